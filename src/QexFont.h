@@ -1,0 +1,20 @@
+// The font's program, which the screen-space quads use as well.
+//
+// It lives from QexFont_Create to QexFont_Release; before and after, the names are 0.
+#pragma once
+
+#include "Qex.h"
+
+struct QexFontProgram {
+    uint32_t program;  // GL names
+    uint32_t vertexShader;
+    uint32_t fragmentShader;
+    int32_t position;  // attribute locations
+    int32_t colour;
+    int32_t texCoord;
+    int32_t projectionLocation;  // uniform locations
+    int32_t textureLocation;
+    int32_t alphaLocation;
+};
+
+const QexFontProgram* QexFont_GetProgram();

@@ -1,0 +1,26 @@
+// The GL interface as the engine's GL modules see it, and the check that follows nearly every call.
+//
+// QEX_GL(call) issues the call and reads glGetError once; an error ends the process. The file that uses it
+// defines QEX_MODULE first. A build with QEX_GL_CHECKS=0 issues the bare call.
+#pragma once
+
+#include <GLES2/gl2.h>
+
+#include "QexDiagnostics.h"
+
+#if QEX_GL_CHECKS
+#define QEX_GL_CHECK()                                                                                       \
+    do {                                                                                                     \
+        const GLenum qexError = glGetError();                                                                \
+        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                                                    \
+            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __LINE__);                                     \
+    } while (0)
+#else
+#define QEX_GL_CHECK() ((void)QEX_MODULE)
+#endif
+
+#define QEX_GL(call)    \
+    do {                \
+        call;           \
+        QEX_GL_CHECK(); \
+    } while (0)

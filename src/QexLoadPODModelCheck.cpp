@@ -1,0 +1,352 @@
+#include <cstdarg>
+#include <cstdio>
+#include <cstring>
+
+#include "QexDiagnostics.h"
+#include "QexLoadPODModel.h"
+#include "QexMemory.h"
+
+#define QEX_MODULE "src/QexLoadPODModel"
+
+namespace {
+
+struct Check {
+    QexPODModel* scene;
+    const char* kind;  // the record being checked
+    uint32_t index;
+};
+
+bool Fail(const Check& at, const char* format, ...) QEX_PRINTF(2, 3);
+bool Fail(const Check& at, const char* format, ...) {
+    char text[192];
+    va_list arguments;
+    va_start(arguments, format);
+    vsnprintf(text, sizeof text, format, arguments);
+    va_end(arguments);
+    QexError(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %s %u: %s", at.kind, at.index, text);
+    return false;
+}
+
+// An index that may be -1 for none.
+bool InRange(int32_t index, uint32_t count) { return index == -1 || static_cast<uint32_t>(index) < count; }
+
+// ---- Meshes ----
+
+bool CheckElement(const Check& at, const char* name, CPODData* element, uint32_t ownBytes) {
+    const QexPODMesh& mesh = at.scene->meshes[at.index];
+    const uint64_t offset = mesh.interleaved ? reinterpret_cast<uintptr_t>(element->data) : 0;
+    const uint64_t bytes = mesh.interleaved ? mesh.interleavedBytes : ownBytes;
+    if (!element->componentCount || !mesh.vertexCount) return true;
+    if (!mesh.interleaved && !element->data) {
+        element->componentCount = 0;  // declared, but without data
+        return true;
+    }
+    if (!QexPODData_ComponentSize(element->type)) return Fail(at, "%s of unknown type %u", name, element->type);
+    if (element->componentCount > 4) return Fail(at, "%s of %u components", name, element->componentCount);
+    const uint32_t size = QexPODData_ElementSize(element->type, element->componentCount);
+    if (!element->stride && !mesh.interleaved) element->stride = size;
+    if (element->stride < size && mesh.vertexCount > 1)
+        return Fail(at, "%s of %u bytes with a stride of %u", name, size, element->stride);
+    const uint64_t end = offset + uint64_t{mesh.vertexCount - 1} * element->stride + size;
+    if (end <= bytes) return true;
+    return Fail(at, "%s of %u vertices reach byte %llu of %llu", name, mesh.vertexCount,
+                static_cast<unsigned long long>(end), static_cast<unsigned long long>(bytes));
+}
+
+bool CheckElements(const Check& at, const uint32_t* extents) {
+    QexPODMesh& mesh = at.scene->meshes[at.index];
+    const struct {
+        const char* name;
+        CPODData* element;
+        uint32_t extent;
+    } elements[] = {
+        {"positions", &mesh.vertices, kExtentVertices},       {"normals", &mesh.normals, kExtentNormals},
+        {"tangents", &mesh.tangents, kExtentTangents},        {"binormals", &mesh.binormals, kExtentBinormals},
+        {"colours", &mesh.colours, kExtentColours},           {"bone indices", &mesh.boneIndices, kExtentBoneIndices},
+        {"bone weights", &mesh.boneWeights, kExtentBoneWeights},
+    };
+    for (const auto& e : elements)
+        if (!CheckElement(at, e.name, e.element, extents[e.extent])) return false;
+    for (uint32_t i = 0; i < mesh.uvwChannelCount; ++i)
+        if (!CheckElement(at, "texture coordinates", &mesh.uvws[i], extents[kExtentUVWs + i])) return false;
+    return true;
+}
+
+template <class Index>
+uint32_t Highest(const uint8_t* data, uint64_t count) {
+    const Index* indices = reinterpret_cast<const Index*>(data);
+    Index highest = 0;
+    for (uint64_t i = 0; i < count; ++i) highest = indices[i] > highest ? indices[i] : highest;
+    return highest;
+}
+
+bool CheckFaces(const Check& at, const uint32_t* extents) {
+    QexPODMesh& mesh = at.scene->meshes[at.index];
+    uint64_t count = uint64_t{mesh.faceCount} * 3;
+    if (mesh.stripCount) {
+        if (mesh.stripCount > extents[kExtentStrips])
+            return Fail(at, "%u strips, but %u strip lengths", mesh.stripCount, extents[kExtentStrips]);
+        count = 0;
+        for (uint32_t i = 0; i < mesh.stripCount; ++i) count += uint64_t{mesh.stripLengths[i]} + 2;
+    }
+    if (count > INT32_MAX) return Fail(at, "more faces than can be drawn");
+    if (!mesh.faces.data) {
+        // Only positions show that the vertices counted are really there.
+        const uint32_t vertices = mesh.vertices.componentCount ? mesh.vertexCount : 0;
+        if (count <= vertices) return true;
+        return Fail(at, "its faces need %u vertices, it has %u", static_cast<uint32_t>(count), vertices);
+    }
+    const bool wide = mesh.faces.type == QEX_POD_UNSIGNED_INT;
+    if (!wide && mesh.faces.type != QEX_POD_UNSIGNED_SHORT)
+        return Fail(at, "face indices of type %u", mesh.faces.type);
+    if (count > extents[kExtentFaces] / (wide ? 4 : 2))
+        return Fail(at, "its faces need %u indices, it has %u", static_cast<uint32_t>(count),
+                    extents[kExtentFaces] / (wide ? 4 : 2));
+    if (!count) return true;
+    const uint32_t highest =
+        wide ? Highest<uint32_t>(mesh.faces.data, count) : Highest<uint16_t>(mesh.faces.data, count);
+    if (highest < mesh.vertexCount) return true;
+    return Fail(at, "a face uses vertex %u of %u", highest, mesh.vertexCount);
+}
+
+const uint8_t* ElementData(const QexPODMesh& mesh, const CPODData& element) {
+    return mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
+}
+
+uint8_t* ElementData(QexPODMesh& mesh, const CPODData& element) {
+    return const_cast<uint8_t*>(ElementData(static_cast<const QexPODMesh&>(mesh), element));
+}
+
+// Bone indices count even where the file calls them normalised: the shaders get them as they are.
+uint32_t BoneIndexType(uint32_t type) {
+    switch (type) {
+        case QEX_POD_SHORT_NORM: return QEX_POD_SHORT;
+        case QEX_POD_BYTE_NORM: return QEX_POD_BYTE;
+        case QEX_POD_UNSIGNED_BYTE_NORM: return QEX_POD_UNSIGNED_BYTE;
+        case QEX_POD_UNSIGNED_SHORT_NORM: return QEX_POD_UNSIGNED_SHORT;
+        default: return type;
+    }
+}
+
+// Every bone that a vertex really follows lies in its batch. A bone of weight 0 may be anything in the file; it
+// becomes 0, so that no shader reads past its matrices.
+bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
+    QexPODMesh& mesh = at.scene->meshes[at.index];
+    const uint32_t n = QexPODData_Components(mesh.boneIndices);
+    const uint32_t type = BoneIndexType(mesh.boneIndices.type);
+    uint8_t* source = ElementData(mesh, mesh.boneIndices) + uint64_t{vertex} * mesh.boneIndices.stride;
+    float bone[4], weight[4];
+    QexPODVertex_ReadVec(bone, source, type, static_cast<int32_t>(n));
+    QexPODVertex_ReadVec(weight,
+                         ElementData(mesh, mesh.boneWeights) + uint64_t{vertex} * mesh.boneWeights.stride,
+                         mesh.boneWeights.type, static_cast<int32_t>(n));
+    bool changed = false;
+    for (uint32_t i = 0; i < n; ++i) {
+        if (bone[i] >= 0 && bone[i] < static_cast<float>(bones)) continue;
+        if (weight[i] != 0) return Fail(at, "vertex %u follows bone %g of a batch of %d", vertex,
+                                        static_cast<double>(bone[i]), bones);
+        bone[i] = 0;
+        changed = true;
+    }
+    if (changed) QexVertexWriteVec(source, type, static_cast<int32_t>(n), bone);
+    return true;
+}
+
+bool CheckBatch(const Check& at, int32_t batch) {
+    const QexPODMesh& mesh = at.scene->meshes[at.index];
+    const QexBoneBatches& b = mesh.boneBatches;
+    const int32_t bones = b.bonesPerBatch[batch];
+    const uint32_t first = static_cast<uint32_t>(b.offsets[batch]);
+    const uint32_t end = batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
+    if (bones < 0 || bones > b.maxBones) return Fail(at, "batch %d has %d bones of %d", batch, bones, b.maxBones);
+    for (int32_t i = 0; i < bones; ++i) {
+        const int32_t node = b.boneTable[int64_t{batch} * b.maxBones + i];
+        if (node < 0 || static_cast<uint32_t>(node) >= at.scene->nodeCount)
+            return Fail(at, "batch %d uses node %d of %u as a bone", batch, node, at.scene->nodeCount);
+    }
+    if (first > end || end > mesh.faceCount || (batch == 0 && first != 0))
+        return Fail(at, "batch %d covers faces %u to %u of %u", batch, first, end, mesh.faceCount);
+    const uint32_t size = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
+    for (uint64_t i = uint64_t{first} * 3; i < uint64_t{end} * 3; ++i) {
+        uint32_t vertex = 0;
+        QexPODVertex_ReadInt(&vertex, mesh.faces.data + i * size, mesh.faces.type);
+        if (!CheckBoneIndices(at, vertex, bones)) return false;
+    }
+    return true;
+}
+
+// A mesh follows bones when it has bone indices, weights, and batches that say which bones those are.
+bool CheckSkin(const Check& at, const uint32_t* extents) {
+    QexPODMesh& mesh = at.scene->meshes[at.index];
+    const QexBoneBatches& b = mesh.boneBatches;
+    if (b.batchCount < 0 || b.maxBones < 0) return Fail(at, "%d batches of %d bones", b.batchCount, b.maxBones);
+    const uint64_t table = static_cast<uint64_t>(b.batchCount) * static_cast<uint64_t>(b.maxBones);
+    const uint32_t count = static_cast<uint32_t>(b.batchCount);
+    if (table > extents[kExtentBoneTable] || count > extents[kExtentBonesPerBatch] ||
+        count > extents[kExtentBatchOffsets])
+        return Fail(at, "%d batches of %d bones, but shorter tables", b.batchCount, b.maxBones);
+    mesh.skinned = 0;
+    if (!mesh.boneIndices.componentCount || !mesh.boneWeights.componentCount || !mesh.vertexCount) return true;
+    if (!b.batchCount || mesh.stripCount || !mesh.faces.data) {
+        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> mesh %u: follows bones, but %s; it stands still",
+               at.index, !b.batchCount ? "has no bone batches" : "is not a list of indexed triangles");
+        return true;
+    }
+    const uint32_t indices = QexPODData_Components(mesh.boneIndices);
+    const uint32_t weights = QexPODData_Components(mesh.boneWeights);
+    if (indices != weights) return Fail(at, "%u bone indices, but %u weights a vertex", indices, weights);
+    for (int32_t batch = 0; batch < b.batchCount; ++batch)
+        if (!CheckBatch(at, batch)) return false;
+    mesh.skinned = 1;
+    return true;
+}
+
+// ---- Nodes ----
+
+struct Channel {
+    const char* name;
+    uint32_t bit;
+    uint32_t keyFloats;
+    uint32_t** index;
+    float** keys;
+    uint32_t shared;
+};
+
+// Keys for every frame, or the node stands still at its first.
+void CheckKeys(const Check& at, const Channel& channel, uint32_t indexCount, uint32_t floats) {
+    QexPODNode& node = at.scene->nodes[at.index];
+    const uint32_t frames = at.scene->frameCount ? at.scene->frameCount : 1;
+    const char* fault = nullptr;
+    if (!*channel.keys) return;
+    if (floats < channel.keyFloats) {
+        fault = "not even one key";
+        if (!(node.ownershipFlags & channel.shared)) QexMemory_Free(*channel.keys);
+        node.ownershipFlags &= ~channel.shared;
+        *channel.keys = nullptr;
+    } else if (!(node.animationFlags & channel.bit)) {
+        return;
+    } else if (!*channel.index) {
+        if (floats / channel.keyFloats < frames) fault = "fewer keys than frames";
+    } else if (indexCount < frames) {
+        fault = "fewer key indices than frames";
+    } else {
+        for (uint32_t i = 0; i < frames && !fault; ++i)
+            if (uint64_t{(*channel.index)[i]} + channel.keyFloats > floats) fault = "a key index beyond its keys";
+    }
+    if (!fault) return;
+    node.animationFlags &= ~channel.bit;
+    if (frames > 1)
+        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> node %u: %s has %s; it stands still", at.index,
+               channel.name, fault);
+}
+
+// Walks up the parents, which must end at a root.
+bool CheckParents(const Check& at) {
+    int32_t parent = at.scene->nodes[at.index].parentIndex;
+    for (uint32_t steps = 0; parent != -1; ++steps) {
+        if (!InRange(parent, at.scene->nodeCount))
+            return Fail(at, "its parent is node %d of %u", parent, at.scene->nodeCount);
+        if (steps > kPODMaxParents)
+            return Fail(at, "its parents form a circle, or more than %u of them", kPODMaxParents);
+        parent = at.scene->nodes[parent].parentIndex;
+    }
+    return true;
+}
+
+bool CheckNode(const Check& at, const uint32_t* extents) {
+    QexPODNode& node = at.scene->nodes[at.index];
+    if (at.index < at.scene->meshNodeCount && static_cast<uint32_t>(node.objectIndex) >= at.scene->meshCount)
+        return Fail(at, "it draws mesh %d of %u", node.objectIndex, at.scene->meshCount);
+    // A node without the block, in a scene without materials.
+    if (!at.scene->materialCount && !node.materialIndex) node.materialIndex = -1;
+    if (!InRange(node.materialIndex, at.scene->materialCount))
+        return Fail(at, "it uses material %d of %u", node.materialIndex, at.scene->materialCount);
+    const Channel channels[] = {
+        {"position", QEX_NODE_POSITION_ANIMATED, 3, &node.positionIndex, &node.position, QEX_NODE_SHARED_POSITION},
+        {"rotation", QEX_NODE_ROTATION_ANIMATED, 4, &node.rotationIndex, &node.rotation, 0},
+        // Only the first three of a scale key's seven floats are read; some exporters cut the last key short.
+        {"scale", QEX_NODE_SCALE_ANIMATED, 3, &node.scaleIndex, &node.scale, QEX_NODE_SHARED_SCALE},
+        {"matrix", QEX_NODE_MATRIX_ANIMATED, 16, &node.matrixIndex, &node.matrix, QEX_NODE_SHARED_MATRIX},
+    };
+    for (uint32_t i = 0; i < 4; ++i) {
+        Channel channel = channels[i];
+        // Without an index, scale keys lie seven floats apart.
+        const uint32_t frames = at.scene->frameCount ? at.scene->frameCount : 1;
+        uint32_t floats = extents[kExtentPosition + i];
+        if (i == 2 && !*channel.index && (node.animationFlags & channel.bit) && floats >= 3)
+            floats = uint64_t{frames - 1} * 7 + 3 <= floats ? 3 * frames : 3;
+        CheckKeys(at, channel, extents[kExtentPositionIndex + i], floats);
+    }
+    return CheckParents(at);
+}
+
+// ---- The rest ----
+
+bool CheckMaterial(const Check& at) {
+    const QexPODMaterial& material = at.scene->materials[at.index];
+    for (const int32_t* index = &material.diffuseTexture; index <= &material.refractionTexture; ++index)
+        if (!InRange(*index, at.scene->textureCount))
+            return Fail(at, "it uses texture %d of %u", *index, at.scene->textureCount);
+    return true;
+}
+
+bool CheckCamera(const Check& at, const uint32_t* extents) {
+    QexPODCamera& camera = at.scene->cameras[at.index];
+    if (!InRange(camera.targetIndex, at.scene->nodeCount))
+        return Fail(at, "its target is node %d of %u", camera.targetIndex, at.scene->nodeCount);
+    if (camera.animatedFov && extents[kExtentFov] < (at.scene->frameCount ? at.scene->frameCount : 1)) {
+        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> camera %u: fewer fields of view than frames; it keeps one",
+               at.index);
+        QexMemory_Free(camera.animatedFov);
+        camera.animatedFov = nullptr;
+    }
+    return true;
+}
+
+bool CheckCounts(QexPODModel* scene) {
+    const uint64_t ordered = uint64_t{scene->meshNodeCount} + scene->lightCount + scene->cameraCount;
+    if (ordered <= scene->nodeCount) return true;
+    QexError(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %u nodes, but %u mesh nodes, %u lights and %u cameras",
+             scene->nodeCount, scene->meshNodeCount, scene->lightCount, scene->cameraCount);
+    return false;
+}
+
+}  // namespace
+
+uint32_t QexPODData_ComponentSize(uint32_t type) {
+    static const uint8_t sizes[] = {0, 4, 4, 2, 4, 4, 4, 4, 4, 4, 1, 2, 2, 1, 1, 1, 2, 4};
+    return type < sizeof sizes ? sizes[type] : 0;
+}
+
+uint32_t QexPODData_Components(const CPODData& element) {
+    if (!element.componentCount) return 0;
+    return element.type == QEX_POD_UBYTE4 ? 4 : element.type == QEX_POD_DEC3N ? 3 : element.componentCount;
+}
+
+uint32_t QexPODData_ElementSize(uint32_t type, uint32_t componentCount) {
+    const bool packed = type >= QEX_POD_RGBA && type <= QEX_POD_DEC3N;
+    return QexPODData_ComponentSize(type) * (packed ? 1 : componentCount);
+}
+
+bool QexLoadPODModel_Check(QexPODModel* scene, QexPODExtents* const extents[kPODKinds]) {
+    if (!CheckCounts(scene)) return false;
+    Check at = {scene, "mesh", 0};
+    for (at.index = 0; at.index < scene->meshCount; ++at.index) {
+        const uint32_t* lengths = extents[kPODMesh][at.index];
+        if (!CheckElements(at, lengths) || !CheckFaces(at, lengths) || !CheckSkin(at, lengths)) return false;
+    }
+    at.kind = "node";
+    for (at.index = 0; at.index < scene->nodeCount; ++at.index)
+        if (!CheckNode(at, extents[kPODNode][at.index])) return false;
+    at.kind = "material";
+    for (at.index = 0; at.index < scene->materialCount; ++at.index)
+        if (!CheckMaterial(at)) return false;
+    at.kind = "camera";
+    for (at.index = 0; at.index < scene->cameraCount; ++at.index)
+        if (!CheckCamera(at, extents[kPODCamera][at.index])) return false;
+    at.kind = "light";
+    for (at.index = 0; at.index < scene->lightCount; ++at.index)
+        if (!InRange(scene->lights[at.index].targetIndex, scene->nodeCount))
+            return Fail(at, "its target is node %d of %u", scene->lights[at.index].targetIndex, scene->nodeCount);
+    return true;
+}

@@ -1,0 +1,46 @@
+// Four floats at a time, for the parts of the math that every node of every frame runs through. The compiler
+// keeps a Float4 in one SIMD register where the target has them, and splits it where not.
+#pragma once
+
+#include <cstring>
+
+#include "Qex.h"
+
+typedef float Float4 __attribute__((vector_size(16)));
+typedef double Double4 __attribute__((vector_size(32)));
+
+inline Float4 Load4(const float* from) {
+    Float4 value;
+    memcpy(&value, from, sizeof value);
+    return value;
+}
+
+inline void Store4(float* to, Float4 value) {
+    memcpy(to, &value, sizeof value);
+}
+
+// Any four lanes of a and b: 0 to 3 are a's, 4 to 7 are b's.
+template <int i, int j, int k, int l>
+inline Float4 Shuffle(Float4 a, Float4 b) {
+#if defined(__clang__)
+    return __builtin_shufflevector(a, b, i, j, k, l);
+#else
+    typedef int Int4 __attribute__((vector_size(16)));
+    return __builtin_shuffle(a, b, Int4{i, j, k, l});
+#endif
+}
+template <int i, int j, int k, int l>
+inline Float4 Shuffle(Float4 a) {
+    return Shuffle<i, j, k, l>(a, a);
+}
+
+// One lane in all four.
+template <int lane>
+inline Float4 Splat(Float4 a) {
+    return Shuffle<lane, lane, lane, lane>(a);
+}
+
+// c0 * v.x + c1 * v.y + c2 * v.z
+inline Float4 Combine3(Float4 c0, Float4 c1, Float4 c2, Float4 v) {
+    return c0 * Splat<0>(v) + c1 * Splat<1>(v) + c2 * Splat<2>(v);
+}

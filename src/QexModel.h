@@ -1,0 +1,35 @@
+// Models for the engine's own modules: the shader modules that all models share.
+//
+// They are made with the first model and go with the last; QexModel_CreateDefaultShader and
+// QexModel_ReleaseShader count.
+#pragma once
+
+#include "Qex.h"
+
+struct QexModelSharedShaders {
+    QexShaderModule* texture;   // null while there are none
+    QexShaderModule* skinning;
+    QexShaderModule* simple;
+    uint32_t shadowTexture;     // GL names of the shadow target
+    uint32_t shadowDepth;
+    uint32_t shadowFramebuffer;
+    int32_t shadowWidth;        // pixels
+    int32_t shadowHeight;
+};
+
+const QexModelSharedShaders* QexModel_GetSharedShaders();
+
+// Builds a mesh's attribute layout and box, and its GL buffers' contents where the mesh's own bytes cannot be
+// uploaded as they are.
+struct QexMeshUpload {
+    const uint8_t* vertices;  // vertexBytes to upload; the mesh's own or `packedVertices`
+    uint32_t vertexBytes;
+    const uint16_t* indices;  // indexCount to upload, or null
+    uint32_t indexCount;
+    uint8_t* packedVertices;  // owned, or null
+    uint16_t* packedIndices;  // owned, or null
+};
+
+// False, with a line in the log, when the mesh cannot be drawn or memory runs out. Free with Release in any case.
+bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex);
+void QexModelGeometry_Release(QexMeshUpload* upload);

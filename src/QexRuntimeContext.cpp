@@ -1,0 +1,103 @@
+#include <cstring>
+
+#include "QexDiagnostics.h"
+
+namespace {
+
+uint32_t s_Initialized;
+uint32_t s_OwnerDrawInitialized;
+
+static_assert(sizeof(QexEngineConfig) == QEX_ENGINE_CONFIG_SIZE || sizeof(void*) > 4, "11 words");
+static_assert(sizeof(QexRuntimeContext) == 64 || sizeof(void*) > 4, "16 words");
+
+bool IsConfigSize(uint32_t size) { return size == QEX_ENGINE_CONFIG_SIZE || size == sizeof(QexEngineConfig); }
+
+// Window-system words and surface size, from configuration to context and back.
+void CopyWindowWords(QexRuntimeContext* context, const QexEngineConfig& config) {
+    context->windowWord1 = config.windowWord1;
+    context->windowWord2 = config.windowWord2;
+    context->windowWord3 = config.windowWord3;
+    context->windowWord4 = config.windowWord4;
+    context->width = config.width;
+    context->height = config.height;
+    context->windowWord7 = config.windowWord7;
+    context->windowWord8 = config.windowWord8;
+}
+
+void CopyWindowWords(QexEngineConfig* config, const QexRuntimeContext& context) {
+    config->windowWord1 = context.windowWord1;
+    config->windowWord2 = context.windowWord2;
+    config->windowWord3 = context.windowWord3;
+    config->windowWord4 = context.windowWord4;
+    config->width = context.width;
+    config->height = context.height;
+    config->windowWord7 = context.windowWord7;
+    config->windowWord8 = context.windowWord8;
+}
+
+// The pool starts at a multiple of 4 and loses what lies before it.
+void SetPool(QexRuntimeContext* context, const QexEngineConfig& config) {
+    const uint32_t skipped = static_cast<uint32_t>(-reinterpret_cast<uintptr_t>(config.memory) & 3);
+    context->poolBlock = config.memory;
+    context->poolBase = config.memory ? static_cast<uint8_t*>(config.memory) + skipped : nullptr;
+    context->poolSize = config.memorySize > skipped ? config.memorySize - skipped : 0;
+}
+
+}  // namespace
+
+extern "C" {
+
+int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config) {
+    if (!IsConfigSize(configSize) || !context || !config) return -1;
+    CopyWindowWords(context, *config);
+    QexInitEGL(context);
+    CopyWindowWords(config, *context);
+    QexEngine_InitForOwnerDraw(context, configSize, config);
+    s_Initialized = 1;
+    QexLog(QEX_TAG, "<QexEngine_Init> Engine initialization success.");
+    return 0;
+}
+
+int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config) {
+    if (!IsConfigSize(configSize) || !context || !config) return -1;
+    memset(context, 0, sizeof *context);
+    SetPool(context, *config);
+    CopyWindowWords(context, *config);
+    QexMemory_Init(context->poolBase, context->poolSize);
+    context->startTime = QexTime_Init();
+    QexRenderState_Reset(context);
+    QexTexture_CreateDefault();
+    QexFont_Create(context->width, context->height);
+    s_OwnerDrawInitialized = 1;
+    QexLog(QEX_TAG, "<QexEngine_InitForOwnerDraw> Owner draw initialized ok");
+    return 0;
+}
+
+void QexEngine_Shutdown(QexRuntimeContext* context) {
+    QexEngine_ShutdownForOwnerDraw(context);
+    QexShutdownEGL(context);
+    s_Initialized = 0;
+    QexLog(QEX_TAG, "<QexEngine_Shutdown> Engine shutdown.");
+}
+
+void QexEngine_ShutdownForOwnerDraw(QexRuntimeContext* context) {
+    QexFont_Release();
+    QexTexture_ReleaseDefault();
+    QexModel_ReleaseShader(1);
+    destroyWindow();
+    // A block without room for the signature was never touched.
+    if (context && context->poolSize >= sizeof(uint32_t)) QexMemory_Shutdown(context->poolBase);
+    s_Initialized = 0;
+    QexLog(QEX_TAG, "<QexEngine_ShutdownForOwnerDraw> Shutdown ok.");
+    s_OwnerDrawInitialized = 0;
+}
+
+uint32_t QexEngine_IsInitialized(void) { return s_Initialized; }
+uint32_t QexEngine_IsOwnerDrawInitialized(void) { return s_OwnerDrawInitialized; }
+void QexRenderer_Present(void) {}
+int32_t QexInitEGL(QexRuntimeContext*) { return 0; }
+int32_t QexShutdownEGL(QexRuntimeContext*) { return 0; }
+int32_t createWindow(void) { return 0; }
+int32_t destroyWindow(void) { return 0; }
+
+}  // extern "C"

@@ -1,0 +1,212 @@
+#include "QexShaderModule.h"
+
+#include <cstring>
+
+#include "../QexPODAnimation.h"
+
+#define QEX_MODULE (type->path)
+
+namespace {
+
+constexpr float kDefaultThreshold = 0.5f;
+
+constexpr QexPODMaterial MakeWhite() {
+    QexPODMaterial material = {};
+    material.opacity = 1;
+    for (int i = 0; i < 3; ++i) material.ambient[i] = material.diffuse[i] = 1;
+    return material;
+}
+
+// What a node without a material is drawn with.
+constexpr QexPODMaterial kNoMaterial = MakeWhite();
+
+QexTexture* TextureOf(QexTexture** textures, const QexPODNode* node) {
+    return node->materialIndex < 0 || !textures ? nullptr : textures[node->materialIndex];
+}
+
+const QexPODMesh* MeshOf(const QexModel* model, uint32_t nodeIndex) {
+    return &model->scene.meshes[model->scene.nodes[nodeIndex].objectIndex];
+}
+
+uint32_t MeshIndexOf(const QexModel* model, uint32_t nodeIndex) {
+    return static_cast<uint32_t>(model->scene.nodes[nodeIndex].objectIndex);
+}
+
+const void* BufferOffset(uint64_t bytes) { return reinterpret_cast<const void*>(static_cast<uintptr_t>(bytes)); }
+
+// Draws `count` vertices from number `first`, by index where the mesh has indices.
+void DrawRange(const QexShaderModuleType* type, bool indexed, GLenum mode, uint32_t first, uint32_t count) {
+    if (indexed)
+        QEX_GL(glDrawElements(mode, static_cast<GLsizei>(count), GL_UNSIGNED_SHORT, BufferOffset(uint64_t{first} * 2)));
+    else
+        QEX_GL(glDrawArrays(mode, static_cast<GLint>(first), static_cast<GLsizei>(count)));
+}
+
+}  // namespace
+
+// ---- Lifetime ----
+
+QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
+    QexShaderModule* module = static_cast<QexShaderModule*>(QexMemory_Alloc(sizeof(QexShaderModule)));
+    if (!module) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return nullptr;
+    }
+    memset(static_cast<void*>(module), 0, sizeof *module);
+    QexShaderModule_Setup(type, module);
+    if (type->hasThreshold) module->slots[type->thresholdSlot].value = kDefaultThreshold;
+    module->render = type->render;
+    return module;
+}
+
+int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
+    char log[QEX_SHADER_LOG_SIZE];
+    const char* names[kMaxShaderAttributes];
+    int32_t attributeCount = 0;
+    while (type->attributes[attributeCount].name) {
+        names[attributeCount] = type->attributes[attributeCount].name;
+        ++attributeCount;
+    }
+    QexShader_Create(&module->vertexShader, type->vertexSource, GL_VERTEX_SHADER);
+    QexShader_Create(&module->fragmentShader, type->fragmentSource, GL_FRAGMENT_SHADER);
+    if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names, attributeCount,
+                                log) != 0)
+        QexError(QEX_TAG, "<%s> link failed: %s", type->path, log);
+    for (uint32_t i = 0; type->uniforms[i]; ++i)
+        QEX_GL(module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]));
+    for (const QexShaderSampler* sampler = type->samplers; sampler->name; ++sampler) {
+        GLint location;
+        QEX_GL(location = glGetUniformLocation(module->program, sampler->name));
+        QEX_GL(glUniform1i(location, sampler->unit));
+    }
+    return 0;
+}
+
+void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {
+    QexShaderModule* m = *module;
+    if (!m) return;
+    QexRenderState_UseProgram(0);
+    QEX_GL(glDeleteProgram(m->program));
+    QEX_GL(glDeleteShader(m->vertexShader));
+    QEX_GL(glDeleteShader(m->fragmentShader));
+    QexMemory_Free(m);
+    *module = nullptr;
+}
+
+// ---- A node ----
+
+bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type, QexShaderModule* module,
+                           QexModel* model, uint32_t nodeIndex) {
+    if (nodeIndex >= model->scene.meshNodeCount || !model->vertexBuffers) return false;
+    QexPODNode* node = &model->scene.nodes[nodeIndex];
+    if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return false;
+    const QexPODMaterial* material =
+        node->materialIndex < 0 ? &kNoMaterial : &model->scene.materials[node->materialIndex];
+    *draw = {type, module, model, nodeIndex, node, MeshOf(model, nodeIndex), material};
+    QexRenderState_UseProgram(module->program);
+    return true;
+}
+
+float QexShaderModule_Opacity(const QexShaderDraw& draw) { return draw.material->opacity * g_fQexGlobalAlpha; }
+
+void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix,
+                                         const QexMatrix* view, const QexMatrix* projection) {
+    const QexMatrix* world = QexPODAnimation_WorldMatrix(&draw.model->scene, draw.node);
+    QexMatrix placed;
+    if (modelMatrix) {
+        QexMatrix_Multiply(&placed, modelMatrix, world);
+        world = &placed;
+    }
+    QexMatrix_Multiply(out, projection, view);
+    QexMatrix_Multiply(out, out, world);
+}
+
+void QexShaderModule_BindMaterial(const QexShaderDraw& draw) {
+    if (TextureOf(draw.model->alphaTextures, draw.node))
+        draw.node->blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
+    QexShaderModule_BindMaterialKeepPass(draw);
+}
+
+void QexShaderModule_BindMaterialKeepPass(const QexShaderDraw& draw) {
+    QexModel* model = draw.model;
+    QexTexture_Set(TextureOf(model->alphaTextures, draw.node), kAlphaUnit);
+    if (model->bindTextureHook && model->bindTextureHook(model, draw.nodeIndex)) return;
+    QexTexture_Set(TextureOf(model->textures, draw.node), kDiffuseUnit);
+}
+
+void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw) {
+    QexTexture_Set(nullptr, kAlphaUnit);
+    if (draw.node->materialIndex >= 0) QexTexture_Set(TextureOf(draw.model->textures, draw.node), kDiffuseUnit);
+}
+
+// ---- A mesh ----
+
+void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
+    const QexPODMesh& mesh = model->scene.meshes[meshIndex];
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[meshIndex]));
+    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[meshIndex]));
+    for (GLuint i = 0; type->attributes[i].name; ++i) {
+        if (mesh.attributes[type->attributes[i].element].componentCount)
+            QEX_GL(glEnableVertexAttribArray(i));
+        else
+            QEX_GL(glVertexAttrib4f(i, 0, 0, 0, 1));
+    }
+    for (GLuint i = 0; type->attributes[i].name; ++i) {
+        const QexVertexAttribute& a = mesh.attributes[type->attributes[i].element];
+        if (a.componentCount)
+            QEX_GL(glVertexAttribPointer(i, a.componentCount, a.glType, a.normalised ? GL_TRUE : GL_FALSE,
+                                         static_cast<GLsizei>(a.stride), BufferOffset(a.offset)));
+    }
+}
+
+void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
+    const QexPODMesh& mesh = model->scene.meshes[meshIndex];
+    for (GLuint i = 0; type->attributes[i].name; ++i)
+        if (mesh.attributes[type->attributes[i].element].componentCount) QEX_GL(glDisableVertexAttribArray(i));
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
+    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
+}
+
+int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex) {
+    const QexPODMesh* mesh = MeshOf(model, nodeIndex);
+    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
+    const bool indexed = model->indexBuffers[meshIndex] != 0;
+    QexShaderModule_BeginMesh(type, model, meshIndex);
+    if (!mesh->stripCount) DrawRange(type, indexed, GL_TRIANGLES, 0, mesh->faceCount * 3);
+    uint32_t first = 0;
+    for (uint32_t i = 0; i < mesh->stripCount; ++i) {
+        const uint32_t count = mesh->stripLengths[i] + 2;
+        DrawRange(type, indexed, GL_TRIANGLE_STRIP, first, count);
+        first += count;
+    }
+    QexShaderModule_EndMesh(type, model, meshIndex);
+    return 0;
+}
+
+int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
+                                        const QexShaderBones& bones) {
+    QexPODModel* scene = &model->scene;
+    QexPODNode* node = &scene->nodes[nodeIndex];
+    const QexPODMesh* mesh = MeshOf(model, nodeIndex);
+    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
+    const QexBoneBatches& batches = mesh->boneBatches;
+    QexMatrix matrices[QEX_MAX_BATCH_BONES];
+    if (!mesh->skinned) return 0;
+    QexShaderModule_BeginMesh(type, model, meshIndex);
+    for (int32_t batch = 0; batch < batches.batchCount; ++batch) {
+        const int32_t* bone = batches.boneTable + static_cast<int64_t>(batch) * batches.maxBones;
+        const int32_t count = batches.bonesPerBatch[batch];
+        const uint32_t first = static_cast<uint32_t>(batches.offsets[batch]);
+        const uint32_t end =
+            batch + 1 < batches.batchCount ? static_cast<uint32_t>(batches.offsets[batch + 1]) : mesh->faceCount;
+        QEX_GL(glUniform1i(bones.boneCountLocation, mesh->attributes[QEX_ELEMENT_BONE_INDEX].componentCount));
+        for (int32_t j = 0; j < count; ++j) {
+            QexPODModel_GetBoneWorldMatrix(scene, &matrices[j], node, &scene->nodes[bone[j]]);
+            if (bones.modelMatrix) QexMatrix_Multiply(&matrices[j], bones.modelMatrix, &matrices[j]);
+        }
+        QEX_GL(glUniformMatrix4fv(bones.boneMatrixLocation, count, GL_FALSE, matrices[0].m));
+        DrawRange(type, true, GL_TRIANGLES, first * 3, (end - first) * 3);
+    }
+    QexShaderModule_EndMesh(type, model, meshIndex);
+    return 0;
+}

@@ -1,0 +1,119 @@
+// What the built-in shader modules share.
+//
+// A module is a description (QexShaderModuleType: sources, attributes, uniforms, samplers) and a Render that sets
+// its uniforms. Everything else, from compiling to drawing a mesh, is here and works from the description. An
+// instance (QexShaderModule) is allocated by CreateProgram and freed by Release; its slots hold the uniform
+// locations in the description's order, then the parameters, the first of which is the alpha threshold.
+//
+// GL errors are reported under the module whose description is at work: QEX_MODULE is `type->path` in every
+// function that has one.
+#pragma once
+
+#include "../QexGL.h"
+#include "Qex.h"
+
+struct QexShaderAttribute {
+    const char* name;
+    QexVertexElement element;  // what feeds it
+};
+
+struct QexShaderSampler {
+    const char* name;
+    int32_t unit;
+};
+
+// Texture units, the same in every module.
+enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };
+
+constexpr uint32_t kMaxShaderAttributes = 7;
+constexpr uint32_t kMaxShaderUniforms = 20;
+constexpr uint32_t kMaxShaderSamplers = 4;
+
+// Lists end at the first entry without a name.
+struct QexShaderModuleType {
+    const char* path;  // of the module's source, without extension
+    const char* vertexSource;
+    const char* fragmentSource;
+    QexShaderRenderFn render;
+    QexShaderAttribute attributes[kMaxShaderAttributes + 1];
+    const char* uniforms[kMaxShaderUniforms + 1];
+    QexShaderSampler samplers[kMaxShaderSamplers + 1];
+    bool hasThreshold;
+    uint32_t thresholdSlot;  // also the number of uniforms
+};
+
+// Lifetime.
+QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type);
+int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module);
+void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module);
+
+inline int32_t QexShaderModule_Location(const QexShaderModule* module, uint32_t uniform) {
+    return module->slots[uniform].location;
+}
+
+// What a Render works with, found once.
+struct QexShaderDraw {
+    const QexShaderModuleType* type;
+    QexShaderModule* module;
+    QexModel* model;
+    uint32_t nodeIndex;
+    QexPODNode* node;
+    const QexPODMesh* mesh;
+    const QexPODMaterial* material;  // never null: a node without one gets an opaque white one
+};
+
+// Finds the node and makes the program current; false when there is nothing to draw: no such mesh node, one
+// whose rendering is off, or a model whose geometry is not loaded.
+bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type, QexShaderModule* module,
+                           QexModel* model, uint32_t nodeIndex);
+
+// The material's opacity times the global alpha.
+float QexShaderModule_Opacity(const QexShaderDraw& draw);
+
+// projection * view * [model matrix *] node world.
+void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix,
+                                         const QexMatrix* view, const QexMatrix* projection);
+
+// Binds the alpha texture (a node whose material has one leaves the opaque pass), asks the model's hook, and
+// binds the diffuse texture unless the hook bound something itself.
+void QexShaderModule_BindMaterial(const QexShaderDraw& draw);
+
+// The same for modules that take a node's pass as it is.
+void QexShaderModule_BindMaterialKeepPass(const QexShaderDraw& draw);
+
+// For modules that read alpha from the diffuse texture: no alpha texture, no hook; without a material the
+// diffuse unit stays as it is.
+void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw);
+
+// Binds the mesh's buffers and feeds the module's attributes; End undoes both.
+void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);
+void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);
+
+// The whole draw of a mesh that follows no bones: triangles or strips, indexed or not.
+int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex);
+
+// Sets `boneCount` and `boneMatrixArray` (at those locations) for one bone batch and draws its triangles.
+struct QexShaderBones {
+    int32_t boneCountLocation;
+    int32_t boneMatrixLocation;
+    const QexMatrix* modelMatrix;  // in front of every bone matrix, or null
+};
+int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
+                                        const QexShaderBones& bones);
+
+// The operations that every module exports and that its description settles. `type` is a pointer to it.
+#define QEX_SHADER_MODULE_LIFETIME(Name, type)                                                        \
+    QexShaderModule* Name##_CreateProgram(void) { return QexShaderModule_Create(type); }              \
+    int32_t Name##_SetupProgram(QexShaderModule* module) { return QexShaderModule_Setup(type, module); } \
+    void Name##_Release(QexShaderModule** module) { QexShaderModule_Release(type, module); }
+
+#define QEX_SHADER_MODULE_THRESHOLD(Name, slot)                                                       \
+    void Name##_SetAlphaThreshold(QexShaderModule* module, float threshold) {                         \
+        module->slots[slot].value = threshold;                                                        \
+    }                                                                                                 \
+    float Name##_GetAlphaThreshold(const QexShaderModule* module) { return module->slots[slot].value; }
+
+#define QEX_SHADER_MODULE_DRAW_MESH(Name, type)                                            \
+    int32_t Name##_DrawMesh(QexShaderModule*, QexModel* model, uint32_t nodeIndex) {       \
+        return QexShaderModule_DrawMesh(type, model, nodeIndex);                           \
+    }

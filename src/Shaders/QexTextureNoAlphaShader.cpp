@@ -1,0 +1,48 @@
+#include "QexTextureShader.h"
+
+namespace {
+
+const char* const kFragmentSource = R"(
+uniform sampler2D sTexture;
+uniform lowp float opacity;
+uniform lowp float alphaThreshold;
+varying mediump vec2 fTexCoord;
+void main() {
+    lowp vec4 texel = texture2D(sTexture, fTexCoord);
+    lowp float alpha = opacity * texel.a;
+    if (alpha <= alphaThreshold) alpha = 0.0;
+    gl_FragColor = vec4(texel.rgb, alpha);
+}
+)";
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexTextureNoAlphaShader",
+    kQexTextureVertexSource,
+    kFragmentSource,
+    QexTextureNoAlphaShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
+    {"mvpMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}},
+    true,
+    kTextureThreshold,
+};
+
+}  // namespace
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexTextureNoAlphaShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexTextureNoAlphaShader, kTextureThreshold)
+QEX_SHADER_MODULE_DRAW_MESH(QexTextureNoAlphaShader, &kType)
+
+void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                    const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                    const QexMatrix* projection, const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexTextureShader_SetUniforms(draw, modelMatrix, view, projection);
+    QexShaderModule_BindDiffuseOnly(draw);
+    QexTextureNoAlphaShader_DrawMesh(module, model, nodeIndex);
+}
+
+}  // extern "C"

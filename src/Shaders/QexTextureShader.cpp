@@ -1,0 +1,72 @@
+#include "QexTextureShader.h"
+
+#define QEX_MODULE (type->path)
+
+const char* const kQexTextureVertexSource = R"(
+attribute highp vec3 inVertex;
+attribute mediump vec2 inTexCoord;
+uniform highp mat4 mvpMatrix;
+varying mediump vec2 fTexCoord;
+void main() {
+    fTexCoord = inTexCoord;
+    gl_Position = mvpMatrix * vec4(inVertex, 1.0);
+}
+)";
+
+const char* const kQexTextureFragmentSource = R"(
+uniform sampler2D sTexture;
+uniform sampler2D alphaTexture;
+uniform lowp float opacity;
+uniform lowp float alphaThreshold;
+varying mediump vec2 fTexCoord;
+void main() {
+    lowp float alpha = opacity * texture2D(alphaTexture, fTexCoord).r;
+    if (alpha <= alphaThreshold) alpha = 0.0;
+    gl_FragColor = vec4(texture2D(sTexture, fTexCoord).rgb, alpha);
+}
+)";
+
+namespace {
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexTextureShader",
+    kQexTextureVertexSource,
+    kQexTextureFragmentSource,
+    QexTextureShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
+    {"mvpMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    true,
+    kTextureThreshold,
+};
+
+}  // namespace
+
+void QexTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                  const QexMatrix* projection) {
+    const QexShaderModuleType* type = draw.type;
+    const QexShaderSlot* slots = draw.module->slots;
+    QexMatrix mvp;
+    QexShaderModule_ModelViewProjection(draw, &mvp, modelMatrix, view, projection);
+    QEX_GL(glUniform1f(slots[kTextureOpacity].location, QexShaderModule_Opacity(draw)));
+    QEX_GL(glUniform1f(slots[kTextureAlphaThreshold].location, slots[kTextureThreshold].value));
+    QEX_GL(glUniformMatrix4fv(slots[kTextureMvpMatrix].location, 1, GL_FALSE, mvp.m));
+}
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexTextureShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexTextureShader, kTextureThreshold)
+QEX_SHADER_MODULE_DRAW_MESH(QexTextureShader, &kType)
+
+void QexTextureShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex, const QexLightSet*,
+                             const QexMatrix* modelMatrix, const QexMatrix* view, const QexMatrix* projection,
+                             const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexTextureShader_SetUniforms(draw, modelMatrix, view, projection);
+    QexShaderModule_BindMaterial(draw);
+    QexTextureShader_DrawMesh(module, model, nodeIndex);
+}
+
+}  // extern "C"
