@@ -1,0 +1,157 @@
+#include "ConvertCommand.h"
+
+#include <assimp/config.h>
+#include <assimp/postprocess.h>
+#include <assimp/scene.h>
+#include <algorithm>
+#include <assimp/Importer.hpp>
+#include <cmath>
+#include <exception>
+#include <filesystem>
+
+#include "ConvertLog.h"
+#include "ConvertScene.h"
+#include "ConvertTextures.h"
+#include "PodWriter.h"
+
+namespace fs = std::filesystem;
+
+namespace {
+
+enum ExitStatus { kDone = 0, kBadInput = 1, kBadArgument = 2 };
+
+constexpr double kMaxFps = 1000;
+
+// What is particular about the importer of a file type.
+struct FileType {
+    const char* extension;
+    bool textureReplacesColour;
+    CameraQuirks cameras;
+};
+
+constexpr FileType kFileTypes[] = {
+    {".dae", true, {}},
+    {".zae", true, {}},
+    {".fbx", true, {}},
+    {".3ds", true, {false, false, true}},
+    {".ase", true, {false, true, false}},
+    {".gltf", false, {true, false, false}},
+    {".glb", false, {true, false, false}},
+};
+
+SceneSettings SettingsFor(const ConvertOptions& options) {
+    SceneSettings settings;
+    settings.fps = options.fps;
+    std::string extension = fs::path(options.input).extension().string();
+    for (char& c : extension) {
+        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+    }
+    for (const FileType& type : kFileTypes) {
+        if (extension != type.extension) continue;
+        settings.textureReplacesColour = type.textureReplacesColour;
+        settings.cameras = type.cameras;
+    }
+    return settings;
+}
+
+int BadArgument(const std::string& subject, const std::string& text) {
+    std::fprintf(stderr, "qex convert: %s: %s\n", subject.c_str(), text.c_str());
+    return kBadArgument;
+}
+
+std::string OutputDirectory(const ConvertOptions& options) {
+    const std::string directory = fs::path(options.output).parent_path().string();
+    return directory.empty() ? "." : directory;
+}
+
+// kDone, or the status to end with after a message.
+int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
+    std::error_code ec;
+    if (!ParseTextureFormat(options.textureFormat, format)) {
+        return BadArgument(options.textureFormat, "no texture format; etc1, rgba8888 or rgb888 is expected");
+    }
+    if (!(options.fps >= 1 && options.fps <= kMaxFps && options.fps == std::floor(options.fps))) {
+        return BadArgument("--fps", "a whole number of frames per second from 1 to 1000 is expected");
+    }
+    if (options.output.empty() || fs::is_directory(options.output, ec)) {
+        return BadArgument(options.output, "no file name; the name of the POD file to write is expected");
+    }
+    if (!fs::is_directory(OutputDirectory(options), ec)) {
+        return BadArgument(options.output, "cannot be written; its folder does not exist");
+    }
+    if (fs::equivalent(options.input, options.output, ec)) {
+        return BadArgument(options.output, "is the input; another name is expected");
+    }
+    return kDone;
+}
+
+const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
+    // Degenerate triangles are told by their shape: an area limit would drop small models whole.
+    importer->SetPropertyBool(AI_CONFIG_PP_FD_CHECKAREA, false);
+    return importer->ReadFile(
+        path, aiProcess_Triangulate | aiProcess_JoinIdenticalVertices | aiProcess_GenSmoothNormals |
+                  aiProcess_CalcTangentSpace | aiProcess_SortByPType | aiProcess_FindDegenerates |
+                  aiProcess_GenUVCoords | aiProcess_TransformUVCoords | aiProcess_ImproveCacheLocality);
+}
+
+void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,
+                  const ConvertLog& log) {
+    unsigned long vertices = 0, triangles = 0;
+    for (const pod::Mesh& mesh : scene.meshes) {
+        vertices += mesh.vertexCount;
+        triangles += mesh.faceCount;
+    }
+    std::printf("%s: meshes %zu, vertices %lu, triangles %lu, nodes %zu, mesh nodes %u, materials %zu, ",
+                options.output.c_str(), scene.meshes.size(), vertices, triangles, scene.nodes.size(),
+                scene.meshNodeCount, scene.materials.size());
+    std::printf("cameras %zu, lights %zu, frames %u at %u per second, ", scene.cameras.size(),
+                scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
+    std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
+                textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
+}
+
+int ConvertFile(const ConvertOptions& options, TextureFormat format) {
+    ConvertLog log(options.input);
+    std::error_code ec;
+    if (!fs::is_regular_file(options.input, ec)) {
+        log.Error("cannot be read; an existing scene file is expected");
+        return kBadInput;
+    }
+    Assimp::Importer importer;
+    const aiScene* source = Import(options.input, &importer);
+    if (!source || !source->mRootNode) {
+        std::string reason = importer.GetErrorString();
+        reason.resize(std::min(reason.size(), reason.find('\n')));
+        log.Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason +
+                  ")");
+        return kBadInput;
+    }
+
+    TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
+    pod::Scene scene;
+    std::string error;
+    if (!ConvertScene(*source, SettingsFor(options), &textures, &log, &scene, &error)) {
+        log.Error(error);
+        return kBadInput;
+    }
+    if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
+    if (!pod::WriteFile(options.output, pod::WritePod(scene))) {
+        return BadArgument(options.output, "cannot be written");
+    }
+    if (!options.quiet) PrintSummary(options, scene, textures, log);
+    return kDone;
+}
+
+}  // namespace
+
+int RunConvert(const ConvertOptions& options) {
+    TextureFormat format;
+    const int argumentStatus = CheckArguments(options, &format);
+    if (argumentStatus != kDone) return argumentStatus;
+    try {
+        return ConvertFile(options, format);
+    } catch (const std::exception& failure) {  // out of memory, or a folder that vanishes while it is read
+        ConvertLog(options.input).Error(std::string("cannot be converted (") + failure.what() + ")");
+        return kBadInput;
+    }
+}

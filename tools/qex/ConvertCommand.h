@@ -1,0 +1,16 @@
+// qex convert: any scene that assimp reads, to a POD scene with PVR textures beside it.
+#pragma once
+
+#include <string>
+
+struct ConvertOptions {
+    std::string input;
+    std::string output;
+    std::string textureFormat = "etc1";  // etc1, rgba8888 or rgb888
+    double fps = 30;                     // whole frames per second of the sampled animation
+    bool quiet = false;                  // no summary; warnings and errors still show
+};
+
+// Returns the exit status: 0, 1 when the input cannot be read or holds nothing to draw, 2 for a bad
+// argument or an output that cannot be written. Errors are one line on standard error.
+int RunConvert(const ConvertOptions& options);

@@ -1,0 +1,23 @@
+// What a conversion has to say: warnings on standard error as they arise, counted for the summary.
+#pragma once
+
+#include <cstdio>
+#include <string>
+
+class ConvertLog {
+  public:
+    explicit ConvertLog(std::string file) : file_(std::move(file)) {}
+
+    void Warn(const std::string& text) {
+        ++warnings_;
+        std::fprintf(stderr, "qex convert: %s: warning: %s\n", file_.c_str(), text.c_str());
+    }
+    void Error(const std::string& text) const {
+        std::fprintf(stderr, "qex convert: %s: %s\n", file_.c_str(), text.c_str());
+    }
+    int Warnings() const { return warnings_; }
+
+  private:
+    std::string file_;
+    int warnings_ = 0;
+};

@@ -1,0 +1,108 @@
+#include "ConvertMeshes.h"
+
+#include <assimp/mesh.h>
+#include <algorithm>
+#include <cmath>
+
+namespace {
+
+float Finite(float value) {
+    return std::isfinite(value) ? value : 0.0f;
+}
+
+std::vector<pod::Vec3> CopyVectors(const aiVector3D* source, unsigned count) {
+    std::vector<pod::Vec3> out;
+    if (!source) return out;
+    out.reserve(count);
+    for (unsigned i = 0; i < count; ++i) {
+        out.push_back({Finite(source[i].x), Finite(source[i].y), Finite(source[i].z)});
+    }
+    return out;
+}
+
+std::array<uint8_t, 4> ToBytes(const aiColor4D& c) {
+    std::array<uint8_t, 4> out;
+    const float channels[4] = {c.r, c.g, c.b, c.a};
+    for (size_t i = 0; i < 4; ++i) {
+        out[i] = static_cast<uint8_t>(std::lround(std::clamp(Finite(channels[i]), 0.0f, 1.0f) * 255.0f));
+    }
+    return out;
+}
+
+pod::MeshArrays CopyMesh(const aiMesh& mesh, const MeshContent& content) {
+    const unsigned count = mesh.mNumVertices;
+    pod::MeshArrays out;
+    out.positions = CopyVectors(mesh.mVertices, count);
+    out.normals = CopyVectors(mesh.mNormals, count);
+    if (content.tangents && mesh.mTangents && mesh.mBitangents) {
+        out.tangents = CopyVectors(mesh.mTangents, count);
+        out.binormals = CopyVectors(mesh.mBitangents, count);
+    }
+    const unsigned channel = mesh.HasTextureCoords(content.uvChannel) ? content.uvChannel : 0;
+    for (const pod::Vec3& uv : CopyVectors(mesh.mTextureCoords[channel], count)) {
+        out.uvs.push_back({uv[0], uv[1]});
+    }
+    if (mesh.mColors[0]) {
+        for (unsigned i = 0; i < count; ++i) out.colours.push_back(ToBytes(mesh.mColors[0][i]));
+    }
+    for (unsigned f = 0; f < mesh.mNumFaces; ++f) {
+        const aiFace& face = mesh.mFaces[f];
+        if (face.mNumIndices != 3) continue;
+        const bool inRange = face.mIndices[0] < count && face.mIndices[1] < count && face.mIndices[2] < count;
+        if (inRange) out.indices.insert(out.indices.end(), face.mIndices, face.mIndices + 3);
+    }
+    return out;
+}
+
+template <class T>
+void CopyVertex(const std::vector<T>& from, uint32_t vertex, std::vector<T>* to) {
+    if (!from.empty()) to->push_back(from[vertex]);
+}
+
+void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* to) {
+    CopyVertex(from.positions, vertex, &to->positions);
+    CopyVertex(from.normals, vertex, &to->normals);
+    CopyVertex(from.tangents, vertex, &to->tangents);
+    CopyVertex(from.binormals, vertex, &to->binormals);
+    CopyVertex(from.uvs, vertex, &to->uvs);
+    CopyVertex(from.colours, vertex, &to->colours);
+}
+
+}  // namespace
+
+std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertices) {
+    std::vector<pod::MeshArrays> pieces;
+    if (mesh.positions.size() <= maxVertices) {
+        pieces.push_back(std::move(mesh));
+        return pieces;
+    }
+    // Where each vertex lies in the current piece; valid while `pieceOf` names that piece.
+    std::vector<uint32_t> place(mesh.positions.size()), pieceOf(mesh.positions.size(), 0);
+    for (size_t i = 0; i + 3 <= mesh.indices.size(); i += 3) {
+        const uint32_t* triangle = &mesh.indices[i];
+        // Three new vertices at the most; a piece may end up to two short of its limit.
+        if (pieces.empty() || pieces.back().positions.size() + 3 > maxVertices) pieces.emplace_back();
+        pod::MeshArrays& piece = pieces.back();
+        const auto number = static_cast<uint32_t>(pieces.size());
+        for (int corner = 0; corner < 3; ++corner) {
+            const uint32_t vertex = triangle[corner];
+            if (pieceOf[vertex] != number) {
+                pieceOf[vertex] = number;
+                place[vertex] = static_cast<uint32_t>(piece.positions.size());
+                CopyVertex(mesh, vertex, &piece);
+            }
+            piece.indices.push_back(place[vertex]);
+        }
+    }
+    return pieces;
+}
+
+std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& content) {
+    std::vector<pod::Mesh> out;
+    pod::MeshArrays arrays = CopyMesh(mesh, content);
+    if (arrays.indices.empty()) return out;
+    for (const pod::MeshArrays& piece : SplitMesh(std::move(arrays), kMaxMeshVertices)) {
+        out.push_back(pod::BuildMesh(piece));
+    }
+    return out;
+}

@@ -1,0 +1,23 @@
+// Meshes of a converted scene: triangles only, interleaved vertices, 16-bit indices.
+#pragma once
+
+#include <vector>
+
+#include "PodBuild.h"
+
+struct aiMesh;
+
+struct MeshContent {
+    bool tangents = false;   // also tangents and binormals, for a normal map
+    unsigned uvChannel = 0;  // the channel that the diffuse texture uses
+};
+
+// The most vertices that a mesh of 16-bit indices takes.
+constexpr uint32_t kMaxMeshVertices = 65535;
+
+// Cuts a mesh, in the order of its triangles, into pieces of at most `maxVertices` vertices. Vertices on a
+// cut are repeated; a mesh that fits comes back whole and unchanged.
+std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertices);
+
+// The triangles of an assimp mesh, in one piece or several. Values that are not finite become 0.
+std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& content);

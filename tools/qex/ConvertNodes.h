@@ -1,0 +1,29 @@
+// The node tree of a converted scene, with the cameras and lights that hang in it.
+#pragma once
+
+#include <vector>
+
+#include "ConvertAnimation.h"
+#include "ConvertLog.h"
+
+struct aiScene;
+
+// One POD mesh that an imported mesh has become, and its material.
+struct MeshPart {
+    int mesh;
+    int material;
+};
+
+// What importers get wrong about cameras.
+struct CameraQuirks {
+    bool fovIsScaledHeight = false;  // the height's angle times the aspect stands for the width's angle
+    bool looksAlongMinusZ = false;   // the view direction is not that of the record but the node's -Z
+    bool directionIsLost = false;
+};
+
+// Fills the nodes, cameras and lights of `out`. The nodes are ordered as the format asks: those with a mesh,
+// then lights, then cameras, then the rest. A POD node carries one thing only, so an imported node with
+// several becomes several: its meshes share its transform and parent, lights and cameras become children.
+// Light nodes shine along their -Z axis. Camera nodes look along -Y with -Z up.
+void ConvertNodes(const aiScene& source, const std::vector<std::vector<MeshPart>>& meshParts,
+                  const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log, pod::Scene* out);

@@ -1,0 +1,302 @@
+#include "ConvertTextures.h"
+
+#include <assimp/scene.h>
+#include <ETC1/etc1.h>
+#include <algorithm>
+#include <filesystem>
+
+#include "PodWriter.h"
+#include "PvrWriter.h"
+
+namespace fs = std::filesystem;
+
+namespace {
+
+constexpr int kMaxSide = 4096;
+constexpr size_t kMaxStem = 64;
+
+std::string Lower(std::string text) {
+    for (char& c : text) {
+        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+    }
+    return text;
+}
+
+// The entry of `directory` called `name`, whatever its case; an exact match goes first.
+fs::path FindEntry(const fs::path& directory, const std::string& name) {
+    std::error_code ec;
+    if (fs::exists(directory / name, ec)) return directory / name;
+    const std::string wanted = Lower(name);
+    for (const auto& entry : fs::directory_iterator(directory, ec)) {
+        if (Lower(entry.path().filename().string()) == wanted) return entry.path();
+    }
+    return {};
+}
+
+fs::path FindBelow(fs::path directory, const fs::path& relative) {
+    for (const fs::path& part : relative) {
+        if (part.empty() || part == ".") continue;
+        directory = part == ".." ? directory / ".." : FindEntry(directory, part.string());
+        if (directory.empty()) return {};
+    }
+    std::error_code ec;
+    return fs::is_regular_file(directory, ec) ? directory : fs::path();
+}
+
+// Scenes name their pictures with either slash, and now and then as URLs.
+std::string CleanPath(std::string path) {
+    std::replace(path.begin(), path.end(), '\\', '/');
+    if (path.rfind("file://", 0) == 0) path.erase(0, 7);
+    return path;
+}
+
+Image FlipRows(const Image& image) {
+    Image out = image;
+    const size_t row = static_cast<size_t>(image.width) * 4;
+    for (int y = 0; y < image.height; ++y) {
+        std::copy_n(image.Pixel(0, image.height - 1 - y), row, &out.pixels[static_cast<size_t>(y) * row]);
+    }
+    return out;
+}
+
+std::vector<uint8_t> ToRgb(const Image& image) {
+    std::vector<uint8_t> rgb;
+    rgb.reserve(image.pixels.size() / 4 * 3);
+    for (size_t i = 0; i < image.pixels.size(); i += 4) {
+        rgb.insert(rgb.end(), {image.pixels[i], image.pixels[i + 1], image.pixels[i + 2]});
+    }
+    return rgb;
+}
+
+std::vector<uint8_t> ToEtc1(const Image& image) {
+    const std::vector<uint8_t> rgb = ToRgb(image);
+    const auto width = static_cast<etc1_uint32>(image.width), height = static_cast<etc1_uint32>(image.height);
+    std::vector<uint8_t> blocks(etc1_get_encoded_data_size(width, height));
+    etc1_encode_image(rgb.data(), width, height, 3, width * 3, blocks.data());
+    return blocks;
+}
+
+struct FormatInfo {
+    const char* name;
+    TextureFormat format;
+    uint32_t pvrType;
+    std::vector<uint8_t> (*encode)(const Image&);
+};
+
+constexpr FormatInfo kFormats[] = {
+    {"etc1", TextureFormat::kEtc1, pod::kPvrEtc1, ToEtc1},
+    {"rgba8888", TextureFormat::kRgba8888, pod::kPvrRgba8888,
+     [](const Image& image) { return image.pixels; }},
+    {"rgb888", TextureFormat::kRgb888, pod::kPvrRgb888, ToRgb},
+};
+
+// A picture whose red, green and blue all hold the alpha channel.
+Image AlphaAsGrey(const Image& image) {
+    Image out = image;
+    for (size_t i = 0; i < out.pixels.size(); i += 4) {
+        std::fill_n(&out.pixels[i], 3, out.pixels[i + 3]);
+        out.pixels[i + 3] = 255;
+    }
+    return out;
+}
+
+void MakeOpaque(Image* image) {
+    for (size_t i = 3; i < image->pixels.size(); i += 4) image->pixels[i] = 255;
+    image->hasAlpha = false;
+}
+
+bool IsGrey(const Image& image) {
+    for (size_t i = 0; i < image.pixels.size(); i += 4) {
+        const uint8_t* p = &image.pixels[i];
+        if (p[0] != p[1] || p[1] != p[2]) return false;
+    }
+    return true;
+}
+
+// The engine's normal-mapped shaders read the map in the order green, red, blue.
+void SwapRedGreen(Image* image) {
+    for (size_t i = 0; i < image->pixels.size(); i += 4) std::swap(image->pixels[i], image->pixels[i + 1]);
+}
+
+}  // namespace
+
+bool ParseTextureFormat(const std::string& name, TextureFormat* format) {
+    for (const FormatInfo& info : kFormats) {
+        if (name != info.name) continue;
+        *format = info.format;
+        return true;
+    }
+    return false;
+}
+
+int PowerOfTwoSide(int side) {
+    int lower = 1;
+    while (lower * 2 <= side && lower < kMaxSide) lower *= 2;
+    const bool upperIsCloser = lower < kMaxSide && lower * 2 - side <= side - lower;
+    return upperIsCloser ? lower * 2 : lower;
+}
+
+std::vector<uint8_t> EncodePvr(const Image& image, TextureFormat format) {
+    const FormatInfo& info = kFormats[static_cast<size_t>(format)];
+    Image level = FlipRows(image);
+    const int width = PowerOfTwoSide(image.width), height = PowerOfTwoSide(image.height);
+    if (width != image.width || height != image.height) level = ResizeImage(level, width, height);
+
+    pod::PvrImage pvr;
+    pvr.type = info.pvrType;
+    pvr.width = static_cast<uint32_t>(width);
+    pvr.height = static_cast<uint32_t>(height);
+    pvr.flags = pod::kPvrFlipped;
+    if (format == TextureFormat::kRgba8888 && image.hasAlpha) pvr.flags |= pod::kPvrAlpha;
+    pvr.surfaces.resize(1);
+    pvr.surfaces[0].push_back(info.encode(level));
+    while (level.width > 1 || level.height > 1) {
+        level = HalveImage(level);
+        pvr.surfaces[0].push_back(info.encode(level));
+    }
+    return pod::WritePvr(pvr);
+}
+
+TextureSet::TextureSet(const aiScene* scene, std::string inputPath, std::string outputDirectory,
+                       TextureFormat format, ConvertLog* log)
+    : scene_(scene),
+      inputPath_(std::move(inputPath)),
+      inputDirectory_(fs::path(inputPath_).parent_path().string()),
+      outputDirectory_(std::move(outputDirectory)),
+      format_(format),
+      log_(log) {
+    if (inputDirectory_.empty()) inputDirectory_ = ".";
+}
+
+int TextureSet::Add(const std::string& path, const std::string& opacityPath, TextureUse use) {
+    const std::string key = path + '\n' + opacityPath + '\n' + std::to_string(static_cast<int>(use));
+    const auto [entry, isNew] = known_.emplace(key, -1);
+    if (!isNew) return entry->second;
+
+    Image image;
+    if (!Load(path, &image)) return -1;
+    if (!opacityPath.empty()) ApplyOpacity(opacityPath, &image);
+    if (use != TextureUse::kColour) MakeOpaque(&image);
+    if (use == TextureUse::kNormalMap) {
+        if (IsGrey(image)) {
+            log_->Warn("texture " + path + " is a grey height map, not a normal map; it is left out");
+            return -1;
+        }
+        SwapRedGreen(&image);
+    }
+    entry->second = WriteTexture(path, std::move(image), use);
+    return entry->second;
+}
+
+int TextureSet::WriteTexture(const std::string& path, Image image, TextureUse use) {
+    const std::string stem = UniqueStem(path);
+    const bool withAlpha = use == TextureUse::kColour && image.hasAlpha;
+    if (!Write(stem + ".pvr", image)) return -1;
+    std::error_code ec;
+    const std::string alphaName = stem + "_a.pvr";
+    if (withAlpha) {
+        if (!Write(alphaName, AlphaAsGrey(image))) return -1;
+    } else if (fs::exists(fs::path(outputDirectory_) / alphaName, ec)) {
+        log_->Warn(alphaName + " lies in the output folder and will be taken for the alpha of " + stem +
+                   ".pvr; remove it unless that is meant");
+    }
+    names_.push_back(stem + ".pvr");
+    hasAlpha_.push_back(withAlpha);
+    return static_cast<int>(names_.size()) - 1;
+}
+
+bool TextureSet::Write(const std::string& name, const Image& image) {
+    const std::string path = (fs::path(outputDirectory_) / name).string();
+    if (pod::WriteFile(path, EncodePvr(image, format_))) {
+        ++filesWritten_;
+        return true;
+    }
+    writeError_ = path;
+    return false;
+}
+
+bool TextureSet::Load(const std::string& path, Image* image) {
+    std::string error;
+    bool embedded = false;
+    if (LoadEmbedded(path, image, &error, &embedded)) return true;
+    if (!embedded) {
+        const std::string file = Find(path);
+        if (file.empty()) {
+            log_->Warn("texture " + path + " not found in " + inputDirectory_ +
+                       " or its folders textures, texture, images, maps");
+            return false;
+        }
+        if (LoadImage(file, image, &error)) return true;
+    }
+    log_->Warn("texture " + path + " " + error);
+    return false;
+}
+
+bool TextureSet::LoadEmbedded(const std::string& path, Image* image, std::string* error, bool* found) {
+    const aiTexture* texture = scene_->GetEmbeddedTexture(path.c_str());
+    *found = texture != nullptr;
+    if (!texture) return false;
+    // Height 0 marks a whole picture file of mWidth bytes.
+    if (texture->mHeight == 0) {
+        const auto* bytes = reinterpret_cast<const uint8_t*>(texture->pcData);
+        return LoadImage(bytes, texture->mWidth, image, error);
+    }
+    image->width = static_cast<int>(texture->mWidth);
+    image->height = static_cast<int>(texture->mHeight);
+    const size_t count = static_cast<size_t>(texture->mWidth) * texture->mHeight;
+    image->pixels.reserve(count * 4);
+    for (size_t i = 0; i < count; ++i) {
+        const aiTexel& t = texture->pcData[i];
+        image->pixels.insert(image->pixels.end(), {t.r, t.g, t.b, t.a});
+    }
+    UpdateHasAlpha(image);
+    return true;
+}
+
+std::string TextureSet::Find(const std::string& path) const {
+    const fs::path clean = CleanPath(path);
+    std::error_code ec;
+    if (clean.is_absolute() && fs::is_regular_file(clean, ec)) return clean.string();
+    if (clean.is_relative()) {
+        const fs::path found = FindBelow(inputDirectory_, clean);
+        if (!found.empty()) return found.string();
+    }
+    for (const char* folder : {"", "textures", "texture", "images", "maps"}) {
+        const fs::path found = FindBelow(inputDirectory_, fs::path(folder) / clean.filename());
+        if (!found.empty()) return found.string();
+    }
+    return {};
+}
+
+// The engine looks for NAME_a.pvr beside every NAME.pvr, so both have to be free. Case is ignored: the
+// files may end up on a system that does the same.
+std::string TextureSet::UniqueStem(const std::string& path) {
+    const std::string base = path.empty() || path[0] == '*' ? fs::path(inputPath_).stem().string()
+                                                            : fs::path(CleanPath(path)).stem().string();
+    std::string stem;
+    for (const char c : base.substr(0, kMaxStem)) {
+        const bool safe = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
+                          c == '-' || c == '_';
+        stem += safe ? c : '_';
+    }
+    if (stem.empty()) stem = "texture";
+    std::string name = stem;
+    for (int n = 2; taken_.count(Lower(name)) || taken_.count(Lower(name) + "_a"); ++n) {
+        name = stem + "_" + std::to_string(n);
+    }
+    taken_.insert(Lower(name));
+    taken_.insert(Lower(name) + "_a");
+    return name;
+}
+
+void TextureSet::ApplyOpacity(const std::string& opacityPath, Image* image) {
+    Image opacity;
+    if (!Load(opacityPath, &opacity)) return;
+    if (opacity.width != image->width || opacity.height != image->height) {
+        opacity = ResizeImage(opacity, image->width, image->height);
+    }
+    // A mask holds its values in its own alpha channel or, without one, in its grey.
+    const size_t channel = opacity.hasAlpha ? 3 : 0;
+    for (size_t i = 0; i < image->pixels.size(); i += 4) image->pixels[i + 3] = opacity.pixels[i + channel];
+    UpdateHasAlpha(image);
+}

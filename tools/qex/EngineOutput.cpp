@@ -1,0 +1,88 @@
+#include "EngineOutput.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <sstream>
+
+#include <unistd.h>
+
+namespace {
+
+// One collection at a time; its file descriptors are kept here, where the exit handler finds them.
+struct Capture {
+    FILE* file = nullptr;
+    int savedOut = -1;
+    int savedErr = -1;
+} g_capture;
+
+std::string ReadAndRestore() {
+    std::string text;
+    if (!g_capture.file) return text;
+    fflush(stdout);
+    fflush(stderr);
+    dup2(g_capture.savedOut, STDOUT_FILENO);
+    dup2(g_capture.savedErr, STDERR_FILENO);
+    close(g_capture.savedOut);
+    close(g_capture.savedErr);
+    rewind(g_capture.file);
+    char buffer[4096];
+    for (size_t n; (n = fread(buffer, 1, sizeof buffer, g_capture.file)) > 0;) text.append(buffer, n);
+    fclose(g_capture.file);
+    g_capture = Capture();
+    return text;
+}
+
+// The process ends inside the engine: say why.
+void ShowErrorsAtExit() {
+    std::istringstream lines(ReadAndRestore());
+    for (std::string line; std::getline(lines, line);)
+        if (line.rfind("E/", 0) == 0) fprintf(stderr, "%s\n", line.c_str());
+}
+
+// "E/Qex: <Function> text" to "text".
+std::string Strip(const std::string& line) {
+    size_t at = line.find(": ");
+    std::string text = at == std::string::npos ? line : line.substr(at + 2);
+    if (!text.empty() && text[0] == '<' && (at = text.find("> ")) != std::string::npos) text = text.substr(at + 2);
+    return text;
+}
+
+}  // namespace
+
+EngineOutput::EngineOutput() {
+    static const bool registered = atexit(ShowErrorsAtExit) == 0;
+    (void)registered;
+    fflush(stdout);
+    fflush(stderr);
+    FILE* file = tmpfile();
+    if (!file) return;
+    g_capture = {file, dup(STDOUT_FILENO), dup(STDERR_FILENO)};
+    dup2(fileno(file), STDOUT_FILENO);
+    dup2(fileno(file), STDERR_FILENO);
+    active_ = true;
+}
+
+EngineOutput::~EngineOutput() { Stop(); }
+
+void EngineOutput::Stop() {
+    if (!active_) return;
+    active_ = false;
+    text_ = ReadAndRestore();
+}
+
+std::string EngineOutput::FirstError() const {
+    std::istringstream lines(text_);
+    for (std::string line; std::getline(lines, line);)
+        if (line.rfind("E/", 0) == 0) return Strip(line);
+    return "";
+}
+
+std::vector<std::string> EngineOutput::Messages(const std::string& part) const {
+    std::vector<std::string> found;
+    std::istringstream lines(text_);
+    for (std::string line; std::getline(lines, line);) {
+        const bool message = line.rfind("I/", 0) == 0 || line.rfind("E/", 0) == 0;
+        if (message && line.find(part) != std::string::npos) found.push_back(Strip(line));
+    }
+    return found;
+}

@@ -1,0 +1,32 @@
+// Pictures in and out for the qex command: PNG, JPEG, TGA, BMP, PSD, GIF and PNM are read, PNG is written.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+struct Image {
+    int width = 0;
+    int height = 0;
+    std::vector<uint8_t> pixels;  // RGBA, 8 bits each, the first row is the top one
+    bool hasAlpha = false;        // some pixel is not opaque
+
+    const uint8_t* Pixel(int x, int y) const {
+        return &pixels[4 * (static_cast<size_t>(y) * static_cast<size_t>(width) + static_cast<size_t>(x))];
+    }
+};
+
+// Both give false and one line in `error` when the data is no picture that can be read.
+bool LoadImage(const std::string& path, Image* image, std::string* error);
+bool LoadImage(const uint8_t* data, size_t size, Image* image, std::string* error);
+
+// Looks at every pixel and sets `hasAlpha`.
+void UpdateHasAlpha(Image* image);
+
+// `pixels` is top-down RGBA without padding.
+bool SavePng(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error);
+
+// Both keep the value range linear (no gamma) and filter each channel by itself.
+Image ResizeImage(const Image& image, int width, int height);
+Image HalveImage(const Image& image);  // 2 x 2 box, for mipmaps; a side of 1 stays 1

@@ -1,0 +1,53 @@
+// The parts of qex info. A file is first described as one JSON document; the text is printed from that
+// document, so both say the same. Names of the document's members are camelCase; a member that does not apply
+// is left out.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include <nlohmann/json.hpp>
+
+#include "EngineOutput.h"
+#include "Qex.h"
+
+using Json = nlohmann::ordered_json;
+
+// Text from a file, made fit for a terminal and for JSON: valid UTF-8 without control characters.
+std::string CleanText(const std::string& text);
+
+// InfoScene.cpp. False, with the reason, when the file is no sound scene.
+bool DescribeScene(const std::string& path, Json* document, std::string* error);
+
+// InfoProblems.cpp. A line for each thing that would draw wrong or not at all. `textures` is the document's
+// list of the textures; `engine` holds what the engine said while it read the scene.
+std::vector<std::string> FindSceneProblems(QexPODModel* scene, const Json& textures,
+                                           const EngineOutput& engine);
+
+// The frames at which a scene is looked into: 0, and when it is animated others up to just before
+// its last.
+std::vector<float> SampleFrames(const QexPODModel& scene);
+
+// InfoTexture.cpp and InfoTextureKtx.cpp. Each describes a whole file in memory, with "loads" (whether the
+// engine takes it) and "problems". False, with the reason, when it is too short to have a header.
+bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* error);
+bool DescribeTga(const std::vector<uint8_t>& file, Json* document, std::string* error);
+bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* error);
+
+bool IsKtx(const std::vector<uint8_t>& start);
+bool IsPvr(const std::vector<uint8_t>& start);
+
+uint32_t ReadLE32(const std::vector<uint8_t>& bytes, size_t at);
+
+// Levels of a whole mipmap chain.
+uint32_t FullChain(uint32_t width, uint32_t height);
+
+// InfoCommand.cpp. The first `most` bytes of a file; false, with the reason, when it cannot be read.
+bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error);
+
+// Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.
+bool DescribeContainer(const std::string& path, Json* document, std::string* error);
+
+// InfoText.cpp. Prints the document on standard output.
+void PrintInfo(const Json& document);

@@ -1,0 +1,94 @@
+#include "InfoCommand.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdint>
+#include <cstdio>
+#include <cstring>
+#include <filesystem>
+#include <memory>
+
+#include "Info.h"
+#include "RenderDiagnosis.h"
+#include "TextureFiles.h"
+
+namespace {
+
+constexpr char kReadable[] = "a POD scene or a PVR, KTX or TGA texture";
+constexpr size_t kStartBytes = 16;  // enough to tell the formats apart
+
+// Whether the first block is one that POD files begin with, in either byte order.
+bool IsPod(const std::vector<uint8_t>& start) {
+    if (start.size() < 4) return false;
+    const uint32_t id = ReadLE32(start, 0);
+    return (id >= 1000 && id <= 1003) || id == 0xE8030000u;
+}
+
+bool Describe(const std::string& path, Json* document, std::string* error) {
+    std::vector<uint8_t> bytes;
+    ReadFileBytes(path, kStartBytes, &bytes, error);
+    if (IsPod(bytes)) return DescribeScene(path, document, error);
+    if (IsKtx(bytes) || IsPvr(bytes)) return DescribeContainer(path, document, error);
+    *error = WhyNotPod(path, kReadable);
+    if (!error->empty()) return false;
+    if (Extension(path) == "tga")
+        return ReadFileBytes(path, SIZE_MAX, &bytes, error) && DescribeTga(bytes, document, error);
+    if (Extension(path) == "pod") return DescribeScene(path, document, error);
+    *error = std::string("is not ") + kReadable;
+    return false;
+}
+
+}  // namespace
+
+std::string CleanText(const std::string& text) {
+    const auto replace = Json::error_handler_t::replace;
+    std::string clean = Json::parse(Json(text).dump(-1, ' ', false, replace)).get<std::string>();
+    for (char& c : clean)
+        if ((c >= 0 && c < ' ') || c == 127) c = c == '\n' || c == '\r' || c == '\t' ? ' ' : '?';
+    return clean;
+}
+
+bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error) {
+    bytes->clear();
+    if (!IsRegularFile(path)) {
+        *error = "is not a file that can be read";
+        return false;
+    }
+    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
+    if (!file) {
+        *error = std::string("cannot be opened: ") + strerror(errno);
+        return false;
+    }
+    uint8_t chunk[65536];
+    while (bytes->size() < most) {
+        const size_t got = fread(chunk, 1, std::min(sizeof chunk, most - bytes->size()), file.get());
+        if (!got) break;
+        bytes->insert(bytes->end(), chunk, chunk + got);
+    }
+    if (!ferror(file.get())) return true;
+    *error = std::string("cannot be read: ") + strerror(errno);
+    return false;
+}
+
+bool DescribeContainer(const std::string& path, Json* document, std::string* error) {
+    std::vector<uint8_t> bytes;
+    if (!ReadFileBytes(path, SIZE_MAX, &bytes, error)) return false;
+    if (IsKtx(bytes)) return DescribeKtx(bytes, document, error);
+    if (IsPvr(bytes)) return DescribePvr(bytes, document, error);
+    *error = "is neither a PVR texture with the header of 52 or 44 bytes nor a KTX 1.1 texture";
+    return false;
+}
+
+int RunInfo(const InfoOptions& options) {
+    Json document = {{"file", CleanText(options.input)}};
+    std::string error;
+    if (!Describe(options.input, &document, &error)) {
+        fprintf(stderr, "qex info: %s: %s\n", CleanText(options.input).c_str(), CleanText(error).c_str());
+        return 1;
+    }
+    if (options.json)
+        printf("%s\n", document.dump(2).c_str());
+    else
+        PrintInfo(document);
+    return 0;
+}

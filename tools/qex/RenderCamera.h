@@ -1,0 +1,25 @@
+// The camera that qex render looks through.
+#pragma once
+
+#include <vector>
+
+#include "Qex.h"
+
+// The scene's vertical axis.
+enum class UpAxis { kX, kY, kZ, kMinusX, kMinusY, kMinusZ };
+
+struct OrbitView {
+    float yaw = 30;    // degrees about the vertical: with Y up, 0 looks along -Z, 90 along -X
+    float pitch = 15;  // degrees above the horizon
+    UpAxis up = UpAxis::kY;
+    bool given = false;  // otherwise flat scenes, such as writing, are seen from the front
+};
+
+// Fills the camera from a scene camera at the current frame. False when the scene has no such camera.
+bool UseSceneCamera(QexModel* model, uint32_t index, float aspect, QexCamera* camera);
+
+// The view as it was given, or the one that suits the points.
+OrbitView ChooseView(const std::vector<QexVec3>& points, OrbitView view);
+
+// Places the camera so that all points are in the picture, from the direction of the view.
+void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, float aspect, QexCamera* camera);

@@ -1,0 +1,262 @@
+#include "RenderCommand.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <GLES2/gl2.h>
+#include <sys/resource.h>
+#include <unistd.h>
+
+#include "EngineOutput.h"
+#include "gltap.h"
+#include "Headless.h"
+#include "ImageFile.h"
+#include "RenderDiagnosis.h"
+#include "RenderTextures.h"
+#include "SceneBounds.h"
+#include "TextureFiles.h"
+
+namespace {
+
+constexpr size_t kFramingPoints = 200000;  // of each mesh node over all frames, about
+
+using Clock = std::chrono::steady_clock;
+
+double Milliseconds(Clock::time_point since) {
+    return std::chrono::duration<double, std::milli>(Clock::now() - since).count();
+}
+
+// Everything that lives while pictures are drawn.
+class Renderer {
+  public:
+    explicit Renderer(const RenderOptions& options) : options_(options) {}
+    ~Renderer();
+
+    int Run();
+
+  private:
+    bool Start();
+    bool Load();
+    void Frame();
+    void Draw(double frame, float turned);
+    bool Save(const std::string& path);
+    void SetFrame(double frame);
+    void DrawText();
+    void ReportProgress(size_t done, size_t count) const;
+    void ReportStats(size_t pictures) const;
+    std::vector<double> Frames() const;
+
+    int Fail(const std::string& text, int status) const {
+        fprintf(stderr, "qex render: %s\n", text.c_str());
+        return status;
+    }
+
+    const RenderOptions& options_;
+    std::unique_ptr<qex::HeadlessContext> context_;
+    QexRuntimeContext engine_ = {};
+    QexModel model_ = {};
+    bool engineStarted_ = false;
+    bool modelLoaded_ = false;
+    QexCamera camera_ = {};
+    std::vector<QexVec3> points_;  // that the automatic camera frames
+    std::vector<TransparentSPODNodeInfo> transparent_;
+    double loadTime_ = 0;
+    double drawTime_ = 0;
+};
+
+Renderer::~Renderer() {
+    EngineOutput quiet;
+    if (modelLoaded_) QexModel_Unload(&model_);
+    if (engineStarted_) QexEngine_Shutdown(&engine_);
+}
+
+bool Renderer::Start() {
+    std::string error;
+    context_ = qex::HeadlessContext::Create(options_.width, options_.height, &error);
+    if (!context_) {
+        Fail(error, 1);
+        return false;
+    }
+    EngineOutput output;
+    QexEngineConfig config = {};
+    config.width = options_.width;
+    config.height = options_.height;
+    engineStarted_ = QexEngine_Init(&engine_, sizeof config, &config) == 0;
+    return engineStarted_;
+}
+
+bool Renderer::Load() {
+    const std::string directory = Directory(options_.input);
+    const std::string problem = WhyNotPod(options_.input);
+    if (!problem.empty()) {
+        Fail(options_.input + ": " + problem, 1);
+        return false;
+    }
+    const auto start = Clock::now();
+    EngineOutput output;
+    QexModel_Create(&model_);
+    SetTextureHook(&model_);
+    const int32_t result = QexModel_LoadContent(&model_, directory.c_str(), FileName(options_.input).c_str());
+    modelLoaded_ = true;
+    std::vector<std::string> warnings;
+    if (result == 0) warnings = CompleteTextures(&model_, directory);
+    output.Stop();
+    loadTime_ = Milliseconds(start);
+    for (const std::string& line : output.Messages("stands still")) warnings.push_back(line);
+    for (const std::string& line : output.Messages("ERROR:")) warnings.push_back(line);
+    for (const std::string& line : warnings) fprintf(stderr, "qex render: warning: %s\n", line.c_str());
+    if (result == 0) return true;
+    Fail(options_.input + ": " + output.FirstError(), 1);
+    return false;
+}
+
+std::vector<double> Renderer::Frames() const {
+    std::vector<double> frames;
+    if (!options_.sequence) return std::vector<double>(static_cast<size_t>(std::max(options_.turn, 1)), options_.frame);
+    const double count = std::floor((options_.last - options_.first) / options_.step + 1e-9) + 1;
+    for (double i = 0; i < count; ++i) frames.push_back(options_.first + i * options_.step);
+    return frames;
+}
+
+// The engine plays a loop, in which the last frame is the first again. A picture of the last frame shows its own keys.
+void Renderer::SetFrame(double frame) {
+    QexPODModel& scene = model_.scene;
+    const float f = static_cast<float>(frame);
+    QexPODModel_SetFrame(&scene, f);
+    if (scene.frameCount < 2 || f != static_cast<float>(scene.frameCount - 1)) return;
+    for (uint32_t i = 0; i < scene.nodeCount; ++i) QexPODModel_SetNodeAnimationFrame(&scene, i, f);
+}
+
+// Collects what the automatic camera has to show, over all frames.
+void Renderer::Frame() {
+    std::vector<double> frames = Frames();
+    frames.erase(std::unique(frames.begin(), frames.end()), frames.end());
+    const size_t share = std::max<size_t>(1000, kFramingPoints / frames.size());
+    for (double frame : frames) {
+        SetFrame(frame);
+        for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i) CollectPoints(&model_.scene, i, share, &points_);
+    }
+}
+
+void Renderer::DrawText() {
+    if (options_.text.empty()) return;
+    // The first line: its glyphs touch the upper edge at 32.
+    QexFont_ReplaceString(&engine_, 8, 40, options_.text.c_str(), 255, 255, 255, 255);
+    QexFont_Draw();
+}
+
+void Renderer::Draw(double frame, float turned) {
+    const float aspect = static_cast<float>(options_.width) / static_cast<float>(options_.height);
+    SetFrame(frame);
+    QexCamera_Create(&camera_, 0);
+    OrbitView view = ChooseView(points_, options_.view);
+    view.yaw += turned;
+    if (options_.autoCamera || options_.turn ||
+        !UseSceneCamera(&model_, static_cast<uint32_t>(options_.camera), aspect, &camera_))
+        FramePoints(points_, view, aspect, &camera_);
+    QexLightSet lights = {};
+    QexModel_GetLight(&model_, &lights);
+    const auto channel = [&](int shift) { return static_cast<float>(options_.background >> shift & 0xFF) / 255.0f; };
+    glViewport(0, 0, options_.width, options_.height);
+    QexRenderer_SetZWrite(1);
+    glClearColor(channel(16), channel(8), channel(0), 1);
+    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
+    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetAlphaBlendModeSeparate(1, 0);
+    uint32_t count = 0;
+    for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
+        QexModel_RenderWithCameraEx(&model_, &lights, &camera_, nullptr, pass, QEX_RENDER_OPAQUE, transparent_.data(),
+                                    &count);
+    // The far sides of transparent bodies first, then the near ones.
+    QexRenderer_SetZWrite(0);
+    for (int32_t culled : {2, 1}) {
+        QexRenderer_SetBackFaceCulling(culled);
+        for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
+            QexModel_RenderAlphaBlendingNodes(transparent_.data(), count, pass);
+    }
+    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetZWrite(1);
+}
+
+bool Renderer::Save(const std::string& path) {
+    std::vector<uint8_t> pixels = context_->ReadPixels();
+    for (size_t i = 3; i < pixels.size(); i += 4) pixels[i] = 255;
+    std::string error;
+    if (SavePng(path, options_.width, options_.height, pixels.data(), &error)) return true;
+    Fail(path + ": " + error, 2);
+    return false;
+}
+
+void Renderer::ReportProgress(size_t done, size_t count) const {
+    if (options_.quiet || count < 2 || !isatty(STDERR_FILENO)) return;
+    const size_t width = 40, filled = width * done / count;
+    fprintf(stderr, "\r[%s%s] %zu/%zu%s", std::string(filled, '=').c_str(), std::string(width - filled, ' ').c_str(),
+            done, count, done == count ? "\n" : "");
+}
+
+void Renderer::ReportStats(size_t pictures) const {
+    const double n = static_cast<double>(pictures);
+    rusage usage = {};
+    getrusage(RUSAGE_SELF, &usage);
+    uint64_t triangles = 0;
+    for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i) {
+        const QexPODMesh& mesh = model_.scene.meshes[model_.scene.nodes[i].objectIndex];
+        if (!mesh.stripCount) triangles += mesh.faceCount;
+        for (uint32_t s = 0; s < mesh.stripCount; ++s) triangles += mesh.stripLengths[s];
+    }
+    const uint64_t draws = gltapCount("glDrawElements") + gltapCount("glDrawArrays");
+    printf("load         %10.1f ms\n", loadTime_);
+    printf("picture      %10.1f ms (drawing and reading back)\n", drawTime_ / n);
+    printf("draw calls   %10.1f a picture\n", static_cast<double>(draws) / n);
+    printf("GL calls     %10.1f a picture\n", static_cast<double>(gltapCountAll()) / n);
+    printf("triangles    %10llu in the scene\n", static_cast<unsigned long long>(triangles));
+    printf("memory       %10.1f MB at most\n", static_cast<double>(usage.ru_maxrss) / 1024);
+    printf("renderer     %s, %s\n", context_->Renderer().c_str(), context_->Version().c_str());
+}
+
+int Renderer::Run() {
+    if (!Start() || !Load()) return 1;
+    if (options_.camera > 0 && !options_.autoCamera &&
+        static_cast<uint32_t>(options_.camera) >= model_.scene.cameraCount)
+        return Fail(options_.input + ": no camera " + std::to_string(options_.camera) + ", the scene has " +
+                        std::to_string(model_.scene.cameraCount),
+                    2);
+    transparent_.resize(model_.scene.meshNodeCount + size_t{1});
+    Frame();
+    const std::vector<double> frames = Frames();
+    const bool numbered = options_.sequence || options_.turn;
+    gltapResetCounts();
+    for (size_t i = 0; i < frames.size(); ++i) {
+        const auto start = Clock::now();
+        {
+            EngineOutput quiet;
+            Draw(frames[i], options_.turn ? 360.0f * static_cast<float>(i) / static_cast<float>(options_.turn) : 0);
+            const std::string reason = i == 0 ? WhyNothingShows(model_, camera_, *context_, options_.background, points_) : "";
+            DrawText();
+            quiet.Stop();
+            if (!reason.empty()) fprintf(stderr, "qex render: warning: %s\n", reason.c_str());
+            for (const std::string& line : quiet.Messages("left out"))
+                if (i == 0) fprintf(stderr, "qex render: warning: %s\n", line.c_str());
+        }
+        drawTime_ += Milliseconds(start);
+        char number[32] = "";
+        if (numbered) snprintf(number, sizeof number, "-%04zu", i);
+        const std::string path =
+            numbered ? WithoutExtension(options_.output) + number + "." + Extension(options_.output) : options_.output;
+        if (!Save(path)) return 2;
+        ReportProgress(i + 1, frames.size());
+    }
+    if (options_.stats) ReportStats(frames.size());
+    return 0;
+}
+
+}  // namespace
+
+int RunRender(const RenderOptions& options) { return Renderer(options).Run(); }

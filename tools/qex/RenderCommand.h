@@ -1,0 +1,28 @@
+// qex render: pictures of a POD scene, drawn by the engine without a window.
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+#include "RenderCamera.h"
+
+struct RenderOptions {
+    std::string input;
+    std::string output;
+    int width = 800;
+    int height = 600;
+    double frame = 0;
+    bool sequence = false;  // several frames, numbered
+    double first = 0, last = 0, step = 1;
+    int turn = 0;           // pictures of one turn around the scene, 0 for none
+    int camera = 0;         // scene camera; with autoCamera or without cameras the scene is framed
+    bool autoCamera = false;
+    OrbitView view;
+    uint32_t background = 0x404858;  // RRGGBB
+    std::string text;
+    bool stats = false;
+    bool quiet = false;
+};
+
+// Returns the exit status: 0, 1 when the scene cannot be drawn, 2 for an output that cannot be written.
+int RunRender(const RenderOptions& options);

@@ -1,0 +1,161 @@
+#include "RenderTextures.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include <GLES2/gl2.h>
+
+#include "ImageFile.h"
+#include "TextureFiles.h"
+
+namespace {
+
+std::vector<std::string> g_problems;
+
+// A record that the model will release and free.
+QexTexture* NewTexture() {
+    QexTexture* texture = static_cast<QexTexture*>(QexMemory_Alloc(sizeof(QexTexture)));
+    if (texture) memset(texture, 0, sizeof *texture);
+    return texture;
+}
+
+// The record that the engine has just made for the material whose texture it wants.
+uint32_t CurrentMaterial(const QexModel* model) {
+    uint32_t material = model->scene.materialCount;
+    while (material-- > 0)
+        if (model->textures[material]) return material;
+    return 0;
+}
+
+int NextPowerOfTwo(int size) {
+    int power = 1;
+    while (power < size) power *= 2;
+    return power;
+}
+
+void FlipRows(Image* image) {
+    const size_t row = static_cast<size_t>(image->width) * 4;
+    std::vector<uint8_t> line(row);
+    for (int top = 0, bottom = image->height - 1; top < bottom; ++top, --bottom) {
+        uint8_t* a = &image->pixels[static_cast<size_t>(top) * row];
+        uint8_t* b = &image->pixels[static_cast<size_t>(bottom) * row];
+        memcpy(line.data(), a, row);
+        memcpy(a, b, row);
+        memcpy(b, line.data(), row);
+    }
+}
+
+// Uploads pixels with mipmaps, repeating; GL ES 2.0 wants powers of two for that.
+void Upload(QexTexture* texture, Image image, const std::string& name) {
+    GLint most = 0;
+    glGetIntegerv(GL_MAX_TEXTURE_SIZE, &most);
+    int width = NextPowerOfTwo(image.width), height = NextPowerOfTwo(image.height);
+    while (width > most) width /= 2;
+    while (height > most) height /= 2;
+    if (width != image.width || height != image.height) image = ResizeImage(image, width, height);
+    QexTexture_CreateFromPixels(texture, width, height, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_LINEAR,
+                                QEX_WRAP_REPEAT, image.pixels.data());
+    texture->pixels = nullptr;
+    glGenerateMipmap(GL_TEXTURE_2D);
+    glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_LINEAR_MIPMAP_LINEAR);
+    QexTexture_SetName(texture, name.c_str());
+}
+
+Image AlphaAsRed(Image image) {
+    for (size_t i = 0; i < image.pixels.size(); i += 4) {
+        const uint8_t alpha = image.pixels[i + 3];
+        image.pixels[i] = image.pixels[i + 1] = image.pixels[i + 2] = alpha;
+        image.pixels[i + 3] = 255;
+    }
+    return image;
+}
+
+// Reads a picture into the model's texture of a material; its first row is the picture's lower edge.
+bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
+    Image image;
+    std::string error;
+    if (!LoadImage(path, &image, &error)) {
+        g_problems.push_back("texture " + path + ": " + error);
+        return false;
+    }
+    FlipRows(&image);
+    Upload(model->textures[material], image, FileName(path));
+    if (!image.hasAlpha) return true;
+    model->alphaTextures[material] = NewTexture();
+    if (model->alphaTextures[material])
+        Upload(model->alphaTextures[material], AlphaAsRed(image), FileName(path));
+    return true;
+}
+
+int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
+    const TextureFile found = FindTexture(path);
+    if (found.kind == TextureFile::kMissing) {
+        g_problems.push_back("texture " + std::string(path) + " is missing (no .pvr, .ktx or picture of that name)");
+        return 0;
+    }
+    if (found.kind == TextureFile::kPicture) return LoadPicture(model, CurrentMaterial(model), found.path) ? 1 : 0;
+    if (static_cast<int32_t>(found.path.size()) <= capacity)
+        snprintf(path, static_cast<size_t>(capacity) + 1, "%s", found.path.c_str());
+    return 0;
+}
+
+// A texture of one texel for a material that has none.
+QexTexture* ColourTexture(const QexPODMaterial& material) {
+    QexTexture* texture = NewTexture();
+    if (!texture) return nullptr;
+    uint8_t texel[4] = {0, 0, 0, 255};
+    for (int i = 0; i < 3; ++i) {
+        const float c = material.diffuse[i];
+        texel[i] = static_cast<uint8_t>((c > 0 ? c < 1 ? c : 1.0f : 0.0f) * 255.0f + 0.5f);
+    }
+    QexTexture_CreateFromPixels(texture, 1, 1, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_REPEAT,
+                                texel);
+    texture->pixels = nullptr;
+    return texture;
+}
+
+// The alpha texture of a material whose texture name has another extension than the files that are there.
+void FindAlpha(QexModel* model, uint32_t material, const std::string& directory) {
+    const int32_t index = model->scene.materials[material].diffuseTexture;
+    if (index < 0 || !model->scene.textures[index].name || model->alphaTextures[material]) return;
+    const TextureFile found = FindTexture(AlphaPath(directory + model->scene.textures[index].name));
+    if (found.kind != TextureFile::kContainer) return;
+    QexTexture* texture = NewTexture();
+    if (texture && QexTexture_LoadPVRFromFile(texture, found.path.c_str(), nullptr, 1, 0) == 0) {
+        model->alphaTextures[material] = texture;
+        return;
+    }
+    QexMemory_Free(texture);
+}
+
+}  // namespace
+
+void SetTextureHook(QexModel* model) {
+    g_problems.clear();
+    model->loadTextureHook = LoadTextureHook;
+}
+
+std::vector<std::string> CompleteTextures(QexModel* model, const std::string& directory) {
+    QexPODModel& scene = model->scene;
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const QexTexture* texture = model->textures[i];
+        const int32_t index = scene.materials[i].diffuseTexture;
+        if (texture && texture->glName == 0) {
+            // The hook could not read the picture; the engine keeps an empty record for it.
+            QexMemory_Free(QexModel_ReplaceTextureByIdx(model, nullptr, i));
+            texture = nullptr;
+        }
+        if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i]), i);
+        FindAlpha(model, i, directory);
+        if (!texture || index < 0 || !scene.textures[index].name) continue;
+        // A KTX file sets no filter, and GL's own wants a whole chain of mipmaps.
+        const TextureFile file = FindTexture(directory + scene.textures[index].name);
+        if (Extension(file.path) == "ktx") QexTexture_SetFilter(model->textures[i], QEX_FILTER_LINEAR);
+    }
+    for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
+        QexPODNode& node = scene.nodes[i];
+        if (node.materialIndex >= 0 && model->alphaTextures[node.materialIndex])
+            node.blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
+    }
+    return g_problems;
+}

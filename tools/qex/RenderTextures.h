@@ -1,0 +1,16 @@
+// Textures of the models that qex render draws: found beside the scene under several names and formats.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "Qex.h"
+
+// Puts the texture hook into a model. For NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other picture
+// formats of that name; pictures are decoded here, with their alpha channel as the alpha texture.
+void SetTextureHook(QexModel* model);
+
+// After loading: materials without a texture get one of their diffuse colour, KTX textures a filter that needs no
+// mipmaps, nodes with an alpha texture leave the opaque pass. Returns a line for each texture that is missing or
+// could not be read.
+std::vector<std::string> CompleteTextures(QexModel* model, const std::string& directory);

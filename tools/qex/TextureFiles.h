@@ -1,0 +1,23 @@
+// Which file stands for a texture name of a scene.
+#pragma once
+
+#include <string>
+
+struct TextureFile {
+    enum Kind { kMissing, kContainer, kPicture };  // container: PVR or KTX, which the engine loads itself
+    Kind kind = kMissing;
+    std::string path;  // of the file that was found
+};
+
+// Looks for `path` with the extension pvr, then ktx, then as it is, then with the extension of another picture
+// format.
+TextureFile FindTexture(const std::string& path);
+
+// "_a" before the last four characters, as the engine names alpha textures.
+std::string AlphaPath(const std::string& path);
+
+std::string FileName(const std::string& path);
+std::string Directory(const std::string& path);  // with its separator; empty for a bare name
+std::string Extension(const std::string& path);  // lower case, without the dot
+std::string WithoutExtension(const std::string& path);
+bool IsRegularFile(const std::string& path);

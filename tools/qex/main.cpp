@@ -1,0 +1,162 @@
+// The qex command: looks into scenes and textures, draws scenes to pictures, converts other formats to POD.
+#include <cstdio>
+#include <map>
+#include <string>
+
+#include <CLI/CLI.hpp>
+
+#include "ConvertCommand.h"
+#include "InfoCommand.h"
+#include "RenderCommand.h"
+#include "SheetCommand.h"
+
+namespace {
+
+constexpr int kMaxSize = 8192;  // pixels a side
+
+// Reads "WxH".
+std::string ParseSize(const std::string& text, RenderOptions* options) {
+    int consumed = 0;
+    if (sscanf(text.c_str(), "%dx%d%n", &options->width, &options->height, &consumed) != 2 ||
+        static_cast<size_t>(consumed) != text.size() || options->width < 1 || options->height < 1 ||
+        options->width > kMaxSize || options->height > kMaxSize)
+        return "'" + text + "' is no size; expected WIDTHxHEIGHT, 1 to " + std::to_string(kMaxSize) + " each";
+    return "";
+}
+
+// Reads "FIRST:LAST:STEP" or "FIRST:LAST".
+std::string ParseFrames(const std::string& text, RenderOptions* options) {
+    int consumed = 0;
+    options->sequence = true;
+    const int count =
+        sscanf(text.c_str(), "%lf:%lf%n:%lf%n", &options->first, &options->last, &consumed, &options->step, &consumed);
+    const bool whole = count >= 2 && static_cast<size_t>(consumed) == text.size();
+    if (!whole || !(options->step > 0) || !(options->first >= 0) || !(options->last >= options->first) ||
+        (options->last - options->first) / options->step >= 100000)
+        return "'" + text + "' are no frames; expected FIRST:LAST:STEP with 0 <= FIRST <= LAST and STEP > 0";
+    return "";
+}
+
+std::string ParseCamera(const std::string& text, RenderOptions* options) {
+    int consumed = 0;
+    options->autoCamera = text == "auto";
+    if (options->autoCamera) return "";
+    if (sscanf(text.c_str(), "%d%n", &options->camera, &consumed) != 1 ||
+        static_cast<size_t>(consumed) != text.size() || options->camera < 0)
+        return "'" + text + "' is no camera; expected a number from 0 on, or auto";
+    return "";
+}
+
+std::string ParseColour(const std::string& text, RenderOptions* options) {
+    if (text.size() != 6 || text.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos)
+        return "'" + text + "' is no colour; expected RRGGBB in hexadecimal";
+    options->background = static_cast<uint32_t>(std::stoul(text, nullptr, 16));
+    return "";
+}
+
+std::string ParseOrbit(const std::string& text, RenderOptions* options) {
+    int consumed = 0;
+    const int count = sscanf(text.c_str(), "%f%n,%f%n", &options->view.yaw, &consumed, &options->view.pitch, &consumed);
+    options->autoCamera = options->view.given = true;
+    if (count < 1 || static_cast<size_t>(consumed) != text.size() || !(options->view.pitch >= -89) ||
+        !(options->view.pitch <= 89) || !(options->view.yaw >= -3600) || !(options->view.yaw <= 3600))
+        return "'" + text + "' is no direction; expected YAW[,PITCH] in degrees, PITCH from -89 to 89";
+    return "";
+}
+
+// An option whose text goes through one of the parsers above.
+void AddParsed(CLI::App* app, const std::string& name, const std::string& help, RenderOptions* options,
+               std::string (*parse)(const std::string&, RenderOptions*)) {
+    app->add_option_function<std::string>(
+        name,
+        [=](const std::string& text) {
+            const std::string problem = parse(text, options);
+            if (!problem.empty()) throw CLI::ValidationError(name, problem);
+        },
+        help);
+}
+
+void SetUpRender(CLI::App* app, RenderOptions* options) {
+    app->add_option("FILE", options->input, "POD scene")->required();
+    app->add_option("-o,--output", options->output, "PNG file; a sequence numbers it")->required();
+    AddParsed(app, "--size", "WxH in pixels (800x600)", options, ParseSize);
+    app->add_option("--frame", options->frame, "animation frame (0)")->check(CLI::Range(0.0, 1e6));
+    AddParsed(app, "--frames", "FIRST:LAST:STEP, a numbered picture each", options, ParseFrames);
+    AddParsed(app, "--camera", "scene camera N, or auto to frame the whole scene (0 if there is one)", options,
+              ParseCamera);
+    AddParsed(app, "--orbit", "YAW[,PITCH] of the automatic camera in degrees (30,15)", options, ParseOrbit);
+    app->add_option("--up", options->view.up, "the scene's vertical axis: x, y, z, -x, -y or -z (y)")
+        ->transform(CLI::CheckedTransformer(std::map<std::string, UpAxis>{{"x", UpAxis::kX},
+                                                                          {"y", UpAxis::kY},
+                                                                          {"z", UpAxis::kZ},
+                                                                          {"-x", UpAxis::kMinusX},
+                                                                          {"-y", UpAxis::kMinusY},
+                                                                          {"-z", UpAxis::kMinusZ}}));
+    app->add_option("--turn", options->turn, "N pictures of one turn around the scene")->check(CLI::Range(1, 10000));
+    AddParsed(app, "--background", "RRGGBB (404858)", options, ParseColour);
+    app->add_option("--text", options->text, "line of text on the picture, at most 64 characters");
+    app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
+    app->add_flag("-q,--quiet", options->quiet, "no progress bar");
+}
+
+void SetUpConvert(CLI::App* app, ConvertOptions* options) {
+    app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
+    app->add_option("-o,--output", options->output, "POD scene; its textures are written beside it")->required();
+    app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
+        ->check(CLI::Range(1.0, 1000.0));
+    app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
+        ->check(CLI::IsMember({"etc1", "rgba8888", "rgb888"}));
+    app->add_flag("-q,--quiet", options->quiet, "no summary");
+}
+
+void SetUpSheet(CLI::App* app, SheetOptions* options) {
+    app->add_option("PICTURES", options->inputs, "pictures, row by row")->required();
+    app->add_option("-o,--output", options->output, "PNG file")->required();
+    app->add_option("--columns", options->columns, "pictures in a row (4)")->check(CLI::Range(1, 1000));
+    app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(CLI::Range(0, 1000));
+}
+
+// The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
+// word or option there is named instead.
+int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, char** argv) {
+    std::string verb;
+    for (const CLI::App* used : app.get_subcommands()) verb = " " + used->get_name();
+    std::string text = error.what();
+    text = text.substr(0, text.find('\n'));
+    if (verb.empty() && argc > 1)
+        text = (argv[1][0] == '-' ? "unknown option '" : "unknown verb '") + std::string(argv[1]) +
+               "'; expected info, render, convert or sheet";
+    fprintf(stderr, "qex%s: %s\n", verb.c_str(), text.c_str());
+    return 2;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    CLI::App app("Qex: looks into, draws and converts 3D scenes for OpenGL ES 2.0");
+    app.require_subcommand(1);
+    app.set_version_flag("--version", "qex " QEX_VERSION);
+    InfoOptions info;
+    RenderOptions render;
+    ConvertOptions convert;
+    SheetOptions sheet;
+    CLI::App* infoApp = app.add_subcommand("info", "what is in a POD, PVR, KTX or TGA file");
+    infoApp->add_option("FILE", info.input, "file to look into")->required();
+    infoApp->add_flag("--json", info.json, "as JSON, and nothing else on standard output");
+    CLI::App* renderApp = app.add_subcommand("render", "draw a POD scene to PNG");
+    SetUpRender(renderApp, &render);
+    CLI::App* convertApp = app.add_subcommand("convert", "make a POD scene from another format");
+    SetUpConvert(convertApp, &convert);
+    CLI::App* sheetApp = app.add_subcommand("sheet", "put several pictures into one");
+    SetUpSheet(sheetApp, &sheet);
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::ParseError& error) {
+        if (error.get_exit_code() == 0) return app.exit(error);
+        return ReportUsage(app, error, argc, argv);
+    }
+    if (infoApp->parsed()) return RunInfo(info);
+    if (renderApp->parsed()) return RunRender(render);
+    if (sheetApp->parsed()) return RunSheet(sheet);
+    return RunConvert(convert);
+}
