@@ -1,0 +1,54 @@
+// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx and tga.
+#include <cstdio>
+#include <filesystem>
+#include <string>
+
+#include "loaders/ImageFiles.h"
+#include "support/PodScenes.h"
+
+namespace {
+
+using Entry = std::pair<const char*, Bytes>;
+
+std::vector<Entry> Entries() {
+    PodBlocks empty, swapped;
+    empty.Version().Begin(1001).End(1001);
+    swapped.Marker(0xE8030000u, 0x0B000000u);
+    Bytes old = pod::WritePvr(PvrNoise(pod::kPvrRgb565, 5, 3, 1, 1));
+    PutWord(&old, 0, 44);
+    old.erase(old.begin() + 44, old.begin() + 52);
+    return {
+        {"pod/everything", pod::WritePod(everything::Scene())},
+        {"pod/empty", empty.bytes},
+        {"pod/swapped", swapped.bytes},
+        {"pvr/cube", pod::WritePvr(PvrNoise(pod::kPvrRgba4444, 4, 4, 3, 6))},
+        {"pvr/etc1", pod::WritePvr(PvrNoise(pod::kPvrEtc1, 8, 8, 4, 1))},
+        {"pvr/pvrtc2", pod::WritePvr(PvrNoise(pod::kPvrtc2, 16, 8, 5, 1))},
+        {"pvr/la88", pod::WritePvr(PvrNoise(pod::kPvrLuminanceAlpha88, 16, 8, 5, 1))},
+        {"pvr/old", old},
+        {"pvr/ktx", SoundKtx().File()},
+        {"ktx/levels", SoundKtx().File()},
+        {"ktx/cube", CubeKtx().File()},
+        {"ktx/etc1", Etc1Ktx().File()},
+        {"tga/rgb", TgaFile(3, 2, 24, Noise(18))},
+        {"tga/rgba", TgaFile(2, 2, 32, Noise(16))},
+        {"tga/grey", TgaFile(2, 2, 8, Noise(4))},
+    };
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    if (argc != 2) {
+        fprintf(stderr, "usage: %s FOLDER\n", argv[0]);
+        return 2;
+    }
+    for (const auto& [name, file] : Entries()) {
+        const std::filesystem::path path = std::filesystem::path(argv[1]) / name;
+        std::filesystem::create_directories(path.parent_path());
+        if (pod::WriteFile(path.string(), file)) continue;
+        fprintf(stderr, "%s cannot be written\n", path.c_str());
+        return 1;
+    }
+    return 0;
+}

@@ -1,0 +1,106 @@
+#include <cmath>
+
+#include "LoaderSupport.h"
+
+namespace {
+
+using BuiltInTextures = LoaderTest;
+
+GLuint Compile(GLenum kind, const char* source) {
+    const GLuint shader = glCreateShader(kind);
+    glShaderSource(shader, 1, &source, nullptr);
+    glCompileShader(shader);
+    return shader;
+}
+
+// Fills a size x size corner with the texture of unit 0, level of detail 0 at its own size; the corner's
+// pixels.
+Bytes Draw(GLsizei size) {
+    const GLuint vertex = Compile(GL_VERTEX_SHADER,
+                                  "attribute vec2 p; varying vec2 t;"
+                                  "void main() { t = p * 0.5 + 0.5; gl_Position = vec4(p, 0.0, 1.0); }");
+    const GLuint fragment = Compile(GL_FRAGMENT_SHADER,
+                                    "precision mediump float; varying vec2 t; uniform sampler2D s;"
+                                    "void main() { gl_FragColor = texture2D(s, t); }");
+    const GLuint program = glCreateProgram();
+    glAttachShader(program, vertex);
+    glAttachShader(program, fragment);
+    glBindAttribLocation(program, 0, "p");
+    glLinkProgram(program);
+    glUseProgram(program);
+    const float corners[] = {-1, -1, 3, -1, -1, 3};
+    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
+    glEnableVertexAttribArray(0);
+    glViewport(0, 0, size, size);
+    glDrawArrays(GL_TRIANGLES, 0, 3);
+    Bytes pixels(static_cast<size_t>(size * size * 4));
+    glReadPixels(0, 0, size, size, GL_RGBA, GL_UNSIGNED_BYTE, pixels.data());
+    glDeleteShader(vertex);
+    glDeleteShader(fragment);
+    glDeleteProgram(program);
+    return pixels;
+}
+
+TEST_F(BuiltInTextures, AreMadeOnceOfTwelveLevels) {
+    ASSERT_EQ(QexTexture_IsETCSupported(), 1);
+    std::string log;
+    const Recorded calls([&] {
+        BothOutputs outputs;
+        QexTexture_CreateDefault();
+        QexTexture_CreateDefault();
+        log = outputs.Errors();
+    });
+    EXPECT_EQ(
+        log,
+        "I/Qex: <QexTexture_CreateDefault> Created.\nI/Qex: <QexTexture_CreateDefault> Already created.\n");
+    const auto uploads = calls.Uploads();
+    const size_t bytes[] = {2048, 512, 128, 32, 8, 8, 8, 128, 32, 8, 8, 8};
+    ASSERT_EQ(uploads.size(), std::size(bytes));
+    for (size_t i = 0; i < std::size(bytes); ++i) {
+        EXPECT_EQ(uploads[i].data.size(), bytes[i]) << i;
+        EXPECT_EQ(uploads[i].format, kEtc1) << i;
+        EXPECT_EQ(uploads[i].level, static_cast<GLint>(i < 7 ? i : i - 7));
+        EXPECT_EQ(uploads[i].width, i < 7 ? 64 >> i : 16 >> (i - 7));
+    }
+    EXPECT_EQ(calls.Parameter(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER), GLenum(GL_LINEAR_MIPMAP_NEAREST));
+    EXPECT_EQ(calls.Parameter(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S), GLenum(GL_REPEAT));
+    EXPECT_EQ(LiveTextures(), 2u);
+
+    for (const GLsizei size : {1, 4}) {
+        QexTexture_Set(nullptr, 0);
+        EXPECT_EQ(Draw(size), Bytes(static_cast<size_t>(4 * size * size), 255)) << "white";
+        QexTexture_SetBlankNormalMap(0);
+        const Bytes normal = Draw(size);
+        for (size_t i = 0; i < normal.size(); ++i)
+            EXPECT_EQ(normal[i], i % 4 < 2 ? 128 : 255) << "straight up";
+    }
+    QexTexture_ReleaseDefault();
+    QexTexture_ReleaseDefault();
+    EXPECT_EQ(LiveTextures(), 0u);
+    EXPECT_EQ(Qextexture_GetDefault()->glName, 0u);
+}
+
+TEST_F(BuiltInTextures, TheNormalisationCubeMapHoldsDirections) {
+    QexTexture texture = {};
+    // Texel (i, j) of a face looks along GL's direction for its middle.
+    const int size = 4;
+    const Recorded four([&] { QexTexture_GenerateNormalisationCubeMap(&texture, size); });
+    const auto uploads = four.Uploads();
+    for (uint32_t face = 0; face < 6; ++face)
+        for (int j = 0; j < size; ++j)
+            for (int i = 0; i < size; ++i) {
+                const double s = (i + 0.5) / size * 2 - 1, t = (j + 0.5) / size * 2 - 1;
+                const double directions[6][3] = {{1, -t, -s}, {-1, -t, s}, {s, 1, t},
+                                                 {s, -1, -t}, {s, -t, 1},  {-s, -t, -1}};
+                const double length = std::sqrt(1 + s * s + t * t);
+                const uint8_t* texel = &uploads[face].data[static_cast<size_t>(3 * (size * j + i))];
+                for (int c = 0; c < 3; ++c)
+                    EXPECT_NEAR(texel[c], std::max(0.0, std::floor(directions[face][c] / length * 255)), 1)
+                        << face << " " << i << " " << j;
+            }
+    EXPECT_EQ(texture.flags, QEX_TEXFLAG_CUBEMAP);
+    EXPECT_EQ(four.Parameter(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_WRAP_T), GLenum(GL_CLAMP_TO_EDGE));
+    QexTexture_Release(&texture);
+}
+
+}  // namespace

@@ -1,0 +1,158 @@
+#include "LoaderSupport.h"
+
+namespace {
+
+using KtxLoader = LoaderTest;
+
+enum Header : size_t {
+    kEndianness = 12,
+    kType = 16,
+    kFormat = 24,
+    kInternal = 28,
+    kBase = 32,
+    kWidth = 36,
+    kHeight = 40,
+    kFaces = 52,
+    kLevels = 56,
+    kKeyValues = 60
+};
+
+Outcome TryFile(const Bytes& file) {
+    const MemoryFile memory(file);
+    return Try([&](QexTexture* t) { return QexTexture_LoadKTXFromFile(t, memory.Path(), nullptr, 1, 0); });
+}
+
+TEST_F(KtxLoader, EachFormatIsUploadedAsItIs) {
+    const struct {
+        uint32_t type, format, width;
+        size_t rowBytes;  // in the file
+        int64_t alignment;
+        uint32_t bytesPerPixel, code;
+    } rows[] = {
+        {GL_UNSIGNED_BYTE, GL_RGBA, 5, 20, 4, 4, QEX_TEXFMT_RGBA8888},
+        {GL_UNSIGNED_BYTE, GL_RGB, 5, 16, 4, 3, QEX_TEXFMT_RGB888},
+        {GL_UNSIGNED_BYTE, GL_RGB, 5, 15, 1, 3, QEX_TEXFMT_RGB888},  // tight, as some writers have it
+        {GL_UNSIGNED_SHORT_5_6_5, GL_RGB, 5, 12, 4, 3, QEX_TEXFMT_RGB888},
+        {GL_UNSIGNED_SHORT_4_4_4_4, GL_RGBA, 5, 10, 1, 4, QEX_TEXFMT_RGBA8888},
+        {GL_UNSIGNED_SHORT_5_5_5_1, GL_RGBA, 4, 8, 4, 4, QEX_TEXFMT_RGBA8888},
+    };
+    for (const auto& row : rows) {
+        SCOPED_TRACE(std::to_string(row.type) + ", rows of " + std::to_string(row.rowBytes));
+        Ktx ktx;
+        ktx.type = row.type;
+        ktx.format = ktx.base = ktx.internal = row.format;
+        ktx.width = row.width;
+        ktx.height = 3;
+        ktx.levels = {{Noise(3 * row.rowBytes)}};
+        ktx.keyValues = Noise(20);
+        const Bytes file = ktx.File();
+        // Through the PVR entry, which knows the other container too.
+        const Outcome outcome = Try(
+            [&](QexTexture* t) { return QexTexture_LoadPVRFromMem(t, file.data(), nullptr, 1, 0, nullptr); });
+        ASSERT_EQ(outcome.result, 0);
+        ASSERT_EQ(outcome.uploads.size(), 1u);
+        const Upload& u = outcome.uploads[0];
+        // GL does not read the padding of the last row.
+        const Bytes& level = ktx.levels[0][0];
+        EXPECT_GT(u.data.size(), 2 * row.rowBytes);
+        ExpectUpload(u, false, 0, 0, row.width,
+                     Bytes(level.begin(), level.begin() + static_cast<long>(u.data.size())));
+        EXPECT_EQ(u.format, row.format);
+        EXPECT_EQ(u.type, row.type);
+        EXPECT_FALSE(u.mismatch);
+        EXPECT_EQ(u.alignment, row.alignment);
+        EXPECT_EQ(outcome.texture.bytesPerPixel, row.bytesPerPixel);
+        EXPECT_EQ(outcome.texture.format, row.code);
+        EXPECT_EQ(outcome.texture.rowBytes, row.bytesPerPixel * row.width);
+    }
+}
+
+TEST_F(KtxLoader, LevelsAndFacesAreFoundInOrder) {
+    Ktx narrow;  // the shorter side stays 1
+    narrow.height = 1;
+    narrow.levels = {{Noise(16)}, {Noise(8)}, {Noise(4)}};
+    for (const Ktx& ktx : {SoundKtx(), CubeKtx(), Etc1Ktx(), narrow}) {
+        const Outcome outcome = TryFile(ktx.File());
+        ASSERT_EQ(outcome.uploads.size(), ktx.levels.size() * ktx.faces);
+        for (size_t i = 0; i < outcome.uploads.size(); ++i) {
+            const size_t level = i / ktx.faces, face = i % ktx.faces;
+            ExpectUpload(outcome.uploads[i], ktx.faces == 6, face, level, ktx.width >> level,
+                         ktx.levels[level][face]);
+            EXPECT_EQ(outcome.uploads[i].format, ktx.type ? ktx.base : kEtc1);
+        }
+        EXPECT_EQ(outcome.texture.flags, ktx.faces == 6 ? QEX_TEXFLAG_CUBEMAP : 0u);
+        EXPECT_EQ(outcome.texture.bytesPerPixel, ktx.type ? 4u : 3u);
+        EXPECT_EQ(outcome.texture.format, ktx.type ? QEX_TEXFMT_RGBA8888 : 0u);
+    }
+}
+
+TEST_F(KtxLoader, WithoutLevelsTheyAreGenerated) {
+    Ktx ktx = SoundKtx();
+    ktx.levels.resize(1);
+    ktx.levelCount = 0;
+    const Outcome outcome = TryFile(ktx.File());
+    EXPECT_EQ(outcome.result, 0);
+    EXPECT_EQ(outcome.uploads.size(), 1u);
+    EXPECT_EQ(outcome.calls->Calls("glGenerateMipmap").size(), 1u);
+    // GL that refuses to: level 0 is there all the same, and nothing ends the process.
+    gltapInjectError("glGenerateMipmap", 1, GL_INVALID_OPERATION);
+    EXPECT_EQ(TryFile(ktx.File()).result, 0);
+}
+
+TEST_F(KtxLoader, RefusesWithItsCode) {
+    const struct {
+        size_t offset;
+        uint32_t word;
+        int32_t result;
+        const char* line;
+    } cases[] = {
+        {kFormat, GL_LUMINANCE, -4, ""},
+        {kFormat, GL_RGB, -4, ""},  // the base format says RGBA
+        {kType, GL_UNSIGNED_SHORT_5_6_5, -4, ""},
+        {kType, GL_FLOAT, -4, ""},
+        {kBase, GL_RGB, -4, ""},
+        {kEndianness, 0x01020304, -1, "the file is in the other byte order."},
+        {kFaces, 0, -1, "0 faces instead of 1 or 6."},
+        {kFaces, 7, -1, "7 faces instead of 1 or 6."},
+        {kFaces, 6, -1, "the file is cut short in level 0."},
+        {kWidth, 0, -1, "0 x 4 pixels are not possible here"},
+        {kHeight, UINT32_MAX, -1, "4 x 4294967295 pixels are not possible here"},
+        {kLevels, 4, -1, "4 levels of 4 x 4 pixels."},
+        {kLevels, UINT32_MAX, -1, "4294967295 levels of 4 x 4 pixels."},
+        {kKeyValues, UINT32_MAX, -1, "the file is cut short in level 0."},
+        {kWidth, 2, -1, "level 0 of 64 bytes is not of its size."},
+        {64 + 12, 63, -1, "level 0 of 63 bytes is not of its size."},
+        {64 + 12, UINT32_MAX, -1, "the file is cut short in level 0."},
+    };
+    for (const auto& c : cases) {
+        Bytes file = SoundKtx().File();
+        PutWord(&file, c.offset, c.word);
+        const Outcome outcome = TryFile(file);
+        EXPECT_EQ(outcome.result, c.result) << c.offset << " " << c.word << outcome.out;
+        EXPECT_EQ(outcome.textures, 0u) << c.offset << " " << c.word;
+        EXPECT_EQ(outcome.texture.glName, 0u) << c.offset << " " << c.word;
+        EXPECT_EQ(outcome.out == "", c.result == -4) << outcome.out;
+        EXPECT_NE(outcome.out.find(c.line), std::string::npos) << outcome.out;
+    }
+    for (size_t i = 0; i < 12; ++i) {
+        Bytes file = SoundKtx().File();
+        file[i] ^= 1;
+        EXPECT_EQ(TryFile(file).result, -3) << i;
+    }
+    Bytes unknown = Etc1Ktx().File();
+    PutWord(&unknown, kInternal, 0x12345);
+    EXPECT_NE(TryFile(unknown).out.find("the GL does not take the compressed format 0x12345."),
+              std::string::npos);
+    Ktx shorter = Etc1Ktx();
+    shorter.levels[1][0].resize(4);
+    EXPECT_NE(TryFile(shorter.File()).out.find("level 1 of 4 bytes is not of its size."), std::string::npos);
+}
+
+TEST_F(KtxLoader, NoCutAndNoWordIsTrusted) {
+    for (const Bytes& file : {SoundKtx().File(), CubeKtx().File(), Etc1Ktx().File()}) {
+        ExpectEveryCutRefused(file, TryFile, "");
+        ExpectNoWordTrusted(file, 12, 80, TryFile);
+    }
+}
+
+}  // namespace

@@ -1,0 +1,123 @@
+#include <GLES2/gl2.h>
+
+#include <climits>
+#include <cmath>
+
+#include "RenderFixture.h"
+#include "support/Capture.h"
+
+namespace {
+
+const Rgba kBackground = {20, 40, 60, 80};
+
+// Character c lies in column (c - 32) mod 32 and row (c - 32) / 32 of cells of 8 x 16 texels; at y = 32 its
+// cell touches the upper edge.
+void Stamp(Picture* picture, int x, int y, const std::string& text, Rgba colour) {
+    for (int i = 0; i < static_cast<int>(text.size()) * 128; ++i) {
+        const int cell = text[static_cast<size_t>(i / 128)] - 32, column = i % 8, row = i / 8 % 16;
+        const int s = cell % 32 * 8 + column, t = cell / 32 * 16 + row;
+        const int px = x + i / 128 * 8 + column, py = y - 32 + row;
+        if (!fontdata[(t * 256 + s) * 4 + 3] || px < 0 || py < 0 || px >= kWidth || py >= kHeight) continue;
+        // Source alpha over, in all four channels.
+        Rgba out = picture->Pixel(px, py);
+        for (size_t c = 0; c < 4; ++c)
+            out[c] = static_cast<int>(std::lround(out[c] + (colour[c] - out[c]) * (colour[3] / 255.0)));
+        picture->Fill(px, py, px + 1, py + 1, out);
+    }
+}
+
+class FontTest : public RenderTest {
+  protected:
+    void SetUp() override {
+        RenderTest::SetUp();
+        background_.Fill(0, 0, kWidth, kHeight, kBackground);
+    }
+    Picture Drawn(const std::function<void()>& draw) {
+        Clear(20 / 255.0f, 40 / 255.0f, 60 / 255.0f, 80 / 255.0f);
+        draw();
+        return Read();
+    }
+    Picture Temporary(int x, int y, const std::string& text, uint32_t colour = ~0u) {
+        return Drawn([&] { QexFont_DrawTempString(&runtime_, x, y, text.c_str(), colour); });
+    }
+    int32_t Add(int x, int y, const char* text) {
+        return QexFont_AddString(&runtime_, x, y, text, 255, 128, 0, 255);
+    }
+
+    Picture background_;
+};
+
+// Index count of each draw, "28 10 ".
+std::string IndexCounts(const std::function<void()>& draw) {
+    const GLCalls calls(draw);
+    std::string text;
+    for (const gltapCall* call : calls.Of({"glDrawElements"}))
+        text += std::to_string(call->argument[1].i) + " ";
+    return text;
+}
+
+TEST_F(FontTest, EveryGlyphLandsOnItsPixels) {
+    std::string all;
+    for (int c = 32; c < 128; ++c) all += static_cast<char>(c);
+    const struct {
+        int x, y;
+        std::string text;
+        uint32_t colour;
+    } strings[] = {
+        {10, 92, "AB", 0xFFFFFFFF},
+        {0, 32, all.substr(0, 16), 0xFF00FF00},
+        {0, 32, all.substr(16, 16), 0xFFFF0000},
+        {0, 50, all.substr(32, 16), 0xFF0000FF},
+        {0, 127, all.substr(48, 16), 0xFFFFFFFF},
+        {0, 112, all.substr(64, 16), 0x80FF0000},
+        {0, 96, all.substr(80, 16), 0x40FFFFFF},
+        {-3, 24, "Clipped", 0xFFFFFF00},
+    };
+    for (const auto& s : strings) {
+        Picture expected = background_;
+        const auto channel = [&](int shift) { return static_cast<int>(s.colour >> shift & 255); };
+        const Rgba colour = {channel(16), channel(8), channel(0), channel(24)};
+        Stamp(&expected, s.x, s.y, s.text, colour);
+        EXPECT_TRUE(SamePicture(Temporary(s.x, s.y, s.text, s.colour), expected, 1)) << s.text;
+        EXPECT_EQ(QexFont_ReplaceString(&runtime_, s.x, s.y, s.text.c_str(), colour[0], colour[1], colour[2],
+                                        colour[3]),
+                  static_cast<int32_t>(s.text.size()));
+        EXPECT_TRUE(SamePicture(Drawn(QexFont_Draw), expected, 1)) << s.text;
+    }
+}
+
+// Nothing shows between the glyphs that one strip joins.
+TEST_F(FontTest, PersistentTextIsBuiltUp) {
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "");
+    EXPECT_EQ(Add(8, 40, "abc"), 3);
+    EXPECT_EQ(Add(70, 100, "de"), 2);
+    Picture expected = background_;
+    Stamp(&expected, 8, 40, "abc", {255, 128, 0, 255});
+    Stamp(&expected, 70, 100, "de", {255, 128, 0, 255});
+    EXPECT_TRUE(SamePicture(Drawn(QexFont_Draw), expected, 1));
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "28 ");
+    EXPECT_EQ(QexFont_ReplaceString(&runtime_, 0, 32, "Hi", 255, 255, 255, 255), 2);
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "10 ");
+    QexFont_ClearString();
+    EXPECT_EQ(Add(0, 32, ""), 0);
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "");
+
+    const std::string seventy(70, 'o');
+    Capture log(STDERR_FILENO);
+    EXPECT_EQ(Add(0, 32, seventy.c_str()), 70);
+    EXPECT_EQ(log.Text(), "E/Qex: <QexFont_AddString> the text is limited to 64 glyphs, 6 are left out\n");
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "382 ");
+    EXPECT_EQ(IndexCounts([&] { Temporary(0, 32, seventy); }), "94 ");
+    EXPECT_EQ(IndexCounts([&] { Temporary(0, 32, ""); }), "");
+}
+
+TEST_F(FontTest, NumbersAndUnknownCharacters) {
+    for (const int32_t number : {-120, 0, INT_MAX, INT_MIN})
+        EXPECT_TRUE(SamePicture(Drawn([&] { QexFont_DrawNum(&runtime_, 4, 60, number, ~0u); }),
+                                Temporary(4, 60, std::to_string(number))));
+    Picture expected = background_;
+    Stamp(&expected, 4, 60, "a\x7F\x7F\x7F\x7F", {255, 255, 255, 255});
+    EXPECT_TRUE(SamePicture(Temporary(4, 60, "a\x01\n\x80\xFF"), expected, 1));
+}
+
+}  // namespace

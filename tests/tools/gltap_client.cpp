@@ -1,0 +1,33 @@
+// A small GLES2 program that knows nothing of the tap: the test preloads it. Prints the colour it cleared to
+// and the errors it met. With "--no-context" it opens no context, which only the null driver survives.
+
+#include <GLES2/gl2.h>
+
+#include <cstdio>
+#include <cstring>
+
+#include "Headless.h"
+
+int main(int argc, char** argv) {
+    const bool withContext = argc < 2 || std::strcmp(argv[1], "--no-context") != 0;
+    std::string error;
+    const auto context = qex::HeadlessContext::Create(
+        4, 4, &error, withContext ? qex::HeadlessGL::kContext : qex::HeadlessGL::kNone);
+    if (!context) {
+        std::fprintf(stderr, "%s\n", error.c_str());
+        return 77;
+    }
+    GLuint textures[2] = {};
+    glGenTextures(2, textures);
+    glBindTexture(GL_TEXTURE_2D, textures[1]);
+    for (int i = 0; i < 3; ++i) {
+        glClearColor(0.0f, 1.0f, 0.0f, 1.0f);
+        glClear(GL_COLOR_BUFFER_BIT);
+        std::printf("error %04x\n", glGetError());
+    }
+    GLubyte pixel[4] = {};
+    glReadPixels(0, 0, 1, 1, GL_RGBA, GL_UNSIGNED_BYTE, pixel);
+    std::printf("pixel %d %d %d %d\n", pixel[0], pixel[1], pixel[2], pixel[3]);
+    glDeleteTextures(1, textures);
+    return 0;
+}

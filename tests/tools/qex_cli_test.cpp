@@ -1,0 +1,112 @@
+// What the qex command says to a wrong command line: one line that names what is expected, and status 2.
+#include <sys/stat.h>
+
+#include "ImageFile.h"
+#include "QexCommandTest.h"
+
+using QexCli = QexCommandTest;
+
+TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
+    WriteScene(Path("a.pod"), QuadScene());
+    const std::string pod = Path("a.pod"), png = Path("a.png");
+    const struct {
+        std::vector<std::string> arguments;
+        const char* part;
+    } cases[] = {
+        {{}, "subcommand"},
+        {{"paint", pod}, "'paint'; expected info, render"},
+        {{"--bogus"}, "unknown option '--bogus'; expected info, render"},
+        {{"info", "--yaml", pod}, "--yaml"},
+        {{"render", pod}, "--output"},
+        {{"render", pod, "-o", png, "--size", "0x0"}, "expected WIDTHxHEIGHT"},
+        {{"render", pod, "-o", png, "--size", "abc"}, "expected WIDTHxHEIGHT"},
+        {{"render", pod, "-o", png, "--frame", "abc"}, "abc"},
+        {{"render", pod, "-o", png, "--frames", "5:1:1"}, "FIRST <= LAST"},
+        {{"render", pod, "-o", png, "--frames", "0:5:0"}, "STEP > 0"},
+        {{"render", pod, "-o", png, "--frames", "nan:nan:nan"}, "FIRST:LAST:STEP"},
+        {{"render", pod, "-o", png, "--camera", "-1"}, "expected a number from 0 on, or auto"},
+        {{"render", pod, "-o", png, "--camera", "7"}, "no camera 7, the scene has 1"},
+        {{"render", pod, "-o", png, "--orbit", "10,95"}, "PITCH from -89 to 89"},
+        {{"render", pod, "-o", png, "--turn", "0"}, "--turn"},
+        {{"render", pod, "-o", png, "--background", "red"}, "expected RRGGBB"},
+        {{"render", pod, "-o", Path("none/a.png")}, "none/a.png: cannot be written"},
+        {{"sheet", png}, "--output"},
+        {{"convert", "a.obj"}, "--output"},
+        {{"convert", "a.obj", "-o", "b.pod", "--texture-format", "dxt"}, "etc1,rgba8888,rgb888"},
+    };
+    for (const auto& c : cases) ExpectRefused(c.arguments, 2, c.part);
+    EXPECT_FALSE(std::filesystem::exists(png));
+}
+
+TEST_F(QexCli, FilesThatCannotBeReadAreOneLineAndStatus1) {
+    const Bytes whole = pod::WritePod(QuadScene());
+    WriteBytes(Path("empty.pod"), {});
+    WriteBytes(Path("picture.pod"), {0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n', 0, 0, 0, 13});
+    for (const char* name : {"text.pod", "text.txt"}) WriteText(Path(name), "hello world\n");
+    WriteBytes(Path("cut.pod"), Bytes(whole.begin(), whole.begin() + static_cast<long>(whole.size() / 2)));
+    WriteBytes(Path("start.pod"), Bytes(whole.begin(), whole.begin() + 3));
+    WriteBytes(Path("cut.pvr"), Bytes{52, 0, 0, 0, 1, 2, 3});
+    WriteBytes(Path("cut.tga"), Bytes(17));
+    WriteBytes(Path("new.pvr"), {'P', 'V', 'R', 3, 0, 0, 0, 0});
+    std::filesystem::create_directory(Path("folder.pod"));
+    ASSERT_EQ(mkfifo(Path("pipe.pod").c_str(), 0600), 0);
+    const struct {
+        const char* name;
+        const char* part;
+        bool scene;  // also given to qex render
+    } cases[] = {
+        {"missing.pod", "missing.pod: no such file", true},
+        {"empty.pod", "empty.pod: is empty", true},
+        {"folder.pod", "folder.pod: is a directory", true},
+        {"pipe.pod", "pipe.pod: is not a regular file", true},
+        {"picture.pod", "picture.pod: is a PNG image", true},
+        {"cut.pod", "cut.pod: ", true},
+        {"start.pod", "start.pod: ", true},
+        {"text.pod", "text.pod: ", true},
+        {"text.txt", "is not a POD scene or a PVR, KTX or TGA texture", false},
+        {"cut.pvr", "cut short in the header of a PVR", false},
+        {"cut.tga", "cut short in the header of a TGA", false},
+        {"new.pvr", "PVR texture of version 3", false},
+    };
+    for (const auto& c : cases) {
+        ExpectRefused({"info", Path(c.name)}, 1, c.part);
+        ExpectRefused({"info", "--json", Path(c.name)}, 1, c.part);
+        if (c.scene) ExpectRefused({"render", Path(c.name), "-o", Path("a.png")}, 1, c.part);
+    }
+    EXPECT_FALSE(std::filesystem::exists(Path("a.png")));
+}
+
+TEST_F(QexCli, SheetPutsPicturesSideBySide) {
+    const std::string left = Path("left.png"), right = Path("right.png"), out = Path("out.png");
+    const Bytes red = {255, 0, 0, 255, 255, 0, 0, 255}, blue = {0, 0, 255, 255, 0, 0, 255, 255};
+    std::string error;
+    ASSERT_TRUE(SavePng(left, 2, 1, red.data(), &error) && SavePng(right, 1, 2, blue.data(), &error))
+        << error;
+    EXPECT_EQ(Run({"sheet", left, right, "-o", out, "--gap", "1"}).err, "");
+    Image sheet;
+    ASSERT_TRUE(LoadImage(out, &sheet, &error)) << error;
+    ASSERT_EQ(sheet.width, 7);
+    ASSERT_EQ(sheet.height, 4);
+    // Cells of 2 x 2 with a white pixel around each.
+    const char* rows[] = {"wwwwwww", "wrrwbww", "wwwwbww", "wwwwwww"};
+    for (int y = 0; y < 4; ++y)
+        for (int x = 0; x < 7; ++x) {
+            const uint8_t* p = sheet.Pixel(x, y);
+            EXPECT_EQ(p[0] ? p[2] ? 'w' : 'r' : 'b', rows[y][x]) << x << ", " << y;
+        }
+    EXPECT_EQ(Run({"sheet", left, left, left, "-o", out, "--columns", "2", "--gap", "0"}).err, "");
+    ASSERT_TRUE(LoadImage(out, &sheet, &error)) << error;
+    EXPECT_EQ(sheet.width * 10 + sheet.height, 42);
+    ExpectRefused({"sheet", left, Path("gone.png"), "-o", out}, 1, "gone.png");
+    ExpectRefused({"sheet", left, "-o", Path("none/out.png")}, 2, "none/out.png");
+}
+
+TEST_F(QexCli, HelpAndVersionGoToStandardOutput) {
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"--help"}, {"--version"}, {"render", "--help"}}) {
+        const CommandResult result = Run(arguments);
+        EXPECT_EQ(result.status, 0);
+        EXPECT_TRUE(Contains(result.out, "qex")) << result.out;
+        EXPECT_EQ(result.err, "");
+    }
+}

@@ -1,0 +1,250 @@
+// qex render draws pictures whose pixels were worked out by hand.
+#include <array>
+#include <functional>
+#include <set>
+
+#include "ImageFile.h"
+#include "QexCommandTest.h"
+
+namespace {
+
+using Rgb = std::array<int, 3>;
+
+constexpr Rgb kBackground = {64, 72, 88};
+constexpr pod::Vec3 kBackgroundColour = {64 / 255.0f, 72 / 255.0f, 88 / 255.0f};
+
+Rgb At(const Image& image, int x, int y) {
+    const uint8_t* p = image.Pixel(x, y);
+    return {p[0], p[1], p[2]};
+}
+
+bool Near(const Rgb& a, const Rgb& b, int tolerance) {
+    for (size_t i = 0; i < 3; ++i)
+        if (std::abs(a[i] - b[i]) > tolerance) return false;
+    return true;
+}
+
+using Box = std::array<int, 4>;  // the first column and row, and those behind the last
+
+// The smallest box around the pixels that are not of the background.
+Box Covered(const Image& image) {
+    Box box = {image.width, image.height, 0, 0};
+    for (int y = 0; y < image.height; ++y)
+        for (int x = 0; x < image.width; ++x)
+            if (!Near(At(image, x, y), kBackground, 1))
+                box = {std::min(box[0], x), std::min(box[1], y), std::max(box[2], x + 1),
+                       std::max(box[3], y + 1)};
+    return box;
+}
+
+size_t Count(const Image& image, const Rgb& colour) {
+    size_t count = 0;
+    for (int y = 0; y < image.height; ++y)
+        for (int x = 0; x < image.width; ++x) count += Near(At(image, x, y), colour, 2);
+    return count;
+}
+
+// The quad from (0, 0) to (2, 1), 20 pixels a unit, around the middle of 200 x 100 pixels.
+constexpr Box kQuad = {100, 30, 140, 50};
+
+class QexRender : public QexCommandTest {
+  protected:
+    Image Load(const std::string& name) const {
+        Image image;
+        std::string error;
+        EXPECT_TRUE(LoadImage(Path(name), &image, &error)) << name << " " << error;
+        if (image.pixels.empty()) image = {1, 1, std::vector<uint8_t>(4), false};
+        return image;
+    }
+    CommandResult Render(const std::string& scene, const std::string& png,
+                         const std::vector<std::string>& more = {}) const {
+        std::vector<std::string> arguments = {"render", scene, "-o", Path(png), "--size", "200x100"};
+        arguments.insert(arguments.end(), more.begin(), more.end());
+        const CommandResult result = Run(arguments);
+        EXPECT_EQ(result.status, 0) << result.err;
+        EXPECT_EQ(result.out, "");
+        return result;
+    }
+    Image Picture(const pod::Scene& scene, const std::vector<std::string>& more = {}) const {
+        WriteScene(Path("scene.pod"), scene);
+        EXPECT_EQ(Render(Path("scene.pod"), "out.png", more).err, "");
+        return Load("out.png");
+    }
+    void WritePng(const std::string& name, int size, const std::function<Rgb(int x, int y)>& colour) const {
+        std::vector<uint8_t> pixels;
+        std::string error;
+        for (int y = 0; y < size; ++y)
+            for (int x = 0; x < size; ++x) {
+                for (const int c : colour(x, y)) pixels.push_back(static_cast<uint8_t>(c));
+                pixels.push_back(255);
+            }
+        ASSERT_TRUE(SavePng(Path(name), size, size, pixels.data(), &error)) << error;
+    }
+};
+
+// The quad moves to the left by half a unit a frame. At the last of its frames it starts over.
+pod::Scene MovingScene() {
+    pod::Scene scene = QuadScene();
+    PlaceQuad(&scene, {{{0, 0, 0}, {-0.5f, 0, 0}, {-1, 0, 0}, {-1.5f, 0, 0}, {-2, 0, 0}}, {}, {}, {}});
+    scene.frameCount = 5;
+    return scene;
+}
+
+}  // namespace
+
+TEST_F(QexRender, DrawsTheQuadWhereTheCameraSeesIt) {
+    const Image image = Picture(QuadScene());
+    EXPECT_EQ(image.width, 200);
+    EXPECT_EQ(image.height, 100);
+    for (int y = 0; y < 100; ++y)
+        for (int x = 0; x < 200; ++x) {
+            const bool inside = x >= 100 && x < 140 && y >= 30 && y < 50;
+            ASSERT_TRUE(Near(At(image, x, y), inside ? Rgb{255, 0, 0} : kBackground, 1)) << x << ", " << y;
+        }
+}
+
+TEST_F(QexRender, LowerEdgeOfATextureIsAtVZero) {
+    // As a picture is looked at: green and yellow above blue and red. The quad's v runs upwards.
+    const Rgb colours[2][2] = {{{0, 255, 0}, {255, 255, 0}}, {{0, 0, 255}, {255, 0, 0}}};
+    WritePng("tex.png", 64, [&](int x, int y) { return colours[y / 32][x / 32]; });
+    pod::Scene scene = QuadScene();
+    TextureQuad(&scene, "tex.png");
+    const Image image = Picture(scene);
+    EXPECT_EQ(Covered(image), kQuad);
+    for (int y = 0; y < 2; ++y)
+        for (int x = 0; x < 2; ++x)
+            EXPECT_TRUE(Near(At(image, 110 + 20 * x, 35 + 10 * y), colours[y][x], 2)) << x << ", " << y;
+}
+
+TEST_F(QexRender, TransparentQuadsBlendTheNearerOneLast) {
+    pod::Scene scene = QuadScene();
+    scene.materials.push_back(scene.materials[0]);
+    scene.materials[0].opacity = scene.materials[1].opacity = 0.6f;
+    scene.materials[1].diffuse = {0, 1, 0};
+    scene.nodes.insert(scene.nodes.begin() + 1, pod::BuildNode("near", Placed(0, 0, 1), -1, 0, 1));
+    scene.meshNodeCount = 2;
+    scene.cameras[0].target = 3;
+    const Rgb blended = {61, 153, 41};  // 0.6 of green over 0.4 of (0.6 of red over 0.4 of blue)
+    for (int order = 0; order < 2; ++order) {
+        EXPECT_TRUE(Near(At(Picture(scene, {"--background", "0000ff"}), 120, 40), blended, 2)) << order;
+        std::swap(scene.nodes[0], scene.nodes[1]);
+    }
+}
+
+TEST_F(QexRender, FramesAreNumberedAndMove) {
+    WriteScene(Path("scene.pod"), MovingScene());
+    EXPECT_EQ(Render(Path("scene.pod"), "out.png", {"--frames", "0:3:1"}).err, "");
+    for (int frame = 0; frame < 4; ++frame) {
+        const Box shifted = {100 - 10 * frame, 30, 140 - 10 * frame, 50};
+        EXPECT_EQ(Covered(Load("out-000" + std::to_string(frame) + ".png")), shifted) << "frame " << frame;
+    }
+    EXPECT_FALSE(std::filesystem::exists(Path("out-0004.png")));
+    EXPECT_FALSE(std::filesystem::exists(Path("out.png")));
+    // Between two frames the quad stands between their places.
+    EXPECT_EQ(Render(Path("scene.pod"), "half.png", {"--frame", "1.5"}).err, "");
+    EXPECT_EQ(Covered(Load("half.png")), (Box{85, 30, 125, 50}));
+}
+
+TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
+    pod::Scene scene = MovingScene();
+    scene.materials[0].opacity = 0.8f;
+    WriteScene(Path("scene.pod"), scene);
+    const struct {
+        const char* name;
+        std::vector<std::string> arguments;
+    } runs[] = {{"one", {"--frame", "2", "--text", "same"}},
+                {"two", {"--frame", "2", "--text", "same"}},
+                {"run", {"--frames", "0:3:1", "--text", "same"}},
+                {"first", {}},
+                {"short", {"--frames", "0:0:1"}},
+                {"turn", {"--turn", "3", "--orbit", "30,15"}},
+                {"orbit", {"--orbit", "150,15"}}};
+    for (const auto& run : runs) Render(Path("scene.pod"), std::string(run.name) + ".png", run.arguments);
+    const auto file = [&](const char* name) { return ReadBytes(Path(name)); };
+    EXPECT_GT(Count(Load("one.png"), {255, 255, 255}), 50u);  // the letters
+    EXPECT_EQ(Count(Load("first.png"), {255, 255, 255}), 0u);
+    EXPECT_EQ(file("one.png"), file("two.png"));
+    EXPECT_EQ(file("one.png"), file("run-0002.png"));
+    EXPECT_EQ(file("first.png"), file("short-0000.png"));
+    EXPECT_EQ(file("orbit.png"), file("turn-0001.png"));
+    EXPECT_NE(file("turn-0000.png"), file("turn-0001.png"));
+}
+
+TEST_F(QexRender, AutomaticCameraShowsTheWholeScene) {
+    pod::Scene scene = QuadScene();
+    PlaceQuad(&scene, Placed(500, -300, 40));
+    const Box box = Covered(Picture(scene, {"--camera", "auto", "--orbit", "0,0"}));
+    const int width = box[2] - box[0];
+    // Twice as wide as high, whole, in the middle, and filling most of the picture.
+    EXPECT_GT(width, 150);
+    EXPECT_NEAR(box[0], 200 - box[2], 1);
+    EXPECT_NEAR(box[1], 100 - box[3], 1);
+    EXPECT_NEAR(width, 2 * (box[3] - box[1]), 2);
+}
+
+TEST_F(QexRender, SaysWhyNothingShows) {
+    const struct {
+        std::function<void(pod::Scene*)> change;
+        const char* part;
+    } cases[] = {
+        {[](auto* s) { PlaceQuad(s, Placed(50, 0, 0)); }, "outside the camera's view"},
+        {[](auto* s) { PlaceQuad(s, Placed(0, 0, 20)); }, "behind the camera"},
+        {[](auto* s) { PlaceQuad(s, Placed(0, 0, -200)); }, "far plane"},
+        {FlattenQuad, "scale of 0"},
+        {[](auto* s) { s->materials[0].opacity = 0.5f; }, "transparent"},
+        {[](auto* s) { s->meshes[0].faceCount = 0; }, "no faces"},
+        {[](auto* s) { s->materials[0].diffuse = kBackgroundColour; }, "colour of the background"},
+        {RemoveQuad, "no mesh nodes"},
+    };
+    for (const auto& c : cases) {
+        pod::Scene scene = QuadScene();
+        c.change(&scene);
+        WriteScene(Path("scene.pod"), scene);
+        const CommandResult result = Render(Path("scene.pod"), "out.png");
+        EXPECT_EQ(CountLines(result.err), 1) << result.err;
+        EXPECT_TRUE(Contains(result.err, "warning: ") && Contains(result.err, c.part))
+            << c.part << result.err;
+        EXPECT_EQ(Count(Load("out.png"), kBackground), 20000u) << c.part;
+    }
+}
+
+TEST_F(QexRender, TexturesAreFoundAsPvrThenKtxThenPicture) {
+    pod::Scene scene = QuadScene();
+    TextureQuad(&scene, "tex.png");
+    WriteScene(Path("scene.pod"), scene);
+    WriteBytes(Path("tex.pvr"), UniformPvr(pod::kPvrRgba8888, 8, {255, 0, 255, 255}));
+    WriteBytes(Path("tex.ktx"), UniformKtx(8, {0, 255, 255, 255}));
+    WritePng("tex.png", 8, [](int, int) { return Rgb{255, 255, 0}; });
+    const struct {
+        const char* file;
+        Rgb colour;
+    } cases[] = {{"tex.pvr", {255, 0, 255}}, {"tex.ktx", {0, 255, 255}}, {"tex.png", {255, 255, 0}}};
+    for (const auto& c : cases) {
+        const CommandResult result = Render(Path("scene.pod"), "out.png");
+        EXPECT_EQ(result.err, "") << c.file;
+        EXPECT_TRUE(Near(At(Load("out.png"), 120, 40), c.colour, 2)) << c.file;
+        std::filesystem::remove(Path(c.file));
+    }
+    const CommandResult missing = Render(Path("scene.pod"), "out.png");
+    EXPECT_TRUE(Contains(missing.err, "tex.png is missing")) << missing.err;
+    EXPECT_EQ(Covered(Load("out.png")), kQuad);
+}
+
+TEST_F(QexRender, RealScenesShow) {
+    const std::vector<std::string> scenes = RealFiles("scenes", ".pod");
+    if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";
+    for (const std::string& scene : scenes) {
+        Render(scene, "out.png");
+        const Image image = Load("out.png");
+        const double share = 1 - static_cast<double>(Count(image, kBackground)) / (200.0 * 100);
+        EXPECT_TRUE(share > 0.02 && share < 0.98) << scene << " " << share;
+        // The automatic camera leaves a margin all around.
+        const Box box = Covered(image);
+        EXPECT_TRUE(box[0] > 0 && box[1] > 0 && box[2] < 200 && box[3] < 100) << scene;
+    }
+    Render(scenes[0], "run.png", {"--frames", "0:81:27"});
+    std::set<Bytes> pictures;
+    for (const char* number : {"0", "1", "2", "3"})
+        pictures.insert(ReadBytes(Path("run-000" + std::string(number) + ".png")));
+    EXPECT_EQ(pictures.size(), 4u);
+}

@@ -1,0 +1,272 @@
+#include <cmath>
+#include <map>
+
+#include "ConvertMeshes.h"
+#include "ConvertSupport.h"
+
+namespace {
+
+using Floats = std::vector<float>;
+
+void ExpectNear(const Floats& actual, const Floats& expected, float tolerance = 1e-5f) {
+    ASSERT_EQ(actual.size(), expected.size());
+    for (size_t i = 0; i < actual.size(); ++i)
+        EXPECT_NEAR(actual[i], expected[i], tolerance) << "entry " << i;
+}
+
+// A column, 0 to 2, of the rotation that a node's stored key (x, y, z, -w) stands for.
+Floats Axis(const PodBlock& node, size_t column, size_t key = 0) {
+    const Floats keys = node[5008].Floats();
+    const float x = keys.at(4 * key), y = keys[4 * key + 1], z = keys[4 * key + 2], w = -keys[4 * key + 3];
+    const Floats columns[3] = {{1 - 2 * y * y - 2 * z * z, 2 * x * y + 2 * z * w, 2 * x * z - 2 * y * w},
+                               {2 * x * y - 2 * z * w, 1 - 2 * x * x - 2 * z * z, 2 * y * z + 2 * x * w},
+                               {2 * x * z + 2 * y * w, 2 * y * z - 2 * x * w, 1 - 2 * x * x - 2 * y * y}};
+    return columns[column];
+}
+
+TEST_F(ConvertTest, QuadKeepsPositionsUvsAndMaterial) {
+    const PodBlock s = ConvertQuad("Kd 0.5 0.25 1\nKa 0.125 0 0\nKs 1 1 1\nNs 64\nd 0.75\n");
+    const PodBlock& mesh = s[2012];
+    ASSERT_EQ(mesh[6000].U32(), 4u);
+    ASSERT_EQ(mesh[6001].U32(), 2u);
+    ASSERT_EQ(mesh[6006][9002].U32(), 32u);
+    const Floats v = mesh[6014].Floats();
+    const size_t uv = mesh[6010][9003].U32() / 4, normal = mesh[6007][9003].U32() / 4;
+    ASSERT_EQ(v.size(), 32u);
+    for (size_t i = 0; i < 32; i += 8) {
+        // v = 0 is the lower edge: on this quad u = (x + 1) / 2 and v = (y + 1) / 2.
+        EXPECT_FLOAT_EQ(v[i + uv], (v[i] + 1) / 2);
+        EXPECT_FLOAT_EQ(v[i + uv + 1], (v[i + 1] + 1) / 2);
+        EXPECT_FLOAT_EQ(v[i + normal + 2], 1);
+    }
+    // Both triangles keep their counter-clockwise order.
+    const auto f = mesh[6003][9003].As<uint16_t>();
+    ASSERT_EQ(f.size(), 6u);
+    for (size_t t = 0; t < 6; t += 3) {
+        const float *a = &v[8 * f[t]], *b = &v[8 * f[t + 1]], *c = &v[8 * f[t + 2]];
+        EXPECT_FLOAT_EQ((b[0] - a[0]) * (c[1] - a[1]) - (b[1] - a[1]) * (c[0] - a[0]), 4);
+    }
+    const std::pair<uint32_t, Floats> material[] = {
+        {3004, {0.5f, 0.25f, 1}}, {3003, {0.125f, 0, 0}}, {3006, {64 / 256.0f}}, {3002, {0.75f}}};
+    for (const auto& [id, values] : material) EXPECT_EQ(s[2015][id].Floats(), values) << id;
+    EXPECT_EQ(s[2015][3001].I32(), -1);
+}
+
+TEST_F(ConvertTest, LargeMeshIsSplitWithoutLoss) {
+    pod::MeshArrays fan;
+    for (int i = 0; i < 8; ++i) fan.positions.push_back({float(i), 0, 0});
+    for (uint32_t i = 1; i < 7; ++i) fan.indices.insert(fan.indices.end(), {0, i, i + 1});
+    size_t index = 0;
+    for (const pod::MeshArrays& piece : SplitMesh(fan, 5)) {
+        EXPECT_LE(piece.positions.size(), 5u);
+        for (const uint32_t i : piece.indices)
+            EXPECT_EQ(piece.positions.at(i), fan.positions[fan.indices.at(index++)]);
+    }
+    EXPECT_EQ(index, fan.indices.size());
+
+    // One triangle after another, 70,002 vertices in all.
+    std::string obj;
+    for (int i = 1; i <= 70002; i += 3) {
+        const std::string x = std::to_string(i);
+        obj += "v " + x + " 0 0\nv " + x + " 1 0\nv " + x + " 0 1\n";
+        obj += "f " + x + " " + std::to_string(i + 1) + " " + std::to_string(i + 2) + "\n";
+    }
+    WriteText(Path("large.obj"), obj);
+    const PodBlock s = Convert(Path("large.obj"));
+    uint32_t vertices = 0, triangles = 0;
+    for (const PodBlock* mesh : s.All(2012)) {
+        EXPECT_LE((*mesh)[6000].U32(), 65535u);
+        vertices += (*mesh)[6000].U32();
+        triangles += (*mesh)[6001].U32();
+    }
+    EXPECT_EQ(s[2006].U32(), 2u);
+    EXPECT_EQ(vertices, 70002u);
+    EXPECT_EQ(triangles, 23334u);
+}
+
+// The triangle of a node "tri", which moves, a camera and a spot light below it, and a camera node "fly" that
+// turns; the triangle twice more under matrices. Sampled at four frames a second over one second.
+class ConvertNodes : public ConvertTest {
+  protected:
+    void SetUp() override {
+        ConvertTest::SetUp();
+        const float h = std::sqrt(0.5f);
+        const Floats data = {0, 0, 0, 1, 0, 0, 0, 1, 0,  // triangle
+                             0, 1,                       // times
+                             0, 0, 0, 2, 4, 6,           // positions
+                             0, 0, 0, 1, 0, h, 0, h};    // rotations: a quarter turn about +Y
+        Bytes bin(data.size() * 4);
+        std::memcpy(bin.data(), data.data(), bin.size());
+        WriteBytes(Path("a.bin"), bin);
+        WriteText(Path("a.gltf"), R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0,3,4,5]}],
+ "extensionsUsed":["KHR_lights_punctual"],
+ "extensions":{"KHR_lights_punctual":{"lights":[{"type":"spot","intensity":4,"color":[1,0.5,0.25],
+   "spot":{"outerConeAngle":0.5}}]}},
+ "cameras":[{"type":"perspective","perspective":{"aspectRatio":1.5,"yfov":0.6,"znear":0.1,"zfar":50}},
+   {"type":"perspective","perspective":{"aspectRatio":1,"yfov":0.5,"znear":0.5,"zfar":5}}],
+ "nodes":[{"name":"tri","mesh":0,"children":[1,2]},
+  {"name":"eye","camera":0,"translation":[1,2,3]},
+  {"name":"lamp","rotation":[0.70710678,0,0,0.70710678],"extensions":{"KHR_lights_punctual":{"light":0}}},
+  {"name":"fly","camera":1},
+  {"name":"mirror","mesh":0,"matrix":[-2,0,0,0,0,3,0,0,0,0,4,0,5,6,7,1]},
+  {"name":"shear","mesh":0,"matrix":[1,0,0,0,1,1,0,0,0,0,1,0,5,6,7,1]}],
+ "meshes":[{"primitives":[{"attributes":{"POSITION":0}}]}],
+ "animations":[{"channels":[{"sampler":0,"target":{"node":0,"path":"translation"}},
+   {"sampler":1,"target":{"node":3,"path":"rotation"}}],
+  "samplers":[{"input":1,"output":2},{"input":1,"output":3}]}],
+ "accessors":[{"bufferView":0,"componentType":5126,"count":3,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
+  {"bufferView":0,"byteOffset":36,"componentType":5126,"count":2,"type":"SCALAR","min":[0],"max":[1]},
+  {"bufferView":0,"byteOffset":44,"componentType":5126,"count":2,"type":"VEC3"},
+  {"bufferView":0,"byteOffset":68,"componentType":5126,"count":2,"type":"VEC4"}],
+ "bufferViews":[{"buffer":0,"byteLength":100}],"buffers":[{"byteLength":100,"uri":"a.bin"}]})");
+        scene_ = Convert(Path("a.gltf"), "etc1", 4);
+        for (const PodBlock& block : scene_.children)
+            if (block.id == 2013) nodes_[block[5001].Text()] = block;
+    }
+
+    PodBlock scene_;
+    std::map<std::string, PodBlock> nodes_;
+};
+
+TEST_F(ConvertNodes, KeysFollowTheAnimation) {
+    EXPECT_EQ(scene_[2009].U32(), 5u);
+    EXPECT_EQ(scene_[2017].U32(), 4u);
+    // Only the position of "tri" is animated: five keys on a straight line.
+    const PodBlock &tri = nodes_["tri"], &fly = nodes_["fly"];
+    EXPECT_EQ(tri[5012].U32(), 1u);
+    ExpectNear(tri[5007].Floats(), {0, 0, 0, 0.5f, 1, 1.5f, 1, 2, 3, 1.5f, 3, 4.5f, 2, 4, 6});
+    ExpectNear(tri[5008].Floats(), {0, 0, 0, -1});
+    EXPECT_EQ(tri[5009].Floats().size(), 7u);
+
+    // "fly" turns a quarter about +Y. A camera node looks along -Y with -Z up, so at first its Y axis is +Z
+    // and its Z axis -Y; at the end the view along -Z has become one along -X.
+    EXPECT_EQ(fly[5012].U32(), 2u);
+    ASSERT_EQ(fly[5008].Floats().size(), 20u);
+    for (size_t k = 0; k < 5; ++k) {
+        const float angle = float(k) * 22.5f * 3.14159265f / 180;
+        ExpectNear(Axis(fly, 1, k), {std::sin(angle), 0, std::cos(angle)});
+        ExpectNear(Axis(fly, 2, k), {0, -1, 0});
+    }
+}
+
+TEST_F(ConvertNodes, ComeInOrderWithCamerasAndLights) {
+    const struct {
+        const char* name;
+        int object, parent;
+    } rows[] = {{"tri", 0, -1}, {"mirror", 0, -1}, {"shear", 0, -1},
+                {"lamp", 0, 0}, {"eye", 0, 0},     {"fly", 1, -1}};
+    const auto nodes = scene_.All(2013);
+    ASSERT_EQ(nodes.size(), 6u);
+    EXPECT_EQ(scene_[2006].U32(), 3u);
+    for (size_t i = 0; i < 6; ++i) {
+        EXPECT_EQ((*nodes[i])[5001].Text(), rows[i].name);
+        EXPECT_EQ((*nodes[i])[5000].I32(), rows[i].object);
+        EXPECT_EQ((*nodes[i])[5003].I32(), rows[i].parent);
+    }
+    // A quarter turn about +X carries the light's -Z to +Y; lights shine along their node's -Z.
+    ExpectNear(Axis(nodes_["lamp"], 2), {0, -1, 0});
+    const PodBlock &lamp = scene_[2011], &eye = scene_[2010];
+    EXPECT_EQ(lamp[7002].U32(), 2u);
+    ExpectNear(lamp[7001].Floats(), {1, 0.5f, 0.25f});
+    ExpectNear(lamp[7006].Floats(), {0.5f});
+    ExpectNear(nodes_["eye"][5007].Floats(), {1, 2, 3});
+    // The width's angle of a height's angle 0.6 at an aspect of 1.5: 2 atan(1.5 tan 0.3).
+    ExpectNear(eye[8001].Floats(), {0.868878f});
+    ExpectNear(eye[8002].Floats(), {50}, 1e-4f);
+    ExpectNear(eye[8003].Floats(), {0.1f});
+    EXPECT_EQ(eye[8000].I32(), -1);
+}
+
+TEST_F(ConvertNodes, MirrorAndShear) {
+    const PodBlock &mirror = nodes_["mirror"], &shear = nodes_["shear"];
+    ExpectNear(mirror[5007].Floats(), {5, 6, 7});
+    const Floats scale = mirror[5009].Floats();
+    const float lengths[3] = {-2, 3, 4};
+    for (size_t column = 0; column < 3; ++column) {
+        Floats expected(3), axis = Axis(mirror, column);
+        expected[column] = lengths[column];
+        for (float& value : axis) value *= scale.at(column);
+        ExpectNear(axis, expected);
+    }
+    // No rotation and scale make a shear: the node has a column-major matrix instead.
+    EXPECT_FALSE(shear.Has(5007));
+    ExpectNear(shear[5011].Floats(), {1, 0, 0, 0, 1, 1, 0, 0, 0, 0, 1, 0, 5, 6, 7, 1});
+    EXPECT_EQ(shear[5012].U32(), 0u);
+}
+
+TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
+    WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    WriteText(Path("points.obj"), "v 0 0 0\nv 1 0 0\np 1 2\n");
+    WriteText(Path("broken.gltf"), "{\"asset\":");
+    WriteText(Path("notes.txt"), "no scene");
+    const std::string good = Path("q.obj"), out = Path("out.pod");
+    const struct {
+        std::string input, output, format;
+        double fps;
+        int status;
+        const char* says;
+    } rows[] = {
+        {good, out, "dxt", 30, 2, "etc1, rgba8888 or rgb888 is expected"},
+        {good, out, "etc1", 0, 2, "whole number of frames"},
+        {good, out, "etc1", 29.97, 2, "whole number of frames"},
+        {good, Path("no/such/out.pod"), "etc1", 30, 2, "folder does not exist"},
+        {good, folder_.string(), "etc1", 30, 2, "no file name"},
+        {good, "", "etc1", 30, 2, "no file name"},
+        {good, good, "etc1", 30, 2, "is the input"},
+        {Path("none.obj"), out, "etc1", 30, 1, "existing scene file is expected"},
+        {Path("broken.gltf"), out, "etc1", 30, 1, "cannot be read as a scene"},
+        {Path("notes.txt"), out, "etc1", 30, 1, "cannot be read as a scene"},
+        {Path("points.obj"), out, "etc1", 30, 1, "holds no triangles"},
+    };
+    for (const auto& row : rows) {
+        ConvertOptions options;
+        options.input = row.input;
+        options.output = row.output;
+        options.textureFormat = row.format;
+        options.fps = row.fps;
+        EXPECT_EQ(Run(options), row.status) << said_;
+        EXPECT_TRUE(Contains(said_, row.says)) << said_;
+        EXPECT_EQ(said_.rfind("qex convert: ", 0), 0u) << said_;
+        EXPECT_EQ(CountLines(said_), 1) << said_;
+    }
+    EXPECT_FALSE(std::filesystem::exists(out));
+}
+
+// Models of the system's packages, and the counts of their files: the duck's 4,212 triangles are the <p>
+// lists of its .dae.
+TEST_F(ConvertTest, ModelsFromThePackages) {
+    const std::string assimp = "/usr/share/assimp/models/", glmark = "/usr/share/glmark2/models/";
+    const struct {
+        std::string file;
+        uint32_t triangles, cameras, lights, textures;
+    } rows[] = {{assimp + "OBJ/spider.obj", 1312, 0, 0, 4},
+                {assimp + "glTF2/BoxTextured-glTF-Binary/BoxTextured.glb", 12, 0, 0, 1},
+                {glmark + "horse.3ds", 7172, 0, 0, 0},
+                {assimp + "Collada/duck.dae", 4212, 1, 1, 1}};
+    PodBlock s;
+    for (const auto& row : rows) {
+        if (!std::filesystem::exists(row.file)) GTEST_SKIP() << row.file << " is not installed";
+        s = Convert(row.file, "etc1");
+        uint32_t triangles = 0;
+        for (const PodBlock* mesh : s.All(2012)) {
+            triangles += (*mesh)[6001].U32();
+            const uint32_t vertices = (*mesh)[6000].U32();
+            EXPECT_EQ((*mesh)[6014].data.size(), size_t((*mesh)[6006][9002].U32()) * vertices);
+            for (const uint16_t index : (*mesh)[6003][9003].As<uint16_t>()) ASSERT_LT(index, vertices);
+        }
+        EXPECT_EQ(triangles, row.triangles) << row.file;
+        EXPECT_EQ(s[2002].U32(), row.cameras);
+        EXPECT_EQ(s[2003].U32(), row.lights);
+        EXPECT_EQ(s[2007].U32(), row.textures);
+        for (const PodBlock* t : s.All(2014)) EXPECT_FALSE(ReadBytes(Path((*t)[4000].Text())).empty());
+    }
+    // The duck's camera: 37.8492 degrees high at an aspect of 1.5 is 54.43 degrees across. It looks along its
+    // node's -Z, which the file's matrix gives as (-0.536475, -0.621148, 0.571288).
+    ExpectNear(s[2010][8001].Floats(), {0.950019f}, 1e-4f);
+    for (const PodBlock* node : s.All(2013))
+        if ((*node)[5001].Text() == "camera1")
+            return ExpectNear(Axis(*node, 1), {0.536475f, 0.621148f, -0.571288f}, 1e-4f);
+    FAIL() << "no node camera1";
+}
+
+}  // namespace

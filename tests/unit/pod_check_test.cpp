@@ -1,0 +1,203 @@
+// What reading a scene refuses, each with its line, and what it puts right.
+#include <gtest/gtest.h>
+
+#include <functional>
+
+#include "support/PodScenes.h"
+#include "support/WalkScene.h"
+
+namespace {
+
+using everything::kHip;
+using everything::kKnee;
+using pod::IndexElement;
+using pod::Mesh;
+using pod::Scene;
+
+bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+struct Refusal {
+    const char* line;
+    std::function<void(Scene&, Mesh&)> damage;  // of the scene, and of its first mesh
+};
+
+// clang-format off
+const Refusal kRefusals[] = {
+    {"node 0: it draws mesh 3 of 3", [](Scene& s, Mesh&) { s.nodes[0].object = 3; }},
+    {"node 1: it draws mesh -1 of 3", [](Scene& s, Mesh&) { s.nodes[1].object = -1; }},
+    {"node 0: it uses material 2 of 2", [](Scene& s, Mesh&) { s.nodes[0].material = 2; }},
+    {"node 7: it uses material -2 of 2", [](Scene& s, Mesh&) { s.nodes[7].material = -2; }},
+    {"node 6: its parent is node 11 of 11", [](Scene& s, Mesh&) { s.nodes[kHip].parent = 11; }},
+    {"node 6: its parent is node -2 of 11", [](Scene& s, Mesh&) { s.nodes[kHip].parent = -2; }},
+    {"node 6: its parents form a circle", [](Scene& s, Mesh&) { s.nodes[kHip].parent = kHip; }},
+    {"its parents form a circle", [](Scene& s, Mesh&) { s.nodes[kHip].parent = kKnee; }},
+    {"11 nodes, but 9 mesh nodes, 2 lights and 1 cameras", [](Scene& s, Mesh&) { s.meshNodeCount = 9; }},
+    {"camera 0: its target is node 11 of 11", [](Scene& s, Mesh&) { s.cameras[0].target = 11; }},
+    {"light 1: its target is node -5 of 11", [](Scene& s, Mesh&) { s.lights[1].target = -5; }},
+    {"the scene counts 12 node records but holds 11", [](Scene& s, Mesh&) { s.counts.nodes = 12; }},
+    {"more node records than the 10", [](Scene& s, Mesh&) { s.counts.nodes = 10; }},
+
+    {"positions of unknown type 18", [](Scene&, Mesh& m) { m.vertices.type = 18; }},
+    {"normals of 5 components", [](Scene&, Mesh& m) { m.normals.components = 5; }},
+    {"texture coordinates of 6 vertices reach byte", [](Scene&, Mesh& m) { m.uvw[0].offset += 21; }},
+    {"tangents of 6 vertices reach byte 4294967", [](Scene&, Mesh& m) { m.tangents.offset = UINT32_MAX; }},
+    {"binormals of 6 vertices reach byte", [](Scene&, Mesh& m) { m.binormals.stride = UINT32_MAX; }},
+    {"colours of 4 bytes with a stride of 3", [](Scene&, Mesh& m) { m.colours.stride = 3; }},
+    {"positions of 4 vertices reach byte 48 of 44", [](Scene& s, Mesh&) { s.meshes[1].vertices.data.resize(44); }},
+    {"a mesh has more UV channels than the 1", [](Scene& s, Mesh&) { s.meshes[1].uvwCount = 1; }},
+    {"a mesh has 9 UV channels, at most 8", [](Scene&, Mesh& m) { m.uvwCount = 9; }},
+
+    {"mesh 0: a face uses vertex 6 of 6", [](Scene&, Mesh& m) { m.faces = IndexElement({0, 1, 2, 3, 4, 6}); }},
+    {"a face uses vertex 70000 of 6", [](Scene&, Mesh& m) { m.faces = IndexElement({0, 1, 70000, 0, 2, 3}, true); }},
+    {"its faces need 9 indices, it has 6", [](Scene&, Mesh& m) { m.faceCount = 3; }},
+    {"more faces than can be drawn", [](Scene&, Mesh& m) { m.faceCount = 0x55555556; }},
+    {"its faces need 9 vertices, it has 6", [](Scene&, Mesh& m) { m.faces = {}; m.faceCount = 3; }},
+    {"face indices of type 10", [](Scene&, Mesh& m) { m.faces.type = pod::kUint8; }},
+    {"its faces need 8 indices, it has 7", [](Scene& s, Mesh&) { s.meshes[2].stripLengths = {1, 3}; }},
+    {"more faces than can be drawn", [](Scene& s, Mesh&) { s.meshes[2].stripLengths = {1, UINT32_MAX}; }},
+
+    {"batch 1 uses node 11 of 11 as a bone", [](Scene&, Mesh& m) { m.batchBones[2] = 11; }},
+    {"batch 0 uses node -1 of 11 as a bone", [](Scene&, Mesh& m) { m.batchBones[1] = -1; }},
+    {"batch 0 has 3 bones of 2", [](Scene&, Mesh& m) { m.bonesPerBatch[0] = 3; }},
+    {"batch 1 has -1 bones of 2", [](Scene&, Mesh& m) { m.bonesPerBatch[1] = -1; }},
+    {"batch 0 covers faces 1 to 1 of 2", [](Scene&, Mesh& m) { m.batchOffsets = {1, 1}; }},
+    {"batch 0 covers faces 0 to 3 of 2", [](Scene&, Mesh& m) { m.batchOffsets = {0, 3}; }},
+    {"batch 0 covers faces 0 to 4294967295 of 2", [](Scene&, Mesh& m) { m.batchOffsets = {0, -1}; }},
+    {"3 batches of 2 bones, but shorter tables", [](Scene&, Mesh& m) { m.batchCount = 3; }},
+    {"2 batches of 3 bones, but shorter tables", [](Scene&, Mesh& m) { m.batchBoneMax = 3; }},
+    {"-1 batches of 2 bones", [](Scene&, Mesh& m) { m.batchCount = -1; }},
+    {"2147483647 batches of 2147483647 bones", [](Scene&, Mesh& m) { m.batchCount = m.batchBoneMax = INT32_MAX; }},
+    {"3 bone indices, but 2 weights a vertex", [](Scene&, Mesh& m) { m.boneWeights.components = 2; }},
+    // The second batch has one bone; vertex 4 follows its second.
+    {"vertex 4 follows bone 1 of a batch of 1",
+     [](Scene&, Mesh& m) { m.vertexBlock[4 * m.boneIndices.stride + m.boneIndices.offset] = 1; }},
+};
+// clang-format on
+
+void ExpectRefused(const Refusal& refusal) {
+    Scene scene = everything::Scene();
+    refusal.damage(scene, scene.meshes[0]);
+    LoadedPod loaded(scene);
+    EXPECT_EQ(loaded.result, -1) << refusal.line;
+    EXPECT_EQ(loaded.scene.runtime, nullptr) << refusal.line;
+    EXPECT_TRUE(Has(loaded.Error(), refusal.line)) << refusal.line << "\n" << loaded.Error();
+}
+
+TEST(PodCheck, RefusesWhatCannotBeDrawn) {
+    for (const Refusal& refusal : kRefusals) ExpectRefused(refusal);
+    for (int i = 0; i < 10; ++i) {
+        ExpectRefused({"material 1: it uses texture 2 of 2",
+                       [i](Scene& s, Mesh&) { (&s.materials[1].diffuseTexture)[i] = 2; }});
+        ExpectRefused({"material 0: it uses texture -2 of 2",
+                       [i](Scene& s, Mesh&) { (&s.materials[0].diffuseTexture)[i] = -2; }});
+    }
+    // World matrices are found by recursion, so the depth has a limit.
+    for (const int32_t generations : {1000, 1100}) {
+        Scene scene;
+        for (int32_t i = 0; i < generations; ++i) scene.nodes.push_back(pod::BuildNode("n", {}, i - 1));
+        const LoadedPod loaded(scene);
+        EXPECT_EQ(loaded.result, generations == 1000 ? 0 : -1);
+        EXPECT_EQ(Has(loaded.Error(), "or more than 1000 of them"), generations != 1000) << loaded.log;
+    }
+}
+
+TEST(PodCheck, RefusesBlocksThatContradictEachOther) {
+    const auto own = [](PodBlocks& b) {
+        b.Begin(6006).Words(9000, {1}).Words(9001, {3}).Words(9002, {12}).Floats(9003, {1, 2, 3}).End(6006);
+    };
+    const struct {
+        const char* line;  // null: it loads
+        std::function<void(PodBlocks&)> blocks;
+    } cases[] = {
+        {"interleaved block comes after its elements",
+         [&](PodBlocks& b) {
+             own(b), b.Floats(6014, {1, 2, 3});
+         }},
+        {"two interleaved blocks", [](PodBlocks& b) { b.Floats(6014, {1}).Floats(6014, {1}); }},
+        {"counts its UV channels twice", [](PodBlocks& b) { b.Words(6002, {1}).Words(6002, {1}); }},
+        {"counts its mesh records twice", [](PodBlocks& b) { b.End(2012).Words(2004, {1}).Begin(2012); }},
+        {"more mesh records than the 1", [](PodBlocks& b) { b.End(2012).Begin(2012); }},
+        {"block 6000 holds 2 bytes instead of 4", [](PodBlocks& b) { b.Bytes(6000, "xy", 2); }},
+        {"1 strips, but 0 strip lengths", [](PodBlocks& b) { b.Words(6005, {1}); }},
+        // Elements read twice keep the later data, and what was read before is not lost.
+        {nullptr, [&](PodBlocks& b) { own(b), own(b); }},
+        // Data shorter than one component is none, so a block may still follow.
+        {nullptr,
+         [](PodBlocks& b) {
+             b.Begin(6006).Bytes(9003, "x", 1).End(6006).Floats(6014, {1, 2, 3});
+         }},
+    };
+    for (const auto& c : cases) {
+        PodBlocks file;
+        file.Version().Begin(1001).Words(2004, {1}).Begin(2012).Words(6000, {1});
+        c.blocks(file);
+        const LoadedPod loaded(file.End(2012).End(1001).bytes);
+        EXPECT_EQ(loaded.result, c.line ? -1 : 0) << loaded.log;
+        EXPECT_TRUE(Has(loaded.Error(), c.line ? c.line : "")) << c.line << "\n" << loaded.log;
+    }
+}
+
+TEST(PodCheck, KeysForTooFewFramesStandStill) {
+    const struct {
+        const char* line;
+        std::function<void(pod::Node&)> damage;
+        uint32_t flags;
+    } cases[] = {
+        // clang-format off
+        {"position has fewer keys than frames", [](pod::Node& n) { n.positions.resize(9); }, 6},
+        {"rotation has fewer keys than frames", [](pod::Node& n) { n.rotations.resize(12); }, 5},
+        {"scale has fewer keys than frames", [](pod::Node& n) { n.scales.resize(14); }, 3},
+        {"position has fewer key indices than frames", [](pod::Node& n) { n.positionIndex = {0, 3, 0}; }, 6},
+        {"rotation has a key index beyond its keys", [](pod::Node& n) { n.rotationIndex = {0, 4, 8, 13}; }, 5},
+        {"scale has a key index beyond its keys", [](pod::Node& n) { n.scaleIndex = {0, 0, 0, UINT32_MAX}; }, 3},
+        {"position has not even one key", [](pod::Node& n) { n.positions.resize(2); }, 6},
+        // The last scale key may be cut short after the three floats that count.
+        {nullptr, [](pod::Node& n) { n.scales.resize(3 * 7 + 3); }, 7},
+        // clang-format on
+    };
+    for (const auto& c : cases) {
+        Scene scene = everything::Scene();
+        c.damage(scene.nodes[kHip]);
+        LoadedPod loaded(scene);
+        ASSERT_EQ(loaded.result, 0) << loaded.log;
+        EXPECT_EQ(Has(loaded.log, "stands still"), c.line != nullptr) << loaded.log;
+        EXPECT_TRUE(Has(loaded.log, c.line ? std::string("node 6: ") + c.line + "; it" : "")) << loaded.log;
+        EXPECT_EQ(loaded.scene.nodes[kHip].animationFlags, c.flags) << loaded.log;
+        EXPECT_EQ(SceneWalk(&loaded.scene).fault, nullptr) << loaded.log;
+    }
+}
+
+TEST(PodCheck, OddCamerasAndBonesArePutRight) {
+    Scene scene = everything::Scene();
+    scene.cameras[0].animatedFov.pop_back();
+    LoadedPod loaded(scene);
+    ASSERT_EQ(loaded.result, 0);
+    EXPECT_TRUE(Has(loaded.log, "camera 0: fewer fields of view than frames"));
+    float position[3], target[3];
+    EXPECT_EQ(QexPODModel_GetCameraPos(&loaded.scene, position, target, 0), 0.8f);
+
+    const QexPODMesh& mesh = loaded.scene.meshes[0];
+    for (uint32_t v = 0; v < 6; ++v) {
+        const uint8_t* bones = mesh.interleaved + v * mesh.boneIndices.stride +
+                               reinterpret_cast<uintptr_t>(mesh.boneIndices.data);
+        EXPECT_EQ(bones[2], 0) << "bone 99 without weight";
+        EXPECT_EQ(bones[1], v < 3 ? 1 : 0);
+    }
+    // Bones without batches, and strips with bones, are drawn as they are.
+    for (const bool strips : {false, true}) {
+        scene = everything::Scene();
+        Mesh& changed = scene.meshes[0];
+        if (strips)
+            changed.stripLengths = {1, 1};
+        else
+            changed.batchCount = changed.batchBoneMax = 0;
+        const LoadedPod still(scene);
+        ASSERT_EQ(still.result, 0) << still.log;
+        EXPECT_EQ(still.scene.meshes[0].skinned, 0u);
+        EXPECT_TRUE(Has(still.log, "mesh 0: follows bones, but "));
+    }
+}
+
+}  // namespace
