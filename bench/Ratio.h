@@ -1,8 +1,8 @@
 // Compares two pieces of work in one run of Google Benchmark and judges the ratio of their times.
 //
-// Each comparison registers both sides; all run several times in random order, so that a change of the processor's
-// clock or load meets both alike, and the medians are compared. Result prints the ratios after Google Benchmark's own
-// table; with --check it is 1 when a ratio is over its limit.
+// Each comparison registers both sides; all run several times in random order, so that a change of the
+// processor's clock or load meets both alike, and the medians are compared. Result prints the ratios after
+// Google Benchmark's own table; with --check it is 1 when a ratio is over its limit.
 //
 //     int main(int argc, char** argv) {
 //         RatioBench bench(&argc, argv);
@@ -30,12 +30,14 @@ class RatioBench {
   public:
     // Takes --check out of the arguments and hands the rest to Google Benchmark.
     RatioBench(int* argc, char** argv) : arguments_(argv, argv + *argc) {
-        const auto check = std::remove_if(arguments_.begin() + 1, arguments_.end(),
-                                          [](const char* argument) { return strcmp(argument, "--check") == 0; });
+        const auto check = std::remove_if(arguments_.begin() + 1, arguments_.end(), [](const char* argument) {
+            return strcmp(argument, "--check") == 0;
+        });
         check_ = check != arguments_.end();
         arguments_.erase(check, arguments_.end());
         // What the caller gives comes after these defaults and takes their place.
-        static char defaults[][56] = {"--benchmark_repetitions=15", "--benchmark_enable_random_interleaving=true",
+        static char defaults[][56] = {"--benchmark_repetitions=15",
+                                      "--benchmark_enable_random_interleaving=true",
                                       "--benchmark_min_time=0.03"};
         for (char* argument : {defaults[2], defaults[1], defaults[0]})
             arguments_.insert(arguments_.begin() + 1, argument);
@@ -43,8 +45,8 @@ class RatioBench {
         benchmark::Initialize(&count, arguments_.data());
     }
 
-    // `qex` against `reference`, each a callable of no arguments that makes `items` operations. `limit` is the largest
-    // ratio that is accepted.
+    // `qex` against `reference`, each a callable of no arguments that makes `items` operations. `limit` is
+    // the largest ratio that is accepted.
     template <class Qex, class Reference>
     void Compare(const std::string& name, double limit, Qex qex, Reference reference, double items = 1) {
         comparisons_.push_back({name, limit, items});

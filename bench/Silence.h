@@ -1,5 +1,5 @@
-// Sends standard output and standard error to /dev/null while it lives: the engine's progress lines would mix with
-// the measurements. Costs a few microseconds.
+// Sends standard output and standard error to /dev/null while it lives: the engine's progress lines would mix
+// with the measurements. Costs a few microseconds.
 #pragma once
 
 #include <cstdio>

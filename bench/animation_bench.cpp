@@ -23,7 +23,8 @@ struct Node {
     int parent;
 };
 
-// What the engine does for a node: interpolate the three keys, build the local matrix, put the parent in front.
+// What the engine does for a node: interpolate the three keys, build the local matrix, put the parent in
+// front.
 void GlmWorldMatrices(const std::vector<Node>& nodes, float frame, std::vector<glm::mat4>* world) {
     const int key = static_cast<int>(frame);
     const float t = frame - static_cast<float>(key);
@@ -43,7 +44,8 @@ void GlmWorldMatrices(const std::vector<Node>& nodes, float frame, std::vector<g
 }
 
 void QexWorldMatrices(QexPODModel* scene, QexMatrix* world) {
-    for (uint32_t i = 0; i < scene->nodeCount; ++i) QexPODModel_GetWorldMatrix(scene, &world[i], &scene->nodes[i]);
+    for (uint32_t i = 0; i < scene->nodeCount; ++i)
+        QexPODModel_GetWorldMatrix(scene, &world[i], &scene->nodes[i]);
 }
 
 }  // namespace

@@ -1,12 +1,12 @@
-// Drawing 1,000 nodes with the texture module against the same GL calls replayed from a record, both under the tap's
-// null driver: what is left is the engine's own work.
+// Drawing 1,000 nodes with the texture module against the same GL calls replayed from a record, both under
+// the tap's null driver: what is left is the engine's own work.
 #include <cstdlib>
 
+#include "gltap.h"
 #include "Qex.h"
 #include "Ratio.h"
 #include "Scenes.h"
 #include "Silence.h"
-#include "gltap.h"
 
 namespace {
 
@@ -43,8 +43,9 @@ int main(int argc, char** argv) {
     draw();
     gltapRecording* recording = gltapEndRecording();
     const size_t calls = gltapRecordingSize(recording);
-    bench.Compare("draw a node with the texture module / its GL calls", 1.3, draw, [&] { gltapReplay(recording); },
-                  kNodes);
+    bench.Compare(
+        "draw a node with the texture module / its GL calls", 1.3, draw, [&] { gltapReplay(recording); },
+        kNodes);
     const int status = bench.Result();
     printf("GL calls a node: %.1f\n", static_cast<double>(calls) / kNodes);
     gltapReleaseRecording(recording);

@@ -44,7 +44,6 @@ typedef struct QexModel QexModel;
 typedef struct QexLightSet QexLightSet;
 typedef struct QexShadowInfo QexShadowInfo;
 
-
 /* ======================================================================================================
  * Base: diagnostics, memory, time and float animation
  *
@@ -564,11 +563,11 @@ QEX_API int32_t GetTranslationMatrixFromMatrix(const QexMatrix* m, QexMatrix* ou
 
 /** A box by its corners. QexBoundingBox_ComputeInterleaved builds one from vertices. */
 typedef struct QexBoundingBox {
-    QexVec3 corners[8];  /* with 0 for the minimum and 1 for the maximum of x, y, z: 000, 001, 010, 011, 100,
-                            101, 110, 111; a transform moves the corners and keeps their order */
-    QexVec3 centre;      /* centre of the axis-aligned box */
-    QexVec3 halfExtent;  /* half sizes along x, y, z */
-    float reserved[3];   /* not used */
+    QexVec3 corners[8]; /* with 0 for the minimum and 1 for the maximum of x, y, z: 000, 001, 010, 011, 100,
+                           101, 110, 111; a transform moves the corners and keeps their order */
+    QexVec3 centre;     /* centre of the axis-aligned box */
+    QexVec3 halfExtent; /* half sizes along x, y, z */
+    float reserved[3];  /* not used */
 } QexBoundingBox;
 
 /** An axis-aligned box. It is empty when a minimum is greater than its maximum. */
@@ -613,7 +612,7 @@ QEX_API void QexBoundingBox_TransformBoundingBox(const QexMatrix* matrix, const 
  *                  from there on; may be null
  *  @return 1 when they overlap along all three axes, else 0. */
 QEX_API int32_t QexBoundingBox_TestBBoxBBox(const QexBoundingBox* a, const QexBoundingBox* b,
-                                             QexVec3* overlap);
+                                            QexVec3* overlap);
 
 /** Tests a box against a camera's view volume. The far plane does not count.
  *  @param box      box
@@ -1018,16 +1017,16 @@ typedef struct CPODData {
     uint32_t type;           /* QEX_POD_FLOAT .. QEX_POD_UNSIGNED_INT; 0 or 1 while unset */
     uint32_t componentCount; /* components a vertex, 0 when the mesh has no such element */
     uint32_t stride;         /* bytes from one vertex to the next; 0 for tightly packed own data */
-    uint8_t* data;           /* the element's own bytes, or its byte offset into the mesh's interleaved block */
+    uint8_t* data; /* the element's own bytes, or its byte offset into the mesh's interleaved block */
 } CPODData;
 
 /** A scene camera. Its node is node (meshNodeCount + lightCount + camera index). */
 typedef struct QexPODCamera {
-    int32_t targetIndex;  /* node that it looks at, -1 for none */
-    float fov;            /* field of view in radians, horizontal */
-    float farPlane;       /* distance of the far plane */
-    float nearPlane;      /* distance of the near plane */
-    float* animatedFov;   /* field of view per frame, or null */
+    int32_t targetIndex; /* node that it looks at, -1 for none */
+    float fov;           /* field of view in radians, horizontal */
+    float farPlane;      /* distance of the far plane */
+    float nearPlane;     /* distance of the near plane */
+    float* animatedFov;  /* field of view per frame, or null */
 } QexPODCamera;
 
 /** Light types of QexPODLight. */
@@ -1037,13 +1036,13 @@ typedef struct QexPODCamera {
 
 /** A scene light. Its node is node (meshNodeCount + light index). */
 typedef struct QexPODLight {
-    int32_t targetIndex;        /* node that it shines at, -1 for none */
-    float colour[3];            /* red, green, blue */
-    uint32_t type;              /* QEX_POD_LIGHT_POINT, _DIRECTIONAL or _SPOT */
+    int32_t targetIndex; /* node that it shines at, -1 for none */
+    float colour[3];     /* red, green, blue */
+    uint32_t type;       /* QEX_POD_LIGHT_POINT, _DIRECTIONAL or _SPOT */
     float constantAttenuation;
     float linearAttenuation;
     float quadraticAttenuation;
-    float fallOffAngle;         /* radians */
+    float fallOffAngle; /* radians */
     float fallOffExponent;
 } QexPODLight;
 
@@ -1065,8 +1064,8 @@ typedef struct QexPODMaterial {
     int32_t opacityTexture;
     int32_t reflectionTexture;
     int32_t refractionTexture;
-    float opacity;           /* 0 invisible to 1 opaque */
-    float ambient[3];        /* red, green, blue */
+    float opacity;    /* 0 invisible to 1 opaque */
+    float ambient[3]; /* red, green, blue */
     float diffuse[3];
     float specular[3];
     float shininess;         /* 0..1; the shaders use 256 times this */
@@ -1116,18 +1115,18 @@ typedef struct QexVertexAttribute {
 /** A mesh. */
 typedef struct QexPODMesh {
     uint32_t vertexCount;
-    uint32_t faceCount;        /* triangles */
+    uint32_t faceCount; /* triangles */
     uint32_t uvwChannelCount;
-    CPODData faces;            /* indices, 16- or 32-bit, always with their own data; no data: not indexed */
-    uint32_t* stripLengths;    /* triangles in each strip, or null */
-    uint32_t stripCount;       /* 0 when the faces are a plain list */
-    CPODData vertices;         /* positions */
+    CPODData faces;         /* indices, 16- or 32-bit, always with their own data; no data: not indexed */
+    uint32_t* stripLengths; /* triangles in each strip, or null */
+    uint32_t stripCount;    /* 0 when the faces are a plain list */
+    CPODData vertices;      /* positions */
     CPODData normals;
     CPODData tangents;
     CPODData binormals;
-    CPODData* uvws;            /* uvwChannelCount UV channels */
+    CPODData* uvws; /* uvwChannelCount UV channels */
     CPODData colours;
-    CPODData boneIndices;      /* indices into the bone list of the vertex's batch */
+    CPODData boneIndices; /* indices into the bone list of the vertex's batch */
     CPODData boneWeights;
     uint8_t* interleaved;      /* the vertex block that the elements' data are offsets into, or null */
     uint32_t interleavedBytes; /* its length */
@@ -1135,9 +1134,9 @@ typedef struct QexPODMesh {
     uint32_t passID;           /* pass that draws it, see QexPODModel_SetPassID */
     QexBoneBatches boneBatches;
     uint32_t reserved;
-    QexMatrix unpackMatrix;    /* turns stored positions into model positions; identity unless given */
+    QexMatrix unpackMatrix; /* turns stored positions into model positions; identity unless given */
     /* Filled by QexModel_DownloadGeometry: */
-    QexBoundingBox localBox;   /* box of the positions */
+    QexBoundingBox localBox;                          /* box of the positions */
     QexVertexAttribute attributes[QEX_ELEMENT_COUNT]; /* layout of the GL vertex buffer */
 } QexPODMesh;
 
@@ -1166,17 +1165,17 @@ typedef struct QexPODMesh {
 /** A node. Mesh nodes come first, then the lights', then the cameras', then all others. Key arrays that lie
  *  in the caller's memory may be unaligned: read them with memcpy. */
 typedef struct QexPODNode {
-    int32_t objectIndex;       /* its mesh, light or camera */
+    int32_t objectIndex; /* its mesh, light or camera */
     char* name;
-    int32_t materialIndex;     /* -1 for none */
-    int32_t parentIndex;       /* -1 for a root */
-    uint32_t animationFlags;   /* QEX_NODE_..._ANIMATED */
-    uint32_t* positionIndex;   /* per frame the float offset of its key, or null: keys follow each other */
-    float* position;           /* 3 floats a key, or null */
+    int32_t materialIndex;   /* -1 for none */
+    int32_t parentIndex;     /* -1 for a root */
+    uint32_t animationFlags; /* QEX_NODE_..._ANIMATED */
+    uint32_t* positionIndex; /* per frame the float offset of its key, or null: keys follow each other */
+    float* position;         /* 3 floats a key, or null */
     uint32_t* rotationIndex;
-    float* rotation;           /* quaternions x, y, z, w, 4 floats a key */
+    float* rotation; /* quaternions x, y, z, w, 4 floats a key */
     uint32_t* scaleIndex;
-    float* scale;              /* 7 floats a key, the first three the scale */
+    float* scale; /* 7 floats a key, the first three the scale */
     uint32_t* matrixIndex;
     float* matrix;             /* 16 floats a key; a node with matrices ignores the other keys */
     float speed;               /* factor on the frame advance, 1 after reading */
@@ -1190,22 +1189,22 @@ typedef struct QexPODNode {
     QexMatrix overrideScaleMatrix;
     QexMatrix overrideRotationMatrix;
     QexMatrix overrideTranslationMatrix;
-    QexMatrix overrideMatrix;  /* applied in front of the animated matrix while QEX_NODE_OVERRIDDEN is set */
-    QexShaderModule* shader;   /* draws the node; null: never drawn */
-    uint8_t blendFlags;        /* QEX_NODE_OPAQUE */
-    int32_t blendOrder;        /* for the application, see QexModel_SetAlphaBlendingNodesWithOrder */
+    QexMatrix overrideMatrix; /* applied in front of the animated matrix while QEX_NODE_OVERRIDDEN is set */
+    QexShaderModule* shader;  /* draws the node; null: never drawn */
+    uint8_t blendFlags;       /* QEX_NODE_OPAQUE */
+    int32_t blendOrder;       /* for the application, see QexModel_SetAlphaBlendingNodesWithOrder */
 } QexPODNode;
 
 /** The run-time part of a scene: current frame and world matrices. */
 typedef struct SPVRTPODImpl {
-    float frame;                  /* frame last set, as given */
-    float frameFraction;          /* the same within the animation: fraction */
-    uint32_t frameInteger;        /* and integer part */
-    float* cacheKeys;             /* per node: frame + fraction that its cached matrix belongs to, -1 none */
-    QexMatrix* cachedMatrices;    /* per node: world matrix */
-    QexMatrix* bindPose;          /* per node: world matrix at frame 0 */
+    float frame;               /* frame last set, as given */
+    float frameFraction;       /* the same within the animation: fraction */
+    uint32_t frameInteger;     /* and integer part */
+    float* cacheKeys;          /* per node: frame + fraction that its cached matrix belongs to, -1 none */
+    QexMatrix* cachedMatrices; /* per node: world matrix */
+    QexMatrix* bindPose;       /* per node: world matrix at frame 0 */
     uint32_t reserved;
-    QexMatrix* inverseBindPose;   /* per node: affine inverse of bindPose */
+    QexMatrix* inverseBindPose; /* per node: affine inverse of bindPose */
 } SPVRTPODImpl;
 
 /** A scene. */
@@ -1218,8 +1217,8 @@ struct QexPODModel {
     QexPODLight* lights;
     uint32_t meshCount;
     QexPODMesh* meshes;
-    uint32_t nodeCount;       /* all nodes */
-    uint32_t meshNodeCount;   /* the first nodes: those that draw meshes */
+    uint32_t nodeCount;     /* all nodes */
+    uint32_t meshNodeCount; /* the first nodes: those that draw meshes */
     QexPODNode* nodes;
     uint32_t textureCount;
     QexPODTexture* textures;
@@ -1228,9 +1227,9 @@ struct QexPODModel {
     uint32_t frameCount;      /* 0 or 1: not animated */
     uint32_t framesPerSecond; /* 30 unless the file says otherwise */
     uint32_t flags;
-    SPVRTPODImpl* runtime;    /* null until the scene was read whole */
-    uint32_t cacheStale;      /* 1: every world matrix is recomputed when next asked for */
-    uint32_t highestPass;     /* highest pass given to QexPODModel_SetPassID */
+    SPVRTPODImpl* runtime; /* null until the scene was read whole */
+    uint32_t cacheStale;   /* 1: every world matrix is recomputed when next asked for */
+    uint32_t highestPass;  /* highest pass given to QexPODModel_SetPassID */
 };
 
 /** Reads a POD file.
@@ -1258,8 +1257,9 @@ QEX_API int32_t QexPODModel_ReadFromMemory(QexPODModel* scene, const void* data,
  *  @param option4  not read
  *  @return 0, or -1 with one line in the log that says what is wrong and where. After -1 the scene is partly
  *  filled and only good to be released. */
-QEX_API int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* stream, uint32_t optionA,
-                                                 uint32_t option2, uint32_t optionB, uint32_t option4);
+QEX_API int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* stream,
+                                                 uint32_t optionA, uint32_t option2, uint32_t optionB,
+                                                 uint32_t option4);
 
 /** Builds the run-time part of a scene (frame 0, bind pose); an existing one is replaced. Reading calls it.
  *  @return 0, or -1 when memory runs out. */
@@ -1392,7 +1392,8 @@ QEX_API void QexPODModel_SetNodeMatrix(QexPODModel* scene, uint32_t index, const
 QEX_API void QexPODModel_ResetNodeTransform(QexPODNode* node);
 
 /** The node's translation at its current frame, as a matrix; identity without position keys. */
-QEX_API void QexPODModel_GetTranslationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node);
+QEX_API void QexPODModel_GetTranslationMatrix(const QexPODModel* scene, QexMatrix* out,
+                                              const QexPODNode* node);
 
 /** The node's rotation at its current frame (spherical interpolation); identity without rotation keys. */
 QEX_API void QexPODModel_GetRotationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node);
@@ -1435,7 +1436,8 @@ QEX_API float QexPODModel_GetCameraPosEx(QexPODModel* scene, float* position, fl
                                          uint32_t index);
 
 /** Reads a camera's clip distances; nothing is written for a bad index. */
-QEX_API void QexPODModel_GetCameraNearFar(const QexPODModel* scene, float* zNear, float* zFar, uint32_t index);
+QEX_API void QexPODModel_GetCameraNearFar(const QexPODModel* scene, float* zNear, float* zFar,
+                                          uint32_t index);
 
 /** Reads a light's position and direction (the negated third column of its node's world matrix), 3 floats
  *  each; nothing is written for a bad index. */
@@ -1469,8 +1471,8 @@ QEX_API int32_t QexPODModel_FindNodeIdxByName(const QexPODModel* scene, const ch
 
 /** The cache. */
 typedef struct QexRenderState {
-    uint32_t boundTexture;   /* 0 after reset, all bits set after a change of the unit; binds are not cached */
-    uint32_t activeTexture;  /* GL_TEXTURE0 + n, or all bits set: unknown */
+    uint32_t boundTexture;  /* 0 after reset, all bits set after a change of the unit; binds are not cached */
+    uint32_t activeTexture; /* GL_TEXTURE0 + n, or all bits set: unknown */
     uint32_t currentProgram; /* GL program, or all bits set: unknown */
 } QexRenderState;
 
@@ -1700,9 +1702,9 @@ struct QexTexture {
  *  @param wrap     QEX_WRAP_...
  *  @param pixels   width * height pixels, rows tightly packed; kept by pointer, not owned
  *  @return 0. Unknown codes are skipped, as the single functions say. The name becomes "Noname". */
-QEX_API int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height, uint32_t format,
-                                            int32_t ignored, uint32_t stage, uint32_t filter, uint32_t wrap,
-                                            void* pixels);
+QEX_API int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height,
+                                            uint32_t format, int32_t ignored, uint32_t stage, uint32_t filter,
+                                            uint32_t wrap, void* pixels);
 
 /** Creates a texture from an uncompressed 24- or 32-bit TGA image in memory. Only width, height and depth of
  *  its header are read; pixels follow the 18-byte header in stored order. The caller vouches for the length.
@@ -1752,8 +1754,8 @@ QEX_API void QexTexture_Release(QexTexture* texture);
 QEX_API int32_t QexTexture_SetName(QexTexture* texture, const char* name);
 
 /** Finds the last '/', '\\' or ':' of a path. No GL context needed.
- *  @return a pointer to that character (it is part of the result), to the start of the path when there is none
- *  after the first character, or null for an empty path. */
+ *  @return a pointer to that character (it is part of the result), to the start of the path when there is
+ * none after the first character, or null for an empty path. */
 QEX_API const char* GetNameFromFullPath(const char* path);
 
 /** @return the white default texture. No GL context needed. */
@@ -1774,18 +1776,18 @@ QEX_API int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int
 
 /** The legacy PVR header, as QexTexture_LoadPVRFromMem gives it back. */
 typedef struct QexPVRHeader {
-    uint32_t headerSize;   /* 52, or 44 for the oldest files */
-    uint32_t height;       /* pixels */
-    uint32_t width;        /* pixels */
-    uint32_t mipmapCount;  /* levels below level 0 */
-    uint32_t flags;        /* bits 0..7 pixel type; 0x100 mipmaps, 0x200 twiddled, 0x1000 cube map */
-    uint32_t dataSize;     /* bytes of one surface with all its levels */
+    uint32_t headerSize;  /* 52, or 44 for the oldest files */
+    uint32_t height;      /* pixels */
+    uint32_t width;       /* pixels */
+    uint32_t mipmapCount; /* levels below level 0 */
+    uint32_t flags;       /* bits 0..7 pixel type; 0x100 mipmaps, 0x200 twiddled, 0x1000 cube map */
+    uint32_t dataSize;    /* bytes of one surface with all its levels */
     uint32_t bitsPerPixel;
     uint32_t redMask;
     uint32_t greenMask;
     uint32_t blueMask;
     uint32_t alphaMask;
-    uint32_t tag;          /* "PVR!" */
+    uint32_t tag; /* "PVR!" */
     uint32_t numSurfaces;
 } QexPVRHeader;
 
@@ -1891,7 +1893,8 @@ QEX_API void QexTextureShader_Render(QexShaderModule* module, QexModel* model, u
  * never changes a node's pass; a node without a material keeps what is bound on unit 0.
  * Slots: mvpMatrix, opacity, alphaThreshold locations; the threshold. */
 
-/** Creates the unlit module without alpha texture, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** Creates the unlit module without alpha texture, threshold 0.5. @return as QexTextureShader_CreateProgram.
+ */
 QEX_API QexShaderModule* QexTextureNoAlphaShader_CreateProgram(void);
 /** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
 QEX_API int32_t QexTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
@@ -1902,16 +1905,17 @@ QEX_API void QexTextureNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, 
 /** @return the alpha threshold. */
 QEX_API float QexTextureNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
 /** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
-QEX_API int32_t QexTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
+QEX_API int32_t QexTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                 uint32_t nodeIndex);
 /** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                             const QexLightSet* lights, const QexMatrix* modelMatrix,
                                             const QexMatrix* view, const QexMatrix* projection,
                                             const QexShadowInfo* shadow);
 
-/* QexSkinningTextureShader (QEX_SHADER_SKINNING_TEXTURE): as QexTextureShader for meshes that follow bones, one
- * draw a bone batch, up to 16 bones a batch and 4 a vertex. It leaves the node's pass alone.
- * Slots: boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the threshold. */
+/* QexSkinningTextureShader (QEX_SHADER_SKINNING_TEXTURE): as QexTextureShader for meshes that follow bones,
+ * one draw a bone batch, up to 16 bones a batch and 4 a vertex. It leaves the node's pass alone. Slots:
+ * boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the threshold. */
 
 /** Most bones in a batch that the skinned modules draw. */
 #define QEX_MAX_BATCH_BONES 16
@@ -1929,8 +1933,8 @@ QEX_API float QexSkinningTextureShader_GetAlphaThreshold(const QexShaderModule* 
 /** Draws a node's batches; the module's program is current and its uniforms set.
  *  @param modelMatrix  applied in front of the bone matrices, or null
  *  @return 0. */
-QEX_API int32_t QexSkinningTextureShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
-                                                  const QexMatrix* modelMatrix);
+QEX_API int32_t QexSkinningTextureShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                  uint32_t nodeIndex, const QexMatrix* modelMatrix);
 /** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningTextureShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
@@ -1973,24 +1977,25 @@ typedef int32_t (*QexBindTextureHook)(QexModel* model, uint32_t nodeIndex);
  *  @param path      directory and texture name; may be rewritten
  *  @param capacity  characters that path holds, besides the NUL
  *  @return 0: the engine loads `path`. Non-zero: the hook dealt with it; the material's record (the last
- *  non-null entry of model->textures) is zeroed, and the hook may fill it with a texture of its own, which the
- *  model then owns. QexModel_LoadTextureFromCache makes no record: there the material's entries stay null. */
+ *  non-null entry of model->textures) is zeroed, and the hook may fill it with a texture of its own, which
+ * the model then owns. QexModel_LoadTextureFromCache makes no record: there the material's entries stay null.
+ */
 typedef int32_t (*QexLoadTextureHook)(QexModel* model, char* path, int32_t capacity);
 /** Called once for each mesh node at the end of loading. @return not read. */
 typedef int32_t (*QexMeshNodeLoadedHook)(QexModel* model, QexPODMesh* mesh, uint32_t meshNodeIndex);
 
 struct QexModel {
-    uint32_t flags;              /* QEX_MODEL_... */
+    uint32_t flags; /* QEX_MODEL_... */
     QexPODModel scene;
-    QexTexture** textures;       /* diffuse texture of each material, null where none */
-    QexTexture** alphaTextures;  /* alpha texture of each material, null where none */
-    QexBoundingBox* nodeBoxes;   /* box of each mesh node in the world */
-    QexBoundingBox* screenBoxes; /* box of each mesh node in normalised device coordinates */
-    uint32_t* vertexBuffers;     /* GL buffer of each mesh */
-    uint32_t* indexBuffers;      /* GL buffer of each mesh, 0 for one without indices */
-    float currentFrame;          /* animation position in frames */
-    QexBindTextureHook bindTextureHook;       /* the three hooks: optional, set between */
-    QexLoadTextureHook loadTextureHook;       /* QexModel_Create and loading */
+    QexTexture** textures;              /* diffuse texture of each material, null where none */
+    QexTexture** alphaTextures;         /* alpha texture of each material, null where none */
+    QexBoundingBox* nodeBoxes;          /* box of each mesh node in the world */
+    QexBoundingBox* screenBoxes;        /* box of each mesh node in normalised device coordinates */
+    uint32_t* vertexBuffers;            /* GL buffer of each mesh */
+    uint32_t* indexBuffers;             /* GL buffer of each mesh, 0 for one without indices */
+    float currentFrame;                 /* animation position in frames */
+    QexBindTextureHook bindTextureHook; /* the three hooks: optional, set between */
+    QexLoadTextureHook loadTextureHook; /* QexModel_Create and loading */
     QexMeshNodeLoadedHook meshNodeLoadedHook;
 };
 
@@ -2028,9 +2033,9 @@ struct QexShadowInfo {
     QexMatrix shadowSpaceMatrix; /* world to shadow-map coordinates, 0..1 */
     QexShadowCaster* casters;
     uint32_t casterCount;
-    uint32_t shadowTexture;      /* GL texture */
-    float shadowIntensity;       /* brightness factor of shadowed pixels */
-    float biasValue;             /* depth bias */
+    uint32_t shadowTexture; /* GL texture */
+    float shadowIntensity;  /* brightness factor of shadowed pixels */
+    float biasValue;        /* depth bias */
 };
 
 /** The skinned shadow program that all models share. */
@@ -2058,16 +2063,16 @@ QEX_API int32_t QexModel_Create(QexModel* model);
  *  node. A model that was loaded before is unloaded first.
  *  @param directory  put in front of the file's and the textures' names as it is, with its separator
  *  @param file       POD file; directory and name together at most 255 characters
- *  @return 0, or the failing step's result, with lines in the log that say what is wrong; the model then holds
- *  nothing but may be unloaded all the same. Missing textures fail nothing. */
+ *  @return 0, or the failing step's result, with lines in the log that say what is wrong; the model then
+ * holds nothing but may be unloaded all the same. Missing textures fail nothing. */
 QEX_API int32_t QexModel_LoadContent(QexModel* model, const char* directory, const char* file);
 
 /** Loads a model whole from memory, its textures from a cache.
  *  @param data   the POD file; must outlive the model, which uses its animation keys in place
  *  @param size   bytes of data
- *  @param cache  name cache of QexTexture records or of pointers to them (its element size tells), or null for
- *                none; keeps owning the textures. Records must stay in place while the model uses them: such
- *                a cache may not grow.
+ *  @param cache  name cache of QexTexture records or of pointers to them (its element size tells), or null
+ * for none; keeps owning the textures. Records must stay in place while the model uses them: such a cache may
+ * not grow.
  *  @return 0, also when reading the scene fails; -1 when its geometry cannot be drawn or memory runs out.
  *  Failures put a line in the log; the model then holds nothing and draws nothing. */
 QEX_API int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_t size,
@@ -2080,8 +2085,8 @@ QEX_API int32_t QexModel_LoadFromFile(QexModel* model, const char* directory, co
 /** Reads the scene only, from memory that must outlive it. No GL context needed. @return 0, or -1. */
 QEX_API int32_t QexModel_LoadFromMemory(QexModel* model, const void* data, uint32_t size);
 
-/** Creates the GL buffers and works out each mesh's box and attribute layout. Vertices are laid out interleaved
- *  where the file does not; 32-bit indices become 16-bit ones.
+/** Creates the GL buffers and works out each mesh's box and attribute layout. Vertices are laid out
+ * interleaved where the file does not; 32-bit indices become 16-bit ones.
  *  @return 0; -1 with a line in the log when memory runs out or a mesh needs more than 16-bit indices or a
  *  batch more than QEX_MAX_BATCH_BONES bones. */
 QEX_API int32_t QexModel_DownloadGeometry(QexModel* model);
@@ -2102,8 +2107,8 @@ QEX_API int32_t QexModel_CreateDefaultShader(void);
  *  @param force  1: frees it whatever the count */
 QEX_API void QexModel_ReleaseShader(int32_t force);
 
-/** Sets the size of the shadow target that is made with the next shared set; 512 x 512 at first. No GL context
- *  needed. */
+/** Sets the size of the shadow target that is made with the next shared set; 512 x 512 at first. No GL
+ * context needed. */
 QEX_API void QexModel_SetShadowMapSize(int32_t width, int32_t height);
 
 /** Frees everything that the model holds. A second call does nothing. */
@@ -2115,8 +2120,8 @@ QEX_API void QexModel_UnloadGeometry(QexModel* model);
 /** Releases the textures that the model owns and forgets the others. */
 QEX_API void QexModel_UnloadTextures(QexModel* model);
 
-/** Replaces a material's diffuse texture. A model that owns its textures (QEX_MODEL_OWNS_TEXTURES) releases the
- *  new one too and frees it with QexMemory_Free. No GL context needed.
+/** Replaces a material's diffuse texture. A model that owns its textures (QEX_MODEL_OWNS_TEXTURES) releases
+ * the new one too and frees it with QexMemory_Free. No GL context needed.
  *  @param texture  may be null
  *  @param index    material
  *  @return the texture before, now the caller's; null, with nothing changed, for a bad index. */
@@ -2137,23 +2142,23 @@ QEX_API uint32_t QexModel_GetNumMeshNodes(const QexModel* model);
 /* ======================================================================================================
  * Models: rendering
  *
- * The render calls draw mesh nodes in index order, each through its shader module. A `pass` argument draws only
- * the nodes whose mesh has that pass ID (0 after reading). `modelMatrix` is applied in front of every node's
- * world matrix and may be null; `lights` may be null where no module is lit. Nothing is allocated. Needs a
- * current GL context, except where a function says not.
+ * The render calls draw mesh nodes in index order, each through its shader module. A `pass` argument draws
+ * only the nodes whose mesh has that pass ID (0 after reading). `modelMatrix` is applied in front of every
+ * node's world matrix and may be null; `lights` may be null where no module is lit. Nothing is allocated.
+ * Needs a current GL context, except where a function says not.
  * ====================================================================================================== */
 
 /** A transparent node that was put off. */
 typedef struct TransparentSPODNodeInfo {
-    QexModel* model;     /* null: an empty entry */
+    QexModel* model; /* null: an empty entry */
     uint32_t nodeIndex;
-    float distance;      /* squared distance from the eye, filled when the list is drawn */
+    float distance; /* squared distance from the eye, filled when the list is drawn */
     QexLightSet lights;
     QexMatrix modelMatrix;
     QexVec3 eye;
     QexMatrix view;
     QexMatrix projection;
-    int32_t passID;      /* pass of the call that put it off */
+    int32_t passID; /* pass of the call that put it off */
 } TransparentSPODNodeInfo;
 
 /** The eye of the last camera that a render call used. */
@@ -2187,8 +2192,8 @@ QEX_API void QexModel_RenderWithCameraEx(QexModel* model, const QexLightSet* lig
                                          const QexMatrix* modelMatrix, uint32_t pass, uint32_t mode,
                                          TransparentSPODNodeInfo* list, uint32_t* count);
 
-/** Draws each node whose material's opacity and whose global alpha are at least 1 and whom the mode allows; the
- *  others go to the list.
+/** Draws each node whose material's opacity and whose global alpha are at least 1 and whom the mode allows;
+ * the others go to the list.
  *  @param eye    3 floats of the eye position, for sorting
  *  @param mode   QEX_RENDER_...; another draws none
  *  @param list   room for every mesh node that may be put off, or null: they are dropped
@@ -2199,8 +2204,8 @@ QEX_API void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLight
                                                  uint32_t pass, uint32_t mode, TransparentSPODNodeInfo* list,
                                                  uint32_t* count);
 
-/** Sorts the list by distance (with the C library's qsort, which may allocate for long lists) and draws the entries of the pass, farthest first. Entries of several models and
- *  cameras may share a list. */
+/** Sorts the list by distance (with the C library's qsort, which may allocate for long lists) and draws the
+ * entries of the pass, farthest first. Entries of several models and cameras may share a list. */
 QEX_API void QexModel_RenderAlphaBlendingNodes(TransparentSPODNodeInfo* list, uint32_t count, uint32_t pass);
 
 /** qsort comparison of two list entries, nearest first. No GL context needed. @return -1, 0 or 1. */
@@ -2225,8 +2230,8 @@ QEX_API void QexModel_SetOpacityR(QexModel* model, uint32_t nodeIndex, float opa
  *  @param names  node names, or null for none */
 QEX_API void QexModel_SetAlphaBlendingNodes(QexModel* model, const char* const* names, int32_t count);
 
-/** Puts the named nodes into the alpha-blending list and stores their blend order. Other nodes are left alone.
- *  No GL context needed.
+/** Puts the named nodes into the alpha-blending list and stores their blend order. Other nodes are left
+ * alone. No GL context needed.
  *  @param names   node names, or null: nothing happens
  *  @param orders  one value per node of the scene, indexed by node */
 QEX_API void QexModel_SetAlphaBlendingNodesWithOrder(QexModel* model, const char* const* names,
@@ -2248,8 +2253,8 @@ QEX_API void QexModel_SetAlphaTestCmpValue(float threshold);
 /** Does nothing; kept for callers. */
 QEX_API void QexModel_SetAnimatedUVUniform(QexModel* model, float u, float v);
 
-/** Recomputes a mesh node's box (nodeBoxes): its mesh's box carried by the node, for a skinned mesh by the first
- *  bone of its first batch. No GL context needed.
+/** Recomputes a mesh node's box (nodeBoxes): its mesh's box carried by the node, for a skinned mesh by the
+ * first bone of its first batch. No GL context needed.
  *  @param modelMatrix  applied in front for meshes that are not skinned, or null */
 QEX_API void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
                                                 const QexMatrix* modelMatrix);
@@ -2257,8 +2262,8 @@ QEX_API void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNo
 /** QexModel_UpdateMeshNodeBoundingBox for every mesh node. No GL context needed. */
 QEX_API void QexModel_UpdateModelBoundingBox(QexModel* model, const QexMatrix* modelMatrix);
 
-/** Reads the scene's first lights, at most QEX_MAX_LIGHTS; one that is neither point nor directional leaves its
- *  entry as it was. No GL context needed. @param set  out */
+/** Reads the scene's first lights, at most QEX_MAX_LIGHTS; one that is neither point nor directional leaves
+ * its entry as it was. No GL context needed. @param set  out */
 QEX_API void QexModel_GetLight(QexModel* model, QexLightSet* set);
 
 /** Reads a scene camera at the current frame. No GL context needed.
@@ -2306,8 +2311,8 @@ QEX_API void QexFont_ReleaseShader(int32_t ignored);
 /** Releases the font. @return the log call's result. */
 QEX_API int32_t QexFont_Release(void);
 
-/** Appends a string to the persistent text. What lies beyond QEX_FONT_MAX_TEXT glyphs is left out, with a line
- *  in the log. Running out of memory ends the process with exit status 1. No GL context needed.
+/** Appends a string to the persistent text. What lies beyond QEX_FONT_MAX_TEXT glyphs is left out, with a
+ * line in the log. Running out of memory ends the process with exit status 1. No GL context needed.
  *  @param context     the engine's context; its height is read
  *  @param x, y        pixels
  *  @param r, g, b, a  0 to 255
@@ -2323,13 +2328,14 @@ QEX_API int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t 
 /** Empties the persistent text. No GL context needed. */
 QEX_API void QexFont_ClearString(void);
 
-/** Draws the persistent text from the engine's own memory: no GL buffer may be bound. Leaves blending on (source alpha over), the depth function at less or equal. */
+/** Draws the persistent text from the engine's own memory: no GL buffer may be bound. Leaves blending on
+ * (source alpha over), the depth function at less or equal. */
 QEX_API void QexFont_Draw(void);
 
 /** Draws a string at once, its first QEX_FONT_MAX_TEMP characters. Leaves the state that QexFont_Draw leaves.
  *  @param colour  0xAARRGGBB */
-QEX_API void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
-                                    uint32_t colour);
+QEX_API void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y,
+                                    const char* string, uint32_t colour);
 
 /** Draws a number in decimal at once; as QexFont_DrawTempString. */
 QEX_API void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_t y, int32_t number,
@@ -2347,27 +2353,27 @@ QEX_API void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_
 
 /** What the application asks for. The window-system words are copied to the context and not read. */
 typedef struct QexEngineConfig {
-    uint32_t reserved;      /* not read */
+    uint32_t reserved; /* not read */
     uint32_t windowWord1;
     uint32_t windowWord2;
     uint32_t windowWord3;
     uint32_t windowWord4;
-    int32_t width;          /* of the drawing surface, pixels */
+    int32_t width; /* of the drawing surface, pixels */
     int32_t height;
     uint32_t windowWord7;
     uint32_t windowWord8;
-    void* memory;           /* block lent for the memory pool until shutdown, may be null */
-    uint32_t memorySize;    /* its bytes */
+    void* memory;        /* block lent for the memory pool until shutdown, may be null */
+    uint32_t memorySize; /* its bytes */
 } QexEngineConfig;
 
 /** The engine's context; the application allocates it, initialisation fills it. */
 struct QexRuntimeContext {
-    uint32_t startTime;     /* what QexTime_Init returned */
+    uint32_t startTime; /* what QexTime_Init returned */
     uint32_t windowWord1;
     uint32_t windowWord2;
     uint32_t windowWord3;
     uint32_t windowWord4;
-    int32_t width;          /* of the drawing surface, pixels */
+    int32_t width; /* of the drawing surface, pixels */
     int32_t height;
     uint32_t windowWord7;
     uint32_t windowWord8;

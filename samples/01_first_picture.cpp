@@ -1,5 +1,5 @@
-// Sample 1: the shortest way from a scene to a picture. Makes a GL context, starts the engine, loads a scene, places a
-// camera, draws one frame and saves it.
+// Sample 1: the shortest way from a scene to a picture. Makes a GL context, starts the engine, loads a scene,
+// places a camera, draws one frame and saves it.
 #include <cstdio>
 
 #include <GLES2/gl2.h>
@@ -25,8 +25,8 @@ int main(int argc, char** argv) {
     config.height = kHeight;
     if (QexEngine_Init(&engine, sizeof config, &config) != 0) return 1;
 
-    // An application calls QexModel_LoadContent with a directory and a file; here the file is made in memory, and
-    // stays there as long as the model.
+    // An application calls QexModel_LoadContent with a directory and a file; here the file is made in memory,
+    // and stays there as long as the model.
     const std::vector<uint8_t> file = pod::WritePod(scenes::Grid(9));
     QexModel model;
     QexModel_Create(&model);

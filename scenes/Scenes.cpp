@@ -24,7 +24,9 @@ void AddFace(const Face& face, pod::MeshArrays* arrays) {
     for (uint32_t index : {0u, 1u, 2u, 2u, 1u, 3u}) arrays->indices.push_back(first + index);
 }
 
-pod::Vec4 AboutZ(float angle) { return {0, 0, std::sin(angle / 2), std::cos(angle / 2)}; }
+pod::Vec4 AboutZ(float angle) {
+    return {0, 0, std::sin(angle / 2), std::cos(angle / 2)};
+}
 
 // Keys that differ from frame to frame in all three channels.
 pod::Transform Wave(uint32_t frames, float phase) {
@@ -58,7 +60,8 @@ pod::MeshArrays Sheet(uint32_t size) {
     for (uint32_t y = 0; y + 1 < size; ++y)
         for (uint32_t x = 0; x + 1 < size; ++x) {
             const uint32_t i = y * size + x;
-            for (uint32_t index : {i, i + 1, i + size, i + size, i + 1, i + size + 1}) arrays.indices.push_back(index);
+            for (uint32_t index : {i, i + 1, i + size, i + size, i + 1, i + size + 1})
+                arrays.indices.push_back(index);
         }
     return arrays;
 }
@@ -122,8 +125,8 @@ pod::Scene Large(size_t bytes) {
     for (size_t size = 0; size < bytes; size += each) {
         const int32_t index = static_cast<int32_t>(scene.meshes.size());
         scene.meshes.push_back(mesh);
-        scene.nodes.push_back(
-            pod::BuildNode("sheet" + std::to_string(index), Wave(kFrames, static_cast<float>(index)), -1, index, 0));
+        scene.nodes.push_back(pod::BuildNode("sheet" + std::to_string(index),
+                                             Wave(kFrames, static_cast<float>(index)), -1, index, 0));
     }
     scene.meshNodeCount = static_cast<uint32_t>(scene.nodes.size());
     return scene;

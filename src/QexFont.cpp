@@ -70,7 +70,9 @@ QexTexture s_Texture;
 QexFontProgram s_Program;
 QexMatrix s_Projection;
 
-uint32_t IndexCount(uint32_t glyphs) { return glyphs * 6 - 2; }
+uint32_t IndexCount(uint32_t glyphs) {
+    return glyphs * 6 - 2;
+}
 
 template <class T>
 bool Resize(T*& array, uint64_t bytes) {
@@ -115,8 +117,10 @@ void BuildIndices(Glyphs* glyphs) {
 }
 
 // Vertex i of a quad lies right for odd i and up for i > 1.
-void WriteGlyph(Glyphs* glyphs, uint32_t slot, float left, float bottom, uint8_t character, const Colour& colour) {
-    const uint32_t known = character >= kFirstCharacter && character <= kLastCharacter ? character : kLastCharacter;
+void WriteGlyph(Glyphs* glyphs, uint32_t slot, float left, float bottom, uint8_t character,
+                const Colour& colour) {
+    const uint32_t known =
+        character >= kFirstCharacter && character <= kLastCharacter ? character : kLastCharacter;
     const uint32_t cell = known - kFirstCharacter;
     const int32_t s = static_cast<int32_t>(cell % kSheetColumns) * kGlyphWidth;
     const int32_t t = static_cast<int32_t>(cell / kSheetColumns) * kGlyphHeight;
@@ -198,7 +202,9 @@ bool CheckCreated(const char* function) {
 
 }  // namespace
 
-const QexFontProgram* QexFont_GetProgram() { return &s_Program; }
+const QexFontProgram* QexFont_GetProgram() {
+    return &s_Program;
+}
 
 extern "C" {
 
@@ -261,8 +267,8 @@ int32_t QexFont_Release(void) {
     return QexLog(QEX_TAG, "<QexFont_Release> Font released!");
 }
 
-int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string, int32_t r,
-                          int32_t g, int32_t b, int32_t a) {
+int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
+                          int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_AddString")) return 0;
     const uint32_t length = static_cast<uint32_t>(strlen(string));
     const uint32_t slot = s_Text.count;
@@ -277,8 +283,8 @@ int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y
     return static_cast<int32_t>(length);
 }
 
-int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string, int32_t r,
-                              int32_t g, int32_t b, int32_t a) {
+int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
+                              int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_ReplaceString")) return 0;
     const uint32_t length = static_cast<uint32_t>(strlen(string));
     const uint32_t count = FitText("QexFont_ReplaceString", 0, length);
@@ -324,7 +330,8 @@ void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t
     glDepthFunc(GL_LEQUAL);
 }
 
-void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_t y, int32_t number, uint32_t colour) {
+void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_t y, int32_t number,
+                     uint32_t colour) {
     char text[16];
     snprintf(text, sizeof text, "%d", number);
     QexFont_DrawTempString(context, x, y, text, colour);

@@ -5,7 +5,6 @@
 
 #include "Qex.h"
 
-
 namespace {
 
 constexpr int kCellWidth = 8, kCellHeight = 16, kColumns = 32, kRows = 3;

@@ -9,11 +9,11 @@
 #include "QexDiagnostics.h"
 
 #if QEX_GL_CHECKS
-#define QEX_GL_CHECK()                                                                                       \
-    do {                                                                                                     \
-        const GLenum qexError = glGetError();                                                                \
-        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                                                    \
-            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __LINE__);                                     \
+#define QEX_GL_CHECK()                                                   \
+    do {                                                                 \
+        const GLenum qexError = glGetError();                            \
+        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                \
+            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __LINE__); \
     } while (0)
 #else
 #define QEX_GL_CHECK() ((void)QEX_MODULE)

@@ -27,7 +27,7 @@ enum class Kind : uint8_t {
     Element,  // a CPODData container
     UVWCount,
     UVW,
-    Static    // an older file's static transform: `unit` words, kept until the node ends
+    Static  // an older file's static transform: `unit` words, kept until the node ends
 };
 
 struct Field {
@@ -348,9 +348,11 @@ bool ReadElementData(Reader& reader, uint32_t length, CPODData* element, uint32_
     if (size == 1)
         read = QexSourceStream_Read(reader.stream, element->data, length);
     else if (size == 2)
-        read = QexSourceStream_ReadArray16(reader.stream, reinterpret_cast<uint16_t*>(element->data), length / 2);
+        read = QexSourceStream_ReadArray16(reader.stream, reinterpret_cast<uint16_t*>(element->data),
+                                           length / 2);
     else
-        read = QexSourceStream_ReadArray32(reader.stream, reinterpret_cast<uint32_t*>(element->data), length / 4);
+        read = QexSourceStream_ReadArray32(reader.stream, reinterpret_cast<uint32_t*>(element->data),
+                                           length / 4);
     return read && QexSourceStream_Skip(reader.stream, length % size);
 }
 
@@ -399,7 +401,8 @@ bool ReadField(Reader& reader, const Field& field, uint32_t length, void* record
     switch (field.kind) {
         case Kind::Words: return ReadWords(reader, field, length, &At<uint8_t>(record, field.offset));
         case Kind::String: return ReadString(reader, field, length, At<char*>(record, field.offset));
-        case Kind::Array: return ReadArray(reader, field, length, At<uint32_t*>(record, field.offset), extents);
+        case Kind::Array:
+            return ReadArray(reader, field, length, At<uint32_t*>(record, field.offset), extents);
         case Kind::Keys: return ReadKeys(reader, field, length, static_cast<QexPODNode*>(record), extents);
         case Kind::Bytes: return ReadInterleaved(reader, field, length, mesh, extents);
         case Kind::UVWCount: return ReadUVWCount(reader, field, length, mesh);
@@ -410,7 +413,8 @@ bool ReadField(Reader& reader, const Field& field, uint32_t length, void* record
         }
         case Kind::UVW: {
             if (reader.uvwRead >= mesh->uvwChannelCount)
-                return Fail(reader, "a mesh has more UV channels than the %u it counts", mesh->uvwChannelCount);
+                return Fail(reader, "a mesh has more UV channels than the %u it counts",
+                            mesh->uvwChannelCount);
             const uint32_t channel = reader.uvwRead++;
             return ReadElement(reader, field.id, &mesh->uvws[channel], mesh->interleaved != nullptr,
                                extents[kExtentUVWs + channel]);
@@ -426,13 +430,16 @@ bool ReadField(Reader& reader, const Field& field, uint32_t length, void* record
 
 void BeginMaterial(void* record) {
     QexPODMaterial* material = static_cast<QexPODMaterial*>(record);
-    for (int32_t* index = &material->diffuseTexture; index <= &material->refractionTexture; ++index) *index = -1;
-    material->blendSrcColour = material->blendSrcAlpha = 1;          // GL_ONE
-    material->blendDstColour = material->blendDstAlpha = 0;          // GL_ZERO
-    material->blendOpColour = material->blendOpAlpha = 0x8006;       // GL_FUNC_ADD
+    for (int32_t* index = &material->diffuseTexture; index <= &material->refractionTexture; ++index)
+        *index = -1;
+    material->blendSrcColour = material->blendSrcAlpha = 1;     // GL_ONE
+    material->blendDstColour = material->blendDstAlpha = 0;     // GL_ZERO
+    material->blendOpColour = material->blendOpAlpha = 0x8006;  // GL_FUNC_ADD
 }
 
-void BeginMesh(void* record) { QexMatrix_Identity(&static_cast<QexPODMesh*>(record)->unpackMatrix); }
+void BeginMesh(void* record) {
+    QexMatrix_Identity(&static_cast<QexPODMesh*>(record)->unpackMatrix);
+}
 
 void SwapElement(QexPODMesh* mesh, const CPODData& element) {
     const uint32_t size = QexPODData_ComponentSize(element.type);
@@ -493,10 +500,10 @@ bool EndNode(Reader& reader, void* record, uint32_t* extents) {
            CompleteStatic(node->scale, fixed.scale, 7, QEX_NODE_SCALE_ANIMATED, node, extents[kExtentScale]);
 }
 
-#define KIND(countId, blockId, name, type, counter, array, countLine, title, fields, begin, end)         \
-    {                                                                                                    \
+#define KIND(countId, blockId, name, type, counter, array, countLine, title, fields, begin, end)            \
+    {                                                                                                       \
         countId, blockId, name, sizeof(type), offsetof(QexPODModel, counter), offsetof(QexPODModel, array), \
-            countLine, title, fields, Count(fields), begin, end                                          \
+            countLine, title, fields, Count(fields), begin, end                                             \
     }
 const RecordKind kKinds[kPODKinds] = {
     KIND(2002, 2010, "camera", QexPODCamera, cameraCount, cameras, "  - %d camera(s) found.\n",
@@ -621,7 +628,8 @@ bool ReadScene(Reader& reader) {
 
 bool ReadVersion(Reader& reader, uint32_t length) {
     char text[sizeof kVersion] = {};
-    if (length != sizeof kVersion) return Fail(reader, "the version block holds %u bytes instead of 11", length);
+    if (length != sizeof kVersion)
+        return Fail(reader, "the version block holds %u bytes instead of 11", length);
     if (!CheckLength(reader, kVersionBlock, length)) return false;
     if (!QexSourceStream_Read(reader.stream, reinterpret_cast<uint8_t*>(text), length)) return false;
     if (memcmp(text, kVersion, sizeof kVersion) != 0)
@@ -665,8 +673,8 @@ bool Finish(Reader& reader, bool anyway) {
 
 extern "C" {
 
-int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* stream, uint32_t optionA, uint32_t,
-                                         uint32_t optionB, uint32_t) {
+int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* stream, uint32_t optionA,
+                                         uint32_t, uint32_t optionB, uint32_t) {
     if (scene) memset(scene, 0, sizeof *scene);
     if (!stream || !stream->file) return -1;
     Reader reader = {};

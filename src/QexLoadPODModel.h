@@ -1,8 +1,8 @@
 // Reading POD files: what the reader and its checks share.
 //
 // The reader fills the scene's records block by block and notes how long each array in the file was. When the
-// scene block ends, the checks compare every count, index and offset with those lengths, once, so that nothing
-// later has to. Lengths live as long as the read.
+// scene block ends, the checks compare every count, index and offset with those lengths, once, so that
+// nothing later has to. Lengths live as long as the read.
 #pragma once
 
 #include "Qex.h"

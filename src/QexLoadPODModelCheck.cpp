@@ -28,7 +28,9 @@ bool Fail(const Check& at, const char* format, ...) {
 }
 
 // An index that may be -1 for none.
-bool InRange(int32_t index, uint32_t count) { return index == -1 || static_cast<uint32_t>(index) < count; }
+bool InRange(int32_t index, uint32_t count) {
+    return index == -1 || static_cast<uint32_t>(index) < count;
+}
 
 // ---- Meshes ----
 
@@ -41,7 +43,8 @@ bool CheckElement(const Check& at, const char* name, CPODData* element, uint32_t
         element->componentCount = 0;  // declared, but without data
         return true;
     }
-    if (!QexPODData_ComponentSize(element->type)) return Fail(at, "%s of unknown type %u", name, element->type);
+    if (!QexPODData_ComponentSize(element->type))
+        return Fail(at, "%s of unknown type %u", name, element->type);
     if (element->componentCount > 4) return Fail(at, "%s of %u components", name, element->componentCount);
     const uint32_t size = QexPODData_ElementSize(element->type, element->componentCount);
     if (!element->stride && !mesh.interleaved) element->stride = size;
@@ -60,9 +63,12 @@ bool CheckElements(const Check& at, const uint32_t* extents) {
         CPODData* element;
         uint32_t extent;
     } elements[] = {
-        {"positions", &mesh.vertices, kExtentVertices},       {"normals", &mesh.normals, kExtentNormals},
-        {"tangents", &mesh.tangents, kExtentTangents},        {"binormals", &mesh.binormals, kExtentBinormals},
-        {"colours", &mesh.colours, kExtentColours},           {"bone indices", &mesh.boneIndices, kExtentBoneIndices},
+        {"positions", &mesh.vertices, kExtentVertices},
+        {"normals", &mesh.normals, kExtentNormals},
+        {"tangents", &mesh.tangents, kExtentTangents},
+        {"binormals", &mesh.binormals, kExtentBinormals},
+        {"colours", &mesh.colours, kExtentColours},
+        {"bone indices", &mesh.boneIndices, kExtentBoneIndices},
         {"bone weights", &mesh.boneWeights, kExtentBoneWeights},
     };
     for (const auto& e : elements)
@@ -128,8 +134,8 @@ uint32_t BoneIndexType(uint32_t type) {
     }
 }
 
-// Every bone that a vertex really follows lies in its batch. A bone of weight 0 may be anything in the file; it
-// becomes 0, so that no shader reads past its matrices.
+// Every bone that a vertex really follows lies in its batch. A bone of weight 0 may be anything in the file;
+// it becomes 0, so that no shader reads past its matrices.
 bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
     QexPODMesh& mesh = at.scene->meshes[at.index];
     const uint32_t n = QexPODData_Components(mesh.boneIndices);
@@ -143,8 +149,9 @@ bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
     bool changed = false;
     for (uint32_t i = 0; i < n; ++i) {
         if (bone[i] >= 0 && bone[i] < static_cast<float>(bones)) continue;
-        if (weight[i] != 0) return Fail(at, "vertex %u follows bone %g of a batch of %d", vertex,
-                                        static_cast<double>(bone[i]), bones);
+        if (weight[i] != 0)
+            return Fail(at, "vertex %u follows bone %g of a batch of %d", vertex,
+                        static_cast<double>(bone[i]), bones);
         bone[i] = 0;
         changed = true;
     }
@@ -157,8 +164,10 @@ bool CheckBatch(const Check& at, int32_t batch) {
     const QexBoneBatches& b = mesh.boneBatches;
     const int32_t bones = b.bonesPerBatch[batch];
     const uint32_t first = static_cast<uint32_t>(b.offsets[batch]);
-    const uint32_t end = batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
-    if (bones < 0 || bones > b.maxBones) return Fail(at, "batch %d has %d bones of %d", batch, bones, b.maxBones);
+    const uint32_t end =
+        batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
+    if (bones < 0 || bones > b.maxBones)
+        return Fail(at, "batch %d has %d bones of %d", batch, bones, b.maxBones);
     for (int32_t i = 0; i < bones; ++i) {
         const int32_t node = b.boneTable[int64_t{batch} * b.maxBones + i];
         if (node < 0 || static_cast<uint32_t>(node) >= at.scene->nodeCount)
@@ -179,14 +188,16 @@ bool CheckBatch(const Check& at, int32_t batch) {
 bool CheckSkin(const Check& at, const uint32_t* extents) {
     QexPODMesh& mesh = at.scene->meshes[at.index];
     const QexBoneBatches& b = mesh.boneBatches;
-    if (b.batchCount < 0 || b.maxBones < 0) return Fail(at, "%d batches of %d bones", b.batchCount, b.maxBones);
+    if (b.batchCount < 0 || b.maxBones < 0)
+        return Fail(at, "%d batches of %d bones", b.batchCount, b.maxBones);
     const uint64_t table = static_cast<uint64_t>(b.batchCount) * static_cast<uint64_t>(b.maxBones);
     const uint32_t count = static_cast<uint32_t>(b.batchCount);
     if (table > extents[kExtentBoneTable] || count > extents[kExtentBonesPerBatch] ||
         count > extents[kExtentBatchOffsets])
         return Fail(at, "%d batches of %d bones, but shorter tables", b.batchCount, b.maxBones);
     mesh.skinned = 0;
-    if (!mesh.boneIndices.componentCount || !mesh.boneWeights.componentCount || !mesh.vertexCount) return true;
+    if (!mesh.boneIndices.componentCount || !mesh.boneWeights.componentCount || !mesh.vertexCount)
+        return true;
     if (!b.batchCount || mesh.stripCount || !mesh.faces.data) {
         QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> mesh %u: follows bones, but %s; it stands still",
                at.index, !b.batchCount ? "has no bone batches" : "is not a list of indexed triangles");
@@ -231,7 +242,8 @@ void CheckKeys(const Check& at, const Channel& channel, uint32_t indexCount, uin
         fault = "fewer key indices than frames";
     } else {
         for (uint32_t i = 0; i < frames && !fault; ++i)
-            if (uint64_t{(*channel.index)[i]} + channel.keyFloats > floats) fault = "a key index beyond its keys";
+            if (uint64_t{(*channel.index)[i]} + channel.keyFloats > floats)
+                fault = "a key index beyond its keys";
     }
     if (!fault) return;
     node.animationFlags &= ~channel.bit;
@@ -262,7 +274,8 @@ bool CheckNode(const Check& at, const uint32_t* extents) {
     if (!InRange(node.materialIndex, at.scene->materialCount))
         return Fail(at, "it uses material %d of %u", node.materialIndex, at.scene->materialCount);
     const Channel channels[] = {
-        {"position", QEX_NODE_POSITION_ANIMATED, 3, &node.positionIndex, &node.position, QEX_NODE_SHARED_POSITION},
+        {"position", QEX_NODE_POSITION_ANIMATED, 3, &node.positionIndex, &node.position,
+         QEX_NODE_SHARED_POSITION},
         {"rotation", QEX_NODE_ROTATION_ANIMATED, 4, &node.rotationIndex, &node.rotation, 0},
         // Only the first three of a scale key's seven floats are read; some exporters cut the last key short.
         {"scale", QEX_NODE_SCALE_ANIMATED, 3, &node.scaleIndex, &node.scale, QEX_NODE_SHARED_SCALE},
@@ -295,7 +308,8 @@ bool CheckCamera(const Check& at, const uint32_t* extents) {
     if (!InRange(camera.targetIndex, at.scene->nodeCount))
         return Fail(at, "its target is node %d of %u", camera.targetIndex, at.scene->nodeCount);
     if (camera.animatedFov && extents[kExtentFov] < (at.scene->frameCount ? at.scene->frameCount : 1)) {
-        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> camera %u: fewer fields of view than frames; it keeps one",
+        QexLog(QEX_TAG,
+               "<QexPODModel_ReadFromSourceStream> camera %u: fewer fields of view than frames; it keeps one",
                at.index);
         QexMemory_Free(camera.animatedFov);
         camera.animatedFov = nullptr;
@@ -306,7 +320,8 @@ bool CheckCamera(const Check& at, const uint32_t* extents) {
 bool CheckCounts(QexPODModel* scene) {
     const uint64_t ordered = uint64_t{scene->meshNodeCount} + scene->lightCount + scene->cameraCount;
     if (ordered <= scene->nodeCount) return true;
-    QexError(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %u nodes, but %u mesh nodes, %u lights and %u cameras",
+    QexError(QEX_TAG,
+             "<QexPODModel_ReadFromSourceStream> %u nodes, but %u mesh nodes, %u lights and %u cameras",
              scene->nodeCount, scene->meshNodeCount, scene->lightCount, scene->cameraCount);
     return false;
 }
@@ -347,6 +362,7 @@ bool QexLoadPODModel_Check(QexPODModel* scene, QexPODExtents* const extents[kPOD
     at.kind = "light";
     for (at.index = 0; at.index < scene->lightCount; ++at.index)
         if (!InRange(scene->lights[at.index].targetIndex, scene->nodeCount))
-            return Fail(at, "its target is node %d of %u", scene->lights[at.index].targetIndex, scene->nodeCount);
+            return Fail(at, "its target is node %d of %u", scene->lights[at.index].targetIndex,
+                        scene->nodeCount);
     return true;
 }

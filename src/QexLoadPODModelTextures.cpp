@@ -37,7 +37,9 @@ int32_t Refuse(const char* function, const char* format, ...) {
     return -1;
 }
 
-uint32_t Half(uint32_t size) { return size > 1 ? size / 2 : 1; }
+uint32_t Half(uint32_t size) {
+    return size > 1 ? size / 2 : 1;
+}
 
 uint32_t ChainLength(uint32_t width, uint32_t height) {
     uint32_t levels = 1;
@@ -158,7 +160,8 @@ bool ReadPVRHeader(PVR* pvr, const Image& image) {
     pvr->surfaces = pvr->header.numSurfaces ? pvr->header.numSurfaces : pvr->cube ? 6 : 1;
     if (headerSize == kPVROldHeaderSize)
         QexSystem_Printf(
-            "WARNING:<QexTexture_LoadPVRFromMem> this is an old pvr format. You can use PVRTexTool to update its "
+            "WARNING:<QexTexture_LoadPVRFromMem> this is an old pvr format. You can use PVRTexTool to update "
+            "its "
             "header.\n");
     pvr->header.tag = kPVRTag;
     pvr->header.numSurfaces = pvr->surfaces;
@@ -171,25 +174,29 @@ bool CheckPVR(PVR* pvr, uint32_t firstLevel) {
     pvr->type = FindPVRType(header.flags);
     pvr->levels = header.flags & kPVRMipmaps ? header.mipmapCount + 1 : 1;
     const char* refusal = nullptr;
-    if (header.flags & kPVRTwiddled && !pvr->type.twiddled) refusal = "texture should be untwiddled.";
-    else if (pvr->type.refusal) refusal = pvr->type.refusal;
-    else if (header.bitsPerPixel != pvr->type.bits) refusal = "bits per pixel do not fit the pixel type.";
-    else if (pvr->cube && pvr->surfaces > 6) refusal = "a cube map of more than 6 faces.";
+    if (header.flags & kPVRTwiddled && !pvr->type.twiddled)
+        refusal = "texture should be untwiddled.";
+    else if (pvr->type.refusal)
+        refusal = pvr->type.refusal;
+    else if (header.bitsPerPixel != pvr->type.bits)
+        refusal = "bits per pixel do not fit the pixel type.";
+    else if (pvr->cube && pvr->surfaces > 6)
+        refusal = "a cube map of more than 6 faces.";
     if (refusal) {
         Refuse(kPVRFunction, "%s", refusal);
         return false;
     }
     if (!CheckSize(kPVRFunction, header.width, header.height, pvr->cube)) return false;
     if (!pvr->levels || pvr->levels > ChainLength(header.width, header.height) || firstLevel >= pvr->levels) {
-        Refuse(kPVRFunction, "%u mipmaps of %u x %u pixels, first level %u.", header.mipmapCount, header.width,
-               header.height, firstLevel);
+        Refuse(kPVRFunction, "%u mipmaps of %u x %u pixels, first level %u.", header.mipmapCount,
+               header.width, header.height, firstLevel);
         return false;
     }
     const uint64_t surface = SurfaceSize(*pvr);
     // Surfaces that overlapped could be billions in a file of a few bytes.
     if (pvr->surfaces > 1 && header.dataSize < surface) {
-        Refuse(kPVRFunction, "%u surfaces of %u bytes, whose levels take %llu.", pvr->surfaces, header.dataSize,
-               static_cast<unsigned long long>(surface));
+        Refuse(kPVRFunction, "%u surfaces of %u bytes, whose levels take %llu.", pvr->surfaces,
+               header.dataSize, static_cast<unsigned long long>(surface));
         return false;
     }
     const uint64_t needed = uint64_t{pvr->surfaces - 1} * header.dataSize + surface;
@@ -203,7 +210,8 @@ void UploadLevel(const PVRType& type, GLenum target, GLint level, uint32_t width
                  const uint8_t* data) {
     const GLsizei w = static_cast<GLsizei>(width), h = static_cast<GLsizei>(height);
     if (type.dataType)
-        QEX_GL(glTexImage2D(target, level, static_cast<GLint>(type.format), w, h, 0, type.format, type.dataType, data));
+        QEX_GL(glTexImage2D(target, level, static_cast<GLint>(type.format), w, h, 0, type.format,
+                            type.dataType, data));
     else
         QEX_GL(glCompressedTexImage2D(target, level, type.format, w, h, 0,
                                       static_cast<GLsizei>(LevelSize(type, width, height)), data));
@@ -253,7 +261,8 @@ struct KTX {
 uint32_t PixelSize(uint32_t format, uint32_t type) {
     if (type == GL_UNSIGNED_BYTE) return format == GL_RGBA ? 4 : 3;
     if (type == GL_UNSIGNED_SHORT_5_6_5) return format == GL_RGB ? 2 : 0;
-    return (type == GL_UNSIGNED_SHORT_4_4_4_4 || type == GL_UNSIGNED_SHORT_5_5_5_1) && format == GL_RGBA ? 2 : 0;
+    return (type == GL_UNSIGNED_SHORT_4_4_4_4 || type == GL_UNSIGNED_SHORT_5_5_5_1) && format == GL_RGBA ? 2
+                                                                                                         : 0;
 }
 
 KTX ReadKTXHeader(const uint8_t* bytes) {
@@ -270,8 +279,8 @@ KTX ReadKTXHeader(const uint8_t* bytes) {
     return ktx;
 }
 
-// Bytes of an uncompressed level: rows padded to 4 bytes, as the format asks, or tight, as some writers have it.
-// 0 when imageSize is neither.
+// Bytes of an uncompressed level: rows padded to 4 bytes, as the format asks, or tight, as some writers have
+// it. 0 when imageSize is neither.
 uint32_t RowAlignment(const KTX& ktx, uint32_t width, uint32_t height, uint32_t imageSize) {
     const uint64_t tight = uint64_t{width} * ktx.pixelSize;
     if ((tight + 3) / 4 * 4 * height == imageSize) return 4;
@@ -310,8 +319,8 @@ bool UploadKTXFace(const KTX& ktx, uint32_t face, uint32_t level, const uint8_t*
     const uint32_t alignment = RowAlignment(ktx, width, height, imageSize);
     if (!alignment) return false;
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, static_cast<GLint>(alignment)));
-    QEX_GL(glTexImage2D(target, static_cast<GLint>(level), static_cast<GLint>(ktx.baseInternalFormat), w, h, 0,
-                        ktx.format, ktx.type, data));
+    QEX_GL(glTexImage2D(target, static_cast<GLint>(level), static_cast<GLint>(ktx.baseInternalFormat), w, h,
+                        0, ktx.format, ktx.type, data));
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
     return true;
 }
@@ -338,7 +347,8 @@ bool UploadKTXLevels(const KTX& ktx, const Image& image) {
 }
 
 int32_t LoadKTX(QexTexture* texture, const Image& image) {
-    if (image.size < kKTXHeaderSize || memcmp(image.bytes, kKTXIdentifier, sizeof kKTXIdentifier) != 0) return -3;
+    if (image.size < kKTXHeaderSize || memcmp(image.bytes, kKTXIdentifier, sizeof kKTXIdentifier) != 0)
+        return -3;
     KTX ktx = ReadKTXHeader(image.bytes);
     if (!ktx.Compressed()) {
         const bool known = ktx.format == GL_RGB || ktx.format == GL_RGBA;
@@ -374,13 +384,15 @@ int32_t LoadKTX(QexTexture* texture, const Image& image) {
 
 int32_t LoadPVR(QexTexture* texture, const Image& image, QexPVRHeader* header, uint32_t firstLevel,
                 const void* pixelData) {
-    if (image.size >= sizeof kKTXIdentifier && memcmp(image.bytes, kKTXIdentifier, sizeof kKTXIdentifier) == 0)
+    if (image.size >= sizeof kKTXIdentifier &&
+        memcmp(image.bytes, kKTXIdentifier, sizeof kKTXIdentifier) == 0)
         return LoadKTX(texture, image);
     PVR pvr = {};
     texture->glName = 0;
     if (!ReadPVRHeader(&pvr, image)) return -1;
     pvr.data = pixelData ? static_cast<const uint8_t*>(pixelData) : image.bytes + pvr.header.headerSize;
-    pvr.dataSize = pixelData || image.size == kUnknownSize ? kUnknownSize : image.size - pvr.header.headerSize;
+    pvr.dataSize =
+        pixelData || image.size == kUnknownSize ? kUnknownSize : image.size - pvr.header.headerSize;
     if (!CheckPVR(&pvr, firstLevel)) return -1;
     uint32_t name = 0;
     if (pvr.type.bytesPerPixel >= 0) {
@@ -429,7 +441,8 @@ int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path, QexPVR
     if (!QexResFile_Exists(path)) return -1;
     QexResFile_Create(&file, path);
     if (QexResFile_IsOpen(&file))
-        result = LoadPVR(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)}, header, firstLevel, nullptr);
+        result = LoadPVR(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)}, header, firstLevel,
+                         nullptr);
     QexResFile_Release(&file);
     return result;
 }
@@ -449,6 +462,8 @@ int32_t QexTexture_LoadKTXFromFile(QexTexture* texture, const char* path, QexPVR
     return result;
 }
 
-int32_t QexTexture_IsETCSupported(void) { return QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES) ? 1 : 0; }
+int32_t QexTexture_IsETCSupported(void) {
+    return QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES) ? 1 : 0;
+}
 
 }  // extern "C"

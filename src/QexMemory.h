@@ -7,7 +7,9 @@
 template <class T>
 class QexScratch {
   public:
-    explicit QexScratch(uint64_t count = 0) { if (count) Alloc(count); }
+    explicit QexScratch(uint64_t count = 0) {
+        if (count) Alloc(count);
+    }
     ~QexScratch() { QexMemory_Free(block_); }
     QexScratch(const QexScratch&) = delete;
     QexScratch& operator=(const QexScratch&) = delete;

@@ -127,9 +127,11 @@ int32_t QexModel_LoadFromMemory(QexModel* model, const void* data, uint32_t size
 int32_t QexModel_LoadContent(QexModel* model, const char* directory, const char* file) {
     QexModel_Unload(model);
     int32_t result = QexModel_LoadFromFile(model, directory, file);
-    if (result != 0) return Abandon(model, result, false, "<QexModel_LoadContent> QexModel_LoadFromFile error.");
+    if (result != 0)
+        return Abandon(model, result, false, "<QexModel_LoadContent> QexModel_LoadFromFile error.");
     result = QexModel_CreateDefaultShader();
-    if (result != 0) return Abandon(model, result, false, "<QexModel_LoadContent> create default shader error!");
+    if (result != 0)
+        return Abandon(model, result, false, "<QexModel_LoadContent> create default shader error!");
     result = QexModel_DownloadGeometry(model);
     if (result != 0) return Abandon(model, result, true, "<QexModel_LoadContent> download geometry failed!");
     result = QexModel_LoadTextureFromFile(model, directory);
@@ -174,7 +176,8 @@ void QexModel_UnloadGeometry(QexModel* model) {
         QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
     }
     for (uint32_t i = 0; i < model->scene.meshCount; ++i) {
-        if (model->indexBuffers && model->indexBuffers[i]) QEX_GL(glDeleteBuffers(1, &model->indexBuffers[i]));
+        if (model->indexBuffers && model->indexBuffers[i])
+            QEX_GL(glDeleteBuffers(1, &model->indexBuffers[i]));
         if (model->vertexBuffers) QEX_GL(glDeleteBuffers(1, &model->vertexBuffers[i]));
     }
     FreeArray(model->vertexBuffers);
@@ -197,9 +200,17 @@ QexTexture* QexModel_ReplaceAlphaTextureByIdx(QexModel* model, QexTexture* textu
     return Exchange(model->alphaTextures, model->scene.materialCount, texture, index);
 }
 
-uint32_t QexModel_GetNumFrames(const QexModel* model) { return model->scene.frameCount; }
-uint32_t QexModel_GetFPS(const QexModel* model) { return model->scene.framesPerSecond; }
-uint32_t QexModel_GetNumNodes(const QexModel* model) { return model->scene.nodeCount; }
-uint32_t QexModel_GetNumMeshNodes(const QexModel* model) { return model->scene.meshNodeCount; }
+uint32_t QexModel_GetNumFrames(const QexModel* model) {
+    return model->scene.frameCount;
+}
+uint32_t QexModel_GetFPS(const QexModel* model) {
+    return model->scene.framesPerSecond;
+}
+uint32_t QexModel_GetNumNodes(const QexModel* model) {
+    return model->scene.nodeCount;
+}
+uint32_t QexModel_GetNumMeshNodes(const QexModel* model) {
+    return model->scene.meshNodeCount;
+}
 
 }  // extern "C"

@@ -7,13 +7,13 @@
 #include "Qex.h"
 
 struct QexModelSharedShaders {
-    QexShaderModule* texture;   // null while there are none
+    QexShaderModule* texture;  // null while there are none
     QexShaderModule* skinning;
     QexShaderModule* simple;
-    uint32_t shadowTexture;     // GL names of the shadow target
+    uint32_t shadowTexture;  // GL names of the shadow target
     uint32_t shadowDepth;
     uint32_t shadowFramebuffer;
-    int32_t shadowWidth;        // pixels
+    int32_t shadowWidth;  // pixels
     int32_t shadowHeight;
 };
 
@@ -30,6 +30,7 @@ struct QexMeshUpload {
     uint16_t* packedIndices;  // owned, or null
 };
 
-// False, with a line in the log, when the mesh cannot be drawn or memory runs out. Free with Release in any case.
+// False, with a line in the log, when the mesh cannot be drawn or memory runs out. Free with Release in any
+// case.
 bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex);
 void QexModelGeometry_Release(QexMeshUpload* upload);

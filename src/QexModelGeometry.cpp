@@ -40,8 +40,8 @@ GLType ToGLType(uint32_t podType) {
 
 struct Element {
     const CPODData* data;
-    bool asFloats;    // converted at upload
-    uint32_t size;    // bytes a vertex in the upload
+    bool asFloats;  // converted at upload
+    uint32_t size;  // bytes a vertex in the upload
 };
 
 // The elements that are uploaded, in the order of QexVertexElement.
@@ -55,24 +55,30 @@ const uint8_t* SourceOf(const QexPODMesh& mesh, const CPODData& data) {
 
 Elements ListElements(const QexPODMesh& mesh) {
     static const CPODData none = {};
-    const CPODData* const sources[QEX_ELEMENT_COUNT] = {
-        &mesh.vertices,  &mesh.normals,
-        &mesh.tangents,  &mesh.binormals,
-        mesh.uvwChannelCount ? &mesh.uvws[0] : &none,
-        &mesh.boneIndices, &mesh.boneWeights};
+    const CPODData* const sources[QEX_ELEMENT_COUNT] = {&mesh.vertices,
+                                                        &mesh.normals,
+                                                        &mesh.tangents,
+                                                        &mesh.binormals,
+                                                        mesh.uvwChannelCount ? &mesh.uvws[0] : &none,
+                                                        &mesh.boneIndices,
+                                                        &mesh.boneWeights};
     Elements elements;
     for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
         const CPODData* data = sources[i];
         // Positions are always floats: the mesh's box comes from them, and its unpack matrix goes into them.
-        const bool asFloats = i == QEX_ELEMENT_POSITION ? data->type != QEX_POD_FLOAT : !ToGLType(data->type).type;
+        const bool asFloats =
+            i == QEX_ELEMENT_POSITION ? data->type != QEX_POD_FLOAT : !ToGLType(data->type).type;
         const uint32_t bytes = asFloats ? QexPODData_Components(*data) * 4
                                         : QexPODData_ElementSize(data->type, data->componentCount);
-        elements.list[i] = {data, data->componentCount && asFloats, data->componentCount ? (bytes + 3) / 4 * 4 : 0};
+        elements.list[i] = {data, data->componentCount && asFloats,
+                            data->componentCount ? (bytes + 3) / 4 * 4 : 0};
     }
     return elements;
 }
 
-bool IsIdentity(const QexMatrix& matrix) { return memcmp(&matrix, &g_sMatIdentity, sizeof matrix) == 0; }
+bool IsIdentity(const QexMatrix& matrix) {
+    return memcmp(&matrix, &g_sMatIdentity, sizeof matrix) == 0;
+}
 
 // Whether the interleaved block can go to GL as it is: one stride, everything within it and aligned.
 bool UploadsAsIs(const QexPODMesh& mesh, const Elements& elements) {
@@ -109,7 +115,8 @@ void Decode(float* out, const uint8_t* source, const CPODData& data) {
         if (source[i] > 127) out[i] -= data.type == QEX_POD_BYTE ? 256.0f : 256.0f / 127.0f;
 }
 
-void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position, uint32_t vertex) {
+void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position,
+                 uint32_t vertex) {
     const CPODData& data = *element.data;
     const uint8_t* source = SourceOf(mesh, data) + uint64_t{vertex} * data.stride;
     if (!element.asFloats && !position) {
@@ -131,7 +138,8 @@ bool Pack(QexMeshUpload* upload, QexPODMesh* mesh, const Elements& elements) {
     for (const Element& element : elements.list) stride += element.size;
     const uint64_t bytes = uint64_t{stride} * mesh->vertexCount;
     upload->packedVertices =
-        bytes > INT32_MAX ? nullptr : static_cast<uint8_t*>(QexMemory_Alloc(static_cast<uint32_t>(bytes ? bytes : 1)));
+        bytes > INT32_MAX ? nullptr
+                          : static_cast<uint8_t*>(QexMemory_Alloc(static_cast<uint32_t>(bytes ? bytes : 1)));
     if (!upload->packedVertices) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return false;
@@ -160,7 +168,8 @@ bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t mesh
         return true;
     }
     if (mesh.vertexCount > 65536) {
-        QexError(QEX_TAG, "<QexModel_DownloadGeometry> mesh %u has %u vertices, more than 16-bit indices reach",
+        QexError(QEX_TAG,
+                 "<QexModel_DownloadGeometry> mesh %u has %u vertices, more than 16-bit indices reach",
                  meshIndex, mesh.vertexCount);
         return false;
     }
@@ -171,7 +180,8 @@ bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t mesh
         return false;
     }
     const uint32_t* wide = reinterpret_cast<const uint32_t*>(mesh.faces.data);
-    for (uint32_t i = 0; i < upload->indexCount; ++i) upload->packedIndices[i] = static_cast<uint16_t>(wide[i]);
+    for (uint32_t i = 0; i < upload->indexCount; ++i)
+        upload->packedIndices[i] = static_cast<uint16_t>(wide[i]);
     upload->indices = upload->packedIndices;
     return true;
 }
@@ -180,7 +190,8 @@ bool BatchesFit(const QexPODMesh& mesh, uint32_t meshIndex) {
     for (int32_t i = 0; mesh.skinned && i < mesh.boneBatches.batchCount; ++i) {
         const int32_t bones = mesh.boneBatches.bonesPerBatch[i];
         if (bones <= QEX_MAX_BATCH_BONES) continue;
-        QexError(QEX_TAG, "<QexModel_DownloadGeometry> mesh %u has a bone batch of %d bones, at most %d are drawn",
+        QexError(QEX_TAG,
+                 "<QexModel_DownloadGeometry> mesh %u has a bone batch of %d bones, at most %d are drawn",
                  meshIndex, bones, QEX_MAX_BATCH_BONES);
         return false;
     }

@@ -6,7 +6,9 @@
 
 namespace {
 
-void SetEye(const QexCamera* camera) { g_VecEyePos = camera->eye; }
+void SetEye(const QexCamera* camera) {
+    g_VecEyePos = camera->eye;
+}
 
 const QexPODMesh* MeshOf(const QexModel* model, uint32_t node) {
     return &model->scene.meshes[model->scene.nodes[node].objectIndex];
@@ -19,7 +21,9 @@ QexPODMaterial* MaterialOf(QexModel* model, uint32_t node) {
     return index < model->scene.materialCount ? &model->scene.materials[index] : nullptr;
 }
 
-bool InPass(const QexModel* model, uint32_t node, uint32_t pass) { return MeshOf(model, node)->passID == pass; }
+bool InPass(const QexModel* model, uint32_t node, uint32_t pass) {
+    return MeshOf(model, node)->passID == pass;
+}
 
 // Draws a mesh node through its module, if it has one.
 void DrawNode(QexModel* model, uint32_t node, const QexLightSet* lights, const QexMatrix* modelMatrix,
@@ -66,12 +70,13 @@ QexVec3 g_VecEyePos = {0, 0, 0};
 void QexModel_RenderWithCamera(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
                                const QexMatrix* modelMatrix, uint32_t pass) {
     SetEye(camera);
-    QexModel_RenderWithViewProjection(model, lights, modelMatrix, &camera->viewMatrix, &camera->projectionMatrix,
-                                      pass);
+    QexModel_RenderWithViewProjection(model, lights, modelMatrix, &camera->viewMatrix,
+                                      &camera->projectionMatrix, pass);
 }
 
-void QexModel_RenderWithViewProjection(QexModel* model, const QexLightSet* lights, const QexMatrix* modelMatrix,
-                                       const QexMatrix* view, const QexMatrix* projection, uint32_t pass) {
+void QexModel_RenderWithViewProjection(QexModel* model, const QexLightSet* lights,
+                                       const QexMatrix* modelMatrix, const QexMatrix* view,
+                                       const QexMatrix* projection, uint32_t pass) {
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i)
         if (InPass(model, i, pass)) DrawNode(model, i, lights, modelMatrix, view, projection);
 }
@@ -86,7 +91,8 @@ void QexModel_RenderNodeWithCamera(QexModel* model, uint32_t nodeIndex, const Qe
 void QexModel_RenderNodeWithViewProjection(QexModel* model, uint32_t nodeIndex, const QexLightSet* lights,
                                            const QexMatrix* modelMatrix, const QexMatrix* view,
                                            const QexMatrix* projection) {
-    if (nodeIndex < model->scene.meshNodeCount) DrawNode(model, nodeIndex, lights, modelMatrix, view, projection);
+    if (nodeIndex < model->scene.meshNodeCount)
+        DrawNode(model, nodeIndex, lights, modelMatrix, view, projection);
 }
 
 void QexModel_RenderWithCameraEx(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
@@ -97,10 +103,10 @@ void QexModel_RenderWithCameraEx(QexModel* model, const QexLightSet* lights, con
                                         &camera->projectionMatrix, pass, mode, list, count);
 }
 
-void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lights, const QexMatrix* modelMatrix,
-                                         const QexVec3* eye, const QexMatrix* view, const QexMatrix* projection,
-                                         uint32_t pass, uint32_t mode, TransparentSPODNodeInfo* list,
-                                         uint32_t* count) {
+void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lights,
+                                         const QexMatrix* modelMatrix, const QexVec3* eye,
+                                         const QexMatrix* view, const QexMatrix* projection, uint32_t pass,
+                                         uint32_t mode, TransparentSPODNodeInfo* list, uint32_t* count) {
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
         if (!InPass(model, i, pass)) continue;
         if (IsOpaque(model, i) && ModeAllows(model->scene.nodes[i], mode)) {
@@ -137,8 +143,8 @@ void QexModel_RenderAlphaBlendingNodes(TransparentSPODNodeInfo* list, uint32_t c
     for (uint32_t i = count; i-- > 0;) {
         const TransparentSPODNodeInfo& entry = list[i];
         if (entry.model && entry.passID == static_cast<int32_t>(pass))
-            QexModel_RenderNodeWithViewProjection(entry.model, entry.nodeIndex, &entry.lights, &entry.modelMatrix,
-                                                  &entry.view, &entry.projection);
+            QexModel_RenderNodeWithViewProjection(entry.model, entry.nodeIndex, &entry.lights,
+                                                  &entry.modelMatrix, &entry.view, &entry.projection);
     }
 }
 
@@ -214,7 +220,8 @@ void QexModel_SetAnimatedUVUniform(QexModel*, float, float) {}
 
 // ---- Boxes, lights, cameras ----
 
-void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex, const QexMatrix* modelMatrix) {
+void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
+                                        const QexMatrix* modelMatrix) {
     QexPODModel* scene = &model->scene;
     if (meshNodeIndex >= scene->meshNodeCount || !model->nodeBoxes) return;
     QexPODNode* node = &scene->nodes[meshNodeIndex];

@@ -87,7 +87,8 @@ void CreateShadowProgram(uint32_t* program, ShadowShaders* shaders, const char* 
     char log[QEX_SHADER_LOG_SIZE];
     QexShader_Create(&shaders->vertex, vertexSource, GL_VERTEX_SHADER);
     QexShader_Create(&shaders->fragment, kShadowFragmentSource, GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(program, shaders->vertex, shaders->fragment, attributes, attributeCount, log) != 0)
+    if (QexShader_CreateProgram(program, shaders->vertex, shaders->fragment, attributes, attributeCount,
+                                log) != 0)
         QexError(QEX_TAG, "<QexModel_CreateDefaultShader> shadow program: %s", log);
     QEX_GL(glUniform1i(Location(*program, "alphaTexture"), kAlphaUnit));
 }
@@ -110,8 +111,10 @@ void CreateShadowTarget() {
                                  s_Shared.shadowHeight));
     QEX_GL(glGenFramebuffers(1, &s_Shared.shadowFramebuffer));
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, s_Shared.shadowFramebuffer));
-    QEX_GL(glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, s_Shared.shadowTexture, 0));
-    QEX_GL(glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_DEPTH_ATTACHMENT, GL_RENDERBUFFER, s_Shared.shadowDepth));
+    QEX_GL(glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, s_Shared.shadowTexture,
+                                  0));
+    QEX_GL(glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_DEPTH_ATTACHMENT, GL_RENDERBUFFER,
+                                     s_Shared.shadowDepth));
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
 }
 
@@ -132,7 +135,9 @@ void DeleteShadowProgram(uint32_t* program, ShadowShaders* shaders) {
 
 }  // namespace
 
-const QexModelSharedShaders* QexModel_GetSharedShaders() { return &s_Shared; }
+const QexModelSharedShaders* QexModel_GetSharedShaders() {
+    return &s_Shared;
+}
 
 extern "C" {
 
@@ -146,9 +151,11 @@ int32_t QexModel_CreateDefaultShader(void) {
     s_Shared.simple = QexSimpleShader_CreateProgram();
     CreateShadowProgram(&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders, kSkinShadowVertexSource,
                         kSkinShadowAttributes, 4);
-    m_SkinShadowShaderProgram.viewProjMatrixLoc = Location(m_SkinShadowShaderProgram.program, "viewProjMatrix");
+    m_SkinShadowShaderProgram.viewProjMatrixLoc =
+        Location(m_SkinShadowShaderProgram.program, "viewProjMatrix");
     m_SkinShadowShaderProgram.boneCountLoc = Location(m_SkinShadowShaderProgram.program, "boneCount");
-    m_SkinShadowShaderProgram.boneMatrixArrayLoc = Location(m_SkinShadowShaderProgram.program, "boneMatrixArray");
+    m_SkinShadowShaderProgram.boneMatrixArrayLoc =
+        Location(m_SkinShadowShaderProgram.program, "boneMatrixArray");
     CreateShadowProgram(&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders, kShadowVertexSource,
                         kShadowAttributes, 2);
     m_uModelShadowShaderProgram.mvpMatrixLoc = Location(m_uModelShadowShaderProgram.program, "mvpMatrix");

@@ -31,8 +31,8 @@ const char* DiffuseName(const QexModel* model, uint32_t material) {
     return index < 0 ? nullptr : model->scene.textures[index].name;
 }
 
-// Puts prefix and name together, and the same with "_a" before the last four characters; false when they do not
-// fit. Paths of fewer than four characters have no alpha path.
+// Puts prefix and name together, and the same with "_a" before the last four characters; false when they do
+// not fit. Paths of fewer than four characters have no alpha path.
 bool MakePaths(char (&path)[kPathSize], char (&alphaPath)[kPathSize], const char* prefix, const char* name) {
     const int written = snprintf(path, kPathSize, "%s%s", prefix, name);
     const size_t length = written < 0 ? kPathSize : static_cast<size_t>(written);
@@ -41,7 +41,8 @@ bool MakePaths(char (&path)[kPathSize], char (&alphaPath)[kPathSize], const char
         return false;
     }
     alphaPath[0] = 0;
-    if (length >= 4) snprintf(alphaPath, kPathSize, "%.*s_a.%s", static_cast<int>(length - 4), path, path + length - 3);
+    if (length >= 4)
+        snprintf(alphaPath, kPathSize, "%.*s_a.%s", static_cast<int>(length - 4), path, path + length - 3);
     return true;
 }
 

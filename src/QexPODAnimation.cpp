@@ -11,9 +11,13 @@ constexpr int32_t kNullArgument = -9;
 constexpr int32_t kUnknownName = -11;
 constexpr int32_t kIndexOutOfRange = -12;
 
-uint32_t LastFrame(const QexPODModel* scene) { return scene->frameCount ? scene->frameCount - 1 : 0; }
+uint32_t LastFrame(const QexPODModel* scene) {
+    return scene->frameCount ? scene->frameCount - 1 : 0;
+}
 
-float NodeKey(const QexPODNode* node) { return static_cast<float>(node->frame) + node->frameFraction; }
+float NodeKey(const QexPODNode* node) {
+    return static_cast<float>(node->frame) + node->frameFraction;
+}
 
 // Splits a frame into integer part and fraction; what is no frame at all counts as 0.
 void SplitFrame(float frame, uint32_t* integer, float* fraction) {
@@ -22,7 +26,9 @@ void SplitFrame(float frame, uint32_t* integer, float* fraction) {
     *fraction = frame - static_cast<float>(*integer);
 }
 
-void SetNodeFrame(QexPODNode* node, float frame) { SplitFrame(frame, &node->frame, &node->frameFraction); }
+void SetNodeFrame(QexPODNode* node, float frame) {
+    SplitFrame(frame, &node->frame, &node->frameFraction);
+}
 
 // A frame given for one node: beyond the last, it is taken modulo the frame count.
 float WrapNodeFrame(const QexPODModel* scene, float frame) {
@@ -51,13 +57,14 @@ uint64_t KeyOffset(const uint32_t* index, uint32_t frame, uint32_t keyFloats) {
 template <class T>
 T LoadKey(const float* data, uint64_t offset) {
     T key;
-    memcpy(static_cast<void*>(&key), reinterpret_cast<const uint8_t*>(data) + offset * sizeof(float), sizeof key);
+    memcpy(static_cast<void*>(&key), reinterpret_cast<const uint8_t*>(data) + offset * sizeof(float),
+           sizeof key);
     return key;
 }
 
 // Position or scale between two frames.
-inline QexVec3 InterpolateVec3(const QexPODNode* node, const Frames& frames, const float* data, const uint32_t* index,
-                               uint32_t keyFloats, uint32_t animatedBit) {
+inline QexVec3 InterpolateVec3(const QexPODNode* node, const Frames& frames, const float* data,
+                               const uint32_t* index, uint32_t keyFloats, uint32_t animatedBit) {
     if (!(node->animationFlags & animatedBit)) return LoadKey<QexVec3>(data, 0);
     const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(index, frames.a, keyFloats));
     const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(index, frames.b, keyFloats));
@@ -81,8 +88,10 @@ void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames
     }
     QexQuaternion q = LoadKey<QexQuaternion>(node->rotation, 0);
     if (node->animationFlags & QEX_NODE_ROTATION_ANIMATED) {
-        const QexQuaternion a = LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.a, 4));
-        const QexQuaternion b = LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.b, 4));
+        const QexQuaternion a =
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.a, 4));
+        const QexQuaternion b =
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.b, 4));
         QexQuaternion_Slerp(&q, &a, &b, node->frameFraction);
     }
     QexQuaternion_ToRotationMatrix(out, &q);
@@ -121,10 +130,13 @@ void UpdateOverride(QexPODNode* node) {
     const float* r = node->overrideRotation;
     const float* p = node->overridePosition;
     if (changed & QEX_NODE_SCALE_CHANGED) QexMatrix_Scale(&node->overrideScaleMatrix, s[0], s[1], s[2]);
-    if (changed & QEX_NODE_ROTATION_CHANGED) QexMatrix_RotateXYZ(&node->overrideRotationMatrix, r[0], r[1], r[2]);
-    if (changed & QEX_NODE_POSITION_CHANGED) QexMatrix_Translate(&node->overrideTranslationMatrix, p[0], p[1], p[2]);
+    if (changed & QEX_NODE_ROTATION_CHANGED)
+        QexMatrix_RotateXYZ(&node->overrideRotationMatrix, r[0], r[1], r[2]);
+    if (changed & QEX_NODE_POSITION_CHANGED)
+        QexMatrix_Translate(&node->overrideTranslationMatrix, p[0], p[1], p[2]);
     node->stateFlags &= ~changed;
-    QexMatrix_Multiply(&node->overrideMatrix, &node->overrideTranslationMatrix, &node->overrideRotationMatrix);
+    QexMatrix_Multiply(&node->overrideMatrix, &node->overrideTranslationMatrix,
+                       &node->overrideRotationMatrix);
     QexMatrix_Multiply(&node->overrideMatrix, &node->overrideMatrix, &node->overrideScaleMatrix);
 }
 
@@ -173,7 +185,8 @@ bool FirstElement(const QexPODModel* scene, uint32_t index, CPODData QexPODMesh:
         }
     }
     QexLog(QEX_TAG,
-           "<QexPODModel_GetNodePlaneNormal> unsupported vertex array format - must export as interleaved data.");
+           "<QexPODModel_GetNodePlaneNormal> unsupported vertex array format - must export as interleaved "
+           "data.");
     return false;
 }
 
@@ -363,7 +376,8 @@ void QexPODModel_GetTransformationMatrix(const QexPODModel* scene, QexMatrix* ou
     QexMatrix_Identity(out);
     if (!node->matrix) return;
     const bool animated = node->animationFlags & QEX_NODE_MATRIX_ANIMATED;
-    *out = LoadKey<QexMatrix>(node->matrix, animated ? KeyOffset(node->matrixIndex, FindFrames(scene, node).a, 16) : 0);
+    *out = LoadKey<QexMatrix>(node->matrix,
+                              animated ? KeyOffset(node->matrixIndex, FindFrames(scene, node).a, 16) : 0);
 }
 
 void QexPODModel_GetWorldMatrixNoCache(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {
@@ -400,7 +414,8 @@ void QexPODModel_GetBoneWorldMatrix(QexPODModel* scene, QexMatrix* out, QexPODNo
         return;
     }
     const QexMatrix* world = QexPODAnimation_WorldMatrix(scene, boneNode);
-    QexMatrix_Multiply(out, &impl->inverseBindPose[boneNode - scene->nodes], &impl->bindPose[meshNode - scene->nodes]);
+    QexMatrix_Multiply(out, &impl->inverseBindPose[boneNode - scene->nodes],
+                       &impl->bindPose[meshNode - scene->nodes]);
     QexMatrix_Multiply(out, world, out);
 }
 
@@ -417,7 +432,8 @@ float QexPODModel_GetCameraPos(QexPODModel* scene, float* position, float* targe
     return CameraFov(scene, camera);
 }
 
-float QexPODModel_GetCameraPosEx(QexPODModel* scene, float* position, float* target, float* up, uint32_t index) {
+float QexPODModel_GetCameraPosEx(QexPODModel* scene, float* position, float* target, float* up,
+                                 uint32_t index) {
     QexPODNode* node = CameraNode(scene, index);
     if (!node) return 0;
     const float* m = QexPODAnimation_WorldMatrix(scene, node)->m;

@@ -41,7 +41,9 @@ void WriteComponents(void* destination, int32_t count, const float* values, floa
 const uint8_t kRGBAShifts[4] = {24, 16, 8, 0};
 const uint8_t kARGBShifts[4] = {16, 8, 0, 24};
 
-const uint8_t* ColourShifts(uint32_t type) { return type == QEX_POD_RGBA ? kRGBAShifts : kARGBShifts; }
+const uint8_t* ColourShifts(uint32_t type) {
+    return type == QEX_POD_RGBA ? kRGBAShifts : kARGBShifts;
+}
 
 void WriteColour(void* destination, const uint8_t* shifts, const float* values) {
     uint32_t word = 0;
@@ -137,7 +139,9 @@ void CPODData_Reset(CPODData* element) {
     *element = {QEX_POD_FLOAT, 0, 0, nullptr};
 }
 
-void SPVRTPODImpl_Contructor(SPVRTPODImpl* impl) { memset(impl, 0, sizeof *impl); }
+void SPVRTPODImpl_Contructor(SPVRTPODImpl* impl) {
+    memset(impl, 0, sizeof *impl);
+}
 
 void SPVRTPODImpl_Destructor(SPVRTPODImpl* impl) {
     FreeArray(impl->cacheKeys);
@@ -246,8 +250,12 @@ void QexVertexWriteVec(void* destination, uint32_t type, int32_t count, const fl
         case QEX_POD_FLOAT:
             for (int32_t i = 0; i < count; ++i) Store(destination, i, values[i]);
             break;
-        case QEX_POD_INT: WriteComponents<int32_t>(destination, count, values, 1, INT32_MIN, INT32_MAX); break;
-        case QEX_POD_UNSIGNED_SHORT: WriteComponents<uint16_t>(destination, count, values, 1, 0, 65535); break;
+        case QEX_POD_INT:
+            WriteComponents<int32_t>(destination, count, values, 1, INT32_MIN, INT32_MAX);
+            break;
+        case QEX_POD_UNSIGNED_SHORT:
+            WriteComponents<uint16_t>(destination, count, values, 1, 0, 65535);
+            break;
         case QEX_POD_RGBA:
         case QEX_POD_ARGB:
         case QEX_POD_D3DCOLOR: WriteColour(destination, ColourShifts(type), values); break;
@@ -259,13 +267,19 @@ void QexVertexWriteVec(void* destination, uint32_t type, int32_t count, const fl
         case QEX_POD_UNSIGNED_BYTE:
         case QEX_POD_BYTE: WriteComponents<uint8_t>(destination, count, values, 1, 0, 255); break;
         case QEX_POD_SHORT: WriteComponents<int16_t>(destination, count, values, 1, -32768, 32767); break;
-        case QEX_POD_SHORT_NORM: WriteComponents<int16_t>(destination, count, values, 32767, -32768, 32767); break;
+        case QEX_POD_SHORT_NORM:
+            WriteComponents<int16_t>(destination, count, values, 32767, -32768, 32767);
+            break;
         case QEX_POD_BYTE_NORM: WriteComponents<uint8_t>(destination, count, values, 127, 0, 255); break;
-        case QEX_POD_UNSIGNED_BYTE_NORM: WriteComponents<uint8_t>(destination, count, values, 255, 0, 255); break;
+        case QEX_POD_UNSIGNED_BYTE_NORM:
+            WriteComponents<uint8_t>(destination, count, values, 255, 0, 255);
+            break;
         case QEX_POD_UNSIGNED_SHORT_NORM:
             WriteComponents<uint16_t>(destination, count, values, 65535, 0, 65535);
             break;
-        case QEX_POD_UNSIGNED_INT: WriteComponents<uint32_t>(destination, count, values, 1, 0, UINT32_MAX); break;
+        case QEX_POD_UNSIGNED_INT:
+            WriteComponents<uint32_t>(destination, count, values, 1, 0, UINT32_MAX);
+            break;
         default: break;
     }
 }

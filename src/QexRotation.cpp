@@ -6,7 +6,8 @@ namespace {
 
 // Polynomials fitted at the Chebyshev points of the range; both are off by less than the last bit of a float.
 
-// asin(sqrt(x)) / sqrt(x) for x in [0, 1/2]. Summed in pairs, since the terms do not wait for each other then.
+// asin(sqrt(x)) / sqrt(x) for x in [0, 1/2]. Summed in pairs, since the terms do not wait for each other
+// then.
 inline float ArcSineRatio(float x) {
     const float x2 = x * x, x4 = x2 * x2;
     const float low = (1.0f + 0.166666142f * x) + (0.0750275732f + 0.0440916167f * x) * x2;
@@ -20,7 +21,6 @@ inline float SineRatio(float x) {
     const float low = (1.0f - 0.166666666f * x) + (0.00833333097f - 0.000198408612f * x) * x2;
     return low + (2.75252698e-6f - 2.38892177e-8f * x) * (x2 * x2);
 }
-
 
 constexpr double kPi = 3.141592653589793;
 
@@ -125,8 +125,8 @@ void QexQuaternion_Slerp(QexQuaternion* out, const QexQuaternion* a, const QexQu
         *out = *a;
         return;
     }
-    // With h = (1 - c) / 2, the angle is 2 sqrt(h) asin(sqrt(h)) / sqrt(h), so its square needs no root. What sin(t *
-    // angle) and sin((1 - t) * angle) have in common goes with the normalisation.
+    // With h = (1 - c) / 2, the angle is 2 sqrt(h) asin(sqrt(h)) / sqrt(h), so its square needs no root. What
+    // sin(t * angle) and sin((1 - t) * angle) have in common goes with the normalisation.
     const float h = (1 - c) * 0.5f;
     const float ratio = ArcSineRatio(h);
     const float angle2 = 4 * h * ratio * ratio;

@@ -10,7 +10,9 @@ uint32_t s_OwnerDrawInitialized;
 static_assert(sizeof(QexEngineConfig) == QEX_ENGINE_CONFIG_SIZE || sizeof(void*) > 4, "11 words");
 static_assert(sizeof(QexRuntimeContext) == 64 || sizeof(void*) > 4, "16 words");
 
-bool IsConfigSize(uint32_t size) { return size == QEX_ENGINE_CONFIG_SIZE || size == sizeof(QexEngineConfig); }
+bool IsConfigSize(uint32_t size) {
+    return size == QEX_ENGINE_CONFIG_SIZE || size == sizeof(QexEngineConfig);
+}
 
 // Window-system words and surface size, from configuration to context and back.
 void CopyWindowWords(QexRuntimeContext* context, const QexEngineConfig& config) {
@@ -92,12 +94,24 @@ void QexEngine_ShutdownForOwnerDraw(QexRuntimeContext* context) {
     s_OwnerDrawInitialized = 0;
 }
 
-uint32_t QexEngine_IsInitialized(void) { return s_Initialized; }
-uint32_t QexEngine_IsOwnerDrawInitialized(void) { return s_OwnerDrawInitialized; }
+uint32_t QexEngine_IsInitialized(void) {
+    return s_Initialized;
+}
+uint32_t QexEngine_IsOwnerDrawInitialized(void) {
+    return s_OwnerDrawInitialized;
+}
 void QexRenderer_Present(void) {}
-int32_t QexInitEGL(QexRuntimeContext*) { return 0; }
-int32_t QexShutdownEGL(QexRuntimeContext*) { return 0; }
-int32_t createWindow(void) { return 0; }
-int32_t destroyWindow(void) { return 0; }
+int32_t QexInitEGL(QexRuntimeContext*) {
+    return 0;
+}
+int32_t QexShutdownEGL(QexRuntimeContext*) {
+    return 0;
+}
+int32_t createWindow(void) {
+    return 0;
+}
+int32_t destroyWindow(void) {
+    return 0;
+}
 
 }  // extern "C"

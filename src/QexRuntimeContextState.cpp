@@ -19,8 +19,8 @@ void SetBlending(int32_t mode, GLenum alphaSource, GLenum alphaDestination) {
     }
     if (mode < 1 || mode > 3) return;
     QEX_GL(glEnable(GL_BLEND));
-    QEX_GL(glBlendFuncSeparate(kBlendFactors[mode - 1].source, kBlendFactors[mode - 1].destination, alphaSource,
-                               alphaDestination));
+    QEX_GL(glBlendFuncSeparate(kBlendFactors[mode - 1].source, kBlendFactors[mode - 1].destination,
+                               alphaSource, alphaDestination));
 }
 
 }  // namespace
@@ -32,7 +32,9 @@ float g_fQexGlobalAlpha = 1.0f;
 float g_fAlphaTestCmpValue = 0.95f;
 uint32_t g_bSpecularOn = 0;
 
-void QexRenderState_Reset(QexRuntimeContext*) { g_QexCachedRenderStates = {0, kUnknown, kUnknown}; }
+void QexRenderState_Reset(QexRuntimeContext*) {
+    g_QexCachedRenderStates = {0, kUnknown, kUnknown};
+}
 
 void QexRenderState_UseProgram(uint32_t program) {
     if (program == g_QexCachedRenderStates.currentProgram) return;
@@ -47,7 +49,9 @@ void QexRenderState_ActiveTexture(uint32_t unit) {
     g_QexCachedRenderStates.boundTexture = kUnknown;
 }
 
-void QexRenderState_Bind(uint32_t target, uint32_t name) { QEX_GL(glBindTexture(target, name)); }
+void QexRenderState_Bind(uint32_t target, uint32_t name) {
+    QEX_GL(glBindTexture(target, name));
+}
 
 void QexRenderer_SetZTestFunc(uint32_t mode) {
     glEnable(GL_DEPTH_TEST);
@@ -55,7 +59,9 @@ void QexRenderer_SetZTestFunc(uint32_t mode) {
     if (mode < 8) glDepthFunc(GL_NEVER + mode);
 }
 
-void QexRenderer_SetZWrite(int32_t flag) { glDepthMask(flag ? GL_TRUE : GL_FALSE); }
+void QexRenderer_SetZWrite(int32_t flag) {
+    glDepthMask(flag ? GL_TRUE : GL_FALSE);
+}
 
 void QexRenderer_SetBackFaceCulling(int32_t mode) {
     static const GLenum faces[] = {GL_BACK, GL_FRONT, GL_FRONT_AND_BACK};
@@ -67,7 +73,9 @@ void QexRenderer_SetBackFaceCulling(int32_t mode) {
     }
 }
 
-void QexRenderer_SetBlendFactor(uint32_t source, uint32_t destination) { glBlendFunc(source, destination); }
+void QexRenderer_SetBlendFactor(uint32_t source, uint32_t destination) {
+    glBlendFunc(source, destination);
+}
 
 void QexRenderer_SetAlphaBlendMode(int32_t mode) {
     const bool blends = mode >= 1 && mode <= 3;
@@ -87,9 +95,13 @@ float QexRenderer_SetGlobalAlpha(float alpha) {
     return previous;
 }
 
-void QexRenderer_SetAlphaTestCmpValue(float value) { g_fAlphaTestCmpValue = value; }
+void QexRenderer_SetAlphaTestCmpValue(float value) {
+    g_fAlphaTestCmpValue = value;
+}
 
-void QexRenderer_EnableSpecular(uint32_t flag) { g_bSpecularOn = flag; }
+void QexRenderer_EnableSpecular(uint32_t flag) {
+    g_bSpecularOn = flag;
+}
 
 void QexRenderer_Draw(uint32_t, int32_t count) {
     QEX_GL(glDrawElements(GL_TRIANGLES, count, GL_UNSIGNED_SHORT, nullptr));

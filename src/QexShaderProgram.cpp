@@ -86,7 +86,8 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
     char log[QEX_SHADER_LOG_SIZE];
     DeleteShaders();
     QexShader_Create(&s_VertexShader, lit ? kLightVertexSource : kColourVertexSource, GL_VERTEX_SHADER);
-    QexShader_Create(&s_FragmentShader, lit ? kLightFragmentSource : kColourFragmentSource, GL_FRAGMENT_SHADER);
+    QexShader_Create(&s_FragmentShader, lit ? kLightFragmentSource : kColourFragmentSource,
+                     GL_FRAGMENT_SHADER);
     QexShader_CreateProgram(&record->program, s_VertexShader, s_FragmentShader,
                             lit ? kLightAttributes : kColourAttributes, lit ? 3 : 4, log);
     record->mvpMatrixLoc = Location(record, "MVPMatrix");

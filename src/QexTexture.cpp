@@ -26,7 +26,9 @@ const struct {
     {2, GL_RGBA, GL_UNSIGNED_SHORT_5_5_5_1},
 };
 
-bool IsFormat(uint32_t format) { return format >= 1 && format <= sizeof kFormats / sizeof kFormats[0]; }
+bool IsFormat(uint32_t format) {
+    return format >= 1 && format <= sizeof kFormats / sizeof kFormats[0];
+}
 
 // Sets a pair of parameters of a bound texture to one value.
 void SetParameters(GLenum target, GLenum first, GLenum second, GLint value) {
@@ -85,8 +87,8 @@ bool QexTexture_IsPossibleSize(uint32_t width, uint32_t height, bool cube) {
 
 extern "C" {
 
-int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height, uint32_t format, int32_t,
-                                    uint32_t stage, uint32_t filter, uint32_t wrap, void* pixels) {
+int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height, uint32_t format,
+                                    int32_t, uint32_t stage, uint32_t filter, uint32_t wrap, void* pixels) {
     memset(texture, 0, sizeof *texture);
     texture->pixels = pixels;
     texture->width = width;
@@ -101,8 +103,8 @@ int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t 
     return QexTexture_SetName(texture, "Noname");
 }
 
-int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage, uint32_t filter, uint32_t wrap,
-                                    const void* tga) {
+int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage, uint32_t filter,
+                                    uint32_t wrap, const void* tga) {
     const uint8_t* file = static_cast<const uint8_t*>(tga);
     const TGAHeader header = ReadTGAHeader(file);
     memset(texture, 0, sizeof *texture);

@@ -40,8 +40,8 @@ void WriteLE32(uint8_t* bytes, uint32_t value) {
 // Loads a PVR image of one colour: every block of every level is the same. `image` is room for it.
 void LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mipmaps, const uint8_t* block,
                  uint32_t blocks) {
-    const uint32_t words[13] = {kPVRHeaderSize, size, size, mipmaps, kPVRFlags, blocks * kETCBlockSize, 4,
-                                0,              0,    0,    0,       kPVRTag,   1};
+    const uint32_t words[13] = {
+        kPVRHeaderSize, size, size, mipmaps, kPVRFlags, blocks * kETCBlockSize, 4, 0, 0, 0, 0, kPVRTag, 1};
     for (uint32_t i = 0; i < 13; ++i) WriteLE32(image + 4 * i, words[i]);
     for (uint32_t i = 0; i < blocks; ++i)
         memcpy(image + kPVRHeaderSize + i * kETCBlockSize, block, kETCBlockSize);
@@ -82,9 +82,13 @@ void FillFace(uint8_t* texels, uint32_t face, int32_t size) {
 
 extern "C" {
 
-QexTexture* Qextexture_GetDefault(void) { return &s_Default; }
+QexTexture* Qextexture_GetDefault(void) {
+    return &s_Default;
+}
 
-void QexTexture_SetBlankNormalMap(uint32_t stage) { QexTexture_Set(&s_BlankNormalMap, stage); }
+void QexTexture_SetBlankNormalMap(uint32_t stage) {
+    QexTexture_Set(&s_BlankNormalMap, stage);
+}
 
 int32_t QexTexture_CreateDefault(void) {
     if (s_Created) {
@@ -122,8 +126,8 @@ int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t siz
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);
     for (uint32_t face = 0; face < 6; ++face) {
         FillFace(texels.Get(), face, size);
-        glTexImage2D(GL_TEXTURE_CUBE_MAP_POSITIVE_X + face, 0, GL_RGB, size, size, 0, GL_RGB, GL_UNSIGNED_BYTE,
-                     texels.Get());
+        glTexImage2D(GL_TEXTURE_CUBE_MAP_POSITIVE_X + face, 0, GL_RGB, size, size, 0, GL_RGB,
+                     GL_UNSIGNED_BYTE, texels.Get());
     }
     glTexParameteri(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_MIN_FILTER, GL_LINEAR);
     glTexParameteri(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_MAG_FILTER, GL_LINEAR);

@@ -32,12 +32,15 @@ uint32_t MeshIndexOf(const QexModel* model, uint32_t nodeIndex) {
     return static_cast<uint32_t>(model->scene.nodes[nodeIndex].objectIndex);
 }
 
-const void* BufferOffset(uint64_t bytes) { return reinterpret_cast<const void*>(static_cast<uintptr_t>(bytes)); }
+const void* BufferOffset(uint64_t bytes) {
+    return reinterpret_cast<const void*>(static_cast<uintptr_t>(bytes));
+}
 
 // Draws `count` vertices from number `first`, by index where the mesh has indices.
 void DrawRange(const QexShaderModuleType* type, bool indexed, GLenum mode, uint32_t first, uint32_t count) {
     if (indexed)
-        QEX_GL(glDrawElements(mode, static_cast<GLsizei>(count), GL_UNSIGNED_SHORT, BufferOffset(uint64_t{first} * 2)));
+        QEX_GL(glDrawElements(mode, static_cast<GLsizei>(count), GL_UNSIGNED_SHORT,
+                              BufferOffset(uint64_t{first} * 2)));
     else
         QEX_GL(glDrawArrays(mode, static_cast<GLint>(first), static_cast<GLsizei>(count)));
 }
@@ -69,8 +72,8 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
     }
     QexShader_Create(&module->vertexShader, type->vertexSource, GL_VERTEX_SHADER);
     QexShader_Create(&module->fragmentShader, type->fragmentSource, GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names, attributeCount,
-                                log) != 0)
+    if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names,
+                                attributeCount, log) != 0)
         QexError(QEX_TAG, "<%s> link failed: %s", type->path, log);
     for (uint32_t i = 0; type->uniforms[i]; ++i)
         QEX_GL(module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]));
@@ -107,10 +110,13 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
     return true;
 }
 
-float QexShaderModule_Opacity(const QexShaderDraw& draw) { return draw.material->opacity * g_fQexGlobalAlpha; }
+float QexShaderModule_Opacity(const QexShaderDraw& draw) {
+    return draw.material->opacity * g_fQexGlobalAlpha;
+}
 
-void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix,
-                                         const QexMatrix* view, const QexMatrix* projection) {
+void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out,
+                                         const QexMatrix* modelMatrix, const QexMatrix* view,
+                                         const QexMatrix* projection) {
     const QexMatrix* world = QexPODAnimation_WorldMatrix(&draw.model->scene, draw.node);
     QexMatrix placed;
     if (modelMatrix) {
@@ -136,7 +142,8 @@ void QexShaderModule_BindMaterialKeepPass(const QexShaderDraw& draw) {
 
 void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw) {
     QexTexture_Set(nullptr, kAlphaUnit);
-    if (draw.node->materialIndex >= 0) QexTexture_Set(TextureOf(draw.model->textures, draw.node), kDiffuseUnit);
+    if (draw.node->materialIndex >= 0)
+        QexTexture_Set(TextureOf(draw.model->textures, draw.node), kDiffuseUnit);
 }
 
 // ---- A mesh ----
@@ -162,7 +169,8 @@ void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* 
 void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
     const QexPODMesh& mesh = model->scene.meshes[meshIndex];
     for (GLuint i = 0; type->attributes[i].name; ++i)
-        if (mesh.attributes[type->attributes[i].element].componentCount) QEX_GL(glDisableVertexAttribArray(i));
+        if (mesh.attributes[type->attributes[i].element].componentCount)
+            QEX_GL(glDisableVertexAttribArray(i));
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
     QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
 }
@@ -197,8 +205,9 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
         const int32_t* bone = batches.boneTable + static_cast<int64_t>(batch) * batches.maxBones;
         const int32_t count = batches.bonesPerBatch[batch];
         const uint32_t first = static_cast<uint32_t>(batches.offsets[batch]);
-        const uint32_t end =
-            batch + 1 < batches.batchCount ? static_cast<uint32_t>(batches.offsets[batch + 1]) : mesh->faceCount;
+        const uint32_t end = batch + 1 < batches.batchCount
+                                 ? static_cast<uint32_t>(batches.offsets[batch + 1])
+                                 : mesh->faceCount;
         QEX_GL(glUniform1i(bones.boneCountLocation, mesh->attributes[QEX_ELEMENT_BONE_INDEX].componentCount));
         for (int32_t j = 0; j < count; ++j) {
             QexPODModel_GetBoneWorldMatrix(scene, &matrices[j], node, &scene->nodes[bone[j]]);

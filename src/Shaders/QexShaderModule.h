@@ -1,9 +1,10 @@
 // What the built-in shader modules share.
 //
-// A module is a description (QexShaderModuleType: sources, attributes, uniforms, samplers) and a Render that sets
-// its uniforms. Everything else, from compiling to drawing a mesh, is here and works from the description. An
-// instance (QexShaderModule) is allocated by CreateProgram and freed by Release; its slots hold the uniform
-// locations in the description's order, then the parameters, the first of which is the alpha threshold.
+// A module is a description (QexShaderModuleType: sources, attributes, uniforms, samplers) and a Render that
+// sets its uniforms. Everything else, from compiling to drawing a mesh, is here and works from the
+// description. An instance (QexShaderModule) is allocated by CreateProgram and freed by Release; its slots
+// hold the uniform locations in the description's order, then the parameters, the first of which is the alpha
+// threshold.
 //
 // GL errors are reported under the module whose description is at work: QEX_MODULE is `type->path` in every
 // function that has one.
@@ -71,8 +72,9 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
 float QexShaderModule_Opacity(const QexShaderDraw& draw);
 
 // projection * view * [model matrix *] node world.
-void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix,
-                                         const QexMatrix* view, const QexMatrix* projection);
+void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out,
+                                         const QexMatrix* modelMatrix, const QexMatrix* view,
+                                         const QexMatrix* projection);
 
 // Binds the alpha texture (a node whose material has one leaves the opaque pass), asks the model's hook, and
 // binds the diffuse texture unless the hook bound something itself.
@@ -102,18 +104,26 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
                                         const QexShaderBones& bones);
 
 // The operations that every module exports and that its description settles. `type` is a pointer to it.
-#define QEX_SHADER_MODULE_LIFETIME(Name, type)                                                        \
-    QexShaderModule* Name##_CreateProgram(void) { return QexShaderModule_Create(type); }              \
-    int32_t Name##_SetupProgram(QexShaderModule* module) { return QexShaderModule_Setup(type, module); } \
-    void Name##_Release(QexShaderModule** module) { QexShaderModule_Release(type, module); }
+#define QEX_SHADER_MODULE_LIFETIME(Name, type)             \
+    QexShaderModule* Name##_CreateProgram(void) {          \
+        return QexShaderModule_Create(type);               \
+    }                                                      \
+    int32_t Name##_SetupProgram(QexShaderModule* module) { \
+        return QexShaderModule_Setup(type, module);        \
+    }                                                      \
+    void Name##_Release(QexShaderModule** module) {        \
+        QexShaderModule_Release(type, module);             \
+    }
 
-#define QEX_SHADER_MODULE_THRESHOLD(Name, slot)                                                       \
-    void Name##_SetAlphaThreshold(QexShaderModule* module, float threshold) {                         \
-        module->slots[slot].value = threshold;                                                        \
-    }                                                                                                 \
-    float Name##_GetAlphaThreshold(const QexShaderModule* module) { return module->slots[slot].value; }
+#define QEX_SHADER_MODULE_THRESHOLD(Name, slot)                               \
+    void Name##_SetAlphaThreshold(QexShaderModule* module, float threshold) { \
+        module->slots[slot].value = threshold;                                \
+    }                                                                         \
+    float Name##_GetAlphaThreshold(const QexShaderModule* module) {           \
+        return module->slots[slot].value;                                     \
+    }
 
-#define QEX_SHADER_MODULE_DRAW_MESH(Name, type)                                            \
-    int32_t Name##_DrawMesh(QexShaderModule*, QexModel* model, uint32_t nodeIndex) {       \
-        return QexShaderModule_DrawMesh(type, model, nodeIndex);                           \
+#define QEX_SHADER_MODULE_DRAW_MESH(Name, type)                                      \
+    int32_t Name##_DrawMesh(QexShaderModule*, QexModel* model, uint32_t nodeIndex) { \
+        return QexShaderModule_DrawMesh(type, model, nodeIndex);                     \
     }

@@ -14,10 +14,10 @@ struct Row {
     void (*setDisplacement)(QexShaderModule*, float, float);
 };
 
-#define ROW(kind, Name)                                                                      \
-    {                                                                                        \
-        kind, Name##_CreateProgram, Name##_Release, Name##_GetAlphaThreshold,                \
-            Name##_SetAlphaThreshold, nullptr, nullptr                                       \
+#define ROW(kind, Name)                                                                                 \
+    {                                                                                                   \
+        kind, Name##_CreateProgram, Name##_Release, Name##_GetAlphaThreshold, Name##_SetAlphaThreshold, \
+            nullptr, nullptr                                                                            \
     }
 
 const Row kRows[] = {
@@ -33,7 +33,9 @@ const Row* Find(uint32_t kind) {
 }
 
 // The row of a module that is there; null otherwise.
-const Row* Find(const QexShaderModule* module, uint32_t kind) { return module ? Find(kind) : nullptr; }
+const Row* Find(const QexShaderModule* module, uint32_t kind) {
+    return module ? Find(kind) : nullptr;
+}
 
 }  // namespace
 

@@ -66,7 +66,8 @@ void QexSkinningTextureShader_Render(QexShaderModule* module, QexModel* model, u
     QexMatrix_Multiply(&viewProjection, projection, view);
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kOpacity), QexShaderModule_Opacity(draw)));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kAlphaThreshold), module->slots[kThreshold].value));
-    QEX_GL(glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
+    QEX_GL(
+        glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
     QexShaderModule_BindMaterialKeepPass(draw);
     QexSkinningTextureShader_DrawMesh(module, model, nodeIndex, modelMatrix);
 }

@@ -42,8 +42,8 @@ const QexShaderModuleType kType = {
 
 }  // namespace
 
-void QexTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                  const QexMatrix* projection) {
+void QexTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix,
+                                  const QexMatrix* view, const QexMatrix* projection) {
     const QexShaderModuleType* type = draw.type;
     const QexShaderSlot* slots = draw.module->slots;
     QexMatrix mvp;

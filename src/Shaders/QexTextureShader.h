@@ -1,4 +1,5 @@
-// What the unlit modules for meshes without bones have in common: vertex stage, uniforms and how they are set.
+// What the unlit modules for meshes without bones have in common: vertex stage, uniforms and how they are
+// set.
 #pragma once
 
 #include "QexShaderModule.h"
@@ -12,5 +13,5 @@ extern const char* const kQexTextureFragmentSource;
 enum { kTextureMvpMatrix, kTextureOpacity, kTextureAlphaThreshold, kTextureThreshold };
 
 // Sets opacity, threshold and matrix.
-void QexTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                  const QexMatrix* projection);
+void QexTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix,
+                                  const QexMatrix* view, const QexMatrix* projection);

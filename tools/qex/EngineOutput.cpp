@@ -43,7 +43,8 @@ void ShowErrorsAtExit() {
 std::string Strip(const std::string& line) {
     size_t at = line.find(": ");
     std::string text = at == std::string::npos ? line : line.substr(at + 2);
-    if (!text.empty() && text[0] == '<' && (at = text.find("> ")) != std::string::npos) text = text.substr(at + 2);
+    if (!text.empty() && text[0] == '<' && (at = text.find("> ")) != std::string::npos)
+        text = text.substr(at + 2);
     return text;
 }
 
@@ -62,7 +63,9 @@ EngineOutput::EngineOutput() {
     active_ = true;
 }
 
-EngineOutput::~EngineOutput() { Stop(); }
+EngineOutput::~EngineOutput() {
+    Stop();
+}
 
 void EngineOutput::Stop() {
     if (!active_) return;

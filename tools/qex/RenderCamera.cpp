@@ -11,7 +11,9 @@ constexpr float kDegree = 3.14159265f / 180;
 constexpr float kMargin = 1.06f;  // of the picture around the points
 
 // Length of a vector's part along an axis.
-float Along(const QexVec3& v, const QexVec3& axis) { return QexVec3_DotProduct(&v, &axis); }
+float Along(const QexVec3& v, const QexVec3& axis) {
+    return QexVec3_DotProduct(&v, &axis);
+}
 
 QexVec3 Combine(const QexVec3& x, const QexVec3& y, const QexVec3& z, float a, float b, float c) {
     return {x.x * a + y.x * b + z.x * c, x.y * a + y.y * b + z.y * c, x.z * a + y.z * b + z.z * c};
@@ -40,7 +42,8 @@ bool UseSceneCamera(QexModel* model, uint32_t index, float aspect, QexCamera* ca
 
 OrbitView ChooseView(const std::vector<QexVec3>& points, OrbitView view) {
     const Bounds box = BoundsOf(points);
-    const float width = box.high.x - box.low.x, height = box.high.y - box.low.y, depth = box.high.z - box.low.z;
+    const float width = box.high.x - box.low.x, height = box.high.y - box.low.y,
+                depth = box.high.z - box.low.z;
     if (view.given || box.empty || depth > std::min(width, height) * 0.5f) return view;
     view.yaw = view.pitch = 0;
     return view;
@@ -68,8 +71,8 @@ void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, floa
         distance = std::max({distance, Along(p, back) + std::fabs(Along(p, right) - cx) * kMargin / tanX,
                              Along(p, back) + std::fabs(Along(p, up) - cy) * kMargin / tanY});
     const float depth = std::max(distance - bounds.low.z, 1e-4f);
-    const float size = std::max({bounds.high.x - bounds.low.x, bounds.high.y - bounds.low.y,
-                                 bounds.high.z - bounds.low.z, 1e-4f});
+    const float size = std::max(
+        {bounds.high.x - bounds.low.x, bounds.high.y - bounds.low.y, bounds.high.z - bounds.low.z, 1e-4f});
     distance = std::max(distance, bounds.high.z + size * 0.05f);
     const float zNear = std::max((distance - bounds.high.z) * 0.5f, depth * 1e-3f);
     const QexVec3 eye = Combine(right, up, back, cx, cy, distance);

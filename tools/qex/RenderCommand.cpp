@@ -118,13 +118,15 @@ bool Renderer::Load() {
 
 std::vector<double> Renderer::Frames() const {
     std::vector<double> frames;
-    if (!options_.sequence) return std::vector<double>(static_cast<size_t>(std::max(options_.turn, 1)), options_.frame);
+    if (!options_.sequence)
+        return std::vector<double>(static_cast<size_t>(std::max(options_.turn, 1)), options_.frame);
     const double count = std::floor((options_.last - options_.first) / options_.step + 1e-9) + 1;
     for (double i = 0; i < count; ++i) frames.push_back(options_.first + i * options_.step);
     return frames;
 }
 
-// The engine plays a loop, in which the last frame is the first again. A picture of the last frame shows its own keys.
+// The engine plays a loop, in which the last frame is the first again. A picture of the last frame shows its
+// own keys.
 void Renderer::SetFrame(double frame) {
     QexPODModel& scene = model_.scene;
     const float f = static_cast<float>(frame);
@@ -140,7 +142,8 @@ void Renderer::Frame() {
     const size_t share = std::max<size_t>(1000, kFramingPoints / frames.size());
     for (double frame : frames) {
         SetFrame(frame);
-        for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i) CollectPoints(&model_.scene, i, share, &points_);
+        for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
+            CollectPoints(&model_.scene, i, share, &points_);
     }
 }
 
@@ -162,7 +165,9 @@ void Renderer::Draw(double frame, float turned) {
         FramePoints(points_, view, aspect, &camera_);
     QexLightSet lights = {};
     QexModel_GetLight(&model_, &lights);
-    const auto channel = [&](int shift) { return static_cast<float>(options_.background >> shift & 0xFF) / 255.0f; };
+    const auto channel = [&](int shift) {
+        return static_cast<float>(options_.background >> shift & 0xFF) / 255.0f;
+    };
     glViewport(0, 0, options_.width, options_.height);
     QexRenderer_SetZWrite(1);
     glClearColor(channel(16), channel(8), channel(0), 1);
@@ -172,8 +177,8 @@ void Renderer::Draw(double frame, float turned) {
     QexRenderer_SetAlphaBlendModeSeparate(1, 0);
     uint32_t count = 0;
     for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-        QexModel_RenderWithCameraEx(&model_, &lights, &camera_, nullptr, pass, QEX_RENDER_OPAQUE, transparent_.data(),
-                                    &count);
+        QexModel_RenderWithCameraEx(&model_, &lights, &camera_, nullptr, pass, QEX_RENDER_OPAQUE,
+                                    transparent_.data(), &count);
     // The far sides of transparent bodies first, then the near ones.
     QexRenderer_SetZWrite(0);
     for (int32_t culled : {2, 1}) {
@@ -197,8 +202,8 @@ bool Renderer::Save(const std::string& path) {
 void Renderer::ReportProgress(size_t done, size_t count) const {
     if (options_.quiet || count < 2 || !isatty(STDERR_FILENO)) return;
     const size_t width = 40, filled = width * done / count;
-    fprintf(stderr, "\r[%s%s] %zu/%zu%s", std::string(filled, '=').c_str(), std::string(width - filled, ' ').c_str(),
-            done, count, done == count ? "\n" : "");
+    fprintf(stderr, "\r[%s%s] %zu/%zu%s", std::string(filled, '=').c_str(),
+            std::string(width - filled, ' ').c_str(), done, count, done == count ? "\n" : "");
 }
 
 void Renderer::ReportStats(size_t pictures) const {
@@ -237,8 +242,10 @@ int Renderer::Run() {
         const auto start = Clock::now();
         {
             EngineOutput quiet;
-            Draw(frames[i], options_.turn ? 360.0f * static_cast<float>(i) / static_cast<float>(options_.turn) : 0);
-            const std::string reason = i == 0 ? WhyNothingShows(model_, camera_, *context_, options_.background, points_) : "";
+            Draw(frames[i],
+                 options_.turn ? 360.0f * static_cast<float>(i) / static_cast<float>(options_.turn) : 0);
+            const std::string reason =
+                i == 0 ? WhyNothingShows(model_, camera_, *context_, options_.background, points_) : "";
             DrawText();
             quiet.Stop();
             if (!reason.empty()) fprintf(stderr, "qex render: warning: %s\n", reason.c_str());
@@ -249,7 +256,8 @@ int Renderer::Run() {
         char number[32] = "";
         if (numbered) snprintf(number, sizeof number, "-%04zu", i);
         const std::string path =
-            numbered ? WithoutExtension(options_.output) + number + "." + Extension(options_.output) : options_.output;
+            numbered ? WithoutExtension(options_.output) + number + "." + Extension(options_.output)
+                     : options_.output;
         if (!Save(path)) return 2;
         ReportProgress(i + 1, frames.size());
     }
@@ -259,4 +267,6 @@ int Renderer::Run() {
 
 }  // namespace
 
-int RunRender(const RenderOptions& options) { return Renderer(options).Run(); }
+int RunRender(const RenderOptions& options) {
+    return Renderer(options).Run();
+}

@@ -14,8 +14,8 @@ struct RenderOptions {
     double frame = 0;
     bool sequence = false;  // several frames, numbered
     double first = 0, last = 0, step = 1;
-    int turn = 0;           // pictures of one turn around the scene, 0 for none
-    int camera = 0;         // scene camera; with autoCamera or without cameras the scene is framed
+    int turn = 0;    // pictures of one turn around the scene, 0 for none
+    int camera = 0;  // scene camera; with autoCamera or without cameras the scene is framed
     bool autoCamera = false;
     OrbitView view;
     uint32_t background = 0x404858;  // RRGGBB

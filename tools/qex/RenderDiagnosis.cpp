@@ -17,11 +17,11 @@ struct Magic {
 };
 
 const Magic kMagics[] = {
-    {"\x89PNG", 4, "a PNG image"},         {"\xFF\xD8\xFF", 3, "a JPEG image"},
-    {"glTF", 4, "a binary glTF scene"},    {"\xABKTX 11", 7, "a KTX texture"},
-    {"\xABKTX 20", 7, "a KTX 2 texture"},  {"PVR\x03", 4, "a PVR texture of version 3"},
-    {"Kaydara FBX", 11, "an FBX scene"},   {"<?xml", 5, "an XML file"},
-    {"xof ", 4, "a DirectX scene"},        {"DDS ", 4, "a DDS texture"},
+    {"\x89PNG", 4, "a PNG image"},        {"\xFF\xD8\xFF", 3, "a JPEG image"},
+    {"glTF", 4, "a binary glTF scene"},   {"\xABKTX 11", 7, "a KTX texture"},
+    {"\xABKTX 20", 7, "a KTX 2 texture"}, {"PVR\x03", 4, "a PVR texture of version 3"},
+    {"Kaydara FBX", 11, "an FBX scene"},  {"<?xml", 5, "an XML file"},
+    {"xof ", 4, "a DirectX scene"},       {"DDS ", 4, "a DDS texture"},
 };
 
 bool OnlyBackground(const std::vector<uint8_t>& pixels, uint32_t background) {
@@ -53,7 +53,8 @@ std::string OutsideOf(const QexCamera& camera, const std::vector<QexVec3>& point
     const size_t all = points.size();
     if (close == all) return "it lies behind the camera or nearer than its near plane";
     if (far == all) return "it lies beyond the camera's far plane";
-    if (left == all || right == all || below == all || above == all) return "it lies outside the camera's view";
+    if (left == all || right == all || below == all || above == all)
+        return "it lies outside the camera's view";
     return "";
 }
 
@@ -78,8 +79,9 @@ std::string WhyNotPod(const std::string& path, const std::string& wanted) {
     return "";
 }
 
-std::string WhyNothingShows(const QexModel& model, const QexCamera& camera, const qex::HeadlessContext& context,
-                            uint32_t background, const std::vector<QexVec3>& points) {
+std::string WhyNothingShows(const QexModel& model, const QexCamera& camera,
+                            const qex::HeadlessContext& context, uint32_t background,
+                            const std::vector<QexVec3>& points) {
     if (!OnlyBackground(context.ReadPixels(), background)) return "";
     const QexPODModel& scene = model.scene;
     const std::string nothing = "nothing of the scene shows: ";
@@ -95,9 +97,11 @@ std::string WhyNothingShows(const QexModel& model, const QexCamera& camera, cons
     if (!faces) return nothing + "its meshes have no faces";
     if (points.empty()) return nothing + "its meshes have no positions, or none that are finite numbers";
     const Bounds bounds = BoundsOf(points);
-    const bool point = bounds.low.x == bounds.high.x && bounds.low.y == bounds.high.y && bounds.low.z == bounds.high.z;
+    const bool point =
+        bounds.low.x == bounds.high.x && bounds.low.y == bounds.high.y && bounds.low.z == bounds.high.z;
     if (point) return nothing + "it is shrunk to a point (a scale of 0?)";
-    if (!anyOpaque) return nothing + "all its materials are transparent (an opacity of at most 0.5 is not drawn)";
+    if (!anyOpaque)
+        return nothing + "all its materials are transparent (an opacity of at most 0.5 is not drawn)";
     const std::string outside = OutsideOf(camera, points);
     if (!outside.empty()) return nothing + outside;
     return nothing + "it has the colour of the background, or is too small to be seen";

@@ -90,10 +90,12 @@ bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
 int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
     const TextureFile found = FindTexture(path);
     if (found.kind == TextureFile::kMissing) {
-        g_problems.push_back("texture " + std::string(path) + " is missing (no .pvr, .ktx or picture of that name)");
+        g_problems.push_back("texture " + std::string(path) +
+                             " is missing (no .pvr, .ktx or picture of that name)");
         return 0;
     }
-    if (found.kind == TextureFile::kPicture) return LoadPicture(model, CurrentMaterial(model), found.path) ? 1 : 0;
+    if (found.kind == TextureFile::kPicture)
+        return LoadPicture(model, CurrentMaterial(model), found.path) ? 1 : 0;
     if (static_cast<int32_t>(found.path.size()) <= capacity)
         snprintf(path, static_cast<size_t>(capacity) + 1, "%s", found.path.c_str());
     return 0;

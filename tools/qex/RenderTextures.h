@@ -6,11 +6,11 @@
 
 #include "Qex.h"
 
-// Puts the texture hook into a model. For NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other picture
-// formats of that name; pictures are decoded here, with their alpha channel as the alpha texture.
+// Puts the texture hook into a model. For NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other
+// picture formats of that name; pictures are decoded here, with their alpha channel as the alpha texture.
 void SetTextureHook(QexModel* model);
 
-// After loading: materials without a texture get one of their diffuse colour, KTX textures a filter that needs no
-// mipmaps, nodes with an alpha texture leave the opaque pass. Returns a line for each texture that is missing or
-// could not be read.
+// After loading: materials without a texture get one of their diffuse colour, KTX textures a filter that
+// needs no mipmaps, nodes with an alpha texture leave the opaque pass. Returns a line for each texture that
+// is missing or could not be read.
 std::vector<std::string> CompleteTextures(QexModel* model, const std::string& directory);

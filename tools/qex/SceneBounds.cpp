@@ -6,7 +6,8 @@
 namespace {
 
 const uint8_t* ElementAt(const QexPODMesh& mesh, const CPODData& element, uint32_t vertex) {
-    const uint8_t* base = mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
+    const uint8_t* base =
+        mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
     return base + static_cast<size_t>(vertex) * element.stride;
 }
 
@@ -21,7 +22,9 @@ void AddPoint(const QexVec4& p, std::vector<QexVec3>* points) {
     if (std::isfinite(p.x) && std::isfinite(p.y) && std::isfinite(p.z)) points->push_back({p.x, p.y, p.z});
 }
 
-float Component(const QexVec4& v, uint32_t i) { return i == 0 ? v.x : i == 1 ? v.y : i == 2 ? v.z : v.w; }
+float Component(const QexVec4& v, uint32_t i) {
+    return i == 0 ? v.x : i == 1 ? v.y : i == 2 ? v.z : v.w;
+}
 
 // The vertices of each batch's triangles, moved by the batch's bones.
 void CollectSkinned(QexPODModel* scene, uint32_t meshNode, uint32_t step, std::vector<QexVec3>* points) {
@@ -34,21 +37,25 @@ void CollectSkinned(QexPODModel* scene, uint32_t meshNode, uint32_t step, std::v
     for (int32_t b = 0; b < batches.batchCount; ++b) {
         const int32_t* bones = batches.boneTable + static_cast<ptrdiff_t>(b) * batches.maxBones;
         for (int32_t i = 0; i < batches.bonesPerBatch[b]; ++i)
-            QexPODModel_GetBoneWorldMatrix(scene, &matrices[static_cast<size_t>(i)], node, &scene->nodes[bones[i]]);
+            QexPODModel_GetBoneWorldMatrix(scene, &matrices[static_cast<size_t>(i)], node,
+                                           &scene->nodes[bones[i]]);
         const uint32_t end =
             b + 1 < batches.batchCount ? static_cast<uint32_t>(batches.offsets[b + 1]) : mesh.faceCount;
         for (uint32_t i = static_cast<uint32_t>(batches.offsets[b]) * 3; i < end * 3; i += step) {
             uint32_t vertex = 0;
-            QexPODVertex_ReadInt(&vertex, mesh.faces.data + static_cast<size_t>(i) * indexSize, mesh.faces.type);
+            QexPODVertex_ReadInt(&vertex, mesh.faces.data + static_cast<size_t>(i) * indexSize,
+                                 mesh.faces.type);
             const QexVec4 position = ReadPosition(mesh, vertex);
-            const QexVec4 index = ReadElement(mesh, mesh.boneIndices, vertex), weight = ReadElement(mesh, mesh.boneWeights, vertex);
+            const QexVec4 index = ReadElement(mesh, mesh.boneIndices, vertex),
+                          weight = ReadElement(mesh, mesh.boneWeights, vertex);
             QexVec4 sum = {0, 0, 0, 0};
             for (uint32_t k = 0; k < mesh.boneIndices.componentCount; ++k) {
                 QexVec4 moved;
                 // Weights in unscaled bytes are shares of 255.
                 float share = Component(weight, k);
                 if (mesh.boneWeights.type == QEX_POD_UNSIGNED_BYTE) share /= 255.0f;
-                QexMatrix_TransformVec4(&matrices[static_cast<size_t>(Component(index, k))], &position, &moved);
+                QexMatrix_TransformVec4(&matrices[static_cast<size_t>(Component(index, k))], &position,
+                                        &moved);
                 sum = {sum.x + moved.x * share, sum.y + moved.y * share, sum.z + moved.z * share, 1};
             }
             AddPoint(sum, points);

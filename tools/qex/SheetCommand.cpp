@@ -28,7 +28,8 @@ int RunSheet(const SheetOptions& options) {
     std::string error;
     size_t cellWidth = 0, cellHeight = 0;
     for (size_t i = 0; i < images.size(); ++i) {
-        if (!LoadImage(options.inputs[i], &images[i], &error)) return Fail(options.inputs[i] + ": " + error, 1);
+        if (!LoadImage(options.inputs[i], &images[i], &error))
+            return Fail(options.inputs[i] + ": " + error, 1);
         cellWidth = std::max(cellWidth, static_cast<size_t>(images[i].width));
         cellHeight = std::max(cellHeight, static_cast<size_t>(images[i].height));
     }
@@ -39,7 +40,9 @@ int RunSheet(const SheetOptions& options) {
     if (width * height > kMaxPixels) return Fail("the sheet would have more than 2^28 pixels", 2);
     std::vector<uint8_t> sheet(width * height * 4, 255);
     for (size_t i = 0; i < images.size(); ++i)
-        Paste(images[i], gap + i % columns * (cellWidth + gap), gap + i / columns * (cellHeight + gap), width, &sheet);
-    if (SavePng(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error)) return 0;
+        Paste(images[i], gap + i % columns * (cellWidth + gap), gap + i / columns * (cellHeight + gap), width,
+              &sheet);
+    if (SavePng(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error))
+        return 0;
     return Fail(options.output + ": " + error, 2);
 }

@@ -14,7 +14,9 @@ std::string Directory(const std::string& path) {
     return slash == std::string::npos ? "" : path.substr(0, slash + 1);
 }
 
-std::string FileName(const std::string& path) { return path.substr(Directory(path).size()); }
+std::string FileName(const std::string& path) {
+    return path.substr(Directory(path).size());
+}
 
 std::string WithoutExtension(const std::string& path) {
     const size_t dot = path.find_last_of('.');

@@ -9,8 +9,8 @@ struct TextureFile {
     std::string path;  // of the file that was found
 };
 
-// Looks for `path` with the extension pvr, then ktx, then as it is, then with the extension of another picture
-// format.
+// Looks for `path` with the extension pvr, then ktx, then as it is, then with the extension of another
+// picture format.
 TextureFile FindTexture(const std::string& path);
 
 // "_a" before the last four characters, as the engine names alpha textures.

@@ -28,8 +28,8 @@ std::string ParseSize(const std::string& text, RenderOptions* options) {
 std::string ParseFrames(const std::string& text, RenderOptions* options) {
     int consumed = 0;
     options->sequence = true;
-    const int count =
-        sscanf(text.c_str(), "%lf:%lf%n:%lf%n", &options->first, &options->last, &consumed, &options->step, &consumed);
+    const int count = sscanf(text.c_str(), "%lf:%lf%n:%lf%n", &options->first, &options->last, &consumed,
+                             &options->step, &consumed);
     const bool whole = count >= 2 && static_cast<size_t>(consumed) == text.size();
     if (!whole || !(options->step > 0) || !(options->first >= 0) || !(options->last >= options->first) ||
         (options->last - options->first) / options->step >= 100000)
@@ -56,7 +56,8 @@ std::string ParseColour(const std::string& text, RenderOptions* options) {
 
 std::string ParseOrbit(const std::string& text, RenderOptions* options) {
     int consumed = 0;
-    const int count = sscanf(text.c_str(), "%f%n,%f%n", &options->view.yaw, &consumed, &options->view.pitch, &consumed);
+    const int count =
+        sscanf(text.c_str(), "%f%n,%f%n", &options->view.yaw, &consumed, &options->view.pitch, &consumed);
     options->autoCamera = options->view.given = true;
     if (count < 1 || static_cast<size_t>(consumed) != text.size() || !(options->view.pitch >= -89) ||
         !(options->view.pitch <= 89) || !(options->view.yaw >= -3600) || !(options->view.yaw <= 3600))
@@ -82,8 +83,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     AddParsed(app, "--size", "WxH in pixels (800x600)", options, ParseSize);
     app->add_option("--frame", options->frame, "animation frame (0)")->check(CLI::Range(0.0, 1e6));
     AddParsed(app, "--frames", "FIRST:LAST:STEP, a numbered picture each", options, ParseFrames);
-    AddParsed(app, "--camera", "scene camera N, or auto to frame the whole scene (0 if there is one)", options,
-              ParseCamera);
+    AddParsed(app, "--camera", "scene camera N, or auto to frame the whole scene (0 if there is one)",
+              options, ParseCamera);
     AddParsed(app, "--orbit", "YAW[,PITCH] of the automatic camera in degrees (30,15)", options, ParseOrbit);
     app->add_option("--up", options->view.up, "the scene's vertical axis: x, y, z, -x, -y or -z (y)")
         ->transform(CLI::CheckedTransformer(std::map<std::string, UpAxis>{{"x", UpAxis::kX},
@@ -92,7 +93,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
                                                                           {"-x", UpAxis::kMinusX},
                                                                           {"-y", UpAxis::kMinusY},
                                                                           {"-z", UpAxis::kMinusZ}}));
-    app->add_option("--turn", options->turn, "N pictures of one turn around the scene")->check(CLI::Range(1, 10000));
+    app->add_option("--turn", options->turn, "N pictures of one turn around the scene")
+        ->check(CLI::Range(1, 10000));
     AddParsed(app, "--background", "RRGGBB (404858)", options, ParseColour);
     app->add_option("--text", options->text, "line of text on the picture, at most 64 characters");
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
@@ -101,7 +103,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
 
 void SetUpConvert(CLI::App* app, ConvertOptions* options) {
     app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
-    app->add_option("-o,--output", options->output, "POD scene; its textures are written beside it")->required();
+    app->add_option("-o,--output", options->output, "POD scene; its textures are written beside it")
+        ->required();
     app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
         ->check(CLI::Range(1.0, 1000.0));
     app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
