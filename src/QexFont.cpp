@@ -19,8 +19,6 @@ constexpr uint32_t kSheetColumns = 32;
 constexpr uint32_t kFirstCharacter = 32;
 constexpr uint32_t kLastCharacter = 127;
 constexpr uint32_t kInitialCapacity = 80;
-constexpr uint32_t kDiffuseUnit = 0;
-constexpr uint32_t kAlphaUnit = 3;
 
 const char* const kVertexSource = R"(#version 100
 attribute highp vec4 a_v4Position;
@@ -74,21 +72,13 @@ uint32_t IndexCount(uint32_t glyphs) {
     return glyphs * 6 - 2;
 }
 
-template <class T>
-bool Resize(T*& array, uint64_t bytes) {
-    void* resized = array ? QexMemory_ReAlloc(array, static_cast<uint32_t>(bytes))
-                          : QexMemory_Alloc(static_cast<uint32_t>(bytes));
-    if (resized) array = static_cast<T*>(resized);
-    return resized != nullptr;
-}
-
 // Makes room for that many glyphs; false when memory runs out.
 bool Reserve(Glyphs* glyphs, uint32_t count) {
     if (count <= glyphs->capacity) return true;
-    if (!Resize(glyphs->positions, uint64_t{count} * sizeof *glyphs->positions) ||
-        !Resize(glyphs->texCoords, uint64_t{count} * sizeof *glyphs->texCoords) ||
-        !Resize(glyphs->colours, uint64_t{count} * sizeof *glyphs->colours) ||
-        !Resize(glyphs->indices, IndexCount(count)))
+    if (!QexMemory_Resize(glyphs->positions, uint64_t{count} * sizeof *glyphs->positions) ||
+        !QexMemory_Resize(glyphs->texCoords, uint64_t{count} * sizeof *glyphs->texCoords) ||
+        !QexMemory_Resize(glyphs->colours, uint64_t{count} * sizeof *glyphs->colours) ||
+        !QexMemory_Resize(glyphs->indices, IndexCount(count)))
         return false;
     glyphs->capacity = count;
     return true;
@@ -242,9 +232,9 @@ int32_t QexFont_CreateShader(void) {
     QEX_GL(p.projectionLocation = glGetUniformLocation(p.program, "u_m4Projection"));
     QEX_GL(glUniformMatrix4fv(p.projectionLocation, 1, GL_FALSE, s_Projection.m));
     QEX_GL(p.textureLocation = glGetUniformLocation(p.program, "u_s2dTexture"));
-    QEX_GL(glUniform1i(p.textureLocation, static_cast<GLint>(kDiffuseUnit)));
+    QEX_GL(glUniform1i(p.textureLocation, kDiffuseUnit));
     QEX_GL(p.alphaLocation = glGetUniformLocation(p.program, "u_s2dAlpha"));
-    QEX_GL(glUniform1i(p.alphaLocation, static_cast<GLint>(kAlphaUnit)));
+    QEX_GL(glUniform1i(p.alphaLocation, kAlphaUnit));
     CreateTexture();
     return 0;
 }

@@ -24,3 +24,6 @@
         call;           \
         QEX_GL_CHECK(); \
     } while (0)
+
+// Texture units, the same in every module.
+enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };

@@ -532,16 +532,6 @@ bool ReadCount(Reader& reader, int kind, uint32_t length) {
                 k.name);
 }
 
-// Resizes an array of records; a null one is allocated.
-bool Resize(void** array, uint64_t bytes) {
-    if (bytes > UINT32_MAX) return false;
-    void* resized = *array ? QexMemory_ReAlloc(*array, static_cast<uint32_t>(bytes))
-                           : QexMemory_Alloc(static_cast<uint32_t>(bytes));
-    if (!resized) return false;
-    *array = resized;
-    return true;
-}
-
 // The next zeroed record of a kind. Arrays grow with the records that are really there, so that a count alone
 // takes no memory.
 void* NextRecord(Reader& reader, int kind) {
@@ -551,11 +541,8 @@ void* NextRecord(Reader& reader, int kind) {
     if (used == reader.capacity[kind]) {
         uint32_t capacity = used ? used * 2 : 16;
         if (capacity > reader.declared[kind]) capacity = reader.declared[kind];
-        void* extents = reader.extents[kind];
-        const bool resized = Resize(&array, uint64_t{capacity} * k.size) &&
-                             Resize(&extents, uint64_t{capacity} * sizeof(QexPODExtents));
-        reader.extents[kind] = static_cast<QexPODExtents*>(extents);
-        if (!resized) {
+        if (!QexMemory_Resize(array, uint64_t{capacity} * k.size) ||
+            !QexMemory_Resize(reader.extents[kind], uint64_t{capacity} * sizeof(QexPODExtents))) {
             OutOfMemory(__LINE__);
             return nullptr;
         }

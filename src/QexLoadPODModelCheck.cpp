@@ -5,6 +5,7 @@
 #include "QexDiagnostics.h"
 #include "QexLoadPODModel.h"
 #include "QexMemory.h"
+#include "QexPODModel.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 
@@ -115,14 +116,6 @@ bool CheckFaces(const Check& at, const uint32_t* extents) {
     return Fail(at, "a face uses vertex %u of %u", highest, mesh.vertexCount);
 }
 
-const uint8_t* ElementData(const QexPODMesh& mesh, const CPODData& element) {
-    return mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
-}
-
-uint8_t* ElementData(QexPODMesh& mesh, const CPODData& element) {
-    return const_cast<uint8_t*>(ElementData(static_cast<const QexPODMesh&>(mesh), element));
-}
-
 // Bone indices count even where the file calls them normalised: the shaders get them as they are.
 uint32_t BoneIndexType(uint32_t type) {
     switch (type) {
@@ -140,12 +133,13 @@ bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
     QexPODMesh& mesh = at.scene->meshes[at.index];
     const uint32_t n = QexPODData_Components(mesh.boneIndices);
     const uint32_t type = BoneIndexType(mesh.boneIndices.type);
-    uint8_t* source = ElementData(mesh, mesh.boneIndices) + uint64_t{vertex} * mesh.boneIndices.stride;
+    uint8_t* source =
+        QexPODMesh_ElementData(&mesh, mesh.boneIndices) + uint64_t{vertex} * mesh.boneIndices.stride;
     float bone[4], weight[4];
     QexPODVertex_ReadVec(bone, source, type, static_cast<int32_t>(n));
-    QexPODVertex_ReadVec(weight,
-                         ElementData(mesh, mesh.boneWeights) + uint64_t{vertex} * mesh.boneWeights.stride,
-                         mesh.boneWeights.type, static_cast<int32_t>(n));
+    QexPODVertex_ReadVec(
+        weight, QexPODMesh_ElementData(&mesh, mesh.boneWeights) + uint64_t{vertex} * mesh.boneWeights.stride,
+        mesh.boneWeights.type, static_cast<int32_t>(n));
     bool changed = false;
     for (uint32_t i = 0; i < n; ++i) {
         if (bone[i] >= 0 && bone[i] < static_cast<float>(bones)) continue;

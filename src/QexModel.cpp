@@ -14,19 +14,9 @@ constexpr size_t kPathSize = 256;
 
 template <class T>
 T* AllocZeroed(uint32_t count) {
-    QexScratch<T> block(count ? count : 1);
-    if (!block) {
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return nullptr;
-    }
-    memset(static_cast<void*>(block.Get()), 0, (count ? count : 1) * sizeof(T));
-    return block.Take();
-}
-
-template <class T>
-void FreeArray(T*& array) {
-    QexMemory_Free(array);
-    array = nullptr;
+    T* array = QexMemory_AllocZeroed<T>(count);
+    if (!array) QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+    return array;
 }
 
 // Joins directory and name; false when they do not fit.
@@ -40,8 +30,8 @@ bool JoinPath(char (&path)[kPathSize], const char* directory, const char* name) 
 
 // Lets go of what a former load left in the model, all but its share of the shaders.
 void Discard(QexModel* model) {
-    FreeArray(model->screenBoxes);
-    FreeArray(model->nodeBoxes);
+    QexMemory_FreeArray(model->screenBoxes);
+    QexMemory_FreeArray(model->nodeBoxes);
     QexModel_UnloadTextures(model);
     QexModel_UnloadGeometry(model);
     QexPODModel_Release(&model->scene);
@@ -180,8 +170,8 @@ void QexModel_UnloadGeometry(QexModel* model) {
             QEX_GL(glDeleteBuffers(1, &model->indexBuffers[i]));
         if (model->vertexBuffers) QEX_GL(glDeleteBuffers(1, &model->vertexBuffers[i]));
     }
-    FreeArray(model->vertexBuffers);
-    FreeArray(model->indexBuffers);
+    QexMemory_FreeArray(model->vertexBuffers);
+    QexMemory_FreeArray(model->indexBuffers);
 }
 
 void QexModel_Unload(QexModel* model) {

@@ -3,6 +3,7 @@
 #include "QexGL.h"
 #include "QexLoadPODModel.h"
 #include "QexModel.h"
+#include "QexPODModel.h"
 
 #define QEX_MODULE "src/QexModel"
 
@@ -48,10 +49,6 @@ struct Element {
 struct Elements {
     Element list[QEX_ELEMENT_COUNT];
 };
-
-const uint8_t* SourceOf(const QexPODMesh& mesh, const CPODData& data) {
-    return mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(data.data) : data.data;
-}
 
 Elements ListElements(const QexPODMesh& mesh) {
     static const CPODData none = {};
@@ -118,7 +115,7 @@ void Decode(float* out, const uint8_t* source, const CPODData& data) {
 void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position,
                  uint32_t vertex) {
     const CPODData& data = *element.data;
-    const uint8_t* source = SourceOf(mesh, data) + uint64_t{vertex} * data.stride;
+    const uint8_t* source = QexPODMesh_ElementData(&mesh, data) + uint64_t{vertex} * data.stride;
     if (!element.asFloats && !position) {
         memcpy(out, source, QexPODData_ElementSize(data.type, data.componentCount));
         return;

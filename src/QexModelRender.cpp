@@ -3,15 +3,12 @@
 
 #include "QexModel.h"
 #include "QexPODAnimation.h"
+#include "QexPODModel.h"
 
 namespace {
 
 void SetEye(const QexCamera* camera) {
     g_VecEyePos = camera->eye;
-}
-
-const QexPODMesh* MeshOf(const QexModel* model, uint32_t node) {
-    return &model->scene.meshes[model->scene.nodes[node].objectIndex];
 }
 
 // The material of any node, or null.
@@ -22,7 +19,7 @@ QexPODMaterial* MaterialOf(QexModel* model, uint32_t node) {
 }
 
 bool InPass(const QexModel* model, uint32_t node, uint32_t pass) {
-    return MeshOf(model, node)->passID == pass;
+    return QexPODModel_MeshOf(&model->scene, node)->passID == pass;
 }
 
 // Draws a mesh node through its module, if it has one.
@@ -211,7 +208,8 @@ void QexModel_SetShaderProgram(QexModel* model, uint32_t nodeIndex, QexShaderMod
 void QexModel_SetShaderProgramForAllNode(QexModel* model, QexShaderModule* staticModule,
                                          QexShaderModule* skinnedModule) {
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
-        QexShaderModule* module = MeshOf(model, i)->skinned == 1 ? skinnedModule : staticModule;
+        QexShaderModule* module =
+            QexPODModel_MeshOf(&model->scene, i)->skinned == 1 ? skinnedModule : staticModule;
         if (module) model->scene.nodes[i].shader = module;
     }
 }
@@ -225,7 +223,7 @@ void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
     QexPODModel* scene = &model->scene;
     if (meshNodeIndex >= scene->meshNodeCount || !model->nodeBoxes) return;
     QexPODNode* node = &scene->nodes[meshNodeIndex];
-    const QexPODMesh* mesh = MeshOf(model, meshNodeIndex);
+    const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, meshNodeIndex);
     QexMatrix world;
     if (mesh->skinned && mesh->boneBatches.batchCount > 0 && mesh->boneBatches.bonesPerBatch[0] > 0) {
         QexPODModel_GetBoneWorldMatrix(scene, &world, node, &scene->nodes[mesh->boneBatches.boneTable[0]]);

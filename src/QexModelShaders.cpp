@@ -7,8 +7,6 @@
 
 namespace {
 
-constexpr GLuint kShadowUnit = 2;
-constexpr GLint kAlphaUnit = 3;
 constexpr int32_t kDefaultShadowSize = 512;
 
 const char* const kSkinShadowVertexSource = R"(
@@ -96,7 +94,7 @@ void CreateShadowProgram(uint32_t* program, ShadowShaders* shaders, const char* 
 void CreateShadowTarget() {
     GLint framebuffer = 0;
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
-    QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowUnit);
+    QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
     QEX_GL(glGenTextures(1, &s_Shared.shadowTexture));
     QexRenderState_Bind(GL_TEXTURE_2D, s_Shared.shadowTexture);
     QEX_GL(glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_NEAREST));

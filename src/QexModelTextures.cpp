@@ -54,11 +54,8 @@ void FreeTexture(QexTexture*& texture, bool release) {
 
 // Allocates an empty record.
 QexTexture* NewTexture() {
-    QexTexture* texture = static_cast<QexTexture*>(QexMemory_Alloc(sizeof(QexTexture)));
-    if (texture)
-        memset(texture, 0, sizeof *texture);
-    else
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+    QexTexture* texture = QexMemory_AllocZeroed<QexTexture>(1);
+    if (!texture) QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
     return texture;
 }
 

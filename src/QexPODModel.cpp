@@ -1,6 +1,8 @@
+#include "QexPODModel.h"
+
 #include <cstring>
 
-#include "Qex.h"
+#include "QexMemory.h"
 
 namespace {
 
@@ -66,12 +68,6 @@ void WriteDec3N(void* destination, const float* values) {
 
 // ---- Release ----
 
-template <class T>
-void FreeArray(T*& array) {
-    QexMemory_Free(array);
-    array = nullptr;
-}
-
 void ReleaseMesh(QexPODMesh* mesh) {
     CPODData_Reset(&mesh->faces);
     CPODData* const elements[] = {&mesh->vertices, &mesh->normals,     &mesh->tangents,   &mesh->binormals,
@@ -80,12 +76,12 @@ void ReleaseMesh(QexPODMesh* mesh) {
         for (CPODData* element : elements) CPODData_Reset(element);
         for (uint32_t i = 0; i < mesh->uvwChannelCount; ++i) CPODData_Reset(&mesh->uvws[i]);
     }
-    FreeArray(mesh->uvws);
-    FreeArray(mesh->stripLengths);
-    FreeArray(mesh->interleaved);
-    FreeArray(mesh->boneBatches.boneTable);
-    FreeArray(mesh->boneBatches.bonesPerBatch);
-    FreeArray(mesh->boneBatches.offsets);
+    QexMemory_FreeArray(mesh->uvws);
+    QexMemory_FreeArray(mesh->stripLengths);
+    QexMemory_FreeArray(mesh->interleaved);
+    QexMemory_FreeArray(mesh->boneBatches.boneTable);
+    QexMemory_FreeArray(mesh->boneBatches.bonesPerBatch);
+    QexMemory_FreeArray(mesh->boneBatches.offsets);
 }
 
 void FreeKeys(float*& keys, uint32_t ownership, uint32_t sharedBit) {
@@ -94,30 +90,21 @@ void FreeKeys(float*& keys, uint32_t ownership, uint32_t sharedBit) {
 }
 
 void ReleaseNode(QexPODNode* node) {
-    FreeArray(node->name);
-    FreeArray(node->positionIndex);
-    FreeArray(node->rotationIndex);
-    FreeArray(node->scaleIndex);
-    FreeArray(node->matrixIndex);
+    QexMemory_FreeArray(node->name);
+    QexMemory_FreeArray(node->positionIndex);
+    QexMemory_FreeArray(node->rotationIndex);
+    QexMemory_FreeArray(node->scaleIndex);
+    QexMemory_FreeArray(node->matrixIndex);
     FreeKeys(node->position, node->ownershipFlags, QEX_NODE_SHARED_POSITION);
     FreeKeys(node->rotation, 0, 0);
     FreeKeys(node->scale, node->ownershipFlags, QEX_NODE_SHARED_SCALE);
     FreeKeys(node->matrix, node->ownershipFlags, QEX_NODE_SHARED_MATRIX);
 }
 
-template <class T>
-T* AllocZeroed(uint32_t count) {
-    const uint64_t bytes = uint64_t{count ? count : 1} * sizeof(T);
-    if (bytes > UINT32_MAX) return nullptr;
-    T* block = static_cast<T*>(QexMemory_Alloc(static_cast<uint32_t>(bytes)));
-    if (block) memset(static_cast<void*>(block), 0, static_cast<size_t>(bytes));
-    return block;
-}
-
 void ReleaseImpl(QexPODModel* scene) {
     if (!scene->runtime) return;
     SPVRTPODImpl_Destructor(scene->runtime);
-    FreeArray(scene->runtime);
+    QexMemory_FreeArray(scene->runtime);
 }
 
 void SetBox(QexBoundingBox* box, const QexVec3& low, const QexVec3& high) {
@@ -144,22 +131,22 @@ void SPVRTPODImpl_Contructor(SPVRTPODImpl* impl) {
 }
 
 void SPVRTPODImpl_Destructor(SPVRTPODImpl* impl) {
-    FreeArray(impl->cacheKeys);
-    FreeArray(impl->cachedMatrices);
-    FreeArray(impl->bindPose);
-    FreeArray(impl->inverseBindPose);
+    QexMemory_FreeArray(impl->cacheKeys);
+    QexMemory_FreeArray(impl->cachedMatrices);
+    QexMemory_FreeArray(impl->bindPose);
+    QexMemory_FreeArray(impl->inverseBindPose);
 }
 
 int32_t QexPODModel_InitImpl(QexPODModel* scene) {
     ReleaseImpl(scene);
-    SPVRTPODImpl* impl = AllocZeroed<SPVRTPODImpl>(1);
+    SPVRTPODImpl* impl = QexMemory_AllocZeroed<SPVRTPODImpl>(1);
     if (!impl) return -1;
     SPVRTPODImpl_Contructor(impl);
     scene->runtime = impl;
-    impl->cacheKeys = AllocZeroed<float>(scene->nodeCount);
-    impl->cachedMatrices = AllocZeroed<QexMatrix>(scene->nodeCount);
-    impl->bindPose = AllocZeroed<QexMatrix>(scene->nodeCount);
-    impl->inverseBindPose = AllocZeroed<QexMatrix>(scene->nodeCount);
+    impl->cacheKeys = QexMemory_AllocZeroed<float>(scene->nodeCount);
+    impl->cachedMatrices = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
+    impl->bindPose = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
+    impl->inverseBindPose = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
     if (!impl->cacheKeys || !impl->cachedMatrices || !impl->bindPose || !impl->inverseBindPose) {
         ReleaseImpl(scene);
         return -1;
@@ -169,21 +156,21 @@ int32_t QexPODModel_InitImpl(QexPODModel* scene) {
 }
 
 void QexPODModel_Release(QexPODModel* scene) {
-    for (uint32_t i = 0; i < scene->cameraCount; ++i) FreeArray(scene->cameras[i].animatedFov);
-    FreeArray(scene->cameras);
+    for (uint32_t i = 0; i < scene->cameraCount; ++i) QexMemory_FreeArray(scene->cameras[i].animatedFov);
+    QexMemory_FreeArray(scene->cameras);
     for (uint32_t i = 0; i < scene->materialCount; ++i) {
-        FreeArray(scene->materials[i].name);
-        FreeArray(scene->materials[i].effectFile);
-        FreeArray(scene->materials[i].effectName);
+        QexMemory_FreeArray(scene->materials[i].name);
+        QexMemory_FreeArray(scene->materials[i].effectFile);
+        QexMemory_FreeArray(scene->materials[i].effectName);
     }
-    FreeArray(scene->materials);
+    QexMemory_FreeArray(scene->materials);
     for (uint32_t i = 0; i < scene->meshCount; ++i) ReleaseMesh(&scene->meshes[i]);
-    FreeArray(scene->meshes);
+    QexMemory_FreeArray(scene->meshes);
     for (uint32_t i = 0; i < scene->nodeCount; ++i) ReleaseNode(&scene->nodes[i]);
-    FreeArray(scene->nodes);
-    for (uint32_t i = 0; i < scene->textureCount; ++i) FreeArray(scene->textures[i].name);
-    FreeArray(scene->textures);
-    FreeArray(scene->lights);
+    QexMemory_FreeArray(scene->nodes);
+    for (uint32_t i = 0; i < scene->textureCount; ++i) QexMemory_FreeArray(scene->textures[i].name);
+    QexMemory_FreeArray(scene->textures);
+    QexMemory_FreeArray(scene->lights);
     ReleaseImpl(scene);
     scene->cameraCount = scene->lightCount = scene->meshCount = scene->nodeCount = 0;
     scene->meshNodeCount = scene->textureCount = scene->materialCount = 0;

@@ -15,26 +15,16 @@ bool IsConfigSize(uint32_t size) {
 }
 
 // Window-system words and surface size, from configuration to context and back.
-void CopyWindowWords(QexRuntimeContext* context, const QexEngineConfig& config) {
-    context->windowWord1 = config.windowWord1;
-    context->windowWord2 = config.windowWord2;
-    context->windowWord3 = config.windowWord3;
-    context->windowWord4 = config.windowWord4;
-    context->width = config.width;
-    context->height = config.height;
-    context->windowWord7 = config.windowWord7;
-    context->windowWord8 = config.windowWord8;
-}
-
-void CopyWindowWords(QexEngineConfig* config, const QexRuntimeContext& context) {
-    config->windowWord1 = context.windowWord1;
-    config->windowWord2 = context.windowWord2;
-    config->windowWord3 = context.windowWord3;
-    config->windowWord4 = context.windowWord4;
-    config->width = context.width;
-    config->height = context.height;
-    config->windowWord7 = context.windowWord7;
-    config->windowWord8 = context.windowWord8;
+template <class To, class From>
+void CopyWindowWords(To* to, const From& from) {
+    to->windowWord1 = from.windowWord1;
+    to->windowWord2 = from.windowWord2;
+    to->windowWord3 = from.windowWord3;
+    to->windowWord4 = from.windowWord4;
+    to->width = from.width;
+    to->height = from.height;
+    to->windowWord7 = from.windowWord7;
+    to->windowWord8 = from.windowWord8;
 }
 
 // The pool starts at a multiple of 4 and loses what lies before it.

@@ -3,6 +3,7 @@
 #include <cstring>
 
 #include "../QexPODAnimation.h"
+#include "../QexPODModel.h"
 
 #define QEX_MODULE (type->path)
 
@@ -22,10 +23,6 @@ constexpr QexPODMaterial kNoMaterial = MakeWhite();
 
 QexTexture* TextureOf(QexTexture** textures, const QexPODNode* node) {
     return node->materialIndex < 0 || !textures ? nullptr : textures[node->materialIndex];
-}
-
-const QexPODMesh* MeshOf(const QexModel* model, uint32_t nodeIndex) {
-    return &model->scene.meshes[model->scene.nodes[nodeIndex].objectIndex];
 }
 
 uint32_t MeshIndexOf(const QexModel* model, uint32_t nodeIndex) {
@@ -105,7 +102,7 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
     if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return false;
     const QexPODMaterial* material =
         node->materialIndex < 0 ? &kNoMaterial : &model->scene.materials[node->materialIndex];
-    *draw = {type, module, model, nodeIndex, node, MeshOf(model, nodeIndex), material};
+    *draw = {type, module, model, nodeIndex, node, QexPODModel_MeshOf(&model->scene, nodeIndex), material};
     QexRenderState_UseProgram(module->program);
     return true;
 }
@@ -176,7 +173,7 @@ void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* mo
 }
 
 int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex) {
-    const QexPODMesh* mesh = MeshOf(model, nodeIndex);
+    const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, nodeIndex);
     const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
     const bool indexed = model->indexBuffers[meshIndex] != 0;
     QexShaderModule_BeginMesh(type, model, meshIndex);
@@ -195,7 +192,7 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
                                         const QexShaderBones& bones) {
     QexPODModel* scene = &model->scene;
     QexPODNode* node = &scene->nodes[nodeIndex];
-    const QexPODMesh* mesh = MeshOf(model, nodeIndex);
+    const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, nodeIndex);
     const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
     const QexBoneBatches& batches = mesh->boneBatches;
     QexMatrix matrices[QEX_MAX_BATCH_BONES];

@@ -23,9 +23,6 @@ struct QexShaderSampler {
     int32_t unit;
 };
 
-// Texture units, the same in every module.
-enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };
-
 constexpr uint32_t kMaxShaderAttributes = 7;
 constexpr uint32_t kMaxShaderUniforms = 20;
 constexpr uint32_t kMaxShaderSamplers = 4;

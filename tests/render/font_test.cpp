@@ -111,6 +111,25 @@ TEST_F(FontTest, PersistentTextIsBuiltUp) {
     EXPECT_EQ(IndexCounts([&] { Temporary(0, 32, ""); }), "");
 }
 
+// Arrays are off again and the depth test is at its usual function; of the rest, what the header says.
+TEST_F(FontTest, StateLeftBehind) {
+    Temporary(0, 32, "a");
+    Add(0, 32, "a");
+    GLint before = 0;
+    glGetIntegerv(GL_CURRENT_PROGRAM, &before);
+    const std::function<void()> draws[] = {QexFont_Draw,
+                                           [&] { QexFont_DrawTempString(&runtime_, 0, 32, "b", ~0u); }};
+    for (const auto& draw : draws) {
+        QexRenderState_UseProgram(0);
+        QexRenderState_ActiveTexture(GL_TEXTURE2);
+        QexRenderer_SetAlphaBlendMode(0);
+        QexRenderer_SetZTestFunc(7);
+        EXPECT_EQ(StateChange(draw), "program: 0 -> " + std::to_string(before) +
+                                         "\nactiveUnit: 2 -> 3\n"
+                                         "blend: 0 -> 1\ndepthFunc: GL_ALWAYS -> GL_LEQUAL\n");
+    }
+}
+
 TEST_F(FontTest, NumbersAndUnknownCharacters) {
     for (const int32_t number : {-120, 0, INT_MAX, INT_MIN})
         EXPECT_TRUE(SamePicture(Drawn([&] { QexFont_DrawNum(&runtime_, 4, 60, number, ~0u); }),

@@ -76,21 +76,29 @@ TEST_F(ModelTest, TexturesByNameAndSuffix) {
     EXPECT_EQ(LoadFile(&model_, "scene.pod").substr(0, 2), "0 ");
     EXPECT_EQ(Sizes(), "4/2 8/0 0/0 0/0 0/0 ");
     EXPECT_EQ(model_.scene.nodes[0].shader->render, QexTextureShader_Render);
-    // From a cache of pointers the textures are borrowed.
+    // A second load takes the place of the first.
+    EXPECT_EQ(LoadFile(&model_, "scene.pod").substr(0, 2), "0 ");
+    EXPECT_EQ(Sizes(), "4/2 8/0 0/0 0/0 0/0 ");
+    // From a cache the textures are borrowed, whether it holds pointers or records.
     QexTexture *wood = model_.textures[0], *alpha = model_.alphaTextures[0];
     const std::vector<uint8_t> file = pod::WritePod(Materials({"wood.pvr", "stone.pvr"}));
-    QexNameCache cache;
-    QexNameCache_Create(&cache, 2, sizeof(QexTexture*));
-    QexNameCache_Add(&cache, "wood.pvr", &wood);
-    QexNameCache_Add(&cache, "wood_a.pvr", &alpha);
-    QexModel borrower;
-    QexModel_Create(&borrower);
-    Capture out(STDOUT_FILENO), log(STDERR_FILENO);
-    QexModel_LoadContentFromCache(&borrower, file.data(), static_cast<uint32_t>(file.size()), &cache);
-    EXPECT_TRUE(borrower.textures[0] == wood && borrower.alphaTextures[0] == alpha && !borrower.textures[1]);
-    EXPECT_EQ(GLCalls([&] { QexModel_UnloadTextures(&borrower); }).Size(), 0u);
-    QexModel_Unload(&borrower);
-    QexNameCache_Release(&cache);
+    for (const bool records : {false, true}) {
+        QexNameCache cache;
+        QexNameCache_Create(&cache, 2, records ? sizeof(QexTexture) : sizeof(QexTexture*));
+        QexNameCache_Add(&cache, "wood.pvr", records ? static_cast<void*>(wood) : &wood);
+        QexNameCache_Add(&cache, "wood_a.pvr", records ? static_cast<void*>(alpha) : &alpha);
+        QexModel borrower;
+        QexModel_Create(&borrower);
+        Capture out(STDOUT_FILENO), log(STDERR_FILENO);
+        QexModel_LoadContentFromCache(&borrower, file.data(), static_cast<uint32_t>(file.size()), &cache);
+        ASSERT_TRUE(borrower.textures[0] && borrower.alphaTextures[0]);
+        EXPECT_EQ(borrower.textures[0]->glName, wood->glName);
+        EXPECT_EQ(borrower.alphaTextures[0]->glName, alpha->glName);
+        EXPECT_TRUE((borrower.textures[0] == wood) != records && !borrower.textures[1]);
+        EXPECT_EQ(GLCalls([&] { QexModel_UnloadTextures(&borrower); }).Size(), 0u);
+        QexModel_Unload(&borrower);
+        QexNameCache_Release(&cache);
+    }
 }
 
 std::string g_hookLog;

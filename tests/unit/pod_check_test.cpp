@@ -54,6 +54,7 @@ const Refusal kRefusals[] = {
     {"its faces need 9 indices, it has 6", [](Scene&, Mesh& m) { m.faceCount = 3; }},
     {"more faces than can be drawn", [](Scene&, Mesh& m) { m.faceCount = 0x55555556; }},
     {"its faces need 9 vertices, it has 6", [](Scene&, Mesh& m) { m.faces = {}; m.faceCount = 3; }},
+    {"its faces need 6 vertices, it has 0", [](Scene&, Mesh& m) { m.faces = {}; m.vertices = {}; }},
     {"face indices of type 10", [](Scene&, Mesh& m) { m.faces.type = pod::kUint8; }},
     {"its faces need 8 indices, it has 7", [](Scene& s, Mesh&) { s.meshes[2].stripLengths = {1, 3}; }},
     {"more faces than can be drawn", [](Scene& s, Mesh&) { s.meshes[2].stripLengths = {1, UINT32_MAX}; }},
@@ -73,6 +74,12 @@ const Refusal kRefusals[] = {
     // The second batch has one bone; vertex 4 follows its second.
     {"vertex 4 follows bone 1 of a batch of 1",
      [](Scene&, Mesh& m) { m.vertexBlock[4 * m.boneIndices.stride + m.boneIndices.offset] = 1; }},
+    // A normalised type changes nothing: bones are numbers.
+    {"vertex 4 follows bone 1 of a batch of 1",
+     [](Scene&, Mesh& m) {
+         m.boneIndices.type = pod::kUint8Norm;
+         m.vertexBlock[4 * m.boneIndices.stride + m.boneIndices.offset] = 1;
+     }},
 };
 // clang-format on
 
