@@ -1315,6 +1315,144 @@ QEX_API void QexBoundingBox_ComputeInterleaved(QexBoundingBox* box, const void* 
                                                uint32_t offset, uint32_t stride);
 
 /* ======================================================================================================
+ * POD scenes: bone batching
+ *
+ * A skinned mesh may follow more bones than a vertex shader has room for matrices. Batching cuts it into runs
+ * of triangles that need few bones each. Scenes read from files usually bring their batches; these functions
+ * make them for other data, and export the small containers that the work uses. No pointer may be null except
+ * where a function says so. No GL context needed.
+ * ====================================================================================================== */
+
+/** A set of bone indices with a fixed capacity. */
+typedef struct CBatch {
+    int32_t capacity;
+    int32_t count;
+    int32_t* bones; /* capacity entries, owned; null before CBatch_SetSize */
+} CBatch;
+
+/** An array of elements of one size that grows at its end. */
+typedef struct CGrowableArray {
+    void* data;           /* owned; from QexMemory_Alloc */
+    uint32_t elementSize; /* bytes */
+    uint32_t elementCount;
+} CGrowableArray;
+
+/** A growing array of integers. */
+typedef struct CStdVectorInt {
+    uint32_t capacity;
+    uint32_t size;
+    int32_t* data; /* owned */
+} CStdVectorInt;
+
+/** Makes an empty set without room. */
+QEX_API void CBatch_Constructor(CBatch* batch);
+
+/** Frees the set's storage. */
+QEX_API void CBatch_Destructor(CBatch* batch);
+
+/** Empties the set and gives it room for `capacity` bones; without memory, or below 1, for none. */
+QEX_API void CBatch_SetSize(CBatch* batch, int32_t capacity);
+
+/** Empties the set. */
+QEX_API void CBatch_Clear(CBatch* batch);
+
+/** Adds a bone. @return 1, also when it is there already; 0 when it is negative or the set is full. */
+QEX_API int32_t CBatch_Add(CBatch* batch, int32_t bone);
+
+/** @return 1 when the set holds the bone, else 0. */
+QEX_API int32_t CBatch_ContainsIdx(const CBatch* batch, int32_t bone);
+
+/** @return 1 when every bone of b is in a (an empty b always is), else 0. */
+QEX_API int32_t CBatch_Contains(const CBatch* a, const CBatch* b);
+
+/** @return the number of b's bones that a lacks, or -1 when a has no room for them. */
+QEX_API int32_t CBatch_TestMerge(const CBatch* a, const CBatch* b);
+
+/** Adds b's bones to a, as far as there is room. */
+QEX_API void CBatch_Merge(CBatch* a, const CBatch* b);
+
+/** Makes a's bones those of b, as far as there is room. */
+QEX_API void CBatch_Assign(CBatch* a, const CBatch* b);
+
+/** Makes a new set with b's capacity and bones. @param a  uninitialised */
+QEX_API void CBatch_CopyConstructor(CBatch* a, const CBatch* b);
+
+/** Copies the bones out. @param destination  room for the set's bones  @param count  their number, out */
+QEX_API void CBatch_Write(const CBatch* batch, int32_t* destination, int32_t* count);
+
+/** Turns a vertex's bones into positions within the set.
+ *  @param indices  n bone indices, changed: a bone of weight 0 becomes 0, one that is not in the set stays
+ *  @param weights  n weights */
+QEX_API void CBatch_GetVertexBoneIndices(const CBatch* batch, float* indices, const float* weights,
+                                         int32_t n);
+
+/** Makes an empty array. @param elementSize  bytes */
+QEX_API void CGrowableArray_Constructor(CGrowableArray* array, uint32_t elementSize);
+
+/** Frees the array's block and empties it. */
+QEX_API void CGrowableArray_Destructor(CGrowableArray* array);
+
+/** Copies n elements to the end; without memory nothing changes, and a line is printed. */
+QEX_API void CGrowableArray_Append(CGrowableArray* array, const void* source, uint32_t n);
+
+/** @return the address of element i, which is below the count; good until the array grows. */
+QEX_API void* CGrowableArray_at(const CGrowableArray* array, uint32_t i);
+
+/** @return the address of the last element, or null. */
+QEX_API void* CGrowableArray_last(const CGrowableArray* array);
+
+/** @return the number of elements. */
+QEX_API uint32_t CGrowableArray_size(const CGrowableArray* array);
+
+/** Hands the block over and empties the array.
+ *  @param block  out; the caller frees it with QexMemory_Free; null when there were no elements
+ *  @return the number of elements. */
+QEX_API uint32_t CGrowableArray_Surrender(CGrowableArray* array, void** block);
+
+/** Makes an empty array with room for `capacity` integers. */
+QEX_API void CStdVectorInt_Constructor(CStdVectorInt* vector, uint32_t capacity);
+
+/** Frees the array and zeroes the record. */
+QEX_API void CStdVectorInt_Destructor(CStdVectorInt* vector);
+
+/** Appends an integer; the room grows by 64 when only one place is left. Without memory nothing changes, and
+ *  a line is printed. */
+QEX_API void CStdVectorInt_PushBack(CStdVectorInt* vector, int32_t value);
+
+/** @return element i, which is below the size. */
+QEX_API int32_t CStdVectorInt_At(const CStdVectorInt* vector, uint32_t i);
+
+/** @return the number of integers. */
+QEX_API uint32_t CStdVectorInt_Size(const CStdVectorInt* vector);
+
+/** Cuts a skinned mesh into batches. In triangle order, a triangle's bones go into the first batch that holds
+ * them all, or widen the first one whose bones they include, or become a new batch; then every triangle goes
+ * to the first batch that holds its bones. A vertex that triangles of several batches share is repeated; bone
+ * indices count within the batch afterwards, and a bone of weight 0 has index 0.
+ *  @param batches         out; overwritten; release with QexBoneBatches_Release. maxBones entries a row
+ *  @param outVertexCount  out: the number of new vertices; may be null
+ *  @param outVertices     out: the new vertices, of the same layout; the caller frees them with
+ * QexMemory_Free
+ *  @param indices         3 * triangleCount vertex numbers, replaced by those of the new vertices, grouped by
+ *                         batch
+ *  @param vertices        vertexCount vertices of `stride` bytes; bone indices there are node indices
+ *  @param weightType, indexType      QEX_POD_...
+ *  @param weightOffset, indexOffset  bytes from the start of a vertex
+ *  @param maxBones        bones a batch, 1 or more; the skinned modules draw at most QEX_MAX_BATCH_BONES
+ *  @param bonesPerVertex  1 to 4 weights and bone indices a vertex
+ *  @return 0, or -1 with the indices unchanged: another number of bones a vertex, a triangle with more bones
+ *  than maxBones, a bone or vertex index out of range, elements that reach beyond the stride, more than 512
+ *  batches, or no memory. */
+QEX_API int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
+                                      uint32_t* indices, uint32_t vertexCount, const void* vertices,
+                                      uint32_t stride, uint32_t weightOffset, uint32_t weightType,
+                                      uint32_t indexOffset, uint32_t indexType, uint32_t triangleCount,
+                                      int32_t maxBones, uint32_t bonesPerVertex);
+
+/** Frees the three tables and sets the batch count to 0. */
+QEX_API void QexBoneBatches_Release(QexBoneBatches* batches);
+
+/* ======================================================================================================
  * POD scenes: animation and world matrices
  *
  * Every node has its own frame. A world matrix is computed once and kept until a frame, an override or the

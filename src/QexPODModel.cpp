@@ -79,9 +79,7 @@ void ReleaseMesh(QexPODMesh* mesh) {
     QexMemory_FreeArray(mesh->uvws);
     QexMemory_FreeArray(mesh->stripLengths);
     QexMemory_FreeArray(mesh->interleaved);
-    QexMemory_FreeArray(mesh->boneBatches.boneTable);
-    QexMemory_FreeArray(mesh->boneBatches.bonesPerBatch);
-    QexMemory_FreeArray(mesh->boneBatches.offsets);
+    QexBoneBatches_Release(&mesh->boneBatches);
 }
 
 void FreeKeys(float*& keys, uint32_t ownership, uint32_t sharedBit) {
