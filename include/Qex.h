@@ -2095,6 +2095,327 @@ QEX_API void QexSimpleShader_Render(QexShaderModule* module, QexModel* model, ui
                                     const QexMatrix* view, const QexMatrix* projection,
                                     const QexShadowInfo* shadow);
 
+/* QexUVDisplacementShader (QEX_SHADER_UV_DISPLACEMENT): as QexTextureShader with the texture coordinates
+ * shifted by an amount that may change from frame to frame. Slots: displacement, mvpMatrix, opacity,
+ * alphaThreshold locations; shift u, shift v, threshold. */
+
+/** Creates the unlit module with shifted texture coordinates, threshold 0.5, shift (0, 0). @return as
+ * QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexUVDisplacementShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexUVDisplacementShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexUVDisplacementShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexUVDisplacementShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexUVDisplacementShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Sets the shift, in texture widths and heights, used from the next Render on. */
+QEX_API void QexUVDisplacementShader_SetDisplacement(QexShaderModule* module, float u, float v);
+/** Returns the shift through u and v. */
+QEX_API void QexUVDisplacementShader_GetDisplacement(const QexShaderModule* module, float* u, float* v);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexUVDisplacementShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                 uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexUVDisplacementShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                            const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                            const QexMatrix* view, const QexMatrix* projection,
+                                            const QexShadowInfo* shadow);
+
+/* QexUVDisplacementNoAlphaShader (no kind): as QexTextureNoAlphaShader with shifted texture coordinates.
+ * Slots as QexUVDisplacementShader. */
+
+/** Creates the unlit module with shifted texture coordinates and without alpha texture, threshold 0.5, shift
+ * (0, 0). @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexUVDisplacementNoAlphaShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexUVDisplacementNoAlphaShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexUVDisplacementNoAlphaShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexUVDisplacementNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexUVDisplacementNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Sets the shift, in texture widths and heights, used from the next Render on. */
+QEX_API void QexUVDisplacementNoAlphaShader_SetDisplacement(QexShaderModule* module, float u, float v);
+/** Returns the shift through u and v. */
+QEX_API void QexUVDisplacementNoAlphaShader_GetDisplacement(const QexShaderModule* module, float* u,
+                                                            float* v);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexUVDisplacementNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                        uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexUVDisplacementNoAlphaShader_Render(QexShaderModule* module, QexModel* model,
+                                                   uint32_t nodeIndex, const QexLightSet* lights,
+                                                   const QexMatrix* modelMatrix, const QexMatrix* view,
+                                                   const QexMatrix* projection, const QexShadowInfo* shadow);
+
+/* QexGouraudShader (QEX_SHADER_GOURAUD): lit per vertex: texture times (diffuse light times the material's
+ * diffuse colour, plus its ambient colour). Diffuse light is the sum over the first three lights of max(0, N
+ * . L) times the light's colour; it does not fall off with distance. Like all lit modules it takes a node
+ * whose material has an alpha texture out of the opaque pass; a null light set is an empty one. Slots:
+ * transMatrix, normalMatrix, mvpMatrix, lightCount, lightType, lightPosDir, lightColor, sceneAmbient,
+ * sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
+
+/** Creates the module lit per vertex, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexGouraudShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexGouraudShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexGouraudShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexGouraudShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexGouraudShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexGouraudShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexGouraudShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                     const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                     const QexMatrix* view, const QexMatrix* projection,
+                                     const QexShadowInfo* shadow);
+
+/* QexGouraudSpecularShader (QEX_SHADER_GOURAUD_SPECULAR): as QexGouraudShader plus highlights per fragment:
+ * the material's specular colour times the sum over three lights of pow(N . H, 256 * shininess) times the
+ * light's colour, H halfway between light and camera. The camera is taken to stand at the negated translation
+ * of the view matrix. Slots: as QexGouraudShader, with cameraPos before lightCount, sceneSpecular and
+ * shininess before opacity. */
+
+/** Creates the lit module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexGouraudSpecularShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexGouraudSpecularShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexGouraudSpecularShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexGouraudSpecularShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexGouraudSpecularShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexGouraudSpecularShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                  uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexGouraudSpecularShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                             const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                             const QexMatrix* view, const QexMatrix* projection,
+                                             const QexShadowInfo* shadow);
+
+/* QexGouraudNormalMapShader (QEX_SHADER_GOURAUD_NORMALMAP): as QexGouraudShader, lit per fragment with a
+ * tangent-space normal map on unit 1, whose texels hold the normal's x in green, y in red, z in blue, from -1
+ * to 1 as 0 to 1. The module binds the blank map; a real one comes from the model's bindTextureHook. Meshes
+ * need tangents and binormals. Slots as QexGouraudShader. */
+
+/** Creates the normal-mapped module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexGouraudNormalMapShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexGouraudNormalMapShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexGouraudNormalMapShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexGouraudNormalMapShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexGouraudNormalMapShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                   uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexGouraudNormalMapShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                              const QexMatrix* view, const QexMatrix* projection,
+                                              const QexShadowInfo* shadow);
+
+/* QexGouraudShadowShader (QEX_SHADER_GOURAUD_SHADOW): as QexGouraudShader, with the diffuse part of shadowed
+ * fragments times the shadow intensity. A fragment is in shadow when it faces the shadow light, lies within
+ * the shadow map, and the map holds a depth below its own less the bias. Null shadow parameters mean no
+ * shadow. Slots: as QexGouraudShader, then shadowLightDir, shadowSpaceMatrix, biasValue, shadowIntensity; the
+ * threshold. */
+
+/** Creates the shadow-receiving module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexGouraudShadowShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexGouraudShadowShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexGouraudShadowShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexGouraudShadowShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexGouraudShadowShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexGouraudShadowShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexGouraudShadowShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                           const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                           const QexMatrix* view, const QexMatrix* projection,
+                                           const QexShadowInfo* shadow);
+
+/* QexGouraudShadowExtShader (QEX_SHADER_GOURAUD_SHADOW_EXT): as QexGouraudShadowShader, with shadows that
+ * lighten with the distance between what casts and what receives them: intensity + depth difference * fade,
+ * from 0 to 1. Slots: as QexGouraudShadowShader, with shadowFade behind shadowIntensity; threshold, fade. */
+
+/** Creates the module that receives fading shadows, threshold 0.5, fade 1. @return as
+ * QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexGouraudShadowExtShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexGouraudShadowExtShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexGouraudShadowExtShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexGouraudShadowExtShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexGouraudShadowExtShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Sets how fast shadows lighten, in brightness per unit of shadow-map depth, used from the next Render on.
+ */
+QEX_API void QexGouraudShadowExtShader_SetShadowFade(QexShaderModule* module, float fade);
+/** @return the fade. */
+QEX_API float QexGouraudShadowExtShader_GetShadowFade(const QexShaderModule* module);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexGouraudShadowExtShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                   uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexGouraudShadowExtShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                              const QexMatrix* view, const QexMatrix* projection,
+                                              const QexShadowInfo* shadow);
+
+/* QexSkinningTextureNoAlphaShader (QEX_SHADER_SKINNING_TEXTURE_NOALPHA): as QexTextureNoAlphaShader for
+ * meshes that follow bones. Slots as QexSkinningTextureShader. */
+
+/** Creates the unlit skinned module without alpha texture, threshold 0.5. @return as
+ * QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexSkinningTextureNoAlphaShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexSkinningTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexSkinningTextureNoAlphaShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexSkinningTextureNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexSkinningTextureNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
+QEX_API int32_t QexSkinningTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                         uint32_t nodeIndex, const QexMatrix* modelMatrix);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model,
+                                                    uint32_t nodeIndex, const QexLightSet* lights,
+                                                    const QexMatrix* modelMatrix, const QexMatrix* view,
+                                                    const QexMatrix* projection, const QexShadowInfo* shadow);
+
+/* QexSkinningGouraudShader (QEX_SHADER_SKINNING_GOURAUD): as QexGouraudShader for meshes that follow bones.
+ * Slots: viewProjMatrix, boneCount, boneMatrixArray, boneVecMatrixArray, lightCount, lightType, lightPosDir,
+ * lightColor, sceneAmbient, sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
+
+/** Creates the lit skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexSkinningGouraudShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexSkinningGouraudShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexSkinningGouraudShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexSkinningGouraudShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexSkinningGouraudShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
+QEX_API int32_t QexSkinningGouraudShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                  uint32_t nodeIndex, const QexMatrix* modelMatrix);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexSkinningGouraudShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                             const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                             const QexMatrix* view, const QexMatrix* projection,
+                                             const QexShadowInfo* shadow);
+
+/* QexSkinningGouraudSpecularShader (QEX_SHADER_SKINNING_GOURAUD_SPECULAR): highlights on meshes that follow
+ * bones: all four lights count, and the highlight is multiplied by the texture. Slots: as
+ * QexSkinningGouraudShader, with cameraPos before lightCount, sceneSpecular and shininess before opacity. */
+
+/** Creates the skinned module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexSkinningGouraudSpecularShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexSkinningGouraudSpecularShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexSkinningGouraudSpecularShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexSkinningGouraudSpecularShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexSkinningGouraudSpecularShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
+QEX_API int32_t QexSkinningGouraudSpecularShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                          uint32_t nodeIndex, const QexMatrix* modelMatrix);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexSkinningGouraudSpecularShader_Render(QexShaderModule* module, QexModel* model,
+                                                     uint32_t nodeIndex, const QexLightSet* lights,
+                                                     const QexMatrix* modelMatrix, const QexMatrix* view,
+                                                     const QexMatrix* projection,
+                                                     const QexShadowInfo* shadow);
+
+/* QexSkinningGouraudNormalMapShader (QEX_SHADER_SKINNING_GOURAUD_NORMALMAP): as QexGouraudNormalMapShader for
+ * meshes that follow bones; all four lights count. Slots as QexSkinningGouraudShader. */
+
+/** Creates the normal-mapped skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexSkinningGouraudNormalMapShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexSkinningGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexSkinningGouraudNormalMapShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexSkinningGouraudNormalMapShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexSkinningGouraudNormalMapShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
+QEX_API int32_t QexSkinningGouraudNormalMapShader_DrawMesh(QexShaderModule* module, QexModel* model,
+                                                           uint32_t nodeIndex, const QexMatrix* modelMatrix);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexSkinningGouraudNormalMapShader_Render(QexShaderModule* module, QexModel* model,
+                                                      uint32_t nodeIndex, const QexLightSet* lights,
+                                                      const QexMatrix* modelMatrix, const QexMatrix* view,
+                                                      const QexMatrix* projection,
+                                                      const QexShadowInfo* shadow);
+
+/* QexDepthShader (no kind): depth as a grey level: 0 nearer than near, 1 beyond far, z / (far - near)
+ * between, z being the clip-space z. No threshold. Slots: near, far, mvpMatrix locations. */
+
+/** Creates the depth module; near and far are not set yet. @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexDepthShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexDepthShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexDepthShader_Release(QexShaderModule** module);
+/** Sets near and far, in clip-space z, for the module's program, which must be current. far above near. */
+QEX_API void QexDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar);
+/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
+QEX_API int32_t QexDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                   const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                   const QexMatrix* view, const QexMatrix* projection,
+                                   const QexShadowInfo* shadow);
+
+/* QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha as in
+ * QexSkinningTextureShader. Slots: near, far, boneCount, boneMatrixArray, viewProjMatrix, opacity,
+ * alphaThreshold locations; the threshold. */
+
+/** Creates the skinned depth module, threshold 0.5; near and far are not set yet. @return as
+ * QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexSkinningDepthShader_CreateProgram(void);
+/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexSkinningDepthShader_SetupProgram(QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexSkinningDepthShader_Release(QexShaderModule** module);
+/** Sets the alpha threshold, used from the next Render on. */
+QEX_API void QexSkinningDepthShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
+/** @return the alpha threshold. */
+QEX_API float QexSkinningDepthShader_GetAlphaThreshold(const QexShaderModule* module);
+/** Sets near and far, in clip-space z, for the module's program, which must be current. far above near. */
+QEX_API void QexSkinningDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar);
+/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
+QEX_API int32_t QexSkinningDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                                const QexMatrix* modelMatrix);
+/** Draws a node, see QexShaderRenderFn. */
+QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                           const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                           const QexMatrix* view, const QexMatrix* projection,
+                                           const QexShadowInfo* shadow);
+
 /* ======================================================================================================
  * Models: records and loading
  *

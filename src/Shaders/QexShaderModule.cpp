@@ -54,7 +54,10 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
     }
     memset(static_cast<void*>(module), 0, sizeof *module);
     QexShaderModule_Setup(type, module);
-    if (type->hasThreshold) module->slots[type->thresholdSlot].value = kDefaultThreshold;
+    if (type->hasThreshold) {
+        module->slots[type->thresholdSlot].value = kDefaultThreshold;
+        module->slots[type->thresholdSlot + 1].value = type->secondDefault;
+    }
     module->render = type->render;
     return module;
 }
@@ -111,17 +114,28 @@ float QexShaderModule_Opacity(const QexShaderDraw& draw) {
     return draw.material->opacity * g_fQexGlobalAlpha;
 }
 
+void QexShaderModule_World(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix) {
+    const QexMatrix* world = QexPODAnimation_WorldMatrix(&draw.model->scene, draw.node);
+    if (modelMatrix)
+        QexMatrix_Multiply(out, modelMatrix, world);
+    else
+        *out = *world;
+}
+
+void QexShaderModule_NormalMatrix(QexMatrix3* out, const QexMatrix* world) {
+    QexMatrix3 linear, inverse;
+    QexMatrix3_ConstructorFromMatrix(&linear, world);
+    QexMatrix3_Inverse(&inverse, &linear);
+    QexMatrix3_Transpose(out, &inverse);
+}
+
 void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out,
                                          const QexMatrix* modelMatrix, const QexMatrix* view,
                                          const QexMatrix* projection) {
-    const QexMatrix* world = QexPODAnimation_WorldMatrix(&draw.model->scene, draw.node);
-    QexMatrix placed;
-    if (modelMatrix) {
-        QexMatrix_Multiply(&placed, modelMatrix, world);
-        world = &placed;
-    }
+    QexMatrix world;
+    QexShaderModule_World(draw, &world, modelMatrix);
     QexMatrix_Multiply(out, projection, view);
-    QexMatrix_Multiply(out, out, world);
+    QexMatrix_Multiply(out, out, &world);
 }
 
 void QexShaderModule_BindMaterial(const QexShaderDraw& draw) {
@@ -211,6 +225,11 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
             if (bones.modelMatrix) QexMatrix_Multiply(&matrices[j], bones.modelMatrix, &matrices[j]);
         }
         QEX_GL(glUniformMatrix4fv(bones.boneMatrixLocation, count, GL_FALSE, matrices[0].m));
+        if (bones.hasVectors) {
+            QexMatrix3 vectors[QEX_MAX_BATCH_BONES];
+            for (int32_t j = 0; j < count; ++j) QexShaderModule_NormalMatrix(&vectors[j], &matrices[j]);
+            QEX_GL(glUniformMatrix3fv(bones.boneVectorLocation, count, GL_FALSE, vectors[0].m));
+        }
         DrawRange(type, true, GL_TRIANGLES, first * 3, (end - first) * 3);
     }
     QexShaderModule_EndMesh(type, model, meshIndex);

@@ -37,7 +37,8 @@ struct QexShaderModuleType {
     const char* uniforms[kMaxShaderUniforms + 1];
     QexShaderSampler samplers[kMaxShaderSamplers + 1];
     bool hasThreshold;
-    uint32_t thresholdSlot;  // also the number of uniforms
+    uint32_t thresholdSlot;
+    float secondDefault = 0;  // of the slot behind the threshold, in modules that have a parameter there
 };
 
 // Lifetime.
@@ -68,6 +69,12 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
 // The material's opacity times the global alpha.
 float QexShaderModule_Opacity(const QexShaderDraw& draw);
 
+// [model matrix *] node world.
+void QexShaderModule_World(const QexShaderDraw& draw, QexMatrix* out, const QexMatrix* modelMatrix);
+
+// What turns normals: the transposed inverse of the upper left 3 x 3 of a world matrix.
+void QexShaderModule_NormalMatrix(QexMatrix3* out, const QexMatrix* world);
+
 // projection * view * [model matrix *] node world.
 void QexShaderModule_ModelViewProjection(const QexShaderDraw& draw, QexMatrix* out,
                                          const QexMatrix* modelMatrix, const QexMatrix* view,
@@ -91,10 +98,13 @@ void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* mo
 // The whole draw of a mesh that follows no bones: triangles or strips, indexed or not.
 int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex);
 
-// Sets `boneCount` and `boneMatrixArray` (at those locations) for one bone batch and draws its triangles.
+// The whole draw of a mesh that follows bones: for each bone batch it sets boneCount, boneMatrixArray and,
+// for lit modules, boneVecMatrixArray at those locations and draws the batch's triangles.
 struct QexShaderBones {
     int32_t boneCountLocation;
     int32_t boneMatrixLocation;
+    bool hasVectors;
+    int32_t boneVectorLocation;
     const QexMatrix* modelMatrix;  // in front of every bone matrix, or null
 };
 int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,

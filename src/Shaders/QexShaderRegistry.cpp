@@ -23,7 +23,19 @@ struct Row {
 const Row kRows[] = {
     ROW(QEX_SHADER_TEXTURE, QexTextureShader),
     ROW(QEX_SHADER_TEXTURE_NOALPHA, QexTextureNoAlphaShader),
+    {QEX_SHADER_UV_DISPLACEMENT, QexUVDisplacementShader_CreateProgram, QexUVDisplacementShader_Release,
+     QexUVDisplacementShader_GetAlphaThreshold, QexUVDisplacementShader_SetAlphaThreshold,
+     QexUVDisplacementShader_GetDisplacement, QexUVDisplacementShader_SetDisplacement},
+    ROW(QEX_SHADER_GOURAUD, QexGouraudShader),
+    ROW(QEX_SHADER_GOURAUD_SHADOW, QexGouraudShadowShader),
+    ROW(QEX_SHADER_GOURAUD_NORMALMAP, QexGouraudNormalMapShader),
+    ROW(QEX_SHADER_GOURAUD_SPECULAR, QexGouraudSpecularShader),
     ROW(QEX_SHADER_SKINNING_TEXTURE, QexSkinningTextureShader),
+    ROW(QEX_SHADER_SKINNING_GOURAUD, QexSkinningGouraudShader),
+    ROW(QEX_SHADER_SKINNING_GOURAUD_NORMALMAP, QexSkinningGouraudNormalMapShader),
+    ROW(QEX_SHADER_SKINNING_GOURAUD_SPECULAR, QexSkinningGouraudSpecularShader),
+    ROW(QEX_SHADER_SKINNING_TEXTURE_NOALPHA, QexSkinningTextureNoAlphaShader),
+    ROW(QEX_SHADER_GOURAUD_SHADOW_EXT, QexGouraudShadowExtShader),
 };
 
 const Row* Find(uint32_t kind) {

@@ -1,36 +1,25 @@
+#include "QexSkinningTextureShader.h"
+
+#include "QexGLSL.h"
 #include "QexTextureShader.h"
 
-#define QEX_MODULE (kType.path)
+#define QEX_MODULE (draw.type->path)
 
-namespace {
-
-// A vertex follows boneCount bones; the bone matrices lead straight into the world.
-const char* const kVertexSource = R"(
-attribute highp vec3 inVertex;
+const char* const kQexSkinningVertexSource = QEX_GLSL_SKIN R"(
 attribute mediump vec2 inTexCoord;
-attribute mediump vec4 inBoneIndex;
-attribute mediump vec4 inBoneWeight;
-uniform lowp int boneCount;
-uniform highp mat4 boneMatrixArray[16];
 uniform highp mat4 viewProjMatrix;
 varying mediump vec2 fTexCoord;
 void main() {
-    highp vec4 position = vec4(0.0);
-    highp vec4 vertex = vec4(inVertex, 1.0);
-    if (boneCount > 0) position += boneMatrixArray[int(inBoneIndex.x)] * vertex * inBoneWeight.x;
-    if (boneCount > 1) position += boneMatrixArray[int(inBoneIndex.y)] * vertex * inBoneWeight.y;
-    if (boneCount > 2) position += boneMatrixArray[int(inBoneIndex.z)] * vertex * inBoneWeight.z;
-    if (boneCount > 3) position += boneMatrixArray[int(inBoneIndex.w)] * vertex * inBoneWeight.w;
-    gl_Position = viewProjMatrix * position;
+    gl_Position = viewProjMatrix * skinPosition();
     fTexCoord = inTexCoord;
 }
 )";
 
-enum { kBoneCount, kBoneMatrixArray, kViewProjMatrix, kOpacity, kAlphaThreshold, kThreshold };
+namespace {
 
 const QexShaderModuleType kType = {
     "src/Shaders/QexSkinningTextureShader",
-    kVertexSource,
+    kQexSkinningVertexSource,
     kQexTextureFragmentSource,
     QexSkinningTextureShader_Render,
     {{"inVertex", QEX_ELEMENT_POSITION},
@@ -40,20 +29,31 @@ const QexShaderModuleType kType = {
     {"boneCount", "boneMatrixArray", "viewProjMatrix", "opacity", "alphaThreshold"},
     {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
     true,
-    kThreshold,
+    kSkinningThreshold,
 };
 
 }  // namespace
 
+void QexSkinningTextureShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* view,
+                                          const QexMatrix* projection) {
+    const QexShaderSlot* slots = draw.module->slots;
+    QexMatrix viewProjection;
+    QexMatrix_Multiply(&viewProjection, projection, view);
+    QEX_GL(glUniform1f(slots[kSkinningOpacity].location, QexShaderModule_Opacity(draw)));
+    QEX_GL(glUniform1f(slots[kSkinningAlphaThreshold].location, slots[kSkinningThreshold].value));
+    QEX_GL(glUniformMatrix4fv(slots[kSkinningViewProjMatrix].location, 1, GL_FALSE, viewProjection.m));
+}
+
 extern "C" {
 
 QEX_SHADER_MODULE_LIFETIME(QexSkinningTextureShader, &kType)
-QEX_SHADER_MODULE_THRESHOLD(QexSkinningTextureShader, kThreshold)
+QEX_SHADER_MODULE_THRESHOLD(QexSkinningTextureShader, kSkinningThreshold)
 
 int32_t QexSkinningTextureShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                           const QexMatrix* modelMatrix) {
-    const QexShaderBones bones = {QexShaderModule_Location(module, kBoneCount),
-                                  QexShaderModule_Location(module, kBoneMatrixArray), modelMatrix};
+    const QexShaderBones bones = {QexShaderModule_Location(module, kSkinningBoneCount),
+                                  QexShaderModule_Location(module, kSkinningBoneMatrixArray), false, 0,
+                                  modelMatrix};
     return QexShaderModule_DrawSkinnedMesh(&kType, model, nodeIndex, bones);
 }
 
@@ -61,13 +61,8 @@ void QexSkinningTextureShader_Render(QexShaderModule* module, QexModel* model, u
                                      const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
                                      const QexMatrix* projection, const QexShadowInfo*) {
     QexShaderDraw draw;
-    QexMatrix viewProjection;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
-    QexMatrix_Multiply(&viewProjection, projection, view);
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kOpacity), QexShaderModule_Opacity(draw)));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kAlphaThreshold), module->slots[kThreshold].value));
-    QEX_GL(
-        glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
+    QexSkinningTextureShader_SetUniforms(draw, view, projection);
     QexShaderModule_BindMaterialKeepPass(draw);
     QexSkinningTextureShader_DrawMesh(module, model, nodeIndex, modelMatrix);
 }

@@ -1,8 +1,6 @@
 #include "QexTextureShader.h"
 
-namespace {
-
-const char* const kFragmentSource = R"(
+const char* const kQexTextureNoAlphaFragmentSource = R"(
 uniform sampler2D sTexture;
 uniform lowp float opacity;
 uniform lowp float alphaThreshold;
@@ -15,10 +13,12 @@ void main() {
 }
 )";
 
+namespace {
+
 const QexShaderModuleType kType = {
     "src/Shaders/QexTextureNoAlphaShader",
     kQexTextureVertexSource,
-    kFragmentSource,
+    kQexTextureNoAlphaFragmentSource,
     QexTextureNoAlphaShader_Render,
     {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
     {"mvpMatrix", "opacity", "alphaThreshold"},

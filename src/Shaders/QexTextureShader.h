@@ -9,6 +9,9 @@ extern const char* const kQexTextureVertexSource;
 // Texture colour, alpha from the alpha texture; the skinned texture module ends in it too.
 extern const char* const kQexTextureFragmentSource;
 
+// Texture colour, alpha from the texture itself.
+extern const char* const kQexTextureNoAlphaFragmentSource;
+
 // Slots of the texture modules.
 enum { kTextureMvpMatrix, kTextureOpacity, kTextureAlphaThreshold, kTextureThreshold };
 

@@ -1,0 +1,76 @@
+#include "QexGLSL.h"
+#include "QexShaderModule.h"
+
+#define QEX_MODULE (kType.path)
+
+namespace {
+
+const char* const kVertexSource = QEX_GLSL_SKIN QEX_GLSL_DEPTH R"(
+attribute mediump vec2 inTexCoord;
+uniform highp mat4 viewProjMatrix;
+varying mediump vec2 fTexCoord;
+void main() {
+    gl_Position = viewProjMatrix * skinPosition();
+    fDepth = depthValue(gl_Position.z);
+    fTexCoord = inTexCoord;
+}
+)";
+
+const char* const kFragmentSource = QEX_GLSL_FRAGMENT_PRECISION QEX_GLSL_ALPHA R"(
+varying float fDepth;
+void main() {
+    gl_FragColor = vec4(fDepth, fDepth, fDepth, surfaceAlpha());
+}
+)";
+
+enum { kNear, kFar, kBoneCount, kBoneMatrixArray, kViewProjMatrix, kOpacity, kAlphaThreshold, kThreshold };
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexSkinningDepthShader",
+    kVertexSource,
+    kFragmentSource,
+    QexSkinningDepthShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION},
+     {"inTexCoord", QEX_ELEMENT_UV0},
+     {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
+     {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
+    {"near", "far", "boneCount", "boneMatrixArray", "viewProjMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    true,
+    kThreshold,
+};
+
+}  // namespace
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexSkinningDepthShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexSkinningDepthShader, kThreshold)
+
+void QexSkinningDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar) {
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kNear), zNear));
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
+}
+
+int32_t QexSkinningDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                        const QexMatrix* modelMatrix) {
+    const QexShaderBones bones = {QexShaderModule_Location(module, kBoneCount),
+                                  QexShaderModule_Location(module, kBoneMatrixArray), false, 0, modelMatrix};
+    return QexShaderModule_DrawSkinnedMesh(&kType, model, nodeIndex, bones);
+}
+
+void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                     const QexMatrix* projection, const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexMatrix viewProjection;
+    QexMatrix_Multiply(&viewProjection, projection, view);
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kOpacity), QexShaderModule_Opacity(draw)));
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kAlphaThreshold), module->slots[kThreshold].value));
+    QEX_GL(glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
+    QexShaderModule_BindMaterialKeepPass(draw);
+    QexSkinningDepthShader_DrawMesh(module, model, nodeIndex, modelMatrix);
+}
+
+}  // extern "C"

@@ -1,0 +1,44 @@
+#include "QexSkinningTextureShader.h"
+#include "QexTextureShader.h"
+
+namespace {
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexSkinningTextureNoAlphaShader",
+    kQexSkinningVertexSource,
+    kQexTextureNoAlphaFragmentSource,
+    QexSkinningTextureNoAlphaShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION},
+     {"inTexCoord", QEX_ELEMENT_UV0},
+     {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
+     {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
+    {"boneCount", "boneMatrixArray", "viewProjMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}},
+    true,
+    kSkinningThreshold,
+};
+
+}  // namespace
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexSkinningTextureNoAlphaShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexSkinningTextureNoAlphaShader, kSkinningThreshold)
+
+// The slots are those of the module with alpha texture.
+int32_t QexSkinningTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                                 const QexMatrix* modelMatrix) {
+    return QexSkinningTextureShader_DrawMesh(module, model, nodeIndex, modelMatrix);
+}
+
+void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                     const QexMatrix* projection, const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexSkinningTextureShader_SetUniforms(draw, view, projection);
+    QexShaderModule_BindDiffuseOnly(draw);
+    QexSkinningTextureShader_DrawMesh(module, model, nodeIndex, modelMatrix);
+}
+
+}  // extern "C"

@@ -1,0 +1,38 @@
+#include "QexUVDisplacementShader.h"
+
+#include "QexTextureShader.h"
+
+namespace {
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexUVDisplacementNoAlphaShader",
+    kQexUVDisplacementVertexSource,
+    kQexTextureNoAlphaFragmentSource,
+    QexUVDisplacementNoAlphaShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
+    {"displacement", "mvpMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}},
+    true,
+    kDisplacementThreshold,
+};
+
+}  // namespace
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexUVDisplacementNoAlphaShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexUVDisplacementNoAlphaShader, kDisplacementThreshold)
+QEX_SHADER_MODULE_DRAW_MESH(QexUVDisplacementNoAlphaShader, &kType)
+QEX_UV_DISPLACEMENT(QexUVDisplacementNoAlphaShader)
+
+void QexUVDisplacementNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                     const QexMatrix* projection, const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexUVDisplacementShader_SetUniforms(draw, modelMatrix, view, projection);
+    QexShaderModule_BindDiffuseOnly(draw);
+    QexUVDisplacementNoAlphaShader_DrawMesh(module, model, nodeIndex);
+}
+
+}  // extern "C"

@@ -1,0 +1,65 @@
+#include "QexUVDisplacementShader.h"
+
+#include "QexTextureShader.h"
+
+#define QEX_MODULE (draw.type->path)
+
+// A shift may be animated past 1 for long; low precision would not hold it.
+const char* const kQexUVDisplacementVertexSource = R"(
+attribute highp vec3 inVertex;
+attribute mediump vec2 inTexCoord;
+uniform highp mat4 mvpMatrix;
+uniform mediump vec2 displacement;
+varying mediump vec2 fTexCoord;
+void main() {
+    fTexCoord = inTexCoord + displacement;
+    gl_Position = mvpMatrix * vec4(inVertex, 1.0);
+}
+)";
+
+namespace {
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexUVDisplacementShader",
+    kQexUVDisplacementVertexSource,
+    kQexTextureFragmentSource,
+    QexUVDisplacementShader_Render,
+    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
+    {"displacement", "mvpMatrix", "opacity", "alphaThreshold"},
+    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    true,
+    kDisplacementThreshold,
+};
+
+}  // namespace
+
+void QexUVDisplacementShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix,
+                                         const QexMatrix* view, const QexMatrix* projection) {
+    const QexShaderSlot* slots = draw.module->slots;
+    const float shift[] = {slots[kDisplacementU].value, slots[kDisplacementV].value};
+    QexMatrix mvp;
+    QexShaderModule_ModelViewProjection(draw, &mvp, modelMatrix, view, projection);
+    QEX_GL(glUniform1f(slots[kDisplacementOpacity].location, QexShaderModule_Opacity(draw)));
+    QEX_GL(glUniform1f(slots[kDisplacementAlphaThreshold].location, slots[kDisplacementThreshold].value));
+    QEX_GL(glUniform2fv(slots[kDisplacementUniform].location, 1, shift));
+    QEX_GL(glUniformMatrix4fv(slots[kDisplacementMvpMatrix].location, 1, GL_FALSE, mvp.m));
+}
+
+extern "C" {
+
+QEX_SHADER_MODULE_LIFETIME(QexUVDisplacementShader, &kType)
+QEX_SHADER_MODULE_THRESHOLD(QexUVDisplacementShader, kDisplacementThreshold)
+QEX_SHADER_MODULE_DRAW_MESH(QexUVDisplacementShader, &kType)
+QEX_UV_DISPLACEMENT(QexUVDisplacementShader)
+
+void QexUVDisplacementShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
+                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                     const QexMatrix* projection, const QexShadowInfo*) {
+    QexShaderDraw draw;
+    if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
+    QexUVDisplacementShader_SetUniforms(draw, modelMatrix, view, projection);
+    QexShaderModule_BindMaterial(draw);
+    QexUVDisplacementShader_DrawMesh(module, model, nodeIndex);
+}
+
+}  // extern "C"
