@@ -13,7 +13,7 @@ struct QexModelSharedShaders {
     uint32_t shadowTexture;  // GL names of the shadow target
     uint32_t shadowDepth;
     uint32_t shadowFramebuffer;
-    int32_t shadowWidth;  // pixels
+    int32_t shadowWidth;  // pixels, of the target that exists
     int32_t shadowHeight;
 };
 

@@ -24,9 +24,9 @@ bool InPass(const QexModel* model, uint32_t node, uint32_t pass) {
 
 // Draws a mesh node through its module, if it has one.
 void DrawNode(QexModel* model, uint32_t node, const QexLightSet* lights, const QexMatrix* modelMatrix,
-              const QexMatrix* view, const QexMatrix* projection) {
+              const QexMatrix* view, const QexMatrix* projection, const QexShadowInfo* shadow = nullptr) {
     QexShaderModule* module = model->scene.nodes[node].shader;
-    if (module) module->render(module, model, node, lights, modelMatrix, view, projection, nullptr);
+    if (module) module->render(module, model, node, lights, modelMatrix, view, projection, shadow);
 }
 
 bool ModeAllows(const QexPODNode& node, uint32_t mode) {
@@ -74,8 +74,7 @@ void QexModel_RenderWithCamera(QexModel* model, const QexLightSet* lights, const
 void QexModel_RenderWithViewProjection(QexModel* model, const QexLightSet* lights,
                                        const QexMatrix* modelMatrix, const QexMatrix* view,
                                        const QexMatrix* projection, uint32_t pass) {
-    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i)
-        if (InPass(model, i, pass)) DrawNode(model, i, lights, modelMatrix, view, projection);
+    QexModel_RenderFromViewPerspectiveWithShadow(model, lights, modelMatrix, view, projection, nullptr, pass);
 }
 
 void QexModel_RenderNodeWithCamera(QexModel* model, uint32_t nodeIndex, const QexLightSet* lights,
@@ -90,6 +89,30 @@ void QexModel_RenderNodeWithViewProjection(QexModel* model, uint32_t nodeIndex, 
                                            const QexMatrix* projection) {
     if (nodeIndex < model->scene.meshNodeCount)
         DrawNode(model, nodeIndex, lights, modelMatrix, view, projection);
+}
+
+void QexModel_RenderFromCameraWithShadow(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
+                                         const QexMatrix* modelMatrix, const QexShadowInfo* info,
+                                         uint32_t pass) {
+    SetEye(camera);
+    QexModel_RenderFromViewPerspectiveWithShadow(model, lights, modelMatrix, &camera->viewMatrix,
+                                                 &camera->projectionMatrix, info, pass);
+}
+
+void QexModel_RenderFromViewPerspectiveWithShadow(QexModel* model, const QexLightSet* lights,
+                                                  const QexMatrix* modelMatrix, const QexMatrix* view,
+                                                  const QexMatrix* projection, const QexShadowInfo* info,
+                                                  uint32_t pass) {
+    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i)
+        if (InPass(model, i, pass)) DrawNode(model, i, lights, modelMatrix, view, projection, info);
+}
+
+void QexModel_RenderNodeFromViewPerspectiveWithShadow(QexModel* model, uint32_t nodeIndex,
+                                                      const QexLightSet* lights, const QexMatrix* modelMatrix,
+                                                      const QexMatrix* view, const QexMatrix* projection,
+                                                      const QexShadowInfo* info) {
+    if (nodeIndex < model->scene.meshNodeCount)
+        DrawNode(model, nodeIndex, lights, modelMatrix, view, projection, info);
 }
 
 void QexModel_RenderWithCameraEx(QexModel* model, const QexLightSet* lights, const QexCamera* camera,

@@ -9,6 +9,7 @@ namespace {
 
 constexpr int32_t kDefaultShadowSize = 512;
 
+// What lies before the near plane is drawn at it: it stands between the light and the view, and casts.
 const char* const kSkinShadowVertexSource = R"(
 attribute highp vec3 inVertex;
 attribute mediump vec2 inTexCoord;
@@ -26,7 +27,7 @@ void main() {
     position += boneMatrixArray[int(inBoneIndex.z)] * vertex * inBoneWeight.z;
     fPosition = viewProjMatrix * position;
     fTexCoord = inTexCoord;
-    gl_Position = fPosition;
+    gl_Position = vec4(fPosition.xy, max(fPosition.z, -fPosition.w), fPosition.w);
 }
 )";
 
@@ -39,7 +40,7 @@ varying mediump vec2 fTexCoord;
 void main() {
     fPosition = mvpMatrix * vec4(inVertex, 1.0);
     fTexCoord = inTexCoord;
-    gl_Position = fPosition;
+    gl_Position = vec4(fPosition.xy, max(fPosition.z, -fPosition.w), fPosition.w);
 }
 )";
 
@@ -68,7 +69,9 @@ struct ShadowShaders {
     GLuint fragment;
 };
 
-QexModelSharedShaders s_Shared = {nullptr, nullptr, nullptr, 0, 0, 0, kDefaultShadowSize, kDefaultShadowSize};
+QexModelSharedShaders s_Shared = {nullptr, nullptr, nullptr, 0, 0, 0, 0, 0};
+int32_t s_ShadowWidth = kDefaultShadowSize;  // of the next target
+int32_t s_ShadowHeight = kDefaultShadowSize;
 ShadowShaders s_SkinShadowShaders;
 ShadowShaders s_ModelShadowShaders;
 int32_t s_ReferenceCount;
@@ -93,6 +96,8 @@ void CreateShadowProgram(uint32_t* program, ShadowShaders* shaders, const char* 
 
 void CreateShadowTarget() {
     GLint framebuffer = 0;
+    s_Shared.shadowWidth = s_ShadowWidth;
+    s_Shared.shadowHeight = s_ShadowHeight;
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
     QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
     QEX_GL(glGenTextures(1, &s_Shared.shadowTexture));
@@ -174,8 +179,12 @@ void QexModel_ReleaseShader(int32_t force) {
 }
 
 void QexModel_SetShadowMapSize(int32_t width, int32_t height) {
-    s_Shared.shadowWidth = width;
-    s_Shared.shadowHeight = height;
+    s_ShadowWidth = width;
+    s_ShadowHeight = height;
+}
+
+void QexModel_ReleaseShadowTexture(void) {
+    DeleteShadowTarget();
 }
 
 void QexModel_SetAlphaTestCmpValue(float threshold) {

@@ -48,9 +48,9 @@ void QexDepthShader_SetParameters(QexShaderModule* module, float zNear, float zF
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
 }
 
-void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
-                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                     const QexMatrix* projection, const QexShadowInfo*) {
+void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex, const QexLightSet*,
+                           const QexMatrix* modelMatrix, const QexMatrix* view, const QexMatrix* projection,
+                           const QexShadowInfo*) {
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexMatrix mvp;

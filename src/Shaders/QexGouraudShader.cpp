@@ -38,7 +38,10 @@ const QexLitShaderType kType = {
      {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
      true,
      11},
-    false, false, false, false};
+    false,
+    false,
+    false,
+    false};
 
 }  // namespace
 

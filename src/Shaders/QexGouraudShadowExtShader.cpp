@@ -54,12 +54,16 @@ const QexLitShaderType kType = {
      kFragmentSource,
      QexGouraudShadowExtShader_Render,
      {{"inVertex", QEX_ELEMENT_POSITION}, {"inNormal", QEX_ELEMENT_NORMAL}, {"inTexCoord", QEX_ELEMENT_UV0}},
-     {QEX_STATIC_UNIFORMS, QEX_LIGHT_UNIFORMS, "opacity", "alphaThreshold", QEX_SHADOW_UNIFORMS, "shadowFade"},
+     {QEX_STATIC_UNIFORMS, QEX_LIGHT_UNIFORMS, "opacity", "alphaThreshold", QEX_SHADOW_UNIFORMS,
+      "shadowFade"},
      {{"sTexture", kDiffuseUnit}, {"shadowTexture", kShadowMapUnit}, {"alphaTexture", kAlphaUnit}},
      true,
      kThresholdSlot,
      1.0f},
-    false, false, true, true};
+    false,
+    false,
+    true,
+    true};
 
 }  // namespace
 

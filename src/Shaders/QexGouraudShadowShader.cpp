@@ -55,7 +55,10 @@ const QexLitShaderType kType = {
      {{"sTexture", kDiffuseUnit}, {"shadowTexture", kShadowMapUnit}, {"alphaTexture", kAlphaUnit}},
      true,
      15},
-    false, false, true, false};
+    false,
+    false,
+    true,
+    false};
 
 }  // namespace
 

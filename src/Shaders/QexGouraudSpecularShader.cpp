@@ -52,11 +52,15 @@ const QexLitShaderType kType = {
      kFragmentSource,
      QexGouraudSpecularShader_Render,
      {{"inVertex", QEX_ELEMENT_POSITION}, {"inNormal", QEX_ELEMENT_NORMAL}, {"inTexCoord", QEX_ELEMENT_UV0}},
-     {QEX_STATIC_UNIFORMS, "cameraPos", QEX_LIGHT_UNIFORMS, "sceneSpecular", "shininess", "opacity", "alphaThreshold"},
+     {QEX_STATIC_UNIFORMS, "cameraPos", QEX_LIGHT_UNIFORMS, "sceneSpecular", "shininess", "opacity",
+      "alphaThreshold"},
      {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
      true,
      14},
-    true, false, false, false};
+    true,
+    false,
+    false,
+    false};
 
 }  // namespace
 

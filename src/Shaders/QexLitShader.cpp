@@ -77,7 +77,8 @@ void SetShadow(const QexShaderDraw& draw, uint32_t slot, bool fade, const QexMat
         if (fade) QEX_GL(glUniform1f(slots[slot + 4].location, slots[draw.type->thresholdSlot + 1].value));
     }
     QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
-    QexRenderState_Bind(GL_TEXTURE_2D, shadow ? shadow->shadowTexture : Qextexture_GetDefault()->glName);
+    QexRenderState_Bind(GL_TEXTURE_2D, shadow && shadow->shadowTexture ? shadow->shadowTexture
+                                                                       : Qextexture_GetDefault()->glName);
 }
 
 void BindTextures(const QexShaderDraw& draw, const QexLitShaderType* type) {
@@ -116,7 +117,8 @@ void QexLitShader_RenderSkinned(const QexLitShaderType* type, QexShaderModule* m
 
 int32_t QexLitShader_DrawSkinnedMesh(const QexLitShaderType* type, QexShaderModule* module, QexModel* model,
                                      uint32_t nodeIndex, const QexMatrix* modelMatrix) {
-    const QexShaderBones bones = {module->slots[kBoneCount].location, module->slots[kBoneMatrixArray].location,
-                                  true, module->slots[kBoneVecMatrixArray].location, modelMatrix};
+    const QexShaderBones bones = {module->slots[kBoneCount].location,
+                                  module->slots[kBoneMatrixArray].location, true,
+                                  module->slots[kBoneVecMatrixArray].location, modelMatrix};
     return QexShaderModule_DrawSkinnedMesh(&type->module, model, nodeIndex, bones);
 }

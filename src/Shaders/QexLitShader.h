@@ -20,7 +20,8 @@ struct QexLitShaderType {
 enum { kTransMatrix, kNormalMatrix, kMvpMatrix, kFirstStaticLight };
 enum { kViewProjMatrix, kBoneCount, kBoneMatrixArray, kBoneVecMatrixArray, kFirstSkinnedLight };
 
-#define QEX_LIGHT_UNIFORMS "lightCount", "lightType", "lightPosDir", "lightColor", "sceneAmbient", "sceneDiffuse"
+#define QEX_LIGHT_UNIFORMS \
+    "lightCount", "lightType", "lightPosDir", "lightColor", "sceneAmbient", "sceneDiffuse"
 #define QEX_STATIC_UNIFORMS "transMatrix", "normalMatrix", "mvpMatrix"
 #define QEX_SKINNED_UNIFORMS "viewProjMatrix", "boneCount", "boneMatrixArray", "boneVecMatrixArray"
 #define QEX_SHADOW_UNIFORMS "shadowLightDir", "shadowSpaceMatrix", "biasValue", "shadowIntensity"
@@ -35,25 +36,25 @@ int32_t QexLitShader_DrawSkinnedMesh(const QexLitShaderType* type, QexShaderModu
                                      uint32_t nodeIndex, const QexMatrix* modelMatrix);
 
 // The operations of a lit module.
-#define QEX_LIT_SHADER(Name, type)                                                                      \
-    QEX_SHADER_MODULE_LIFETIME(Name, &(type)->module)                                                   \
-    QEX_SHADER_MODULE_THRESHOLD(Name, (type)->module.thresholdSlot)                                     \
-    QEX_SHADER_MODULE_DRAW_MESH(Name, &(type)->module)                                                  \
-    void Name##_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,                    \
-                       const QexLightSet* lights, const QexMatrix* modelMatrix, const QexMatrix* view,  \
-                       const QexMatrix* projection, const QexShadowInfo* shadow) {                      \
+#define QEX_LIT_SHADER(Name, type)                                                                          \
+    QEX_SHADER_MODULE_LIFETIME(Name, &(type)->module)                                                       \
+    QEX_SHADER_MODULE_THRESHOLD(Name, (type)->module.thresholdSlot)                                         \
+    QEX_SHADER_MODULE_DRAW_MESH(Name, &(type)->module)                                                      \
+    void Name##_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,                        \
+                       const QexLightSet* lights, const QexMatrix* modelMatrix, const QexMatrix* view,      \
+                       const QexMatrix* projection, const QexShadowInfo* shadow) {                          \
         QexLitShader_Render(type, module, model, nodeIndex, lights, modelMatrix, view, projection, shadow); \
     }
 
-#define QEX_SKINNED_LIT_SHADER(Name, type)                                                              \
-    QEX_SHADER_MODULE_LIFETIME(Name, &(type)->module)                                                   \
-    QEX_SHADER_MODULE_THRESHOLD(Name, (type)->module.thresholdSlot)                                     \
-    int32_t Name##_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,               \
-                            const QexMatrix* modelMatrix) {                                             \
-        return QexLitShader_DrawSkinnedMesh(type, module, model, nodeIndex, modelMatrix);               \
-    }                                                                                                   \
-    void Name##_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,                    \
-                       const QexLightSet* lights, const QexMatrix* modelMatrix, const QexMatrix* view,  \
-                       const QexMatrix* projection, const QexShadowInfo*) {                             \
+#define QEX_SKINNED_LIT_SHADER(Name, type)                                                                 \
+    QEX_SHADER_MODULE_LIFETIME(Name, &(type)->module)                                                      \
+    QEX_SHADER_MODULE_THRESHOLD(Name, (type)->module.thresholdSlot)                                        \
+    int32_t Name##_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,                  \
+                            const QexMatrix* modelMatrix) {                                                \
+        return QexLitShader_DrawSkinnedMesh(type, module, model, nodeIndex, modelMatrix);                  \
+    }                                                                                                      \
+    void Name##_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,                       \
+                       const QexLightSet* lights, const QexMatrix* modelMatrix, const QexMatrix* view,     \
+                       const QexMatrix* projection, const QexShadowInfo*) {                                \
         QexLitShader_RenderSkinned(type, module, model, nodeIndex, lights, modelMatrix, view, projection); \
     }

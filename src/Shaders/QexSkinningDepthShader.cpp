@@ -60,15 +60,16 @@ int32_t QexSkinningDepthShader_DrawMesh(QexShaderModule* module, QexModel* model
 }
 
 void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
-                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                     const QexMatrix* projection, const QexShadowInfo*) {
+                                   const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                   const QexMatrix* projection, const QexShadowInfo*) {
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexMatrix viewProjection;
     QexMatrix_Multiply(&viewProjection, projection, view);
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kOpacity), QexShaderModule_Opacity(draw)));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kAlphaThreshold), module->slots[kThreshold].value));
-    QEX_GL(glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
+    QEX_GL(
+        glUniformMatrix4fv(QexShaderModule_Location(module, kViewProjMatrix), 1, GL_FALSE, viewProjection.m));
     QexShaderModule_BindMaterialKeepPass(draw);
     QexSkinningDepthShader_DrawMesh(module, model, nodeIndex, modelMatrix);
 }

@@ -63,7 +63,10 @@ const QexLitShaderType kType = {
      {{"sTexture", kDiffuseUnit}, {"sNormalMap", kNormalMapUnit}, {"alphaTexture", kAlphaUnit}},
      true,
      12},
-    false, true, false, false};
+    false,
+    true,
+    false,
+    false};
 
 }  // namespace
 

@@ -3,7 +3,8 @@
 
 namespace {
 
-const char* const kVertexSource = QEX_GLSL_SKIN QEX_GLSL_SKIN_VECTOR QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("4", "mediump") R"(
+const char* const kVertexSource =
+    QEX_GLSL_SKIN QEX_GLSL_SKIN_VECTOR QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("4", "mediump") R"(
 attribute mediump vec3 inNormal;
 attribute mediump vec2 inTexCoord;
 uniform highp mat4 viewProjMatrix;
@@ -44,18 +45,24 @@ void main() {
 }
 )";
 
-const QexLitShaderType kType = {
-    {"src/Shaders/QexSkinningGouraudSpecularShader",
-     kVertexSource,
-     kFragmentSource,
-     QexSkinningGouraudSpecularShader_Render,
-     {{"inVertex", QEX_ELEMENT_POSITION}, {"inNormal", QEX_ELEMENT_NORMAL}, {"inTexCoord", QEX_ELEMENT_UV0}, {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
-      {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
-     {QEX_SKINNED_UNIFORMS, "cameraPos", QEX_LIGHT_UNIFORMS, "sceneSpecular", "shininess", "opacity", "alphaThreshold"},
-     {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
-     true,
-     15},
-    true, false, false, false};
+const QexLitShaderType kType = {{"src/Shaders/QexSkinningGouraudSpecularShader",
+                                 kVertexSource,
+                                 kFragmentSource,
+                                 QexSkinningGouraudSpecularShader_Render,
+                                 {{"inVertex", QEX_ELEMENT_POSITION},
+                                  {"inNormal", QEX_ELEMENT_NORMAL},
+                                  {"inTexCoord", QEX_ELEMENT_UV0},
+                                  {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
+                                  {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
+                                 {QEX_SKINNED_UNIFORMS, "cameraPos", QEX_LIGHT_UNIFORMS, "sceneSpecular",
+                                  "shininess", "opacity", "alphaThreshold"},
+                                 {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+                                 true,
+                                 15},
+                                true,
+                                false,
+                                false,
+                                false};
 
 }  // namespace
 

@@ -32,8 +32,9 @@ int32_t QexSkinningTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexMod
 }
 
 void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
-                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                     const QexMatrix* projection, const QexShadowInfo*) {
+                                            const QexLightSet*, const QexMatrix* modelMatrix,
+                                            const QexMatrix* view, const QexMatrix* projection,
+                                            const QexShadowInfo*) {
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexSkinningTextureShader_SetUniforms(draw, view, projection);

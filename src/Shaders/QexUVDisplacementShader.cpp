@@ -53,8 +53,8 @@ QEX_SHADER_MODULE_DRAW_MESH(QexUVDisplacementShader, &kType)
 QEX_UV_DISPLACEMENT(QexUVDisplacementShader)
 
 void QexUVDisplacementShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
-                                     const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
-                                     const QexMatrix* projection, const QexShadowInfo*) {
+                                    const QexLightSet*, const QexMatrix* modelMatrix, const QexMatrix* view,
+                                    const QexMatrix* projection, const QexShadowInfo*) {
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexUVDisplacementShader_SetUniforms(draw, modelMatrix, view, projection);

@@ -19,12 +19,12 @@ enum {
 void QexUVDisplacementShader_SetUniforms(const QexShaderDraw& draw, const QexMatrix* modelMatrix,
                                          const QexMatrix* view, const QexMatrix* projection);
 
-#define QEX_UV_DISPLACEMENT(Name)                                            \
-    void Name##_SetDisplacement(QexShaderModule* module, float u, float v) { \
-        module->slots[kDisplacementU].value = u;                             \
-        module->slots[kDisplacementV].value = v;                             \
-    }                                                                        \
+#define QEX_UV_DISPLACEMENT(Name)                                                    \
+    void Name##_SetDisplacement(QexShaderModule* module, float u, float v) {         \
+        module->slots[kDisplacementU].value = u;                                     \
+        module->slots[kDisplacementV].value = v;                                     \
+    }                                                                                \
     void Name##_GetDisplacement(const QexShaderModule* module, float* u, float* v) { \
-        *u = module->slots[kDisplacementU].value;                            \
-        *v = module->slots[kDisplacementV].value;                            \
+        *u = module->slots[kDisplacementU].value;                                    \
+        *v = module->slots[kDisplacementV].value;                                    \
     }
