@@ -12,8 +12,15 @@ namespace {
 
 // The vertex elements that the depth programs read; both draw through what the shader modules share.
 const QexShaderModuleType kStaticCaster = {
-    QEX_MODULE, nullptr, nullptr, nullptr, {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {},         {},      false,   0};
+    QEX_MODULE,
+    nullptr,
+    nullptr,
+    nullptr,
+    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
+    {},
+    {},
+    false,
+    0};
 const QexShaderModuleType kSkinnedCaster = {QEX_MODULE,
                                             nullptr,
                                             nullptr,
@@ -59,7 +66,8 @@ uint32_t CandidateCount(const QexShadowCaster& request) {
     return request.nodeIndices ? request.nodeCount : 0;
 }
 
-// Fills the list of one caster with the candidates that may throw a shadow into the view, and widens `box` by them.
+// Fills the list of one caster with the candidates that may throw a shadow into the view, and widens `box` by
+// them.
 bool ListCasters(QexShadowCaster* caster, const QexShadowCaster& request, const QexMatrix* lightView,
                  const QexAABB& view, QexAABB* box) {
     const uint32_t candidates = CandidateCount(request);
@@ -102,7 +110,8 @@ void BindAlpha(QexModel* model, uint32_t node) {
     if (model->bindTextureHook) model->bindTextureHook(model, node);
 }
 
-void DrawStatic(QexModel* model, uint32_t node, const QexMatrix* modelMatrix, const QexMatrix* lightViewProj) {
+void DrawStatic(QexModel* model, uint32_t node, const QexMatrix* modelMatrix,
+                const QexMatrix* lightViewProj) {
     const QexMatrix* world = QexPODAnimation_WorldMatrix(&model->scene, &model->scene.nodes[node]);
     QexMatrix placed, mvp;
     if (modelMatrix) {
@@ -132,8 +141,8 @@ bool CanDraw(const QexModel* model, uint32_t node) {
 extern "C" {
 
 QexShadowInfo* QexModel_InitShadowInfo(const QexCamera* camera, const QexVec3* lightDir,
-                                       const QexShadowCaster* casters, uint32_t casterCount, float shadowIntensity,
-                                       float biasValue) {
+                                       const QexShadowCaster* casters, uint32_t casterCount,
+                                       float shadowIntensity, float biasValue) {
     QexShadowInfo* info = QexMemory_AllocZeroed<QexShadowInfo>(1);
     if (info) info->casters = QexMemory_AllocZeroed<QexShadowCaster>(casterCount);
     QexMatrix lightView;

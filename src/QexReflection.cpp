@@ -1,4 +1,5 @@
-// Mirror images in a plane: the casters drawn a second time through the reflection matrix, the plane over them.
+// Mirror images in a plane: the casters drawn a second time through the reflection matrix, the plane over
+// them.
 #include <cstring>
 
 #include "QexGL.h"
@@ -20,8 +21,8 @@ bool CopyCaster(QexShadowCaster* copy, const QexShadowCaster& caster) {
 }
 
 // A record with its own copy of the casters; null, with a line, when memory runs out.
-QexReflection* Create(QexModel* model, const QexVec3& normal, const QexVec3& point, const QexShadowCaster* casters,
-                      uint32_t casterCount) {
+QexReflection* Create(QexModel* model, const QexVec3& normal, const QexVec3& point,
+                      const QexShadowCaster* casters, uint32_t casterCount) {
     QexReflection* reflection = QexMemory_AllocZeroed<QexReflection>(1);
     if (reflection) reflection->casters = QexMemory_AllocZeroed<QexShadowCaster>(casterCount);
     bool complete = reflection && reflection->casters;
@@ -45,7 +46,7 @@ void DrawReflected(const QexReflection* reflection, const QexLightSet* lights, c
     for (uint32_t c = 0; c < reflection->casterCount; ++c) {
         const QexShadowCaster& caster = reflection->casters[c];
         const bool withPlane = caster.model == reflection->model && !reflection->infinite;
-        const uint32_t count = !caster.model          ? 0
+        const uint32_t count = !caster.model         ? 0
                                : caster.allMeshNodes ? caster.model->scene.meshNodeCount
                                                      : caster.nodeCount;
         for (uint32_t i = 0; i < count; ++i) {
@@ -61,8 +62,9 @@ void DrawReflected(const QexReflection* reflection, const QexLightSet* lights, c
 
 extern "C" {
 
-QexReflection* QexReflection_InitReflectionInfo(QexModel* model, uint32_t planeNode, const QexShadowCaster* casters,
-                                                uint32_t casterCount, uint8_t useStencil) {
+QexReflection* QexReflection_InitReflectionInfo(QexModel* model, uint32_t planeNode,
+                                                const QexShadowCaster* casters, uint32_t casterCount,
+                                                uint8_t useStencil) {
     QexVec3 normal, point;
     QexPODModel_GetNodePlaneNormal(&model->scene, planeNode, &normal.x);
     QexPODModel_GetNodePlanePoint(&model->scene, planeNode, &point.x);
@@ -74,7 +76,8 @@ QexReflection* QexReflection_InitReflectionInfo(QexModel* model, uint32_t planeN
 }
 
 QexReflection* QexReflection_InitReflectionInfoInfinite(QexModel* model, const QexVec3* planeNormal,
-                                                        const QexVec3* planePoint, const QexShadowCaster* casters,
+                                                        const QexVec3* planePoint,
+                                                        const QexShadowCaster* casters,
                                                         uint32_t casterCount) {
     QexReflection* reflection = Create(model, *planeNormal, *planePoint, casters, casterCount);
     if (reflection) reflection->infinite = 1;
@@ -88,7 +91,8 @@ void QexReflection_Release(QexReflection* reflection) {
     QexMemory_Free(reflection);
 }
 
-void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet* lights, const QexCamera* camera) {
+void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet* lights,
+                                    const QexCamera* camera) {
     const QexMatrix *view = &camera->viewMatrix, *projection = &camera->projectionMatrix;
     const bool plane = !reflection->infinite;
     if (plane) QexPODModel_EnableNodeRendering(&reflection->model->scene, reflection->planeNode, 1);
@@ -101,7 +105,8 @@ void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet
     QEX_GL(glClear(GL_DEPTH_BUFFER_BIT));
     QexRenderer_SetBackFaceCulling(1);
     if (!plane) return;
-    QexModel_RenderNodeWithViewProjection(reflection->model, reflection->planeNode, lights, nullptr, view, projection);
+    QexModel_RenderNodeWithViewProjection(reflection->model, reflection->planeNode, lights, nullptr, view,
+                                          projection);
     QexPODModel_EnableNodeRendering(&reflection->model->scene, reflection->planeNode, 0);
 }
 
