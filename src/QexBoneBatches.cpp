@@ -282,8 +282,7 @@ void CBatch_CopyConstructor(CBatch* a, const CBatch* b) {
 }
 
 void CBatch_Write(const CBatch* batch, int32_t* destination, int32_t* count) {
-    if (batch->count)
-        memcpy(destination, batch->bones, static_cast<size_t>(batch->count) * sizeof *destination);
+    if (batch->count) memcpy(destination, batch->bones, static_cast<size_t>(batch->count) * sizeof *destination);
     *count = batch->count;
 }
 
@@ -321,8 +320,7 @@ void CGrowableArray_Append(CGrowableArray* array, const void* source, uint32_t n
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return;
     }
-    memcpy(static_cast<uint8_t*>(array->data) + array->elementCount * size, source,
-           static_cast<size_t>(n * size));
+    memcpy(static_cast<uint8_t*>(array->data) + array->elementCount * size, source, static_cast<size_t>(n * size));
     array->elementCount = static_cast<uint32_t>(count);
 }
 
@@ -386,14 +384,8 @@ int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount,
                               uint32_t bonesPerVertex) {
     if (bonesPerVertex < 1 || bonesPerVertex > 4 || maxBones < 1) return -1;
     memset(batches, 0, sizeof *batches);
-    const VertexLayout layout = {static_cast<const uint8_t*>(vertices),
-                                 vertexCount,
-                                 stride,
-                                 weightOffset,
-                                 weightType,
-                                 indexOffset,
-                                 indexType,
-                                 static_cast<int32_t>(bonesPerVertex)};
+    const VertexLayout layout = {static_cast<const uint8_t*>(vertices), vertexCount, stride,    weightOffset,
+                                 weightType, indexOffset, indexType, static_cast<int32_t>(bonesPerVertex)};
     if (!IsReadable(layout, indices, triangleCount)) return -1;
     Work work;
     if (!work.Alloc(vertexCount, triangleCount, maxBones)) {

@@ -75,6 +75,7 @@ TEST_F(SceneNodeTest, MatricesFollowTheTreeAndModelsDrawWithThem) {
         ExpectNear(root.worldMatrix, rootWorld, 1e-5f, "root");
         ExpectNear(child.worldMatrix, childWorld, 1e-5f, "child");
         ExpectNear(fixed.worldMatrix, childWorld * given, 1e-5f, "fixed");
+        ExpectNear(none.worldMatrix, rootWorld, 1e-5f, "none");
         EXPECT_EQ(child.nodeFlags, QEX_SCENE_NODE_HAS_MESH);
     }
     QexCamera camera = {};
