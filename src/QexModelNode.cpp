@@ -1,6 +1,6 @@
 #include <cmath>
 
-#include "QexModel.h"
+#include "Qex.h"
 
 namespace {
 
