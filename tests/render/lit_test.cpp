@@ -101,12 +101,11 @@ const glm::mat4 kBones[2] = {
     glm::scale(glm::rotate(glm::translate(glm::mat4(1), {3, 4, 1}), -0.12f, {1, 1, 0}), {1, 0.9f, 1})};
 
 // World to shadow map: x from 20 to 100, y from 5 to 80; depth rises along both.
-const glm::mat4 kShadowSpace = {{1 / 80.0f, 0, 0.003f, 0},
-                                {0, 1 / 75.0f, 0.004f, 0},
-                                {0, 0, 0.002f, 0},
-                                {-0.25f, -1 / 15.0f, 0.2f, 1}};
+const glm::mat4 kShadowSpace = {
+    {1 / 80.0f, 0, 0.003f, 0}, {0, 1 / 75.0f, 0.004f, 0}, {0, 0, 0.002f, 0}, {-0.25f, -1 / 15.0f, 0.2f, 1}};
 constexpr int kMap = 4;
-const uint8_t kMapDepths[kMap * kMap] = {255, 60, 200, 10, 120, 0, 255, 90, 30, 150, 80, 140, 254, 100, 20, 60};
+const uint8_t kMapDepths[kMap * kMap] = {255, 60,  200, 10,  120, 0,   255, 90,
+                                         30,  150, 80,  140, 254, 100, 20,  60};
 
 // What the vertex stage hands on.
 struct Varyings {
@@ -190,7 +189,8 @@ struct Setting {
         glm::vec3 diffuse = v.diffuse, highlight(0);
         if (kind.normalMap) {
             const glm::vec3 map = glm::vec3(kMapTexel[1], kMapTexel[0], kMapTexel[2]) / 255.0f;
-            const glm::vec3 n = glm::mat3(v.tangent, v.binormal, v.normal) * glm::normalize((map - 0.5f) * 2.0f);
+            const glm::vec3 n =
+                glm::mat3(v.tangent, v.binormal, v.normal) * glm::normalize((map - 0.5f) * 2.0f);
             diffuse = glm::vec3(0);
             for (size_t i = 0; i < Used(); ++i)
                 diffuse += glm::clamp(glm::dot(n, v.light[i]), 0.0f, 1.0f) * Colour(lights.lights[i]);
@@ -200,8 +200,8 @@ struct Setting {
             highlight += std::pow(cosine, material->shininess * 256) * Colour(lights.lights[i]);
         }
         highlight *= kind.specular ? glm::make_vec3(material->specular) : glm::vec3(0);
-        const glm::vec3 lit = shadow * glm::make_vec3(material->diffuse) * diffuse +
-                              glm::make_vec3(material->ambient);
+        const glm::vec3 lit =
+            shadow * glm::make_vec3(material->diffuse) * diffuse + glm::make_vec3(material->ambient);
         if (kind.skinned) return kTexel * glm::vec4(lit + highlight, alpha);
         return kTexel * glm::vec4(lit, alpha) + glm::vec4(highlight, 0);
     }
@@ -223,10 +223,11 @@ class LitTest : public RenderTest {
         Clear();
         module->render(module, &model.model, 0, &setting.lights, &extra, &view, &projection, shadow);
         const Picture picture = Read();
-        const Varyings v[] = {setting.Vertex(kCorners[0]), setting.Vertex(kCorners[1]), setting.Vertex(kCorners[2])};
-        const glm::mat3 toBarycentric = glm::inverse(
-            glm::mat3(glm::vec3(v[0].screen.x, v[0].screen.y, 1), glm::vec3(v[1].screen.x, v[1].screen.y, 1),
-                      glm::vec3(v[2].screen.x, v[2].screen.y, 1)));
+        const Varyings v[] = {setting.Vertex(kCorners[0]), setting.Vertex(kCorners[1]),
+                              setting.Vertex(kCorners[2])};
+        const glm::mat3 toBarycentric = glm::inverse(glm::mat3(glm::vec3(v[0].screen.x, v[0].screen.y, 1),
+                                                               glm::vec3(v[1].screen.x, v[1].screen.y, 1),
+                                                               glm::vec3(v[2].screen.x, v[2].screen.y, 1)));
         int compared = 0;
         for (int y = 2; y < kHeight; y += 3)
             for (int x = 1; x < kWidth; x += 3) {
@@ -237,7 +238,8 @@ class LitTest : public RenderTest {
                 if (shade < 0) continue;
                 const glm::vec4 c = glm::clamp(setting.Fragment(at, shade), 0.0f, 1.0f) * 255.0f + 0.5f;
                 EXPECT_TRUE(Near(picture.Pixel(x, y), {int(c.x), int(c.y), int(c.z), int(c.w)}, 2))
-                    << "kind " << setting.kind.kind << ", " << setting.lights.count << " lights at " << x << " " << y;
+                    << "kind " << setting.kind.kind << ", " << setting.lights.count << " lights at " << x
+                    << " " << y;
                 ++compared;
             }
         EXPECT_GT(compared, 100);
@@ -284,7 +286,8 @@ TEST_F(LitTest, EveryModuleFollowsItsFormula) {
             const Setting setting = {kind, Lights(lights), direction, &material, alpha};
             model.Node().blendFlags = QEX_NODE_OPAQUE;
             ExpectAsComputed(model, module, setting, &shadow);
-            EXPECT_EQ(model.Node().blendFlags, 0u) << "an alpha texture takes the node out of the opaque pass";
+            EXPECT_EQ(model.Node().blendFlags, 0u)
+                << "an alpha texture takes the node out of the opaque pass";
             if (kind.shadow != kNone && lights == 3) ExpectAsComputed(model, module, setting, nullptr);
         }
         QexRenderer_SetGlobalAlpha(1);
@@ -329,30 +332,35 @@ struct Order {
     { Name##_CreateProgram, Name##_Release, __VA_ARGS__ }
 const Order kOrders[] = {
     ORDER(QexGouraudShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices, "03"),
-    ORDER(QexGouraudNormalMapShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices, "013"),
+    ORDER(QexGouraudNormalMapShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices,
+          "013"),
     ORDER(QexGouraudSpecularShader, false, kMatrices + "cameraPos " + kLights + kSpecular + kAlpha,
           "cameraPos " + kLights + kSpecular + kAlpha + kMatrices, "03"),
     ORDER(QexGouraudShadowShader, false,
           kMatrices + kLights + kAlpha + "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity ",
-          kLights + kAlpha + kMatrices + "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue ", "023"),
+          kLights + kAlpha + kMatrices + "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue ",
+          "023"),
     ORDER(QexGouraudShadowExtShader, false,
-          kMatrices + kLights + kAlpha + "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity shadowFade ",
-          kLights + kAlpha + kMatrices + "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue shadowFade ",
+          kMatrices + kLights + kAlpha +
+              "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity shadowFade ",
+          kLights + kAlpha + kMatrices +
+              "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue shadowFade ",
           "023"),
     ORDER(QexSkinningTextureNoAlphaShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha,
           kAlpha + kBatch, "03"),
-    ORDER(QexSkinningGouraudShader, true, kBoneSlots + kLights + kAlpha, kLights + kAlpha + kBatch + kVectors, "03"),
+    ORDER(QexSkinningGouraudShader, true, kBoneSlots + kLights + kAlpha, kLights + kAlpha + kBatch + kVectors,
+          "03"),
     ORDER(QexSkinningGouraudNormalMapShader, true, kBoneSlots + kLights + kAlpha,
           kLights + kAlpha + kBatch + kVectors, "013"),
     ORDER(QexSkinningGouraudSpecularShader, true, kBoneSlots + "cameraPos " + kLights + kSpecular + kAlpha,
           "cameraPos " + kLights + kSpecular + kAlpha + kBatch + kVectors, "03"),
-    ORDER(QexUVDisplacementShader, false, "displacement mvpMatrix " + kAlpha, kAlpha + "displacement mvpMatrix ",
-          "03"),
+    ORDER(QexUVDisplacementShader, false, "displacement mvpMatrix " + kAlpha,
+          kAlpha + "displacement mvpMatrix ", "03"),
     ORDER(QexUVDisplacementNoAlphaShader, false, "displacement mvpMatrix " + kAlpha,
           kAlpha + "displacement mvpMatrix ", "03"),
     ORDER(QexDepthShader, false, "near far mvpMatrix ", "mvpMatrix ", "03"),
-    ORDER(QexSkinningDepthShader, true, "near far boneCount boneMatrixArray viewProjMatrix " + kAlpha, kDepthBatch,
-          "03"),
+    ORDER(QexSkinningDepthShader, true, "near far boneCount boneMatrixArray viewProjMatrix " + kAlpha,
+          kDepthBatch, "03"),
 };
 
 TEST_F(LitTest, SlotsUploadsAndStateOfEveryModule) {
@@ -382,16 +390,17 @@ TEST_F(LitTest, SlotsUploadsAndStateOfEveryModule) {
             EXPECT_EQ(change.find(std::string("texture2D[") + unit) != std::string::npos,
                       order.textures.find(unit) != std::string::npos)
                 << order.slots << unit;
-        EXPECT_EQ(std::count(change.begin(), change.end(), '\n'),
-                  static_cast<long>(1 + order.textures.size() + (change.find("activeUnit") != std::string::npos)))
+        EXPECT_EQ(
+            std::count(change.begin(), change.end(), '\n'),
+            static_cast<long>(1 + order.textures.size() + (change.find("activeUnit") != std::string::npos)))
             << change;
 
         const Allocations allocations = CountAllocations(draw);
         EXPECT_TRUE(allocations.made == 0 || !kAllocationsAreCounted);
         const GLCalls calls(draw);
-        for (const gltapCall* call : calls.Of({"glUniform1f", "glUniform1i", "glUniform3f", "glUniform1iv", "glUniform2fv",
-                                              "glUniform3fv", "glUniform4fv", "glUniformMatrix3fv",
-                                              "glUniformMatrix4fv"}))
+        for (const gltapCall* call :
+             calls.Of({"glUniform1f", "glUniform1i", "glUniform3f", "glUniform1iv", "glUniform2fv",
+                       "glUniform3fv", "glUniform4fv", "glUniformMatrix3fv", "glUniformMatrix4fv"}))
             uploads.push_back(call->argument[0].i);
         EXPECT_EQ(Names(module->program, uploads), order.uploads);
         EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 1u);
@@ -408,7 +417,8 @@ TEST_F(LitTest, DepthAndShiftedTextures) {
     const glm::mat4 flat = glm::ortho(0.0f, float{kWidth}, 0.0f, float{kHeight}, -1.0f, 1.0f);
     for (const bool skinned : {false, true}) {
         LoadedModel model(TriangleScene(skinned));
-        QexShaderModule* module = skinned ? QexSkinningDepthShader_CreateProgram() : QexDepthShader_CreateProgram();
+        QexShaderModule* module =
+            skinned ? QexSkinningDepthShader_CreateProgram() : QexDepthShader_CreateProgram();
         QexRenderState_UseProgram(module->program);
         (skinned ? QexSkinningDepthShader_SetParameters : QexDepthShader_SetParameters)(module, 0.1f, 0.9f);
         for (const auto& [z, grey] : {std::pair{0.05f, 0}, {1.0f, 255}, {0.4f, 128}, {0.2f, 64}}) {
@@ -433,10 +443,11 @@ TEST_F(LitTest, DepthAndShiftedTextures) {
         void (*get)(const QexShaderModule*, float*, float*);
         void (*release)(QexShaderModule**);
         int alpha;
-    } rows[] = {{QexUVDisplacementShader_CreateProgram(), QexUVDisplacementShader_SetDisplacement,
-                 QexUVDisplacementShader_GetDisplacement, QexUVDisplacementShader_Release, 255},
-                {QexUVDisplacementNoAlphaShader_CreateProgram(), QexUVDisplacementNoAlphaShader_SetDisplacement,
-                 QexUVDisplacementNoAlphaShader_GetDisplacement, QexUVDisplacementNoAlphaShader_Release, 0}};
+    } rows[] = {
+        {QexUVDisplacementShader_CreateProgram(), QexUVDisplacementShader_SetDisplacement,
+         QexUVDisplacementShader_GetDisplacement, QexUVDisplacementShader_Release, 255},
+        {QexUVDisplacementNoAlphaShader_CreateProgram(), QexUVDisplacementNoAlphaShader_SetDisplacement,
+         QexUVDisplacementNoAlphaShader_GetDisplacement, QexUVDisplacementNoAlphaShader_Release, 0}};
     for (auto row : rows) {
         row.set(row.module, 0.5f, 0.25f);
         model.DrawNode(row.module);
