@@ -13,13 +13,15 @@ target_link_libraries(qex_image PRIVATE qex_warnings)
 
 add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertAnimation.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertBatches.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertCommand.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMaterials.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMeshes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertNodes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertScene.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertSkin.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_include_directories(qex_convert SYSTEM PRIVATE ${ETC1_INCLUDE_DIR})
 target_link_libraries(qex_convert PUBLIC qex_podwriter qex_image assimp::assimp PRIVATE ${ETC1_LIBRARY}
-    qex_warnings)
+    qex_engine qex_warnings)

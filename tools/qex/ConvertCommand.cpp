@@ -3,12 +3,14 @@
 #include <assimp/config.h>
 #include <assimp/postprocess.h>
 #include <assimp/scene.h>
+#include <Qex.h>
 #include <algorithm>
 #include <assimp/Importer.hpp>
 #include <cmath>
 #include <exception>
 #include <filesystem>
 
+#include "ConvertAnimation.h"
 #include "ConvertLog.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
@@ -17,8 +19,6 @@
 namespace fs = std::filesystem;
 
 namespace {
-
-enum ExitStatus { kDone = 0, kBadInput = 1, kBadArgument = 2 };
 
 constexpr double kMaxFps = 1000;
 
@@ -42,6 +42,7 @@ constexpr FileType kFileTypes[] = {
 SceneSettings SettingsFor(const ConvertOptions& options) {
     SceneSettings settings;
     settings.fps = options.fps;
+    settings.maxBones = options.maxBones;
     std::string extension = fs::path(options.input).extension().string();
     for (char& c : extension) {
         if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
@@ -73,8 +74,13 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!(options.fps >= 1 && options.fps <= kMaxFps && options.fps == std::floor(options.fps))) {
         return BadArgument("--fps", "a whole number of frames per second from 1 to 1000 is expected");
     }
+    if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
+        return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
+    }
+    if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
-        return BadArgument(options.output, "no file name; the name of the POD file to write is expected");
+        return BadArgument(options.output.empty() ? "--output" : options.output,
+                           "no file name; the name of the POD file to write is expected");
     }
     if (!fs::is_directory(OutputDirectory(options), ec)) {
         return BadArgument(options.output, "cannot be written; its folder does not exist");
@@ -97,7 +103,9 @@ const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
 void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,
                   const ConvertLog& log) {
     unsigned long vertices = 0, triangles = 0;
+    int batches = 0;
     for (const pod::Mesh& mesh : scene.meshes) {
+        batches += mesh.batchCount;
         vertices += mesh.vertexCount;
         triangles += mesh.faceCount;
     }
@@ -106,6 +114,7 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 scene.meshNodeCount, scene.materials.size());
     std::printf("cameras %zu, lights %zu, frames %u at %u per second, ", scene.cameras.size(),
                 scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
+    if (batches) std::printf("bone batches %d (bind pose at frame 0, animation from frame 1), ", batches);
     std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
                 textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
 }
@@ -127,12 +136,23 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         return kBadInput;
     }
 
+    if (options.listClips) {
+        ListClips(*source);
+        return kDone;
+    }
+    SceneSettings settings = SettingsFor(options);
+    std::string error;
+    if (!options.clip.empty()) {
+        const int clip = FindClip(*source, options.clip, &error);
+        if (clip < 0) return BadArgument("--clip", error);
+        settings.clip = clip;
+    }
     TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
     pod::Scene scene;
-    std::string error;
-    if (!ConvertScene(*source, SettingsFor(options), &textures, &log, &scene, &error)) {
+    const ExitStatus status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
+    if (status != kDone) {
         log.Error(error);
-        return kBadInput;
+        return status;
     }
     if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
     if (!pod::WriteFile(options.output, pod::WritePod(scene))) {

@@ -68,6 +68,19 @@ void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* t
     CopyVertex(from.colours, vertex, &to->colours);
 }
 
+void CopyBatches(const SkinPiece& piece, pod::Mesh* mesh) {
+    size_t row = 0;
+    for (const auto& bones : piece.batchBones) row = std::max(row, bones.size());
+    for (const auto& bones : piece.batchBones) {
+        mesh->bonesPerBatch.push_back(static_cast<int32_t>(bones.size()));
+        mesh->batchBones.insert(mesh->batchBones.end(), bones.begin(), bones.end());
+        mesh->batchBones.resize(row * mesh->bonesPerBatch.size());
+    }
+    mesh->batchOffsets = piece.batchOffsets;
+    mesh->batchBoneMax = static_cast<int32_t>(row);
+    mesh->batchCount = static_cast<int32_t>(piece.batchBones.size());
+}
+
 }  // namespace
 
 std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertices) {
@@ -103,6 +116,32 @@ std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& conten
     if (arrays.indices.empty()) return out;
     for (const pod::MeshArrays& piece : SplitMesh(std::move(arrays), kMaxMeshVertices)) {
         out.push_back(pod::BuildMesh(piece));
+    }
+    return out;
+}
+
+std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent& content,
+                                          const std::vector<VertexBones>& bones, int maxBones,
+                                          std::string* error) {
+    std::vector<pod::Mesh> out;
+    const pod::MeshArrays whole = CopyMesh(mesh, content);
+    const int needed = MostBonesOfATriangle(bones, whole.indices);
+    if (needed > maxBones) {
+        *error = "a triangle of mesh '" + std::string(mesh.mName.C_Str()) + "' follows " +
+                 std::to_string(needed) + " bones; --max-bones " + std::to_string(needed) +
+                 " or more is expected";
+        return out;
+    }
+    for (const SkinPiece& piece : BatchSkin(bones, whole.indices, maxBones, kMaxMeshVertices)) {
+        pod::MeshArrays arrays;
+        for (const uint32_t source : piece.sources) {
+            CopyVertex(whole, source, &arrays);
+            arrays.boneWeights.push_back(bones[source].weights);
+        }
+        arrays.boneIndices = piece.boneIndices;
+        arrays.indices = piece.indices;
+        out.push_back(pod::BuildMesh(arrays));
+        CopyBatches(piece, &out.back());
     }
     return out;
 }
