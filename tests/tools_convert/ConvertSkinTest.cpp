@@ -283,13 +283,13 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
     const std::string models = "/usr/share/assimp/models/";
     const struct {
         const char *file, *clip;
-        size_t triangles;
+        size_t triangles, nodes;
         float size;  // of the scene, about
-    } rows[] = {{"X/Testwuson.X", "Wuson_Walk", 3732, 3},
-                {"X/Testwuson.X", "0", 3732, 3},
-                {"X/BCN_Epileptic.X", "", 5126, 2},
-                {"FBX/animation_with_skeleton.fbx", "", 2112, 7000},
-                {"glTF2/simple_skin/simple_skin.gltf", "", 8, 2}};
+    } rows[] = {{"X/Testwuson.X", "Wuson_Walk", 3732, 39, 3},
+                {"X/Testwuson.X", "0", 3732, 39, 3},
+                {"X/BCN_Epileptic.X", "", 5126, 57, 2},
+                {"FBX/animation_with_skeleton.fbx", "", 2112, 20, 7000},
+                {"glTF2/simple_skin/simple_skin.gltf", "", 8, 3, 2}};
     for (const auto& row : rows) {
         const std::string file = models + row.file;
         if (!std::filesystem::exists(file)) GTEST_SKIP() << file << " is not installed";
@@ -305,6 +305,7 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
         ASSERT_EQ(Run(options), 0) << said_;
         Pod pod(Path("out.pod"));
         ASSERT_GT(pod->frameCount, 20u);
+        EXPECT_EQ(pod->nodeCount, row.nodes) << file;  // the bones are nodes of the file
         std::set<float> seen;
         for (const uint32_t frame : {1u, 2u, 9u, pod->frameCount / 2, pod->frameCount - 2}) {
             const auto expected = SkinAt(*scene, clip, (frame - 1) / 30.0);
@@ -312,6 +313,41 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
             seen.insert(expected.rbegin()->second.position.x + expected.begin()->second.position.y);
         }
         EXPECT_GE(seen.size(), 2u) << file << " does not move";
+    }
+}
+
+// Two triangles with an edge in common, which follow two bones; six vertices in the file.
+TEST_F(ConvertSkin, JoinsVerticesThatFollowTheSameBones) {
+    const float vertices[6][3] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}};
+    for (const uint8_t joint : {1, 0}) {
+        float matrices[2][16] = {}, weights[6][4] = {};
+        uint8_t joints[6][4] = {};
+        for (int b = 0; b < 2; ++b)
+            for (int i = 0; i < 4; ++i) matrices[b][5 * i] = 1;
+        for (int v = 0; v < 6; ++v) weights[v][0] = 1;
+        for (int v = 3; v < 6; ++v) joints[v][0] = joint;
+        Bytes bin;
+        const auto append = [&bin](const void* data, size_t size) {
+            const auto* bytes = static_cast<const uint8_t*>(data);
+            bin.insert(bin.end(), bytes, bytes + size);
+        };
+        append(vertices, sizeof vertices);
+        append(matrices, sizeof matrices);
+        append(weights, sizeof weights);
+        append(joints, sizeof joints);
+        WriteBytes(Path("s.bin"), bin);
+        WriteText(Path("s.gltf"), R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0,1,2]}],
+ "nodes":[{"mesh":0,"skin":0},{"name":"j0"},{"name":"j1"}],"skins":[{"joints":[1,2],"inverseBindMatrices":1}],
+ "meshes":[{"primitives":[{"attributes":{"POSITION":0,"WEIGHTS_0":2,"JOINTS_0":3}}]}],
+ "accessors":[{"bufferView":0,"componentType":5126,"count":6,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
+  {"bufferView":0,"byteOffset":72,"componentType":5126,"count":2,"type":"MAT4"},
+  {"bufferView":0,"byteOffset":200,"componentType":5126,"count":6,"type":"VEC4"},
+  {"bufferView":0,"byteOffset":296,"componentType":5121,"count":6,"type":"VEC4"}],
+ "bufferViews":[{"buffer":0,"byteLength":320}],"buffers":[{"byteLength":320,"uri":"s.bin"}]})");
+        const PodBlock mesh = Convert(Path("s.gltf"))[2012];
+        EXPECT_EQ(mesh[6000].U32(), joint ? 6u : 4u);
+        EXPECT_EQ(mesh[6001].U32(), 2u);
+        EXPECT_EQ(mesh[6016].U32(), joint ? 2u : 1u);
     }
 }
 

@@ -6,7 +6,7 @@
 #include <vector>
 
 // The bones that a vertex follows, by their number in the scene, largest weight first. The weights add up to
-// 255; the bone of a weight of 0 counts for nothing.
+// 255; the bone of a weight of 0 is 0 and counts for nothing.
 struct VertexBones {
     std::array<uint32_t, 4> bones{};
     std::array<uint8_t, 4> weights{};

@@ -94,10 +94,16 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
 const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
     // Degenerate triangles are told by their shape: an area limit would drop small models whole.
     importer->SetPropertyBool(AI_CONFIG_PP_FD_CHECKAREA, false);
-    return importer->ReadFile(
-        path, aiProcess_Triangulate | aiProcess_JoinIdenticalVertices | aiProcess_GenSmoothNormals |
-                  aiProcess_CalcTangentSpace | aiProcess_SortByPType | aiProcess_FindDegenerates |
-                  aiProcess_GenUVCoords | aiProcess_TransformUVCoords | aiProcess_ImproveCacheLocality);
+    const aiScene* scene = importer->ReadFile(path, aiProcess_Triangulate | aiProcess_GenSmoothNormals |
+                                                        aiProcess_CalcTangentSpace | aiProcess_SortByPType |
+                                                        aiProcess_FindDegenerates | aiProcess_GenUVCoords |
+                                                        aiProcess_TransformUVCoords);
+    // Its joining of vertices does not look at the bones that they follow.
+    if (!scene || std::any_of(scene->mMeshes, scene->mMeshes + scene->mNumMeshes,
+                              [](const aiMesh* mesh) { return mesh->HasBones(); })) {
+        return scene;
+    }
+    return importer->ApplyPostProcessing(aiProcess_JoinIdenticalVertices | aiProcess_ImproveCacheLocality);
 }
 
 void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,

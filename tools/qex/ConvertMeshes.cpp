@@ -3,6 +3,7 @@
 #include <assimp/mesh.h>
 #include <algorithm>
 #include <cmath>
+#include <unordered_map>
 
 namespace {
 
@@ -68,6 +69,37 @@ void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* t
     CopyVertex(from.colours, vertex, &to->colours);
 }
 
+template <class T>
+void AppendBytes(const std::vector<T>& array, uint32_t vertex, std::string* bytes) {
+    if (!array.empty()) bytes->append(reinterpret_cast<const char*>(&array[vertex]), sizeof(T));
+}
+
+// Makes vertices that are the same in everything, also in their bones where there are any, one, and drops
+// those that no triangle uses.
+void JoinVertices(pod::MeshArrays* mesh, std::vector<VertexBones>* bones) {
+    pod::MeshArrays joined;
+    std::vector<VertexBones> joinedBones;
+    std::unordered_map<std::string, uint32_t> known;
+    std::string bytes;
+    for (const uint32_t vertex : mesh->indices) {
+        bytes.clear();
+        AppendBytes(mesh->positions, vertex, &bytes);
+        AppendBytes(mesh->normals, vertex, &bytes);
+        AppendBytes(mesh->tangents, vertex, &bytes);
+        AppendBytes(mesh->binormals, vertex, &bytes);
+        AppendBytes(mesh->uvs, vertex, &bytes);
+        AppendBytes(mesh->colours, vertex, &bytes);
+        AppendBytes(*bones, vertex, &bytes);
+        const auto [entry, isNew] = known.emplace(bytes, static_cast<uint32_t>(known.size()));
+        joined.indices.push_back(entry->second);
+        if (!isNew) continue;
+        CopyVertex(*mesh, vertex, &joined);
+        CopyVertex(*bones, vertex, &joinedBones);
+    }
+    *mesh = std::move(joined);
+    *bones = std::move(joinedBones);
+}
+
 void CopyBatches(const SkinPiece& piece, pod::Mesh* mesh) {
     size_t row = 0;
     for (const auto& bones : piece.batchBones) row = std::max(row, bones.size());
@@ -112,8 +144,10 @@ std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertice
 
 std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& content) {
     std::vector<pod::Mesh> out;
+    std::vector<VertexBones> noBones;
     pod::MeshArrays arrays = CopyMesh(mesh, content);
     if (arrays.indices.empty()) return out;
+    JoinVertices(&arrays, &noBones);
     for (const pod::MeshArrays& piece : SplitMesh(std::move(arrays), kMaxMeshVertices)) {
         out.push_back(pod::BuildMesh(piece));
     }
@@ -121,10 +155,10 @@ std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& conten
 }
 
 std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent& content,
-                                          const std::vector<VertexBones>& bones, int maxBones,
-                                          std::string* error) {
+                                          std::vector<VertexBones> bones, int maxBones, std::string* error) {
     std::vector<pod::Mesh> out;
-    const pod::MeshArrays whole = CopyMesh(mesh, content);
+    pod::MeshArrays whole = CopyMesh(mesh, content);
+    JoinVertices(&whole, &bones);
     const int needed = MostBonesOfATriangle(bones, whole.indices);
     if (needed > maxBones) {
         *error = "a triangle of mesh '" + std::string(mesh.mName.C_Str()) + "' follows " +

@@ -28,5 +28,4 @@ std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& conten
 // numbers the batches hold the scene's bones. Empty, with the reason in `error`, when a triangle follows more
 // bones.
 std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent& content,
-                                          const std::vector<VertexBones>& bones, int maxBones,
-                                          std::string* error);
+                                          std::vector<VertexBones> bones, int maxBones, std::string* error);

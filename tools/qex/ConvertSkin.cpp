@@ -189,6 +189,9 @@ VertexBones SkinSet::ToBytes(std::vector<Influence>* influences) {
         ++out.weights[most];
         lost[most] = -1;
     }
+    for (size_t i = 0; i < 4; ++i) {
+        if (out.weights[i] == 0) out.bones[i] = 0;
+    }
     return out;
 }
 
