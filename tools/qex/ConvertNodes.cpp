@@ -122,7 +122,7 @@ class NodeBuilder {
 
     void Build() {
         AddLightAndCameraRecords();
-        if (source_.mRootNode) Visit(*source_.mRootNode, -1, aiMatrix4x4());
+        if (source_.mRootNode) Visit(*source_.mRootNode, {-1, aiMatrix4x4()});
         AddOrphans();
         Finish();
     }
@@ -178,6 +178,12 @@ class NodeBuilder {
         const auto found = channels_.find(node.mName.C_Str());
         return found == channels_.end() ? nullptr : found->second;
     }
+
+    // A node that others hang on.
+    struct Parent {
+        int draft;
+        aiMatrix4x4 first;  // node to world at frame 0
+    };
 
     // How a node moves.
     struct Motion {
@@ -248,7 +254,7 @@ class NodeBuilder {
         return BuildTransform(aiMatrix4x4(), nullptr, frames_, extras);
     }
 
-    void Visit(const aiNode& node, int parent, const aiMatrix4x4& parentFirst) {
+    void Visit(const aiNode& node, const Parent& parent) {
         const std::vector<MeshPart> parts = PartsOf(node);
         const std::vector<Attachment*> attached = AttachmentsOf(node);
         const bool isBone = bonesOf_.count(&node) != 0;
@@ -256,20 +262,23 @@ class NodeBuilder {
             TransformExtras extras;
             extras.attachment = &attached[0]->pose;
             Place(attached[0], attached[0]->name,
-                  BuildTransform(node.mTransformation, ChannelOf(node), frames_, extras), parent);
+                  BuildTransform(node.mTransformation, ChannelOf(node), frames_, extras), parent.draft);
             return;
         }
-        const Motion motion = MotionOf(node, parentFirst);
+        const Motion motion = MotionOf(node, parent.first);
         const bool isNeeded = isBone || !attached.empty() || node.mNumChildren > 0;
-        const int self = AddCarrier(node, motion, parts, parent, isNeeded);
+        const int self = AddCarrier(node, motion, parts, parent.draft, isNeeded);
         if (isBone) AddBones(node, motion.first, self);
         for (Attachment* a : attached) {
             const char* suffix = a->kind == kLightNode ? "_light" : "_camera";
             Place(a, a->name + suffix, Fixed(a->pose), self);
         }
-        // Some importers leave holes in the list of children.
+        visited_.insert({&node, {self, motion.first}});
         for (unsigned i = 0; i < node.mNumChildren; ++i) {
-            if (node.mChildren[i]) Visit(*node.mChildren[i], self, motion.first);
+            // Some importers leave holes in the list of children, or list all bones as children of one node.
+            if (!node.mChildren[i]) continue;
+            const auto known = visited_.find(node.mChildren[i]->mParent);
+            Visit(*node.mChildren[i], known == visited_.end() ? visited_.at(&node) : known->second);
         }
     }
 
@@ -365,6 +374,7 @@ class NodeBuilder {
     ConvertLog* log_;
     pod::Scene* out_;
     std::map<const aiNode*, std::vector<size_t>> bonesOf_;
+    std::map<const aiNode*, Parent> visited_;
     std::map<std::string, const aiNodeAnim*> channels_;
     std::vector<Attachment> attachments_;
     std::vector<Draft> drafts_;
