@@ -74,6 +74,16 @@ void AppendBytes(const std::vector<T>& array, uint32_t vertex, std::string* byte
     if (!array.empty()) bytes->append(reinterpret_cast<const char*>(&array[vertex]), sizeof(T));
 }
 
+// Rounded: in some files the normals at one corner differ by a little.
+void AppendDirection(const std::vector<pod::Vec3>& array, uint32_t vertex, std::string* bytes) {
+    constexpr float kSteps = 8192;
+    if (array.empty()) return;
+    for (const float value : array[vertex]) {
+        const float rounded = std::round(value * kSteps) + 0.0f;  // no negative zero
+        bytes->append(reinterpret_cast<const char*>(&rounded), sizeof rounded);
+    }
+}
+
 // Makes vertices that are the same in everything, also in their bones where there are any, one, and drops
 // those that no triangle uses.
 void JoinVertices(pod::MeshArrays* mesh, std::vector<VertexBones>* bones) {
@@ -84,9 +94,9 @@ void JoinVertices(pod::MeshArrays* mesh, std::vector<VertexBones>* bones) {
     for (const uint32_t vertex : mesh->indices) {
         bytes.clear();
         AppendBytes(mesh->positions, vertex, &bytes);
-        AppendBytes(mesh->normals, vertex, &bytes);
-        AppendBytes(mesh->tangents, vertex, &bytes);
-        AppendBytes(mesh->binormals, vertex, &bytes);
+        AppendDirection(mesh->normals, vertex, &bytes);
+        AppendDirection(mesh->tangents, vertex, &bytes);
+        AppendDirection(mesh->binormals, vertex, &bytes);
         AppendBytes(mesh->uvs, vertex, &bytes);
         AppendBytes(mesh->colours, vertex, &bytes);
         AppendBytes(*bones, vertex, &bytes);
