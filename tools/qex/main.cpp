@@ -103,7 +103,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
 
 void SetUpConvert(CLI::App* app, ConvertOptions* options) {
     app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
-    app->add_option("-o,--output", options->output, "POD scene; its textures are written beside it");
+    app->add_option("-o,--output", options->output,
+                    "POD scene, needed unless clips are listed; its textures are written beside it");
     app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
         ->check(CLI::Range(1.0, 1000.0));
     app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
