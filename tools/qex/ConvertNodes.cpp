@@ -189,6 +189,7 @@ class NodeBuilder {
     struct Motion {
         pod::Transform transform;
         aiMatrix4x4 first;  // node to world at frame 0
+        bool holdsBind;     // it has the bind pose of the first bone that it is
     };
 
     Motion MotionOf(const aiNode& node, const aiMatrix4x4& parentFirst) const {
@@ -205,7 +206,8 @@ class NodeBuilder {
         }
         const aiMatrix4x4 first =
             extras.lead ? Compose(bind) : FirstMatrix(node.mTransformation, channel, frames_);
-        return {BuildTransform(node.mTransformation, channel, frames_, extras), parentFirst * first};
+        return {BuildTransform(node.mTransformation, channel, frames_, extras), parentFirst * first,
+                extras.lead != nullptr};
     }
 
     std::vector<MeshPart> PartsOf(const aiNode& node) const {
@@ -268,7 +270,7 @@ class NodeBuilder {
         const Motion motion = MotionOf(node, parent.first);
         const bool isNeeded = isBone || !attached.empty() || node.mNumChildren > 0;
         const int self = AddCarrier(node, motion, parts, parent.draft, isNeeded);
-        if (isBone) AddBones(node, motion.first, self);
+        if (isBone) AddBones(node, motion, self);
         for (Attachment* a : attached) {
             const char* suffix = a->kind == kLightNode ? "_light" : "_camera";
             Place(a, a->name + suffix, Fixed(a->pose), self);
@@ -311,26 +313,28 @@ class NodeBuilder {
     }
 
     // Finds a draft for each bone that the node is: itself, or one below it.
-    void AddBones(const aiNode& node, const aiMatrix4x4& first, int self) {
+    void AddBones(const aiNode& node, const Motion& motion, int self) {
         int helpers = 0;
-        for (const size_t bone : bonesOf_.at(&node)) {
-            const aiMatrix4x4& bind = skins_.Bones()[bone].bind;
-            boneDrafts_[bone] = self;
-            if (IsSamePlace(first, bind)) continue;
-            if (!IsInvertible(first)) {
+        for (const size_t index : bonesOf_.at(&node)) {
+            const SkinBone& bone = skins_.Bones()[index];
+            boneDrafts_[index] = self;
+            const bool isHeld = motion.holdsBind && index == bonesOf_.at(&node)[0];
+            if (isHeld || IsSamePlace(motion.first, bone.bind, bone.reach)) continue;
+            if (!IsInvertible(motion.first)) {
                 log_->Warn(std::string("bone ") + node.mName.C_Str() +
                            " has no size at frame 0; what follows it is out of place");
                 continue;
             }
-            aiMatrix4x4 toNode = first;
+            aiMatrix4x4 toNode = motion.first;
             toNode.Inverse();
-            const pod::Transform transform = {{}, {}, {}, {ToMat4(toNode * bind), ToMat4(aiMatrix4x4())}};
+            const pod::Transform transform = {
+                {}, {}, {}, {ToMat4(toNode * bone.bind), ToMat4(aiMatrix4x4())}};
             const std::string suffix = ++helpers == 1 ? "_bone" : "_bone_" + std::to_string(helpers);
             pod::Node helper = pod::BuildNode(node.mName.C_Str() + suffix, transform);
             // The first matrix at frame 0, the second one, 16 floats on, at all others.
             helper.matrixIndex.assign(frames_.count, 16);
             helper.matrixIndex[0] = 0;
-            boneDrafts_[bone] = AddDraft(kOtherNode, std::move(helper), self);
+            boneDrafts_[index] = AddDraft(kOtherNode, std::move(helper), self);
         }
     }
 

@@ -38,15 +38,12 @@ struct SkinSet::Source {
     const aiNode* node;
 };
 
-bool IsSamePlace(const aiMatrix4x4& a, const aiMatrix4x4& b) {
-    const struct { unsigned firstColumn, endColumn; } parts[] = {{0, 3}, {3, 4}};  // axes, position
-    for (const auto& part : parts) {
-        const float size = std::max(LargestEntry(a, part.firstColumn, part.endColumn),
-                                    LargestEntry(b, part.firstColumn, part.endColumn));
-        for (unsigned r = 0; r < 3; ++r) {
-            for (unsigned c = part.firstColumn; c < part.endColumn; ++c) {
-                if (!(std::fabs(a[r][c] - b[r][c]) <= 1e-5f * size)) return false;
-            }
+bool IsSamePlace(const aiMatrix4x4& a, const aiMatrix4x4& b, float reach) {
+    const float axes = std::max(LargestEntry(a, 0, 3), LargestEntry(b, 0, 3));
+    const float position = std::max({reach, LargestEntry(a, 3, 4), LargestEntry(b, 3, 4)});
+    for (unsigned r = 0; r < 3; ++r) {
+        for (unsigned c = 0; c < 4; ++c) {
+            if (!(std::fabs(a[r][c] - b[r][c]) <= 1e-5f * (c < 3 ? axes : position))) return false;
         }
     }
     return true;
@@ -57,8 +54,8 @@ bool IsInvertible(const aiMatrix4x4& m) {
     return determinant != 0 && std::isfinite(determinant) && std::isfinite(1 / determinant);
 }
 
-SkinSet::SkinSet(const aiScene& scene, ConvertLog* log) : scene_(scene), skins_(scene.mNumMeshes) {
-    if (scene.mRootNode) FindHolders(*scene.mRootNode);
+SkinSet::SkinSet(const aiScene& scene, ConvertLog* log) : skins_(scene.mNumMeshes) {
+    if (scene.mRootNode) ListNodes(*scene.mRootNode);
     for (unsigned i = 0; i < scene.mNumMeshes; ++i) {
         const aiMesh& mesh = *scene.mMeshes[i];
         // A mesh that several nodes draw follows its bones to one and the same place.
@@ -67,14 +64,15 @@ SkinSet::SkinSet(const aiScene& scene, ConvertLog* log) : scene_(scene), skins_(
     WarnAboutLosses(log);
 }
 
-void SkinSet::FindHolders(const aiNode& node) {
+void SkinSet::ListNodes(const aiNode& node) {
+    nodes_.emplace(node.mName.C_Str(), &node);
     for (unsigned i = 0; i < node.mNumMeshes; ++i) {
         if (node.mMeshes[i] >= skins_.size()) continue;
         const aiNode*& holder = skins_[node.mMeshes[i]].holder;
         if (!holder) holder = &node;
     }
     for (unsigned i = 0; i < node.mNumChildren; ++i) {
-        if (node.mChildren[i]) FindHolders(*node.mChildren[i]);
+        if (node.mChildren[i]) ListNodes(*node.mChildren[i]);
     }
 }
 
@@ -83,9 +81,9 @@ void SkinSet::AddMesh(const aiMesh& mesh, MeshSkin* skin) {
     for (unsigned i = 0; i < mesh.mNumBones; ++i) {
         const aiBone* bone = mesh.mBones[i];
         if (bone->mNumWeights == 0) continue;
-        const aiNode* node = scene_.mRootNode->FindNode(bone->mName);
-        if (node && IsInvertible(bone->mOffsetMatrix)) {
-            sources.push_back({bone, node});
+        const auto node = nodes_.find(bone->mName.C_Str());
+        if (node != nodes_.end() && IsInvertible(bone->mOffsetMatrix)) {
+            sources.push_back({bone, node->second});
         } else {
             ++losses_.bones;
         }
@@ -93,10 +91,14 @@ void SkinSet::AddMesh(const aiMesh& mesh, MeshSkin* skin) {
     if (sources.empty()) return;
 
     skin->place = FindPlace(sources);
+    float reach = 0;
+    for (unsigned v = 0; v < mesh.mNumVertices; ++v) {
+        reach = std::max(reach, (skin->place * mesh.mVertices[v]).Length());
+    }
     std::vector<std::vector<Influence>> influences(mesh.mNumVertices);
     for (const Source& source : sources) {
         aiMatrix4x4 toMesh = source.bone->mOffsetMatrix;
-        const uint32_t bone = AddBone(source.node, skin->place * toMesh.Inverse());
+        const uint32_t bone = AddBone(source.node, skin->place * toMesh.Inverse(), reach);
         for (unsigned k = 0; k < source.bone->mNumWeights; ++k) {
             const aiVertexWeight& w = source.bone->mWeights[k];
             if (w.mVertexId < mesh.mNumVertices && w.mWeight > 0 && std::isfinite(w.mWeight)) {
@@ -110,7 +112,7 @@ void SkinSet::AddMesh(const aiMesh& mesh, MeshSkin* skin) {
     for (auto& list : influences) {
         if (list.empty()) {
             ++losses_.loose;
-            list.push_back({AddBone(skin->holder, skin->place), 1});
+            list.push_back({AddBone(skin->holder, skin->place, reach), 1});
         }
         skin->vertices.push_back(ToBytes(&list));
     }
@@ -145,11 +147,12 @@ const SkinBone* SkinSet::BoneOf(const aiNode* node) const {
     return nullptr;
 }
 
-uint32_t SkinSet::AddBone(const aiNode* node, const aiMatrix4x4& bind) {
+uint32_t SkinSet::AddBone(const aiNode* node, const aiMatrix4x4& bind, float reach) {
     for (size_t i = 0; i < bones_.size(); ++i) {
-        if (bones_[i].node == node && IsSamePlace(bones_[i].bind, bind)) return static_cast<uint32_t>(i);
+        if (bones_[i].node == node && IsSamePlace(bones_[i].bind, bind, reach))
+            return static_cast<uint32_t>(i);
     }
-    bones_.push_back({node, bind});
+    bones_.push_back({node, bind, reach});
     return static_cast<uint32_t>(bones_.size()) - 1;
 }
 

@@ -2,6 +2,8 @@
 #pragma once
 
 #include <assimp/matrix4x4.h>
+#include <map>
+#include <string>
 #include <vector>
 
 #include "ConvertBatches.h"
@@ -15,6 +17,7 @@ struct aiScene;
 struct SkinBone {
     const aiNode* node;
     aiMatrix4x4 bind;  // node to world
+    float reach;       // of the mesh, from the origin
 };
 
 struct MeshSkin {
@@ -23,8 +26,8 @@ struct MeshSkin {
     std::vector<VertexBones> vertices;  // empty for a mesh that follows no bones
 };
 
-// Whether two placements are the same, but for rounding.
-bool IsSamePlace(const aiMatrix4x4& a, const aiMatrix4x4& b);
+// Whether two placements are the same, but for rounding. `reach` is how far from the origin things are.
+bool IsSamePlace(const aiMatrix4x4& a, const aiMatrix4x4& b, float reach);
 
 bool IsInvertible(const aiMatrix4x4& m);
 
@@ -49,15 +52,15 @@ class SkinSet {
         unsigned bones = 0, weights = 0, crowded = 0, loose = 0;
     };
 
-    void FindHolders(const aiNode& node);
+    void ListNodes(const aiNode& node);
     void AddMesh(const aiMesh& mesh, MeshSkin* skin);
     aiMatrix4x4 FindPlace(const std::vector<Source>& sources) const;
     const SkinBone* BoneOf(const aiNode* node) const;
-    uint32_t AddBone(const aiNode* node, const aiMatrix4x4& bind);
+    uint32_t AddBone(const aiNode* node, const aiMatrix4x4& bind, float reach);
     VertexBones ToBytes(std::vector<Influence>* influences);
     void WarnAboutLosses(ConvertLog* log) const;
 
-    const aiScene& scene_;
+    std::map<std::string, const aiNode*> nodes_;
     std::vector<MeshSkin> skins_;
     std::vector<SkinBone> bones_;
     Losses losses_;
