@@ -11,6 +11,7 @@
 #include <filesystem>
 
 #include "ConvertAnimation.h"
+#include "ConvertGltf.h"
 #include "ConvertLog.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
@@ -120,7 +121,8 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 scene.meshNodeCount, scene.materials.size());
     std::printf("cameras %zu, lights %zu, frames %u at %u per second, ", scene.cameras.size(),
                 scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
-    if (batches) std::printf("bone batches %d (bind pose at frame 0, animation from frame 1), ", batches);
+    if (batches) std::printf("bone batches %d, ", batches);
+    if (batches && scene.frameCount) std::printf("bind pose at frame 0, animation from frame 1, ");
     std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
                 textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
 }
@@ -130,6 +132,11 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
     std::error_code ec;
     if (!fs::is_regular_file(options.input, ec)) {
         log.Error("cannot be read; an existing scene file is expected");
+        return kBadInput;
+    }
+    std::string error;
+    if (!CheckGltf(options.input, &error)) {
+        log.Error(error);
         return kBadInput;
     }
     Assimp::Importer importer;
@@ -147,7 +154,6 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         return kDone;
     }
     SceneSettings settings = SettingsFor(options);
-    std::string error;
     if (!options.clip.empty()) {
         const int clip = FindClip(*source, options.clip, &error);
         if (clip < 0) return BadArgument("--clip", error);
