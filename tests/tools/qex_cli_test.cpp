@@ -8,6 +8,7 @@ using QexCli = QexCommandTest;
 
 TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
     WriteScene(Path("a.pod"), QuadScene());
+    WriteText(Path("tri.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
     const std::string pod = Path("a.pod"), png = Path("a.png");
     const struct {
         std::vector<std::string> arguments;
@@ -33,6 +34,8 @@ TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
         {{"sheet", png}, "--output"},
         {{"convert", "a.obj"}, "--output"},
         {{"convert", "a.obj", "-o", "b.pod", "--texture-format", "dxt"}, "etc1,rgba8888,rgb888"},
+        {{"convert", "a.obj", "-o", "b.pod", "--max-bones", "17"}, "--max-bones"},
+        {{"convert", Path("tri.obj"), "-o", Path("b.pod"), "--clip", "walk"}, "'walk'; the scene has none"},
     };
     for (const auto& c : cases) ExpectRefused(c.arguments, 2, c.part);
     EXPECT_FALSE(std::filesystem::exists(png));

@@ -198,6 +198,8 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
     WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
     WriteText(Path("points.obj"), "v 0 0 0\nv 1 0 0\np 1 2\n");
     WriteText(Path("broken.gltf"), "{\"asset\":");
+    WriteText(Path("skin.gltf"), R"({"skins":[{"inverseBindMatrices":0},{"joints":[1]}]})");
+    WriteText(Path("skin.glb"), std::string("glTF\2\0\0\0\x20\0\0\0\x0e\0\0\0JSON{\"skins\":[{}]}", 34));
     WriteText(Path("notes.txt"), "no scene");
     const std::string good = Path("q.obj"), out = Path("out.pod");
     const struct {
@@ -215,6 +217,8 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
         {good, good, "etc1", 30, 2, "is the input"},
         {Path("none.obj"), out, "etc1", 30, 1, "existing scene file is expected"},
         {Path("broken.gltf"), out, "etc1", 30, 1, "cannot be read as a scene"},
+        {Path("skin.gltf"), out, "etc1", 30, 1, "skin 1 has no inverse bind matrices"},
+        {Path("skin.glb"), out, "etc1", 30, 1, "skin 0 has no inverse bind matrices"},
         {Path("notes.txt"), out, "etc1", 30, 1, "cannot be read as a scene"},
         {Path("points.obj"), out, "etc1", 30, 1, "holds no triangles"},
     };

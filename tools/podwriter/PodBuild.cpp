@@ -84,7 +84,10 @@ Mesh BuildMesh(const MeshArrays& a, bool wideIndices) {
     stride = Place(&mesh.binormals, a.binormals, kFloat32, stride);
     stride = Place(uv, a.uvs, kFloat32, stride);
     stride = Place(&mesh.colours, a.colours, kUint8Norm, stride);
-    for (Element* e : {&mesh.vertices, &mesh.normals, &mesh.tangents, &mesh.binormals, uv, &mesh.colours}) {
+    stride = Place(&mesh.boneIndices, a.boneIndices, kUint8, stride);
+    stride = Place(&mesh.boneWeights, a.boneWeights, kUint8Norm, stride);
+    for (Element* e : {&mesh.vertices, &mesh.normals, &mesh.tangents, &mesh.binormals, uv, &mesh.colours,
+                       &mesh.boneIndices, &mesh.boneWeights}) {
         e->stride = e->components ? stride : 0;
     }
 
@@ -95,6 +98,8 @@ Mesh BuildMesh(const MeshArrays& a, bool wideIndices) {
     Fill(&mesh, mesh.binormals, a.binormals);
     Fill(&mesh, *uv, a.uvs);
     Fill(&mesh, mesh.colours, a.colours);
+    Fill(&mesh, mesh.boneIndices, a.boneIndices);
+    Fill(&mesh, mesh.boneWeights, a.boneWeights);
     return mesh;
 }
 

@@ -14,12 +14,13 @@ using Mat4 = std::array<float, 16>;  // column-major, translation in elements 12
 struct MeshArrays {
     std::vector<Vec3> positions, normals, tangents, binormals;
     std::vector<Vec2> uvs;
-    std::vector<std::array<uint8_t, 4>> colours;  // red, green, blue, alpha
+    std::vector<std::array<uint8_t, 4>> colours;                   // red, green, blue, alpha
+    std::vector<std::array<uint8_t, 4>> boneIndices, boneWeights;  // within the batch; shares of 255
     std::vector<uint32_t> indices;
 };
 
-// A mesh of interleaved elements in the order position, normal, tangent, binormal, uv, colour. Indices
-// take 16 bits unless `wideIndices`; the vertex count must fit them.
+// A mesh of interleaved elements in the order position, normal, tangent, binormal, uv, colour, bone
+// indices, bone weights. Indices take 16 bits unless `wideIndices`; the vertex count must fit them.
 Mesh BuildMesh(const MeshArrays& arrays, bool wideIndices = false);
 
 // Element over `count` values stored by themselves (not interleaved), `components` to a vertex.

@@ -1,5 +1,6 @@
 # The pictures and the converter of the qex command, as static libraries.
 find_package(assimp REQUIRED)
+find_package(nlohmann_json REQUIRED)
 find_path(ETC1_INCLUDE_DIR ETC1/etc1.h PATH_SUFFIXES android REQUIRED)
 find_library(ETC1_LIBRARY ETC1 PATH_SUFFIXES android REQUIRED)
 find_path(STB_INCLUDE_DIR stb/stb_image.h REQUIRED)
@@ -13,13 +14,16 @@ target_link_libraries(qex_image PRIVATE qex_warnings)
 
 add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertAnimation.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertBatches.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertCommand.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertGltf.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMaterials.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMeshes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertNodes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertScene.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertSkin.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_include_directories(qex_convert SYSTEM PRIVATE ${ETC1_INCLUDE_DIR})
 target_link_libraries(qex_convert PUBLIC qex_podwriter qex_image assimp::assimp PRIVATE ${ETC1_LIBRARY}
-    qex_warnings)
+    nlohmann_json::nlohmann_json qex_engine qex_warnings)

@@ -1,7 +1,9 @@
 #include "ConvertAnimation.h"
 
+#include <assimp/scene.h>
 #include <algorithm>
 #include <cmath>
+#include <cstdio>
 
 namespace {
 
@@ -61,8 +63,28 @@ pod::Vec3 ToVec3(const aiVector3D& v, float otherwise) {
     return {Finite(v.x, otherwise), Finite(v.y, otherwise), Finite(v.z, otherwise)};
 }
 
-aiMatrix4x4 Compose(const Pose& pose) {
-    return aiMatrix4x4(pose.scale, pose.rotation, pose.position);
+double TicksPerSecond(const aiAnimation& animation) {
+    return animation.mTicksPerSecond > 0 ? animation.mTicksPerSecond : kDefaultTicksPerSecond;
+}
+
+// In ticks; a key behind the end that the file gives counts too.
+double Duration(const aiAnimation& animation) {
+    double duration = std::max(animation.mDuration, 0.0);
+    for (unsigned i = 0; i < animation.mNumChannels; ++i) {
+        const aiNodeAnim& c = *animation.mChannels[i];
+        duration = std::max({duration, LastTime(c.mPositionKeys, c.mNumPositionKeys),
+                             LastTime(c.mRotationKeys, c.mNumRotationKeys),
+                             LastTime(c.mScalingKeys, c.mNumScalingKeys)});
+    }
+    return duration;
+}
+
+// Names come from files: nothing in them breaks a line.
+std::string OnOneLine(std::string text) {
+    for (char& c : text) {
+        if (static_cast<unsigned char>(c) < 32) c = '?';
+    }
+    return text;
 }
 
 // The attachment is a camera or a light: where it stands and faces counts, a scale does not.
@@ -108,6 +130,10 @@ void AddKey(const Pose& pose, pod::Transform* transform) {
 
 }  // namespace
 
+aiMatrix4x4 Compose(const Pose& pose) {
+    return aiMatrix4x4(pose.scale, pose.rotation, pose.position);
+}
+
 bool DecomposeMatrix(const aiMatrix4x4& m, Pose* pose) {
     pose->position = {m.a4, m.b4, m.c4};
     aiVector3D axis[3];
@@ -146,21 +172,16 @@ pod::Mat4 ToMat4(const aiMatrix4x4& m) {
 }
 
 double FrameTimes::Ticks(uint32_t frame) const {
-    return std::min(frame / fps * ticksPerSecond, duration);
+    const uint32_t inClip = frame > lead ? frame - lead : 0;
+    return std::min(inClip / fps * ticksPerSecond, duration);
 }
 
 FrameTimes PlanFrames(const aiAnimation& animation, double fps, bool* truncated) {
     FrameTimes frames;
+    frames.clip = &animation;
     frames.fps = fps;
-    frames.ticksPerSecond =
-        animation.mTicksPerSecond > 0 ? animation.mTicksPerSecond : kDefaultTicksPerSecond;
-    frames.duration = std::max(animation.mDuration, 0.0);
-    for (unsigned i = 0; i < animation.mNumChannels; ++i) {
-        const aiNodeAnim& c = *animation.mChannels[i];
-        frames.duration = std::max({frames.duration, LastTime(c.mPositionKeys, c.mNumPositionKeys),
-                                    LastTime(c.mRotationKeys, c.mNumRotationKeys),
-                                    LastTime(c.mScalingKeys, c.mNumScalingKeys)});
-    }
+    frames.ticksPerSecond = TicksPerSecond(animation);
+    frames.duration = Duration(animation);
     const double exact = frames.duration / frames.ticksPerSecond * fps;
     // The allowance keeps 2.0000001 frames of rounding from becoming a third one.
     const double steps = std::ceil(exact - 1e-3);
@@ -181,22 +202,56 @@ Pose SampleChannel(const aiNodeAnim& c, double ticks, const Pose& rest) {
     return pose;
 }
 
+aiMatrix4x4 FirstMatrix(const aiMatrix4x4& local, const aiNodeAnim* channel, const FrameTimes& frames) {
+    Pose rest;
+    const bool isPose = DecomposeMatrix(local, &rest);
+    if (!channel || frames.count == 0 || (isPose && frames.lead > 0)) return local;
+    return Compose(SampleChannel(*channel, frames.Ticks(0), rest));
+}
+
 pod::Transform BuildTransform(const aiMatrix4x4& local, const aiNodeAnim* channel, const FrameTimes& frames,
-                              const Pose* attachment) {
+                              const TransformExtras& extras) {
     pod::Transform transform;
+    const Pose* attachment = extras.attachment;
     Pose rest;
     const bool isPose = DecomposeMatrix(local, &rest);
     if (!isPose && (!channel || frames.count == 0)) {
         transform.matrices.push_back(ToMat4(attachment ? local * Compose(*attachment) : local));
         return transform;
     }
-    const uint32_t count = channel ? std::max(frames.count, 1u) : 1;
+    const Pose* lead = extras.lead ? extras.lead : isPose ? &rest : nullptr;
+    const uint32_t count = channel || extras.lead ? std::max(frames.count, 1u) : 1;
     for (uint32_t f = 0; f < count; ++f) {
-        const Pose pose = channel ? SampleChannel(*channel, frames.Ticks(f), rest) : rest;
+        const Pose pose = f < frames.lead && lead ? *lead
+                          : channel               ? SampleChannel(*channel, frames.Ticks(f), rest)
+                                                  : rest;
         AddKey(attachment ? Attach(pose, *attachment) : pose, &transform);
     }
     DropRepeats(&transform.positions);
     DropRepeats(&transform.rotations);
     DropRepeats(&transform.scales);
     return transform;
+}
+
+void ListClips(const aiScene& scene) {
+    for (unsigned i = 0; i < scene.mNumAnimations; ++i) {
+        const aiAnimation& clip = *scene.mAnimations[i];
+        std::printf("%u\t%s\t%.3f\t%u\n", i, OnOneLine(clip.mName.C_Str()).c_str(),
+                    Duration(clip) / TicksPerSecond(clip), clip.mNumChannels);
+    }
+}
+
+int FindClip(const aiScene& scene, const std::string& wanted, std::string* error) {
+    std::string names;
+    for (unsigned i = 0; i < scene.mNumAnimations; ++i) {
+        const std::string name = scene.mAnimations[i]->mName.C_Str();
+        if (name == wanted) return static_cast<int>(i);
+        names += (i ? ", " : "") + std::to_string(i) + (name.empty() ? "" : " " + OnOneLine(name));
+    }
+    for (unsigned i = 0; i < scene.mNumAnimations; ++i) {
+        if (wanted == std::to_string(i)) return static_cast<int>(i);
+    }
+    *error = "no animation '" + OnOneLine(wanted) + "'; " +
+             (names.empty() ? "the scene has none" : "expected one of: " + names);
+    return -1;
 }

@@ -3,12 +3,15 @@
 #include <assimp/config.h>
 #include <assimp/postprocess.h>
 #include <assimp/scene.h>
+#include <Qex.h>
 #include <algorithm>
 #include <assimp/Importer.hpp>
 #include <cmath>
 #include <exception>
 #include <filesystem>
 
+#include "ConvertAnimation.h"
+#include "ConvertGltf.h"
 #include "ConvertLog.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
@@ -17,8 +20,6 @@
 namespace fs = std::filesystem;
 
 namespace {
-
-enum ExitStatus { kDone = 0, kBadInput = 1, kBadArgument = 2 };
 
 constexpr double kMaxFps = 1000;
 
@@ -42,6 +43,7 @@ constexpr FileType kFileTypes[] = {
 SceneSettings SettingsFor(const ConvertOptions& options) {
     SceneSettings settings;
     settings.fps = options.fps;
+    settings.maxBones = options.maxBones;
     std::string extension = fs::path(options.input).extension().string();
     for (char& c : extension) {
         if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
@@ -73,8 +75,13 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!(options.fps >= 1 && options.fps <= kMaxFps && options.fps == std::floor(options.fps))) {
         return BadArgument("--fps", "a whole number of frames per second from 1 to 1000 is expected");
     }
+    if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
+        return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
+    }
+    if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
-        return BadArgument(options.output, "no file name; the name of the POD file to write is expected");
+        return BadArgument(options.output.empty() ? "--output" : options.output,
+                           "no file name; the name of the POD file to write is expected");
     }
     if (!fs::is_directory(OutputDirectory(options), ec)) {
         return BadArgument(options.output, "cannot be written; its folder does not exist");
@@ -88,16 +95,24 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
 const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
     // Degenerate triangles are told by their shape: an area limit would drop small models whole.
     importer->SetPropertyBool(AI_CONFIG_PP_FD_CHECKAREA, false);
-    return importer->ReadFile(
-        path, aiProcess_Triangulate | aiProcess_JoinIdenticalVertices | aiProcess_GenSmoothNormals |
-                  aiProcess_CalcTangentSpace | aiProcess_SortByPType | aiProcess_FindDegenerates |
-                  aiProcess_GenUVCoords | aiProcess_TransformUVCoords | aiProcess_ImproveCacheLocality);
+    const aiScene* scene = importer->ReadFile(path, aiProcess_Triangulate | aiProcess_GenSmoothNormals |
+                                                        aiProcess_CalcTangentSpace | aiProcess_SortByPType |
+                                                        aiProcess_FindDegenerates | aiProcess_GenUVCoords |
+                                                        aiProcess_TransformUVCoords);
+    // Its joining of vertices does not look at the bones that they follow.
+    if (!scene || std::any_of(scene->mMeshes, scene->mMeshes + scene->mNumMeshes,
+                              [](const aiMesh* mesh) { return mesh->HasBones(); })) {
+        return scene;
+    }
+    return importer->ApplyPostProcessing(aiProcess_JoinIdenticalVertices | aiProcess_ImproveCacheLocality);
 }
 
 void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,
                   const ConvertLog& log) {
     unsigned long vertices = 0, triangles = 0;
+    int batches = 0;
     for (const pod::Mesh& mesh : scene.meshes) {
+        batches += mesh.batchCount;
         vertices += mesh.vertexCount;
         triangles += mesh.faceCount;
     }
@@ -106,6 +121,8 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 scene.meshNodeCount, scene.materials.size());
     std::printf("cameras %zu, lights %zu, frames %u at %u per second, ", scene.cameras.size(),
                 scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
+    if (batches) std::printf("bone batches %d, ", batches);
+    if (batches && scene.frameCount) std::printf("bind pose at frame 0, animation from frame 1, ");
     std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
                 textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
 }
@@ -115,6 +132,11 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
     std::error_code ec;
     if (!fs::is_regular_file(options.input, ec)) {
         log.Error("cannot be read; an existing scene file is expected");
+        return kBadInput;
+    }
+    std::string error;
+    if (!CheckGltf(options.input, &error)) {
+        log.Error(error);
         return kBadInput;
     }
     Assimp::Importer importer;
@@ -127,12 +149,22 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         return kBadInput;
     }
 
+    if (options.listClips) {
+        ListClips(*source);
+        return kDone;
+    }
+    SceneSettings settings = SettingsFor(options);
+    if (!options.clip.empty()) {
+        const int clip = FindClip(*source, options.clip, &error);
+        if (clip < 0) return BadArgument("--clip", error);
+        settings.clip = clip;
+    }
     TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
     pod::Scene scene;
-    std::string error;
-    if (!ConvertScene(*source, SettingsFor(options), &textures, &log, &scene, &error)) {
+    const ExitStatus status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
+    if (status != kDone) {
         log.Error(error);
-        return kBadInput;
+        return status;
     }
     if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
     if (!pod::WriteFile(options.output, pod::WritePod(scene))) {

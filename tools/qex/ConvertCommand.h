@@ -8,6 +8,9 @@ struct ConvertOptions {
     std::string output;
     std::string textureFormat = "etc1";  // etc1, rgba8888 or rgb888
     double fps = 30;                     // whole frames per second of the sampled animation
+    int maxBones = 16;                   // in a bone batch of a skinned mesh, 1 to 16
+    std::string clip;                    // name or index of the animation; the first when empty
+    bool listClips = false;              // print the animations and convert nothing
     bool quiet = false;                  // no summary; warnings and errors still show
 };
 

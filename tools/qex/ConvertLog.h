@@ -1,8 +1,11 @@
-// What a conversion has to say: warnings on standard error as they arise, counted for the summary.
+// What a conversion has to say: warnings on standard error as they arise, counted for the summary; and
+// how it ends.
 #pragma once
 
 #include <cstdio>
 #include <string>
+
+enum ExitStatus { kDone = 0, kBadInput = 1, kBadArgument = 2 };
 
 class ConvertLog {
   public:

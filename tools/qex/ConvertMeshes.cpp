@@ -3,6 +3,7 @@
 #include <assimp/mesh.h>
 #include <algorithm>
 #include <cmath>
+#include <unordered_map>
 
 namespace {
 
@@ -68,6 +69,60 @@ void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* t
     CopyVertex(from.colours, vertex, &to->colours);
 }
 
+template <class T>
+void AppendBytes(const std::vector<T>& array, uint32_t vertex, std::string* bytes) {
+    if (!array.empty()) bytes->append(reinterpret_cast<const char*>(&array[vertex]), sizeof(T));
+}
+
+// Rounded: in some files the normals at one corner differ by a little.
+void AppendDirection(const std::vector<pod::Vec3>& array, uint32_t vertex, std::string* bytes) {
+    constexpr float kSteps = 8192;
+    if (array.empty()) return;
+    for (const float value : array[vertex]) {
+        const float rounded = std::round(value * kSteps) + 0.0f;  // no negative zero
+        bytes->append(reinterpret_cast<const char*>(&rounded), sizeof rounded);
+    }
+}
+
+// Makes vertices that are the same in everything, also in their bones where there are any, one, and drops
+// those that no triangle uses.
+void JoinVertices(pod::MeshArrays* mesh, std::vector<VertexBones>* bones) {
+    pod::MeshArrays joined;
+    std::vector<VertexBones> joinedBones;
+    std::unordered_map<std::string, uint32_t> known;
+    std::string bytes;
+    for (const uint32_t vertex : mesh->indices) {
+        bytes.clear();
+        AppendBytes(mesh->positions, vertex, &bytes);
+        AppendDirection(mesh->normals, vertex, &bytes);
+        AppendDirection(mesh->tangents, vertex, &bytes);
+        AppendDirection(mesh->binormals, vertex, &bytes);
+        AppendBytes(mesh->uvs, vertex, &bytes);
+        AppendBytes(mesh->colours, vertex, &bytes);
+        AppendBytes(*bones, vertex, &bytes);
+        const auto [entry, isNew] = known.emplace(bytes, static_cast<uint32_t>(known.size()));
+        joined.indices.push_back(entry->second);
+        if (!isNew) continue;
+        CopyVertex(*mesh, vertex, &joined);
+        CopyVertex(*bones, vertex, &joinedBones);
+    }
+    *mesh = std::move(joined);
+    *bones = std::move(joinedBones);
+}
+
+void CopyBatches(const SkinPiece& piece, pod::Mesh* mesh) {
+    size_t row = 0;
+    for (const auto& bones : piece.batchBones) row = std::max(row, bones.size());
+    for (const auto& bones : piece.batchBones) {
+        mesh->bonesPerBatch.push_back(static_cast<int32_t>(bones.size()));
+        mesh->batchBones.insert(mesh->batchBones.end(), bones.begin(), bones.end());
+        mesh->batchBones.resize(row * mesh->bonesPerBatch.size());
+    }
+    mesh->batchOffsets = piece.batchOffsets;
+    mesh->batchBoneMax = static_cast<int32_t>(row);
+    mesh->batchCount = static_cast<int32_t>(piece.batchBones.size());
+}
+
 }  // namespace
 
 std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertices) {
@@ -99,10 +154,38 @@ std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertice
 
 std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& content) {
     std::vector<pod::Mesh> out;
+    std::vector<VertexBones> noBones;
     pod::MeshArrays arrays = CopyMesh(mesh, content);
     if (arrays.indices.empty()) return out;
+    JoinVertices(&arrays, &noBones);
     for (const pod::MeshArrays& piece : SplitMesh(std::move(arrays), kMaxMeshVertices)) {
         out.push_back(pod::BuildMesh(piece));
+    }
+    return out;
+}
+
+std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent& content,
+                                          std::vector<VertexBones> bones, int maxBones, std::string* error) {
+    std::vector<pod::Mesh> out;
+    pod::MeshArrays whole = CopyMesh(mesh, content);
+    JoinVertices(&whole, &bones);
+    const int needed = MostBonesOfATriangle(bones, whole.indices);
+    if (needed > maxBones) {
+        *error = "a triangle of mesh '" + std::string(mesh.mName.C_Str()) + "' follows " +
+                 std::to_string(needed) + " bones; --max-bones " + std::to_string(needed) +
+                 " or more is expected";
+        return out;
+    }
+    for (const SkinPiece& piece : BatchSkin(bones, whole.indices, maxBones, kMaxMeshVertices)) {
+        pod::MeshArrays arrays;
+        for (const uint32_t source : piece.sources) {
+            CopyVertex(whole, source, &arrays);
+            arrays.boneWeights.push_back(bones[source].weights);
+        }
+        arrays.boneIndices = piece.boneIndices;
+        arrays.indices = piece.indices;
+        out.push_back(pod::BuildMesh(arrays));
+        CopyBatches(piece, &out.back());
     }
     return out;
 }

@@ -1,8 +1,10 @@
 // Meshes of a converted scene: triangles only, interleaved vertices, 16-bit indices.
 #pragma once
 
+#include <string>
 #include <vector>
 
+#include "ConvertBatches.h"
 #include "PodBuild.h"
 
 struct aiMesh;
@@ -21,3 +23,9 @@ std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertice
 
 // The triangles of an assimp mesh, in one piece or several. Values that are not finite become 0.
 std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& content);
+
+// The same for a mesh that follows bones, in batches of at most `maxBones`. Until the nodes have their
+// numbers the batches hold the scene's bones. Empty, with the reason in `error`, when a triangle follows more
+// bones.
+std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent& content,
+                                          std::vector<VertexBones> bones, int maxBones, std::string* error);

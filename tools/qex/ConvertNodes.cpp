@@ -103,18 +103,26 @@ pod::Light ConvertLight(const aiLight& source) {
 class NodeBuilder {
   public:
     NodeBuilder(const aiScene& source, const std::vector<std::vector<MeshPart>>& meshParts,
-                const FrameTimes& frames, const CameraQuirks& quirks, pod::Scene* out)
-        : source_(source), meshParts_(meshParts), frames_(frames), quirks_(quirks), out_(out) {
-        if (source.mNumAnimations == 0) return;
-        const aiAnimation& animation = *source.mAnimations[0];
-        for (unsigned i = 0; i < animation.mNumChannels; ++i) {
-            channels_.emplace(animation.mChannels[i]->mNodeName.C_Str(), animation.mChannels[i]);
+                const SkinSet& skins, const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log,
+                pod::Scene* out)
+        : source_(source),
+          meshParts_(meshParts),
+          skins_(skins),
+          frames_(frames),
+          quirks_(quirks),
+          log_(log),
+          out_(out),
+          boneDrafts_(skins.Bones().size(), -1) {
+        for (size_t i = 0; i < skins.Bones().size(); ++i) bonesOf_[skins.Bones()[i].node].push_back(i);
+        for (unsigned i = 0; frames.clip && i < frames.clip->mNumChannels; ++i) {
+            const aiNodeAnim* channel = frames.clip->mChannels[i];
+            channels_.emplace(channel->mNodeName.C_Str(), channel);
         }
     }
 
-    void Build(ConvertLog* log) {
-        AddLightAndCameraRecords(log);
-        if (source_.mRootNode) Visit(*source_.mRootNode, -1);
+    void Build() {
+        AddLightAndCameraRecords();
+        if (source_.mRootNode) Visit(*source_.mRootNode, {-1, aiMatrix4x4()});
         AddOrphans();
         Finish();
     }
@@ -130,7 +138,7 @@ class NodeBuilder {
         pod::Camera camera;
     };
 
-    void AddLightAndCameraRecords(ConvertLog* log) {
+    void AddLightAndCameraRecords() {
         for (unsigned i = 0; i < source_.mNumLights; ++i) {
             const aiLight& light = *source_.mLights[i];
             if (light.mType == aiLightSource_AMBIENT) {
@@ -140,7 +148,7 @@ class NodeBuilder {
                 continue;
             }
             if (light.mType == aiLightSource_AREA) {
-                log->Warn(std::string("area light ") + light.mName.C_Str() + " becomes a point light");
+                log_->Warn(std::string("area light ") + light.mName.C_Str() + " becomes a point light");
             }
             const aiNode* node = source_.mRootNode->FindNode(light.mName);
             attachments_.push_back(
@@ -150,12 +158,12 @@ class NodeBuilder {
             const aiCamera& camera = *source_.mCameras[i];
             const aiNode* node = source_.mRootNode->FindNode(camera.mName);
             if (quirks_.directionIsLost) {
-                log->Warn(std::string("the importer does not tell where camera ") + camera.mName.C_Str() +
-                          " looks; check it");
+                log_->Warn(std::string("the importer does not tell where camera ") + camera.mName.C_Str() +
+                           " looks; check it");
             }
             if (camera.mOrthographicWidth > 0) {
-                log->Warn(std::string("orthographic camera ") + camera.mName.C_Str() +
-                          " becomes perspective");
+                log_->Warn(std::string("orthographic camera ") + camera.mName.C_Str() +
+                           " becomes perspective");
             }
             attachments_.push_back({kCameraNode,
                                     camera.mName.C_Str(),
@@ -171,17 +179,47 @@ class NodeBuilder {
         return found == channels_.end() ? nullptr : found->second;
     }
 
-    pod::Transform TransformOf(const aiNode& node, const Pose* attachment) const {
-        return BuildTransform(node.mTransformation, ChannelOf(node), frames_, attachment);
+    // A node that others hang on.
+    struct Parent {
+        int draft;
+        aiMatrix4x4 first;  // node to world at frame 0
+    };
+
+    // How a node moves.
+    struct Motion {
+        pod::Transform transform;
+        aiMatrix4x4 first;  // node to world at frame 0
+        bool holdsBind;     // it has the bind pose of the first bone that it is
+    };
+
+    Motion MotionOf(const aiNode& node, const aiMatrix4x4& parentFirst) const {
+        const aiNodeAnim* channel = ChannelOf(node);
+        TransformExtras extras;
+        Pose rest, bind;
+        const auto bones = bonesOf_.find(&node);
+        if (bones != bonesOf_.end() && IsInvertible(parentFirst)) {
+            aiMatrix4x4 fromWorld = parentFirst;
+            fromWorld.Inverse();
+            const aiMatrix4x4 wanted = fromWorld * skins_.Bones()[bones->second[0]].bind;
+            const bool holdsPoses = channel || DecomposeMatrix(node.mTransformation, &rest);
+            if (holdsPoses && DecomposeMatrix(wanted, &bind)) extras.lead = &bind;
+        }
+        const aiMatrix4x4 first =
+            extras.lead ? Compose(bind) : FirstMatrix(node.mTransformation, channel, frames_);
+        return {BuildTransform(node.mTransformation, channel, frames_, extras), parentFirst * first,
+                extras.lead != nullptr};
     }
 
     std::vector<MeshPart> PartsOf(const aiNode& node) const {
         std::vector<MeshPart> parts;
         for (unsigned i = 0; i < node.mNumMeshes; ++i) {
             if (node.mMeshes[i] >= meshParts_.size()) continue;
-            const auto& more = meshParts_[node.mMeshes[i]];
-            parts.insert(parts.end(), more.begin(), more.end());
+            for (const MeshPart& part : meshParts_[node.mMeshes[i]]) {
+                if (!part.skin || part.skin->holder == &node) parts.push_back(part);
+            }
         }
+        // Those that stay with the node come first.
+        std::stable_partition(parts.begin(), parts.end(), [](const MeshPart& part) { return !part.skin; });
         return parts;
     }
 
@@ -212,47 +250,97 @@ class NodeBuilder {
         AddDraft(a->kind, pod::BuildNode(name, transform, -1, object), parent);
     }
 
-    void Visit(const aiNode& node, int parent) {
+    pod::Transform Fixed(const Pose& pose) const {
+        TransformExtras extras;
+        extras.attachment = &pose;
+        return BuildTransform(aiMatrix4x4(), nullptr, frames_, extras);
+    }
+
+    void Visit(const aiNode& node, const Parent& parent) {
         const std::vector<MeshPart> parts = PartsOf(node);
         const std::vector<Attachment*> attached = AttachmentsOf(node);
-        if (parts.empty() && attached.size() == 1 && node.mNumChildren == 0) {
-            Place(attached[0], attached[0]->name, TransformOf(node, &attached[0]->pose), parent);
+        const bool isBone = bonesOf_.count(&node) != 0;
+        if (parts.empty() && attached.size() == 1 && node.mNumChildren == 0 && !isBone) {
+            TransformExtras extras;
+            extras.attachment = &attached[0]->pose;
+            Place(attached[0], attached[0]->name,
+                  BuildTransform(node.mTransformation, ChannelOf(node), frames_, extras), parent.draft);
             return;
         }
-        const int self = AddCarrier(node, parts, parent);
+        const Motion motion = MotionOf(node, parent.first);
+        const bool isNeeded = isBone || !attached.empty() || node.mNumChildren > 0;
+        const int self = AddCarrier(node, motion, parts, parent.draft, isNeeded);
+        if (isBone) AddBones(node, motion, self);
         for (Attachment* a : attached) {
             const char* suffix = a->kind == kLightNode ? "_light" : "_camera";
-            Place(a, a->name + suffix, BuildTransform(aiMatrix4x4(), nullptr, frames_, &a->pose), self);
+            Place(a, a->name + suffix, Fixed(a->pose), self);
         }
-        // Some importers leave holes in the list of children.
+        visited_.insert({&node, {self, motion.first}});
         for (unsigned i = 0; i < node.mNumChildren; ++i) {
-            if (node.mChildren[i]) Visit(*node.mChildren[i], self);
+            // Some importers leave holes in the list of children, or list all bones as children of one node.
+            if (!node.mChildren[i]) continue;
+            const auto known = visited_.find(node.mChildren[i]->mParent);
+            Visit(*node.mChildren[i], known == visited_.end() ? visited_.at(&node) : known->second);
         }
     }
 
-    // The node itself; returns the draft that its children hang on.
-    int AddCarrier(const aiNode& node, const std::vector<MeshPart>& parts, int parent) {
+    // The node itself and its meshes; returns the draft that its children hang on. A node whose meshes are
+    // all skinned carries none of them, and may not be needed.
+    int AddCarrier(const aiNode& node, const Motion& motion, const std::vector<MeshPart>& parts, int parent,
+                   bool isNeeded) {
         const std::string name = node.mName.C_Str();
-        if (parts.empty()) {
+        int carrier = parent;
+        size_t number = 0;
+        if (parts.empty() || (parts[0].skin && isNeeded)) {
             // Importers put a root above everything that does nothing.
             const bool idle = !node.mParent && node.mTransformation == aiMatrix4x4() && !ChannelOf(node);
-            if (idle) return parent;
-            return AddDraft(kOtherNode, pod::BuildNode(name, TransformOf(node, nullptr)), parent);
+            if (!idle || bonesOf_.count(&node)) {
+                carrier = AddDraft(kOtherNode, pod::BuildNode(name, motion.transform), parent);
+                ++number;
+            }
         }
-        const pod::Transform transform = TransformOf(node, nullptr);
-        int first = -1;
-        for (size_t i = 0; i < parts.size(); ++i) {
-            const std::string partName = i == 0 ? name : name + "_" + std::to_string(i + 1);
-            const int draft = AddDraft(
-                kMeshNode, pod::BuildNode(partName, transform, -1, parts[i].mesh, parts[i].material), parent);
-            if (i == 0) first = draft;
+        for (const MeshPart& part : parts) {
+            const std::string partName = number == 0 ? name : name + "_" + std::to_string(number + 1);
+            const pod::Transform transform =
+                part.skin ? BuildTransform(part.skin->place, nullptr, frames_, {}) : motion.transform;
+            const int draft =
+                AddDraft(kMeshNode, pod::BuildNode(partName, transform, -1, part.mesh, part.material),
+                         part.skin ? -1 : parent);
+            if (number == 0 && !part.skin) carrier = draft;
+            ++number;
         }
-        return first;
+        return carrier;
+    }
+
+    // Finds a draft for each bone that the node is: itself, or one below it.
+    void AddBones(const aiNode& node, const Motion& motion, int self) {
+        int helpers = 0;
+        for (const size_t index : bonesOf_.at(&node)) {
+            const SkinBone& bone = skins_.Bones()[index];
+            boneDrafts_[index] = self;
+            const bool isHeld = motion.holdsBind && index == bonesOf_.at(&node)[0];
+            if (isHeld || IsSamePlace(motion.first, bone.bind, bone.reach)) continue;
+            if (!IsInvertible(motion.first)) {
+                log_->Warn(std::string("bone ") + node.mName.C_Str() +
+                           " has no size at frame 0; what follows it is out of place");
+                continue;
+            }
+            aiMatrix4x4 toNode = motion.first;
+            toNode.Inverse();
+            const pod::Transform transform = {
+                {}, {}, {}, {ToMat4(toNode * bone.bind), ToMat4(aiMatrix4x4())}};
+            const std::string suffix = ++helpers == 1 ? "_bone" : "_bone_" + std::to_string(helpers);
+            pod::Node helper = pod::BuildNode(node.mName.C_Str() + suffix, transform);
+            // The first matrix at frame 0, the second one, 16 floats on, at all others.
+            helper.matrixIndex.assign(frames_.count, 16);
+            helper.matrixIndex[0] = 0;
+            boneDrafts_[index] = AddDraft(kOtherNode, std::move(helper), self);
+        }
     }
 
     void AddOrphans() {
         for (Attachment& a : attachments_) {
-            if (!a.placed) Place(&a, a.name, BuildTransform(aiMatrix4x4(), nullptr, frames_, &a.pose), -1);
+            if (!a.placed) Place(&a, a.name, Fixed(a.pose), -1);
         }
     }
 
@@ -271,21 +359,36 @@ class NodeBuilder {
             node = std::move(drafts_[i].node);
             node.parent = drafts_[i].parent < 0 ? -1 : finalIndex[static_cast<size_t>(drafts_[i].parent)];
         }
+        for (pod::Mesh& mesh : out_->meshes) {
+            for (size_t i = 0; i < mesh.batchBones.size(); ++i) {
+                const size_t row = i / static_cast<size_t>(mesh.batchBoneMax);
+                const size_t column = i % static_cast<size_t>(mesh.batchBoneMax);
+                if (column >= static_cast<size_t>(mesh.bonesPerBatch[row])) continue;
+                const int draft = boneDrafts_[static_cast<size_t>(mesh.batchBones[i])];
+                mesh.batchBones[i] = finalIndex[static_cast<size_t>(draft)];
+            }
+        }
     }
 
     const aiScene& source_;
     const std::vector<std::vector<MeshPart>>& meshParts_;
+    const SkinSet& skins_;
     const FrameTimes& frames_;
     CameraQuirks quirks_;
+    ConvertLog* log_;
     pod::Scene* out_;
+    std::map<const aiNode*, std::vector<size_t>> bonesOf_;
+    std::map<const aiNode*, Parent> visited_;
     std::map<std::string, const aiNodeAnim*> channels_;
     std::vector<Attachment> attachments_;
     std::vector<Draft> drafts_;
+    std::vector<int> boneDrafts_;  // the draft that each bone is
 };
 
 }  // namespace
 
 void ConvertNodes(const aiScene& source, const std::vector<std::vector<MeshPart>>& meshParts,
-                  const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log, pod::Scene* out) {
-    NodeBuilder(source, meshParts, frames, quirks, out).Build(log);
+                  const SkinSet& skins, const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log,
+                  pod::Scene* out) {
+    NodeBuilder(source, meshParts, skins, frames, quirks, log, out).Build();
 }

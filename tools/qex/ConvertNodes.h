@@ -5,6 +5,7 @@
 
 #include "ConvertAnimation.h"
 #include "ConvertLog.h"
+#include "ConvertSkin.h"
 
 struct aiScene;
 
@@ -12,6 +13,7 @@ struct aiScene;
 struct MeshPart {
     int mesh;
     int material;
+    const MeshSkin* skin;  // null for one that follows no bones
 };
 
 // What importers get wrong about cameras.
@@ -25,5 +27,11 @@ struct CameraQuirks {
 // then lights, then cameras, then the rest. A POD node carries one thing only, so an imported node with
 // several becomes several: its meshes share its transform and parent, lights and cameras become children.
 // Light nodes shine along their -Z axis. Camera nodes look along -Y with -Z up.
+//
+// Frame 0 is the bind pose of `skins`: bones have it as their first key. Where a node cannot hold it (two
+// meshes want it in two places, or it shears) a bone node of its own hangs below it, which is nothing from
+// frame 1 on. A skinned mesh hangs on no other node. The batches of `out`, which hold the numbers of bones,
+// get those of nodes.
 void ConvertNodes(const aiScene& source, const std::vector<std::vector<MeshPart>>& meshParts,
-                  const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log, pod::Scene* out);
+                  const SkinSet& skins, const FrameTimes& frames, const CameraQuirks& quirks, ConvertLog* log,
+                  pod::Scene* out);

@@ -18,20 +18,19 @@ bool IsTriangles(const aiMesh& mesh) {
     return (mesh.mPrimitiveTypes & aiPrimitiveType_TRIANGLE) != 0;
 }
 
-void WarnAboutWhatIsLost(const aiScene& source, ConvertLog* log) {
-    unsigned loose = 0, skinned = 0, morphed = 0;
+void WarnAboutWhatIsLost(const aiScene& source, const SceneSettings& settings, ConvertLog* log) {
+    unsigned loose = 0, morphed = 0;
     for (unsigned i = 0; i < source.mNumMeshes; ++i) {
         const aiMesh& mesh = *source.mMeshes[i];
         if (!IsTriangles(mesh)) loose += mesh.mNumFaces;
-        skinned += mesh.HasBones();
         morphed += mesh.mNumAnimMeshes > 0;
     }
     if (loose) log->Warn(Plural(loose, "point, line or degenerate triangle") + " dropped");
-    if (skinned) log->Warn(Plural(skinned, "skinned mesh part") + " converted in bind pose, without bones");
     if (morphed) log->Warn(Plural(morphed, "mesh part") + " with morph targets converted without them");
-    if (source.mNumAnimations > 1) {
+    if (source.mNumAnimations > 1 && !settings.clip) {
         log->Warn(std::string("the first of ") + std::to_string(source.mNumAnimations) +
-                  " animations is converted (" + source.mAnimations[0]->mName.C_Str() + ")");
+                  " animations is converted (" + source.mAnimations[0]->mName.C_Str() +
+                  "); --clip chooses another");
     }
 }
 
@@ -70,46 +69,61 @@ class MaterialSet {
     std::map<unsigned, Known> known_;
 };
 
-std::vector<std::vector<MeshPart>> ConvertMeshes(const aiScene& source, MaterialSet* materials,
-                                                 std::vector<pod::Mesh>* out) {
+// A mesh whose bones do not fit leaves the reason in `error`.
+std::vector<std::vector<MeshPart>> ConvertMeshes(const aiScene& source, const SkinSet& skins, int maxBones,
+                                                 MaterialSet* materials, std::vector<pod::Mesh>* out,
+                                                 std::string* error) {
     std::vector<std::vector<MeshPart>> parts(source.mNumMeshes);
     for (unsigned i = 0; i < source.mNumMeshes; ++i) {
         if (!IsTriangles(*source.mMeshes[i])) continue;
         MeshContent content;
         const int material = materials->Add(source.mMeshes[i]->mMaterialIndex, &content);
-        for (pod::Mesh& mesh : ConvertMesh(*source.mMeshes[i], content)) {
-            parts[i].push_back({static_cast<int>(out->size()), material});
+        const MeshSkin* skin = skins.Of(i).vertices.empty() ? nullptr : &skins.Of(i);
+        for (pod::Mesh& mesh :
+             skin ? ConvertSkinnedMesh(*source.mMeshes[i], content, skin->vertices, maxBones, error)
+                  : ConvertMesh(*source.mMeshes[i], content)) {
+            parts[i].push_back({static_cast<int>(out->size()), material, skin});
             out->push_back(std::move(mesh));
         }
     }
     return parts;
 }
 
-FrameTimes PlanSceneFrames(const aiScene& source, double fps, ConvertLog* log) {
-    if (source.mNumAnimations == 0) return {};
+FrameTimes PlanSceneFrames(const aiScene& source, const SceneSettings& settings, bool skinned,
+                           ConvertLog* log) {
+    FrameTimes frames;
     bool truncated = false;
-    const FrameTimes frames = PlanFrames(*source.mAnimations[0], fps, &truncated);
+    if (source.mNumAnimations > 0) {
+        frames = PlanFrames(*source.mAnimations[settings.clip.value_or(0)], settings.fps, &truncated);
+    }
     if (truncated) log->Warn("the animation is cut after " + std::to_string(frames.count) + " frames");
+    if (skinned) {
+        // The bind pose, then the clip: two frames at the least, as the engine never stands at the last one.
+        frames.lead = 1;
+        frames.count = std::max(frames.count, 2u) + frames.lead;
+    }
     return frames;
 }
 
 }  // namespace
 
-bool ConvertScene(const aiScene& source, const SceneSettings& settings, TextureSet* textures, ConvertLog* log,
-                  pod::Scene* out, std::string* error) {
+ExitStatus ConvertScene(const aiScene& source, const SceneSettings& settings, TextureSet* textures,
+                        ConvertLog* log, pod::Scene* out, std::string* error) {
+    const SkinSet skins(source, log);
     MaterialSet materials(source, settings, textures, log, &out->materials);
-    const auto parts = ConvertMeshes(source, &materials, &out->meshes);
+    const auto parts = ConvertMeshes(source, skins, settings.maxBones, &materials, &out->meshes, error);
+    if (!error->empty()) return kBadArgument;
     if (out->meshes.empty()) {
         *error = "holds no triangles; a scene with at least one mesh is expected";
-        return false;
+        return kBadInput;
     }
-    WarnAboutWhatIsLost(source, log);
-    const FrameTimes frames = PlanSceneFrames(source, settings.fps, log);
-    ConvertNodes(source, parts, frames, settings.cameras, log, out);
+    WarnAboutWhatIsLost(source, settings, log);
+    const FrameTimes frames = PlanSceneFrames(source, settings, skins.Any(), log);
+    ConvertNodes(source, parts, skins, frames, settings.cameras, log, out);
     out->textures = textures->Names();
     out->fps = static_cast<uint32_t>(settings.fps);
     const bool animated = std::any_of(out->nodes.begin(), out->nodes.end(),
                                       [](const pod::Node& n) { return n.animationFlags.value_or(0) != 0; });
     out->frameCount = animated ? frames.count : 0;
-    return true;
+    return kDone;
 }

@@ -1,6 +1,8 @@
 // An imported scene as a POD scene: nodes in the file's order, cameras, lights, frames.
 #pragma once
 
+#include <optional>
+
 #include "ConvertNodes.h"
 #include "ConvertTextures.h"
 #include "PodWriter.h"
@@ -9,10 +11,13 @@ struct aiScene;
 
 struct SceneSettings {
     double fps = 30;
+    int maxBones = 16;                   // in a batch
+    std::optional<int> clip;             // index of the animation; the first unless given
     bool textureReplacesColour = false;  // see ConvertMaterial
     CameraQuirks cameras;
 };
 
-// False, with the reason in `error`, when the scene holds no triangle.
-bool ConvertScene(const aiScene& source, const SceneSettings& settings, TextureSet* textures, ConvertLog* log,
-                  pod::Scene* out, std::string* error);
+// With the reason in `error`: kBadInput when the scene holds no triangle, kBadArgument when settings.maxBones
+// is too low for it.
+ExitStatus ConvertScene(const aiScene& source, const SceneSettings& settings, TextureSet* textures,
+                        ConvertLog* log, pod::Scene* out, std::string* error);
