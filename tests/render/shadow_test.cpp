@@ -35,8 +35,8 @@ QexCamera Above() {
 
 // The pixel on which a world point falls.
 glm::ivec2 PixelOf(const QexCamera& camera, glm::vec3 point) {
-    const glm::vec4 clip = glm::make_mat4(camera.projectionMatrix.m) * glm::make_mat4(camera.viewMatrix.m) *
-                           glm::vec4(point, 1);
+    const glm::vec4 clip =
+        glm::make_mat4(camera.projectionMatrix.m) * glm::make_mat4(camera.viewMatrix.m) * glm::vec4(point, 1);
     return {int((clip.x / clip.w + 1) / 2 * kWidth), int((1 - clip.y / clip.w) / 2 * kHeight)};
 }
 
@@ -53,11 +53,11 @@ class ShadowTest : public RenderTest {
     }
     // The floor in white light, its node alone, under the shadow of the nodes listed.
     Picture Floor(LoadedModel& model, QexVec3 direction, std::vector<int32_t> casters) {
-        const QexShadowCaster request = {&model.model, 0, casters.data(), static_cast<uint32_t>(casters.size())};
+        const QexShadowCaster request = {&model.model, 0, casters.data(),
+                                         static_cast<uint32_t>(casters.size())};
         QexLightSet lights = {1, {{1, {direction.x, direction.y, direction.z}, {2, 2, 2, 1}}}};
         QexModel_UpdateModelBoundingBox(&model.model, nullptr);
-        QexShadowInfo* info =
-            QexModel_InitShadowInfo(&camera_, &direction, &request, 1, 0.25f, 0.01f);
+        QexShadowInfo* info = QexModel_InitShadowInfo(&camera_, &direction, &request, 1, 0.25f, 0.01f);
         drawn_ = info->casters[0].nodeCount;
         QexModel_RenderShadow(&runtime_, nullptr, info);
         model.model.bindTextureHook = nullptr;  // which is for the map alone
@@ -67,8 +67,8 @@ class ShadowTest : public RenderTest {
         model.Material().diffuse[0] = model.Material().diffuse[1] = model.Material().diffuse[2] = 1;
         model.Material().ambient[0] = model.Material().ambient[1] = model.Material().ambient[2] = 0;
         model.Node().shader = module_;
-        QexModel_RenderNodeFromViewPerspectiveWithShadow(&model.model, 0, &lights, nullptr, &camera_.viewMatrix,
-                                                         &camera_.projectionMatrix, info);
+        QexModel_RenderNodeFromViewPerspectiveWithShadow(
+            &model.model, 0, &lights, nullptr, &camera_.viewMatrix, &camera_.projectionMatrix, info);
         QexModel_ReleaseShadowInfo(info);
         return Read();
     }
@@ -102,11 +102,13 @@ TEST_F(ShadowTest, FallsWhereTheGeometrySays) {
         ASSERT_EQ(model.log, "");
         const Picture picture = Floor(model, c.direction, {0, 1});
         EXPECT_EQ(drawn_, 2u);
-        const float light = 2 * -c.direction.y / glm::length(glm::vec3(c.direction.x, c.direction.y, c.direction.z));
+        const float light =
+            2 * -c.direction.y / glm::length(glm::vec3(c.direction.x, c.direction.y, c.direction.z));
         const int grey = std::min(255, static_cast<int>(light * 0.25f * 255 + 0.5f));
         for (const float x : {-3.0f, 0.0f, 3.0f})
             for (const float z : {-3.0f, 0.0f, 3.0f}) {
-                EXPECT_TRUE(Near(At(picture, c.centre + glm::vec3(x, 0, z)), {grey, grey, grey, 255}, 2)) << x << z;
+                EXPECT_TRUE(Near(At(picture, c.centre + glm::vec3(x, 0, z)), {grey, grey, grey, 255}, 2))
+                    << x << z;
                 const glm::vec3 outside = c.centre + glm::vec3(x < 0 ? -5 : 5, 0, z);
                 EXPECT_EQ(At(picture, outside), kLit);
             }
@@ -158,7 +160,8 @@ TEST_F(ShadowTest, CallsAndStateOfThePass) {
     const GLCalls calls([&] { QexModel_RenderShadow(&runtime_, nullptr, info); });
     GLint viewport[4];
     glGetIntegerv(GL_VIEWPORT, viewport);
-    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST) && viewport[0] == 0 && viewport[2] == kWidth && viewport[3] == kHeight);
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST) && viewport[0] == 0 && viewport[2] == kWidth &&
+                viewport[3] == kHeight);
     EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 2u);
     EXPECT_EQ(calls.Of({"glUniformMatrix4fv"}).size(), 2u);
     EXPECT_EQ(calls.Of({"glEnableVertexAttribArray"}).size(), 4u);

@@ -230,6 +230,39 @@ TEST_F(QexRender, TexturesAreFoundAsPvrThenKtxThenPicture) {
     EXPECT_EQ(Covered(Load("out.png")), kQuad);
 }
 
+// The quad and the pixels that it covers, after each change.
+TEST_F(QexRender, NodesLightsAndEyes) {
+    pod::Scene scene = QuadScene();
+    pod::MeshArrays arrays = Quad(0, 0, 2, 1);
+    arrays.normals.assign(arrays.positions.size(), {0, 0, 1});
+    scene.meshes = {pod::BuildMesh(arrays)};
+    scene.materials[0].diffuse = {1, 1, 1};
+    scene.materials[0].ambient = {0, 0, 0};
+    const auto drawn = [&](const std::vector<std::string>& more) { return Covered(Picture(scene, more)); };
+    EXPECT_EQ(drawn({"--node", "quad=move:-2,0,0"}), (Box{60, 30, 100, 50}));
+    EXPECT_EQ(drawn({"--node", "quad=move:-2,0,0", "--node", "quad=rotate:0,0,90"}), (Box{40, 10, 60, 50}));
+    EXPECT_EQ(drawn({"--mirror", "0"}), (Box{100, 30, 140, 70}));
+    EXPECT_EQ(drawn({"--mirror", "0", "--shader", "simple"}), (Box{100, 30, 140, 70}));
+    // The lower left vertex lies straight under the light, the others aside.
+    const Image lit = Picture(scene, {"--shader", "gouraud", "--light", "0,0,1,ff8000"});
+    const Rgb near = At(lit, 101, 48), far = At(lit, 138, 31);
+    EXPECT_TRUE(near[0] > 235 && near[2] == 0 && std::abs(near[1] - near[0] / 2) < 3) << near[0];
+    EXPECT_NEAR(far[0], 255 / std::sqrt(6.0), 12);
+    const Image sides = Picture(scene, {"--stereo", "3,0", "--shader", "simple"});
+    EXPECT_GT(Count(sides, {255, 255, 255}), 100u);
+    EXPECT_FALSE(Near(At(sides, 60, 45), kBackground, 1) || Near(At(sides, 160, 45), kBackground, 1));
+
+    WriteScene(Path("scene.pod"), scene);
+    const auto run = [&](const std::vector<std::string>& more) {
+        std::vector<std::string> arguments = {"render",      Path("scene.pod"), "-o",
+                                              Path("p.png"), "--size",          "200x100"};
+        arguments.insert(arguments.end(), more.begin(), more.end());
+        return Run(arguments);
+    };
+    EXPECT_EQ(run({"--pick", "120,40", "--pick", "10,10"}).out, "120,40: quad\n10,10:\n");
+    EXPECT_NE(run({"--node", "quad=hide"}).err.find("warning"), std::string::npos);
+}
+
 TEST_F(QexRender, RealScenesShow) {
     const std::vector<std::string> scenes = RealFiles("scenes", ".pod");
     if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";

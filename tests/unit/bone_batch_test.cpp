@@ -28,10 +28,10 @@ struct Batched {
             uint32_t perVertex = 4)
         : indices(std::move(triangles)) {
         result = QexBoneBatches_Create(&batches, &vertexCount, &block, indices.data(),
-                                       static_cast<uint32_t>(vertices.size()), vertices.data(), sizeof(Vertex),
-                                       offsetof(Vertex, weights), QEX_POD_FLOAT, offsetof(Vertex, bones),
-                                       QEX_POD_UNSIGNED_BYTE, static_cast<uint32_t>(indices.size() / 3),
-                                       maxBones, perVertex);
+                                       static_cast<uint32_t>(vertices.size()), vertices.data(),
+                                       sizeof(Vertex), offsetof(Vertex, weights), QEX_POD_FLOAT,
+                                       offsetof(Vertex, bones), QEX_POD_UNSIGNED_BYTE,
+                                       static_cast<uint32_t>(indices.size() / 3), maxBones, perVertex);
     }
     ~Batched() {
         QexBoneBatches_Release(&batches);
@@ -112,7 +112,8 @@ TEST(BoneBatch, GrowingArrays) {
     for (int i = 0; i < 15; ++i) CStdVectorInt_PushBack(&vector, i);
     EXPECT_EQ(vector.capacity, 16u);
     CStdVectorInt_PushBack(&vector, 15);
-    EXPECT_TRUE(vector.capacity == 80 && CStdVectorInt_Size(&vector) == 16 && CStdVectorInt_At(&vector, 15) == 15);
+    EXPECT_TRUE(vector.capacity == 80 && CStdVectorInt_Size(&vector) == 16 &&
+                CStdVectorInt_At(&vector, 15) == 15);
     CStdVectorInt_Destructor(&vector);
     EXPECT_TRUE(!vector.data && !vector.size && !vector.capacity);
 }
@@ -126,7 +127,8 @@ TEST(BoneBatch, SmallMeshesByHand) {
         EXPECT_EQ(one.indices, (std::vector<uint32_t>{0, 1, 2, 2, 1, 3}));
     }
     // {1} starts a batch, {2} another, {1, 3} widens the first, {4, 2} the second; {3} fits into the first.
-    const Batched grown(Vertices({{1}, {2}, {1, 3}, {4, 2}, {3}}), {0, 0, 0, 1, 1, 1, 2, 0, 0, 3, 1, 1, 4, 4, 4}, 2);
+    const Batched grown(Vertices({{1}, {2}, {1, 3}, {4, 2}, {3}}),
+                        {0, 0, 0, 1, 1, 1, 2, 0, 0, 3, 1, 1, 4, 4, 4}, 2);
     ASSERT_EQ(grown.result, 0);
     ASSERT_EQ(grown.batches.batchCount, 2);
     EXPECT_EQ(grown.Bones(0), (std::vector<int32_t>{1, 3}));
@@ -160,7 +162,8 @@ TEST(BoneBatch, AnyMeshKeepsItsTriangles) {
         std::vector<std::vector<int>> sets;
         for (int v = 0; v < 60; ++v) {
             std::set<int> set;
-            for (uint32_t i = 0; i <= random() % 4; ++i) set.insert(static_cast<int>(random() % unsigned(bones)));
+            for (uint32_t i = 0; i <= random() % 4; ++i)
+                set.insert(static_cast<int>(random() % unsigned(bones)));
             sets.emplace_back(set.begin(), set.end());
         }
         const std::vector<Vertex> vertices = Vertices(sets);
@@ -172,7 +175,8 @@ TEST(BoneBatch, AnyMeshKeepsItsTriangles) {
         for (size_t t = 0; t < 300; t += 3) before.insert({triangles[t], triangles[t + 1], triangles[t + 2]});
         int32_t batch = 0;
         for (size_t t = 0; t < 300; t += 3) {
-            while (batch + 1 < made.batches.batchCount && made.batches.offsets[batch + 1] <= int(t / 3)) ++batch;
+            while (batch + 1 < made.batches.batchCount && made.batches.offsets[batch + 1] <= int(t / 3))
+                ++batch;
             const std::vector<int32_t> table = made.Bones(batch);
             after.insert({made.At(t).number, made.At(t + 1).number, made.At(t + 2).number});
             for (size_t corner = t; corner < t + 3; ++corner) {

@@ -44,7 +44,10 @@ class Renderer {
     bool Start();
     bool Load();
     void Frame();
+    void PlaceCamera(float turned);
     void Draw(double frame, float turned);
+    void DrawScene(const QexCamera& camera);
+    void DrawBothEyes();
     bool Save(const std::string& path);
     void SetFrame(double frame);
     void DrawText();
@@ -64,6 +67,7 @@ class Renderer {
     bool engineStarted_ = false;
     bool modelLoaded_ = false;
     QexCamera camera_ = {};
+    SceneShaders shaders_;
     std::vector<QexVec3> points_;  // that the automatic camera frames
     std::vector<TransparentSPODNodeInfo> transparent_;
     double loadTime_ = 0;
@@ -72,6 +76,7 @@ class Renderer {
 
 Renderer::~Renderer() {
     EngineOutput quiet;
+    shaders_.Release();
     if (modelLoaded_) QexModel_Unload(&model_);
     if (engineStarted_) QexEngine_Shutdown(&engine_);
 }
@@ -135,7 +140,7 @@ void Renderer::SetFrame(double frame) {
     for (uint32_t i = 0; i < scene.nodeCount; ++i) QexPODModel_SetNodeAnimationFrame(&scene, i, f);
 }
 
-// Collects what the automatic camera has to show, over all frames.
+// Collects what the automatic camera has to show, over all frames, with its mirror image.
 void Renderer::Frame() {
     std::vector<double> frames = Frames();
     frames.erase(std::unique(frames.begin(), frames.end()), frames.end());
@@ -144,6 +149,11 @@ void Renderer::Frame() {
         SetFrame(frame);
         for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
             CollectPoints(&model_.scene, i, share, &points_);
+    }
+    if (!options_.effects.mirror) return;
+    for (size_t i = 0, seen = points_.size(); i < seen; ++i) {
+        const QexVec3 p = points_[i];
+        points_.push_back({p.x, 2 * *options_.effects.mirror - p.y, p.z});
     }
 }
 
@@ -154,17 +164,22 @@ void Renderer::DrawText() {
     QexFont_Draw();
 }
 
-void Renderer::Draw(double frame, float turned) {
-    const float aspect = static_cast<float>(options_.width) / static_cast<float>(options_.height);
-    SetFrame(frame);
+// With the eyes side by side each has half the picture.
+void Renderer::PlaceCamera(float turned) {
+    const int width = options_.effects.stereo == 3 ? std::max(options_.width / 2, 1) : options_.width;
+    const float aspect = static_cast<float>(width) / static_cast<float>(options_.height);
     QexCamera_Create(&camera_, 0);
     OrbitView view = ChooseView(points_, options_.view);
     view.yaw += turned;
     if (options_.autoCamera || options_.turn ||
         !UseSceneCamera(&model_, static_cast<uint32_t>(options_.camera), aspect, &camera_))
         FramePoints(points_, view, aspect, &camera_);
-    QexLightSet lights = {};
-    QexModel_GetLight(&model_, &lights);
+}
+
+void Renderer::Draw(double frame, float turned) {
+    SetFrame(frame);
+    PlaceCamera(turned);
+    shaders_.SetCamera(camera_);
     const auto channel = [&](int shift) {
         return static_cast<float>(options_.background >> shift & 0xFF) / 255.0f;
     };
@@ -172,12 +187,45 @@ void Renderer::Draw(double frame, float turned) {
     QexRenderer_SetZWrite(1);
     glClearColor(channel(16), channel(8), channel(0), 1);
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
+    if (options_.effects.stereo)
+        DrawBothEyes();
+    else
+        DrawScene(camera_);
+}
+
+// The eyes are a thirtieth of the way to the target apart.
+void Renderer::DrawBothEyes() {
+    QexVec3 forward, right;
+    QexVec3_Subtract(&forward, &camera_.target, &camera_.eye);
+    QexVec3_CrossProduct(&right, &forward, &camera_.up);
+    QexVec3_Normalize(&right, &right);
+    const float half = sqrtf(QexVec3_DotProduct(&forward, &forward)) / 60;
+    QexRenderer_EnableStereo3D(&engine_, options_.effects.stereo, options_.effects.separation);
+    for (const float side : {-half, half}) {
+        QexCamera eye = camera_;
+        const QexVec3 place = {eye.eye.x + side * right.x, eye.eye.y + side * right.y,
+                               eye.eye.z + side * right.z};
+        QexCamera_LookAt(&eye, &place, &camera_.target, &camera_.up);
+        (side < 0 ? QexRenderer_PrepareLeft : QexRenderer_PrepareRight)(&engine_);
+        DrawScene(eye);
+    }
+    QexRenderer_FinishStereo3D(&engine_);
+}
+
+void Renderer::DrawScene(const QexCamera& camera) {
+    const QexLightSet lights = ChooseLights(&model_, options_.effects, camera);
     QexRenderer_SetZTestFunc(3);
     QexRenderer_SetBackFaceCulling(0);
     QexRenderer_SetAlphaBlendModeSeparate(1, 0);
+    DrawMirrored(&model_, options_.effects, lights, camera);
+    QexRenderer_SetBackFaceCulling(0);
+    if (options_.effects.shadow) {
+        DrawWithShadow(&engine_, &model_, lights, camera);
+        return;
+    }
     uint32_t count = 0;
     for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-        QexModel_RenderWithCameraEx(&model_, &lights, &camera_, nullptr, pass, QEX_RENDER_OPAQUE,
+        QexModel_RenderWithCameraEx(&model_, &lights, &camera, nullptr, pass, QEX_RENDER_OPAQUE,
                                     transparent_.data(), &count);
     // The far sides of transparent bodies first, then the near ones.
     QexRenderer_SetZWrite(0);
@@ -233,6 +281,11 @@ int Renderer::Run() {
         return Fail(options_.input + ": no camera " + std::to_string(options_.camera) + ", the scene has " +
                         std::to_string(model_.scene.cameraCount),
                     2);
+    std::string problem = ChangeNodes(&model_, options_.effects.nodes);
+    if (!options_.effects.mirrorNode.empty() && problem.empty())
+        FindNode(model_, options_.effects.mirrorNode, &problem);
+    if (!problem.empty()) return Fail(options_.input + ": " + problem, 2);
+    shaders_.Use(&model_, options_.effects.shader);
     transparent_.resize(model_.scene.meshNodeCount + size_t{1});
     Frame();
     const std::vector<double> frames = Frames();
@@ -259,6 +312,7 @@ int Renderer::Run() {
             numbered ? WithoutExtension(options_.output) + number + "." + Extension(options_.output)
                      : options_.output;
         if (!Save(path)) return 2;
+        PrintPicked(&engine_, &model_, camera_, options_.effects.picks);
         ReportProgress(i + 1, frames.size());
     }
     if (options_.stats) ReportStats(frames.size());

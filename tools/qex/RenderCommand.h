@@ -5,6 +5,7 @@
 #include <string>
 
 #include "RenderCamera.h"
+#include "RenderEffects.h"
 
 struct RenderOptions {
     std::string input;
@@ -20,6 +21,7 @@ struct RenderOptions {
     OrbitView view;
     uint32_t background = 0x404858;  // RRGGBB
     std::string text;
+    EffectOptions effects;
     bool stats = false;
     bool quiet = false;
 };

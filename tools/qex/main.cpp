@@ -65,6 +65,75 @@ std::string ParseOrbit(const std::string& text, RenderOptions* options) {
     return "";
 }
 
+// Reads "X,Y,Z" as a whole text; false when it is not that.
+bool ParsePoint(const std::string& text, QexVec3* point) {
+    int consumed = 0;
+    return sscanf(text.c_str(), "%f,%f,%f%n", &point->x, &point->y, &point->z, &consumed) == 3 &&
+           static_cast<size_t>(consumed) == text.size();
+}
+
+std::string ParseShader(const std::string& text, RenderOptions* options) {
+    options->effects.shader = text;
+    return IsShaderName(text) ? "" : "'" + text + "' is no shader; expected one of " + ShaderNames();
+}
+
+std::string ParseLight(const std::string& text, RenderOptions* options) {
+    QexLight light = {QEX_LIGHT_POINT, {0, 0, 0}, {1, 1, 1, 1}};
+    float* v = light.vector;
+    unsigned colour = 0xFFFFFF;
+    int consumed = 0;
+    const int count =
+        sscanf(text.c_str(), "%f,%f,%f%n,%6x%n", v, v + 1, v + 2, &consumed, &colour, &consumed);
+    for (int i = 0; i < 3; ++i) light.colour[i] = static_cast<float>(colour >> (16 - 8 * i) & 255) / 255.0f;
+    options->effects.lights.push_back(light);
+    if (count < 3 || static_cast<size_t>(consumed) != text.size() ||
+        options->effects.lights.size() > QEX_MAX_LIGHTS)
+        return "'" + text + "' is no light; expected X,Y,Z or X,Y,Z,RRGGBB, at most 4 of them";
+    return "";
+}
+
+std::string ParseNode(const std::string& text, RenderOptions* options) {
+    const size_t equals = text.rfind('='), colon = text.find(':', equals == std::string::npos ? 0 : equals);
+    NodeChange change = {text.substr(0, equals), "", {0, 0, 0}};
+    if (equals != std::string::npos) change.what = text.substr(equals + 1, colon - equals - 1);
+    const bool hide = change.what == "hide" && colon == std::string::npos;
+    const bool moves = change.what == "move" || change.what == "rotate" || change.what == "face";
+    if (!hide && !(moves && colon != std::string::npos && ParsePoint(text.substr(colon + 1), &change.value)))
+        return "'" + text + "' is no change; expected NAME=hide, NAME=move:X,Y,Z, rotate: (degrees) or face:";
+    options->effects.nodes.push_back(change);
+    return "";
+}
+
+std::string ParsePick(const std::string& text, RenderOptions* options) {
+    QexVec2 point = {0, 0};
+    int consumed = 0;
+    if (sscanf(text.c_str(), "%f,%f%n", &point.x, &point.y, &consumed) != 2 ||
+        static_cast<size_t>(consumed) != text.size())
+        return "'" + text + "' is no point; expected X,Y in pixels from the upper left corner";
+    options->effects.picks.push_back(point);
+    return "";
+}
+
+std::string ParseStereo(const std::string& text, RenderOptions* options) {
+    int consumed = 0;
+    const int count =
+        sscanf(text.c_str(), "%u,%f%n", &options->effects.stereo, &options->effects.separation, &consumed);
+    if (count != 2 || static_cast<size_t>(consumed) != text.size() || options->effects.stereo < 1 ||
+        options->effects.stereo > 3)
+        return "'" + text +
+               "' is no stereo; expected MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels";
+    return "";
+}
+
+std::string ParseMirror(const std::string& text, RenderOptions* options) {
+    float height = 0;
+    int consumed = 0;
+    if (sscanf(text.c_str(), "%f%n", &height, &consumed) != 1 || static_cast<size_t>(consumed) != text.size())
+        return "'" + text + "' is no height; expected a number";
+    options->effects.mirror = height;
+    return "";
+}
+
 // An option whose text goes through one of the parsers above.
 void AddParsed(CLI::App* app, const std::string& name, const std::string& help, RenderOptions* options,
                std::string (*parse)(const std::string&, RenderOptions*)) {
@@ -75,6 +144,23 @@ void AddParsed(CLI::App* app, const std::string& name, const std::string& help, 
             if (!problem.empty()) throw CLI::ValidationError(name, problem);
         },
         help);
+}
+
+// The same for an option that may be given several times.
+void AddRepeated(CLI::App* app, const std::string& name, const std::string& help, RenderOptions* options,
+                 std::string (*parse)(const std::string&, RenderOptions*)) {
+    app->add_option_function<std::vector<std::string>>(
+           name,
+           [=](const std::vector<std::string>& texts) {
+               for (const std::string& text : texts) {
+                   const std::string problem = parse(text, options);
+                   if (!problem.empty()) throw CLI::ValidationError(name, problem);
+               }
+           },
+           help)
+        ->type_size(1)
+        ->expected(1, 1000)
+        ->allow_extra_args(false);
 }
 
 void SetUpRender(CLI::App* app, RenderOptions* options) {
@@ -97,6 +183,17 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
         ->check(CLI::Range(1, 10000));
     AddParsed(app, "--background", "RRGGBB (404858)", options, ParseColour);
     app->add_option("--text", options->text, "line of text on the picture, at most 64 characters");
+    AddParsed(app, "--shader", "module to draw with: " + ShaderNames(), options, ParseShader);
+    AddRepeated(app, "--light", "X,Y,Z[,RRGGBB], a point light instead of the scene's; up to 4", options,
+                ParseLight);
+    app->add_flag("--shadow", options->effects.shadow,
+                  "nodes throw shadows on each other (with --shader shadow)");
+    AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options, ParseMirror);
+    app->add_option("--mirror-node", options->effects.mirrorNode, "flat node that mirrors the others");
+    AddParsed(app, "--stereo", "MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels", options,
+              ParseStereo);
+    AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
+    AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
     app->add_flag("-q,--quiet", options->quiet, "no progress bar");
 }

@@ -1,0 +1,70 @@
+// What qex render can do with a scene beyond drawing it as it is: other shader modules, lights, moved nodes,
+// shadow, mirror, stereo, picking.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Qex.h"
+
+struct NodeChange {
+    std::string node;
+    std::string what;  // hide, move, rotate or face
+    QexVec3 value;     // a place, or degrees
+};
+
+struct EffectOptions {
+    std::string shader;            // a name of ShaderNames, or empty: the engine's choice
+    std::vector<QexLight> lights;  // instead of the scene's own
+    std::vector<NodeChange> nodes;
+    std::vector<QexVec2> picks;  // pixels
+    bool shadow = false;
+    std::optional<float> mirror;  // height of the plane
+    std::string mirrorNode;
+    uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
+    float separation = 0;
+};
+
+// The names of the shader modules, ", " between them.
+std::string ShaderNames();
+bool IsShaderName(const std::string& name);
+
+// The modules that draw a model instead of the engine's choice.
+class SceneShaders {
+  public:
+    SceneShaders() = default;
+    ~SceneShaders() { Release(); }
+    SceneShaders(const SceneShaders&) = delete;
+    SceneShaders& operator=(const SceneShaders&) = delete;
+
+    // Gives them to the nodes, static or skinned to match.
+    void Use(QexModel* model, const std::string& name);
+    // What the modules need to know of the camera.
+    void SetCamera(const QexCamera& camera) const;
+    void Release();
+
+  private:
+    size_t row_ = 0;
+    QexShaderModule* static_ = nullptr;
+    QexShaderModule* skinned_ = nullptr;
+};
+
+// Carries the changes out. Returns a line that says which node there is not, or nothing.
+std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes);
+
+// The index of a node of that name; when there is none it is -1 and `problem` names those that there are.
+int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem);
+
+// The lights of the options, else the scene's own, else one that shines from the camera.
+QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera);
+
+// Draws all nodes, those with shadow-receiving modules under the shadows of the others.
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights, const QexCamera& camera);
+
+// Draws the scene's mirror image in the plane that the options name.
+void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights, const QexCamera& camera);
+
+// Prints the mesh nodes under each point, one line a point.
+void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,
+                 const std::vector<QexVec2>& points);
