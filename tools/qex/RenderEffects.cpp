@@ -97,7 +97,7 @@ void SceneShaders::Use(QexModel* model, const std::string& name) {
 void SceneShaders::SetCamera(const QexCamera& camera) const {
     const ShaderRow& row = kShaders[row_];
     const std::pair<SetParameters, QexShaderModule*> modules[] = {{row.setDepth, static_},
-                                                                 {row.setSkinnedDepth, skinned_}};
+                                                                  {row.setSkinnedDepth, skinned_}};
     for (const auto& [set, module] : modules) {
         if (!set || !module) continue;
         QexRenderState_UseProgram(module->program);
@@ -145,13 +145,15 @@ QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const Qe
     return set;
 }
 
-void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights, const QexCamera& camera) {
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights,
+                    const QexCamera& camera) {
     const QexShadowCaster all = {model, 1, nullptr, 0};
     const QexVec3 direction = ShadowDirection(lights, camera);
     GLfloat clear[4];
     glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
     QexModel_UpdateModelBoundingBox(model, nullptr);
-    QexShadowInfo* info = QexModel_InitShadowInfo(&camera, &direction, &all, 1, kShadowIntensity, kShadowBias);
+    QexShadowInfo* info =
+        QexModel_InitShadowInfo(&camera, &direction, &all, 1, kShadowIntensity, kShadowBias);
     QexModel_RenderShadow(engine, nullptr, info);
     glDisable(GL_SCISSOR_TEST);
     glClearColor(clear[0], clear[1], clear[2], clear[3]);
@@ -161,7 +163,8 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSe
     QexModel_ReleaseShadowInfo(info);
 }
 
-void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights, const QexCamera& camera) {
+void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
+                  const QexCamera& camera) {
     const QexShadowCaster all = {model, 1, nullptr, 0};
     const int32_t node = QexModel_FindNodeIdxByName(model, options.mirrorNode.c_str());
     QexReflection* reflection = nullptr;
@@ -186,7 +189,8 @@ void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& ca
     QexModel_CalcScreenBBox(engine, model, &camera);
     for (const QexVec2& point : points) {
         int32_t count = 0;
-        QexModel_Pick(model, nullptr, &point, &count, hit.data(), static_cast<int32_t>(model->scene.meshNodeCount));
+        QexModel_Pick(model, nullptr, &point, &count, hit.data(),
+                      static_cast<int32_t>(model->scene.meshNodeCount));
         printf("%g,%g:", static_cast<double>(point.x), static_cast<double>(point.y));
         for (int32_t i = 0; i < count; ++i) {
             const char* name = QexModel_GetNodeName(model, hit[static_cast<size_t>(i)]);

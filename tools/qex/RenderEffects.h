@@ -60,10 +60,12 @@ int32_t FindNode(const QexModel& model, const std::string& name, std::string* pr
 QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera);
 
 // Draws all nodes, those with shadow-receiving modules under the shadows of the others.
-void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights, const QexCamera& camera);
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights,
+                    const QexCamera& camera);
 
 // Draws the scene's mirror image in the plane that the options name.
-void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights, const QexCamera& camera);
+void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
+                  const QexCamera& camera);
 
 // Prints the mesh nodes under each point, one line a point.
 void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,
