@@ -1205,6 +1205,8 @@ typedef struct SPVRTPODImpl {
     QexMatrix* bindPose;       /* per node: world matrix at frame 0 */
     uint32_t reserved;
     QexMatrix* inverseBindPose; /* per node: affine inverse of bindPose */
+    QexMatrix* boneMatrices;    /* per node: its matrix as a bone of the mesh node named next */
+    int32_t* boneMeshNodes;     /* per node: index of that mesh node, -1 while the matrix is not valid */
 } SPVRTPODImpl;
 
 /** A scene. */

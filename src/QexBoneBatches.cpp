@@ -1,4 +1,6 @@
 // Bone batching: cuts a skinned mesh into runs of triangles that need few bones each.
+#include "QexBoneBatches.h"
+
 #include <cmath>
 #include <cstring>
 
@@ -14,24 +16,12 @@ constexpr uint32_t kMaxBatches = 512;
 constexpr uint32_t kVectorStep = 64;
 constexpr int32_t kNone = -1;
 
-// Where the weights and bone indices of the caller's vertices lie.
-struct VertexLayout {
-    const uint8_t* data;
-    uint32_t count;
-    uint32_t stride;
-    uint32_t weightOffset;
-    uint32_t weightType;
-    uint32_t indexOffset;
-    uint32_t indexType;
-    int32_t components;
-};
-
 struct Influences {
     float bones[4];
     float weights[4];
 };
 
-Influences ReadInfluences(const VertexLayout& layout, uint32_t vertex) {
+Influences ReadInfluences(const QexBoneVertices& layout, uint32_t vertex) {
     const uint8_t* source = layout.data + uint64_t{vertex} * layout.stride;
     Influences in;
     QexPODVertex_ReadVec(in.weights, source + layout.weightOffset, layout.weightType, layout.components);
@@ -40,7 +30,7 @@ Influences ReadInfluences(const VertexLayout& layout, uint32_t vertex) {
 }
 
 // Collects the bones that a triangle follows; false when there are too many, or one is no node index.
-bool CollectBones(CBatch* bones, const VertexLayout& layout, const uint32_t* triangle) {
+bool CollectBones(CBatch* bones, const QexBoneVertices& layout, const uint32_t* triangle) {
     CBatch_Clear(bones);
     for (int corner = 0; corner < 3; ++corner) {
         const Influences in = ReadInfluences(layout, triangle[corner]);
@@ -110,33 +100,64 @@ struct Work {
     uint32_t copyCount = 0;
 };
 
+// Joins batches that fit into one, those that share most bones first.
+void JoinBatches(BatchList* list) {
+    for (uint32_t i = 0; i < list->count; ++i) {
+        for (;;) {
+            uint32_t best = list->count;
+            int32_t fewest = INT32_MAX;
+            for (uint32_t k = i + 1; k < list->count; ++k) {
+                const int32_t missing = CBatch_TestMerge(&list->batches[i], &list->batches[k]);
+                if (missing < 0 || missing >= fewest) continue;
+                fewest = missing;
+                best = k;
+            }
+            if (best == list->count) break;
+            CBatch_Merge(&list->batches[i], &list->batches[best]);
+            list->signatures[i] |= list->signatures[best];
+            CBatch_Destructor(&list->batches[best]);
+            --list->count;
+            list->batches[best] = list->batches[list->count];
+            list->signatures[best] = list->signatures[list->count];
+        }
+    }
+}
+
+bool AppendBatch(BatchList* list, int32_t maxBones, bool join) {
+    if (list->count == kMaxBatches && join) JoinBatches(list);
+    if (list->count == kMaxBatches) return false;
+    CBatch* batch = &list->batches[list->count++];
+    CBatch_Constructor(batch);
+    CBatch_SetSize(batch, maxBones);
+    return batch->bones != nullptr;
+}
+
 // The batch list: a set that no batch contains widens the first batch that it contains, or becomes a new one.
-bool ListBatches(Work& work, const VertexLayout& layout, const uint32_t* indices, uint32_t triangles,
-                 int32_t maxBones) {
+bool ListBatches(Work& work, const QexBoneVertices& layout, const uint32_t* indices, uint32_t triangles,
+                 int32_t maxBones, bool join) {
     BatchList& list = work.list[0];
     for (uint32_t t = 0; t < triangles; ++t) {
         if (!CollectBones(&work.set, layout, indices + 3 * uint64_t{t})) return false;
         const uint64_t signature = Signature(&work.set);
         uint32_t i = 0;
-        while (i < list.count && !list.Contains(i, &work.set, signature) &&
-               !list.IsWithin(i, &work.set, signature))
-            ++i;
+        bool contained = false;
+        for (; i < list.count; ++i) {
+            contained = list.Contains(i, &work.set, signature);
+            if (contained || list.IsWithin(i, &work.set, signature)) break;
+        }
+        if (contained) continue;
         if (i == list.count) {
-            if (list.count == kMaxBatches) return false;
-            CBatch_Constructor(&list.batches[i]);
-            CBatch_SetSize(&list.batches[i], maxBones);
-            ++list.count;
-            if (!list.batches[i].bones) return false;
-        } else if (list.Contains(i, &work.set, signature)) {
-            continue;
+            if (!AppendBatch(&list, maxBones, join)) return false;
+            i = list.count - 1;
         }
         CBatch_Assign(&list.batches[i], &work.set);
         list.signatures[i] = signature;
     }
+    if (join) JoinBatches(&list);
     return true;
 }
 
-void AssignTriangles(Work& work, const VertexLayout& layout, const uint32_t* indices, uint32_t triangles) {
+void AssignTriangles(Work& work, const QexBoneVertices& layout, const uint32_t* indices, uint32_t triangles) {
     const BatchList& list = work.list[0];
     for (uint32_t t = 0; t < triangles; ++t) {
         CollectBones(&work.set, layout, indices + 3 * uint64_t{t});
@@ -148,7 +169,7 @@ void AssignTriangles(Work& work, const VertexLayout& layout, const uint32_t* ind
 }
 
 // The output vertex that is `vertex` with its bones counted within the batch.
-uint32_t OutputVertex(Work& work, const VertexLayout& layout, uint32_t vertex, const CBatch* batch) {
+uint32_t OutputVertex(Work& work, const QexBoneVertices& layout, uint32_t vertex, const CBatch* batch) {
     Influences in = ReadInfluences(layout, vertex);
     CBatch_GetVertexBoneIndices(batch, in.bones, in.weights, layout.components);
     for (int32_t i = layout.components; i < 4; ++i) in.bones[i] = 0;
@@ -173,7 +194,7 @@ bool AllocTables(QexBoneBatches* out, uint32_t batches, int32_t maxBones) {
 }
 
 // Writes the batches and, grouped by them, the new triangles.
-void EmitBatches(Work& work, QexBoneBatches* out, const VertexLayout& layout, const uint32_t* indices,
+void EmitBatches(Work& work, QexBoneBatches* out, const QexBoneVertices& layout, const uint32_t* indices,
                  uint32_t triangles) {
     uint32_t emitted = 0;
     for (uint32_t b = 0; b < work.list[0].count; ++b) {
@@ -189,7 +210,7 @@ void EmitBatches(Work& work, QexBoneBatches* out, const VertexLayout& layout, co
 }
 
 // The block of output vertices, for the caller to own; null when memory runs out.
-uint8_t* WriteVertices(Work& work, const VertexLayout& layout) {
+uint8_t* WriteVertices(Work& work, const QexBoneVertices& layout) {
     QexScratch<uint8_t> block;
     if (!block.Alloc(uint64_t{work.copyCount} * layout.stride)) return nullptr;
     for (uint32_t i = 0; i < work.copyCount; ++i) {
@@ -202,7 +223,7 @@ uint8_t* WriteVertices(Work& work, const VertexLayout& layout) {
 }
 
 // Whether the arguments describe vertices and triangles that can be read.
-bool IsReadable(const VertexLayout& layout, const uint32_t* indices, uint32_t triangles) {
+bool IsReadable(const QexBoneVertices& layout, const uint32_t* indices, uint32_t triangles) {
     const auto inside = [&](uint32_t offset, uint32_t type) {
         const uint32_t size = QexPODData_ElementSize(type, static_cast<uint32_t>(layout.components));
         return size && uint64_t{offset} + size <= layout.stride;
@@ -216,6 +237,32 @@ bool IsReadable(const VertexLayout& layout, const uint32_t* indices, uint32_t tr
 }
 
 }  // namespace
+
+int32_t QexBoneBatches_Make(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
+                            uint32_t* indices, const QexBoneVertices& layout, uint32_t triangleCount,
+                            int32_t maxBones, bool join) {
+    memset(batches, 0, sizeof *batches);
+    if (!IsReadable(layout, indices, triangleCount)) return -1;
+    Work work;
+    if (!work.Alloc(layout.count, triangleCount, maxBones)) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return -1;
+    }
+    if (!ListBatches(work, layout, indices, triangleCount, maxBones, join)) return -1;
+    AssignTriangles(work, layout, indices, triangleCount);
+    const bool allocated = AllocTables(batches, work.list[0].count, maxBones);
+    if (allocated) EmitBatches(work, batches, layout, indices, triangleCount);
+    uint8_t* block = allocated ? WriteVertices(work, layout) : nullptr;
+    if (!block) {
+        QexBoneBatches_Release(batches);
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return -1;
+    }
+    if (triangleCount) memcpy(indices, work.indices.Get(), uint64_t{triangleCount} * 3 * sizeof *indices);
+    *outVertices = block;
+    if (outVertexCount) *outVertexCount = work.copyCount;
+    return 0;
+}
 
 extern "C" {
 
@@ -385,35 +432,16 @@ int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount,
                               uint32_t indexType, uint32_t triangleCount, int32_t maxBones,
                               uint32_t bonesPerVertex) {
     if (bonesPerVertex < 1 || bonesPerVertex > 4 || maxBones < 1) return -1;
-    memset(batches, 0, sizeof *batches);
-    const VertexLayout layout = {static_cast<const uint8_t*>(vertices),
-                                 vertexCount,
-                                 stride,
-                                 weightOffset,
-                                 weightType,
-                                 indexOffset,
-                                 indexType,
-                                 static_cast<int32_t>(bonesPerVertex)};
-    if (!IsReadable(layout, indices, triangleCount)) return -1;
-    Work work;
-    if (!work.Alloc(vertexCount, triangleCount, maxBones)) {
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return -1;
-    }
-    if (!ListBatches(work, layout, indices, triangleCount, maxBones)) return -1;
-    AssignTriangles(work, layout, indices, triangleCount);
-    const bool allocated = AllocTables(batches, work.list[0].count, maxBones);
-    if (allocated) EmitBatches(work, batches, layout, indices, triangleCount);
-    uint8_t* block = allocated ? WriteVertices(work, layout) : nullptr;
-    if (!block) {
-        QexBoneBatches_Release(batches);
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return -1;
-    }
-    if (triangleCount) memcpy(indices, work.indices.Get(), uint64_t{triangleCount} * 3 * sizeof *indices);
-    *outVertices = block;
-    if (outVertexCount) *outVertexCount = work.copyCount;
-    return 0;
+    const QexBoneVertices layout = {static_cast<const uint8_t*>(vertices),
+                                    vertexCount,
+                                    stride,
+                                    weightOffset,
+                                    weightType,
+                                    indexOffset,
+                                    indexType,
+                                    static_cast<int32_t>(bonesPerVertex)};
+    return QexBoneBatches_Make(batches, outVertexCount, outVertices, indices, layout, triangleCount, maxBones,
+                               false);
 }
 
 void QexBoneBatches_Release(QexBoneBatches* batches) {

@@ -131,17 +131,11 @@ uint32_t BoneIndexType(uint32_t type) {
 // it becomes 0, so that no shader reads past its matrices.
 bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
     QexPODMesh& mesh = at.scene->meshes[at.index];
-    const uint32_t n = QexPODData_Components(mesh.boneIndices);
-    const uint32_t type = BoneIndexType(mesh.boneIndices.type);
-    uint8_t* source =
-        QexPODMesh_ElementData(&mesh, mesh.boneIndices) + uint64_t{vertex} * mesh.boneIndices.stride;
+    const int32_t n = static_cast<int32_t>(QexPODData_Components(mesh.boneIndices));
     float bone[4], weight[4];
-    QexPODVertex_ReadVec(bone, source, type, static_cast<int32_t>(n));
-    QexPODVertex_ReadVec(
-        weight, QexPODMesh_ElementData(&mesh, mesh.boneWeights) + uint64_t{vertex} * mesh.boneWeights.stride,
-        mesh.boneWeights.type, static_cast<int32_t>(n));
+    QexPODMesh_ReadInfluences(&mesh, vertex, bone, weight);
     bool changed = false;
-    for (uint32_t i = 0; i < n; ++i) {
+    for (int32_t i = 0; i < n; ++i) {
         if (bone[i] >= 0 && bone[i] < static_cast<float>(bones)) continue;
         if (weight[i] != 0)
             return Fail(at, "vertex %u follows bone %g of a batch of %d", vertex,
@@ -149,7 +143,10 @@ bool CheckBoneIndices(const Check& at, uint32_t vertex, int32_t bones) {
         bone[i] = 0;
         changed = true;
     }
-    if (changed) QexVertexWriteVec(source, type, static_cast<int32_t>(n), bone);
+    if (changed)
+        QexVertexWriteVec(
+            QexPODMesh_ElementData(&mesh, mesh.boneIndices) + uint64_t{vertex} * mesh.boneIndices.stride,
+            BoneIndexType(mesh.boneIndices.type), n, bone);
     return true;
 }
 
@@ -178,6 +175,38 @@ bool CheckBatch(const Check& at, int32_t batch) {
     return true;
 }
 
+// The first vertex that follows what is no node, in a mesh without batches; the vertex count when none does.
+uint32_t FirstStrayVertex(const Check& at) {
+    const QexPODMesh& mesh = at.scene->meshes[at.index];
+    const float nodes = static_cast<float>(at.scene->nodeCount);
+    for (uint32_t vertex = 0; vertex < mesh.vertexCount; ++vertex) {
+        float bone[4], weight[4];
+        QexPODMesh_ReadInfluences(&mesh, vertex, bone, weight);
+        for (uint32_t i = 0; i < QexPODData_Components(mesh.boneIndices); ++i)
+            if (weight[i] != 0 && !(bone[i] >= 0 && bone[i] < nodes)) return vertex;
+    }
+    return mesh.vertexCount;
+}
+
+// Where bones have no batches, vertices name nodes, and the batches are made here.
+void MakeBatches(const Check& at) {
+    QexPODMesh& mesh = at.scene->meshes[at.index];
+    const uint32_t stray = FirstStrayVertex(at);
+    char text[64] = "";
+    const char* fault = text;
+    if (stray < mesh.vertexCount)
+        snprintf(text, sizeof text, "vertex %u follows what is no node", stray);
+    else
+        fault = QexPODMesh_MakeBatches(&mesh, QEX_MAX_BATCH_BONES);
+    mesh.skinned = !fault;
+    if (fault)
+        QexLog(
+            QEX_TAG,
+            "<QexPODModel_ReadFromSourceStream> mesh %u: follows bones, but has no bone batches, and %s; it "
+            "stands still",
+            at.index, fault);
+}
+
 // A mesh follows bones when it has bone indices, weights, and batches that say which bones those are.
 bool CheckSkin(const Check& at, const uint32_t* extents) {
     QexPODMesh& mesh = at.scene->meshes[at.index];
@@ -192,14 +221,20 @@ bool CheckSkin(const Check& at, const uint32_t* extents) {
     mesh.skinned = 0;
     if (!mesh.boneIndices.componentCount || !mesh.boneWeights.componentCount || !mesh.vertexCount)
         return true;
-    if (!b.batchCount || mesh.stripCount || !mesh.faces.data) {
-        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> mesh %u: follows bones, but %s; it stands still",
-               at.index, !b.batchCount ? "has no bone batches" : "is not a list of indexed triangles");
-        return true;
-    }
     const uint32_t indices = QexPODData_Components(mesh.boneIndices);
     const uint32_t weights = QexPODData_Components(mesh.boneWeights);
     if (indices != weights) return Fail(at, "%u bone indices, but %u weights a vertex", indices, weights);
+    if (!b.batchCount) {
+        MakeBatches(at);
+        return true;
+    }
+    if (mesh.stripCount || !mesh.faces.data) {
+        QexLog(QEX_TAG,
+               "<QexPODModel_ReadFromSourceStream> mesh %u: follows bones, but is not a list of indexed "
+               "triangles; it stands still",
+               at.index);
+        return true;
+    }
     for (int32_t batch = 0; batch < b.batchCount; ++batch)
         if (!CheckBatch(at, batch)) return false;
     mesh.skinned = 1;
@@ -335,6 +370,17 @@ uint32_t QexPODData_Components(const CPODData& element) {
 uint32_t QexPODData_ElementSize(uint32_t type, uint32_t componentCount) {
     const bool packed = type >= QEX_POD_RGBA && type <= QEX_POD_DEC3N;
     return QexPODData_ComponentSize(type) * (packed ? 1 : componentCount);
+}
+
+void QexPODMesh_ReadInfluences(const QexPODMesh* mesh, uint32_t vertex, float bones[4], float weights[4]) {
+    const CPODData& index = mesh->boneIndices;
+    const CPODData& weight = mesh->boneWeights;
+    const int32_t n = static_cast<int32_t>(QexPODData_Components(index));
+    QexPODVertex_ReadVec(bones, QexPODMesh_ElementData(mesh, index) + uint64_t{vertex} * index.stride,
+                         BoneIndexType(index.type), n);
+    QexPODVertex_ReadVec(weights, QexPODMesh_ElementData(mesh, weight) + uint64_t{vertex} * weight.stride,
+                         weight.type, n);
+    for (int32_t i = n; i < 4; ++i) bones[i] = weights[i] = 0;
 }
 
 bool QexLoadPODModel_Check(QexPODModel* scene, QexPODExtents* const extents[kPODKinds]) {

@@ -183,23 +183,26 @@ bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t mesh
     return true;
 }
 
-bool BatchesFit(const QexPODMesh& mesh, uint32_t meshIndex) {
-    for (int32_t i = 0; mesh.skinned && i < mesh.boneBatches.batchCount; ++i) {
-        const int32_t bones = mesh.boneBatches.bonesPerBatch[i];
-        if (bones <= QEX_MAX_BATCH_BONES) continue;
-        QexError(QEX_TAG,
-                 "<QexModel_DownloadGeometry> mesh %u has a bone batch of %d bones, at most %d are drawn",
-                 meshIndex, bones, QEX_MAX_BATCH_BONES);
-        return false;
-    }
-    return true;
+// Gives the mesh batches that the shaders can hold, if it has larger ones.
+bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
+    int32_t most = 0;
+    for (int32_t i = 0; mesh->skinned && i < mesh->boneBatches.batchCount; ++i)
+        if (mesh->boneBatches.bonesPerBatch[i] > most) most = mesh->boneBatches.bonesPerBatch[i];
+    if (most <= QEX_MAX_BATCH_BONES) return true;
+    const char* fault = QexPODMesh_MakeBatches(mesh, QEX_MAX_BATCH_BONES);
+    if (!fault) return true;
+    QexError(QEX_TAG,
+             "<QexModel_DownloadGeometry> mesh %u has a bone batch of %d bones, at most %d are drawn, and "
+             "cannot be cut into smaller ones: %s",
+             meshIndex, most, QEX_MAX_BATCH_BONES, fault);
+    return false;
 }
 
 }  // namespace
 
 bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
     memset(upload, 0, sizeof *upload);
-    if (!BatchesFit(*mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
+    if (!FitBatches(mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
     const Elements elements = ListElements(*mesh);
     if (UploadsAsIs(*mesh, elements)) {
         for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {

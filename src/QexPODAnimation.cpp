@@ -10,6 +10,7 @@ namespace {
 constexpr int32_t kNullArgument = -9;
 constexpr int32_t kUnknownName = -11;
 constexpr int32_t kIndexOutOfRange = -12;
+constexpr int32_t kNoMeshNode = -1;
 
 uint32_t LastFrame(const QexPODModel* scene) {
     return scene->frameCount ? scene->frameCount - 1 : 0;
@@ -204,8 +205,25 @@ const QexMatrix* QexPODAnimation_WorldMatrix(QexPODModel* scene, QexPODNode* nod
     if (impl->cacheKeys[i] != key) {
         QexPODModel_GetWorldMatrixNoCache(scene, &impl->cachedMatrices[i], node);
         impl->cacheKeys[i] = key;
+        impl->boneMeshNodes[i] = kNoMeshNode;
     }
     return &impl->cachedMatrices[i];
+}
+
+const QexMatrix* QexPODAnimation_BoneMatrix(QexPODModel* scene, const QexPODNode* meshNode,
+                                            QexPODNode* boneNode) {
+    const SPVRTPODImpl* impl = scene->runtime;
+    if (!impl) return &g_sMatIdentity;
+    const QexMatrix* world = QexPODAnimation_WorldMatrix(scene, boneNode);
+    const size_t bone = static_cast<size_t>(boneNode - scene->nodes);
+    const int32_t mesh = static_cast<int32_t>(meshNode - scene->nodes);
+    if (impl->boneMeshNodes[bone] != mesh) {
+        QexMatrix* out = &impl->boneMatrices[bone];
+        QexMatrix_Multiply(out, &impl->inverseBindPose[bone], &impl->bindPose[mesh]);
+        QexMatrix_Multiply(out, world, out);
+        impl->boneMeshNodes[bone] = mesh;
+    }
+    return &impl->boneMatrices[bone];
 }
 
 extern "C" {
@@ -408,15 +426,7 @@ void QexPODModel_FlushCache(QexPODModel* scene) {
 
 void QexPODModel_GetBoneWorldMatrix(QexPODModel* scene, QexMatrix* out, QexPODNode* meshNode,
                                     QexPODNode* boneNode) {
-    const SPVRTPODImpl* impl = scene->runtime;
-    if (!impl) {
-        QexMatrix_Identity(out);
-        return;
-    }
-    const QexMatrix* world = QexPODAnimation_WorldMatrix(scene, boneNode);
-    QexMatrix_Multiply(out, &impl->inverseBindPose[boneNode - scene->nodes],
-                       &impl->bindPose[meshNode - scene->nodes]);
-    QexMatrix_Multiply(out, world, out);
+    *out = *QexPODAnimation_BoneMatrix(scene, meshNode, boneNode);
 }
 
 // ---- Cameras, lights, planes, names ----

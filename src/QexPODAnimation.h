@@ -6,3 +6,8 @@
 #include "Qex.h"
 
 const QexMatrix* QexPODAnimation_WorldMatrix(QexPODModel* scene, QexPODNode* node);
+
+// What carries a skinned vertex into the world along one bone, see QexPODModel_GetBoneWorldMatrix. It is kept
+// for the mesh node that asked last, so that batches, passes and eyes share it.
+const QexMatrix* QexPODAnimation_BoneMatrix(QexPODModel* scene, const QexPODNode* meshNode,
+                                            QexPODNode* boneNode);

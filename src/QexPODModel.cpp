@@ -133,6 +133,8 @@ void SPVRTPODImpl_Destructor(SPVRTPODImpl* impl) {
     QexMemory_FreeArray(impl->cachedMatrices);
     QexMemory_FreeArray(impl->bindPose);
     QexMemory_FreeArray(impl->inverseBindPose);
+    QexMemory_FreeArray(impl->boneMatrices);
+    QexMemory_FreeArray(impl->boneMeshNodes);
 }
 
 int32_t QexPODModel_InitImpl(QexPODModel* scene) {
@@ -145,7 +147,10 @@ int32_t QexPODModel_InitImpl(QexPODModel* scene) {
     impl->cachedMatrices = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
     impl->bindPose = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
     impl->inverseBindPose = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
-    if (!impl->cacheKeys || !impl->cachedMatrices || !impl->bindPose || !impl->inverseBindPose) {
+    impl->boneMatrices = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
+    impl->boneMeshNodes = QexMemory_AllocZeroed<int32_t>(scene->nodeCount);
+    if (!impl->cacheKeys || !impl->cachedMatrices || !impl->bindPose || !impl->inverseBindPose ||
+        !impl->boneMatrices || !impl->boneMeshNodes) {
         ReleaseImpl(scene);
         return -1;
     }

@@ -221,8 +221,11 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
                                  : mesh->faceCount;
         QEX_GL(glUniform1i(bones.boneCountLocation, mesh->attributes[QEX_ELEMENT_BONE_INDEX].componentCount));
         for (int32_t j = 0; j < count; ++j) {
-            QexPODModel_GetBoneWorldMatrix(scene, &matrices[j], node, &scene->nodes[bone[j]]);
-            if (bones.modelMatrix) QexMatrix_Multiply(&matrices[j], bones.modelMatrix, &matrices[j]);
+            const QexMatrix* matrix = QexPODAnimation_BoneMatrix(scene, node, &scene->nodes[bone[j]]);
+            if (bones.modelMatrix)
+                QexMatrix_Multiply(&matrices[j], bones.modelMatrix, matrix);
+            else
+                matrices[j] = *matrix;
         }
         QEX_GL(glUniformMatrix4fv(bones.boneMatrixLocation, count, GL_FALSE, matrices[0].m));
         if (bones.hasVectors) {

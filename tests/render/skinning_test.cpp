@@ -182,15 +182,62 @@ TEST_F(SkinningTest, VerticesLandWhereTheirBonesCarryThem) {
         }
 }
 
-TEST_F(SkinningTest, BatchesOfTooManyBonesAreRefused) {
-    pod::Mesh mesh = Squares(1, pod::kUint8);
-    mesh.batchBones.assign(34, 1);
-    mesh.bonesPerBatch = {17, 2};
+// The squares as a file without batches has them: vertices name nodes.
+pod::Mesh WithoutBatches(uint32_t influences) {
+    pod::Mesh mesh = Squares(influences, pod::kUint8);
+    for (size_t v = 0; v < mesh.vertexCount; ++v)
+        for (size_t i = 0; i < influences; ++i) {
+            uint8_t& bone = mesh.boneIndices.data[v * influences + i];
+            bone = static_cast<uint8_t>(kBatches[v < 4 * kFirstOfSecondBatch ? 0 : 1][bone]);
+        }
+    mesh.batchBones = mesh.bonesPerBatch = mesh.batchOffsets = {};
+    mesh.batchBoneMax = mesh.batchCount = 0;
+    return mesh;
+}
+
+// One batch of 17 bones: the nodes in turn.
+pod::Mesh WithLargeBatch(uint32_t influences) {
+    pod::Mesh mesh = WithoutBatches(influences);
+    for (uint8_t& bone : mesh.boneIndices.data) bone = static_cast<uint8_t>(bone + 11);  // 12 to 15
+    for (int i = 0; i < 17; ++i) mesh.batchBones.push_back(1 + i % 4);
+    mesh.bonesPerBatch = {17};
+    mesh.batchOffsets = {0};
     mesh.batchBoneMax = 17;
-    LoadedModel model(Skeleton().Scene(mesh));
-    EXPECT_NE(model.log.find("mesh 0 has a bone batch of 17 bones, at most 16 are drawn\n"),
-              std::string::npos);
-    EXPECT_EQ(GLCalls([&] { model.Draw(); }).Size(), 0u);
+    mesh.batchCount = 1;
+    return mesh;
+}
+
+TEST_F(SkinningTest, MeshesGetTheBatchesThatTheyLack) {
+    const Skeleton skeleton;
+    std::vector<uint8_t> palette;
+    for (int i = 0; i < 8; ++i)
+        palette.insert(palette.end(), {uint8_t(30 * i + 20), uint8_t(200 - 20 * i), 90, 255});
+    ScopedTexture texture(8, 1, palette.data());
+    const auto draw = [&](const pod::Mesh& mesh) {
+        LoadedModel model(skeleton.Scene(mesh));
+        EXPECT_EQ(model.log, "");
+        EXPECT_EQ(model.model.scene.meshes[0].boneBatches.batchCount, mesh.batchCount > 1 ? 2 : 1);
+        QexPODModel_SetFrame(&model.model.scene, 1);
+        model.model.textures[0] = &texture;
+        Clear();
+        model.Draw();
+        return Read();
+    };
+    for (uint32_t influences = 1; influences <= 4; ++influences) {
+        SCOPED_TRACE(influences);
+        const Picture expected = draw(Squares(influences, pod::kUint8));
+        EXPECT_TRUE(SamePicture(expected, draw(WithoutBatches(influences))));
+        EXPECT_TRUE(SamePicture(expected, draw(WithLargeBatch(influences))));
+        // Each square as a strip of two triangles; the second of them is turned over.
+        pod::Mesh strips = WithoutBatches(influences);
+        std::vector<uint32_t> indices;
+        for (uint32_t i = 0; i < strips.vertexCount; ++i) indices.push_back(i);
+        strips.faces = pod::IndexElement(indices, true);
+        strips.stripLengths.assign(kQuads, 2);
+        QexRenderer_SetBackFaceCulling(1);
+        EXPECT_TRUE(SamePicture(draw(WithoutBatches(influences)), draw(strips)));
+        QexRenderer_SetBackFaceCulling(0);
+    }
 }
 
 }  // namespace

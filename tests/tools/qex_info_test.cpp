@@ -163,11 +163,6 @@ TEST_F(QexInfo, NamesEveryProblem) {
              mesh.bonesPerBatch[0] = 17;
          },
          "a batch of 17 bones, at most 16"},
-        {[](auto* s) {
-             s->meshes[0] = everything::SkinnedMesh();
-             s->meshes[0].batchCount = 0;
-         },
-         "mesh 0: follows bones, but has no bone batches"},
         {FlattenQuad, "mesh node 0 (quad) is scaled to 0: it is not drawn"},
         {[](auto* s) {
              PlaceQuad(s, {{}, {}, {{0, 0, 0}, {1, 1, 1}}, {}});

@@ -192,7 +192,7 @@ TEST(PodCheck, OddCamerasAndBonesArePutRight) {
         EXPECT_EQ(bones[2], 0) << "bone 99 without weight";
         EXPECT_EQ(bones[1], v < 3 ? 1 : 0);
     }
-    // Bones without batches, and strips with bones, are drawn as they are.
+    // Strips of batched bones, and vertices without batches that follow no node, are drawn as they are.
     for (const bool strips : {false, true}) {
         scene = everything::Scene();
         Mesh& changed = scene.meshes[0];
@@ -200,10 +200,13 @@ TEST(PodCheck, OddCamerasAndBonesArePutRight) {
             changed.stripLengths = {1, 1};
         else
             changed.batchCount = changed.batchBoneMax = 0;
+        if (!strips) changed.vertexBlock[4 * changed.boneIndices.stride + changed.boneIndices.offset] = 11;
         const LoadedPod still(scene);
         ASSERT_EQ(still.result, 0) << still.log;
         EXPECT_EQ(still.scene.meshes[0].skinned, 0u);
-        EXPECT_TRUE(Has(still.log, "mesh 0: follows bones, but "));
+        EXPECT_TRUE(Has(still.log, strips ? "mesh 0: follows bones, but is not a list of indexed triangles"
+                                          : "no bone batches, and vertex 4 follows what is no node"))
+            << still.log;
     }
 }
 

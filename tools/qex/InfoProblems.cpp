@@ -62,7 +62,7 @@ void CheckTextures(Finder* finder) {
     }
 }
 
-// What makes the engine refuse the whole scene, whether the mesh is drawn or not.
+// What makes the engine refuse the whole scene or do work at each load, whether the mesh is drawn or not.
 void CheckUpload(Finder* finder, const QexPODMesh& mesh, const std::string& label) {
     if (mesh.faces.data && mesh.faces.type == QEX_POD_UNSIGNED_INT && mesh.vertexCount > kMostVertices)
         finder->Add(label + " has 32-bit indices and " + std::to_string(mesh.vertexCount) +
@@ -72,7 +72,7 @@ void CheckUpload(Finder* finder, const QexPODMesh& mesh, const std::string& labe
         bones = std::max(bones, mesh.boneBatches.bonesPerBatch[i]);
     if (bones > QEX_MAX_BATCH_BONES)
         finder->Add(label + " has a batch of " + std::to_string(bones) +
-                    " bones, at most 16 can be drawn: the scene is refused");
+                    " bones, at most 16 are drawn at once: each load makes new batches");
 }
 
 void CheckDrawnMesh(Finder* finder, const QexPODMesh& mesh, const std::string& label) {
