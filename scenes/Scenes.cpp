@@ -1,5 +1,6 @@
 #include "Scenes.h"
 
+#include <algorithm>
 #include <cmath>
 
 namespace scenes {
@@ -46,6 +47,46 @@ pod::Material White() {
     return material;
 }
 
+// Two triangles for each cell of a grid of vertices, u first.
+void AddGridIndices(uint32_t across, uint32_t up, pod::MeshArrays* arrays) {
+    for (uint32_t y = 0; y + 1 < up; ++y)
+        for (uint32_t x = 0; x + 1 < across; ++x) {
+            const uint32_t i = y * across + x;
+            for (uint32_t index : {i, i + 1, i + across, i + across, i + 1, i + across + 1})
+                arrays->indices.push_back(index);
+        }
+}
+
+// A closed tube along +Y of radius 0.25, four rings to a bone, that tapers towards its end. A vertex follows
+// the bone beside it, node 2 and on, and the next one, the more the nearer it is.
+pod::MeshArrays Tube(uint32_t bones, float length) {
+    constexpr uint32_t kRings = 4, kAround = 24;
+    pod::MeshArrays arrays;
+    for (uint32_t ring = 0; ring <= kRings * bones; ++ring) {
+        const float along = static_cast<float>(ring) / kRings;  // in bones
+        const float rest = 1 - along / static_cast<float>(bones);
+        const float radius = 0.25f * std::sqrt(rest);
+        const uint32_t bone = std::min(ring / kRings, bones - 1);
+        const auto share =
+            static_cast<uint8_t>(255.0f * std::min(along - static_cast<float>(bone), 1.0f) / 2);
+        for (uint32_t i = 0; i <= kAround; ++i) {
+            const float u = static_cast<float>(i) / kAround, angle = 6.2831853f * u;
+            const pod::Vec3 out = {std::sin(angle), 0, std::cos(angle)};
+            arrays.positions.push_back({radius * out[0], along * length, radius * out[2]});
+            arrays.normals.push_back(out);
+            arrays.tangents.push_back({out[2], 0, -out[0]});
+            arrays.binormals.push_back({0, 1, 0});
+            arrays.uvs.push_back({2 * u, along * length});
+            const uint32_t next = std::min(bone + 1, bones - 1);
+            arrays.boneIndices.push_back(
+                {static_cast<uint8_t>(bone + 2), static_cast<uint8_t>(next + 2), 0, 0});
+            arrays.boneWeights.push_back({static_cast<uint8_t>(255 - share), share, 0, 0});
+        }
+    }
+    AddGridIndices(kAround + 1, kRings * bones + 1, &arrays);
+    return arrays;
+}
+
 // A bumpy sheet of size x size vertices.
 pod::MeshArrays Sheet(uint32_t size) {
     pod::MeshArrays arrays;
@@ -57,12 +98,7 @@ pod::MeshArrays Sheet(uint32_t size) {
             arrays.normals.push_back({0, 0, 1});
             arrays.uvs.push_back({u, v});
         }
-    for (uint32_t y = 0; y + 1 < size; ++y)
-        for (uint32_t x = 0; x + 1 < size; ++x) {
-            const uint32_t i = y * size + x;
-            for (uint32_t index : {i, i + 1, i + size, i + size, i + 1, i + size + 1})
-                arrays.indices.push_back(index);
-        }
+    AddGridIndices(size, size, &arrays);
     return arrays;
 }
 
@@ -84,6 +120,69 @@ pod::MeshArrays Cube() {
     pod::MeshArrays arrays;
     for (const Face& face : faces) AddFace(face, &arrays);
     return arrays;
+}
+
+pod::MeshArrays Sphere(uint32_t segments) {
+    constexpr float kPi = 3.14159265f;
+    pod::MeshArrays arrays;
+    for (uint32_t i = 0; i <= segments; ++i)
+        for (uint32_t j = 0; j <= 2 * segments; ++j) {
+            const float v = static_cast<float>(i) / static_cast<float>(segments);
+            const float u = static_cast<float>(j) / static_cast<float>(2 * segments);
+            const float east = 2 * kPi * u, up = kPi * (v - 0.5f);
+            const pod::Vec3 normal = {std::cos(up) * std::sin(east), std::sin(up),
+                                      std::cos(up) * std::cos(east)};
+            arrays.positions.push_back(normal);
+            arrays.normals.push_back(normal);
+            arrays.tangents.push_back({std::cos(east), 0, -std::sin(east)});
+            arrays.binormals.push_back(
+                {-std::sin(up) * std::sin(east), std::cos(up), -std::sin(up) * std::cos(east)});
+            arrays.uvs.push_back({u, v});
+        }
+    AddGridIndices(2 * segments + 1, segments + 1, &arrays);
+    return arrays;
+}
+
+pod::MeshArrays Floor(float size) {
+    const float half = size / 2;
+    pod::MeshArrays arrays;
+    arrays.positions = {{-half, 0, half}, {half, 0, half}, {-half, 0, -half}, {half, 0, -half}};
+    arrays.normals.assign(4, {0, 1, 0});
+    arrays.uvs = {{0, 0}, {size, 0}, {0, size}, {size, size}};
+    arrays.indices = {0, 1, 2, 2, 1, 3};
+    return arrays;
+}
+
+pod::Scene Still(const std::vector<Object>& objects) {
+    pod::Scene scene;
+    for (const Object& object : objects) {
+        const int32_t index = static_cast<int32_t>(scene.meshes.size());
+        scene.materials.push_back(White());
+        pod::Transform place;
+        place.positions = {object.position};
+        scene.meshes.push_back(pod::BuildMesh(object.mesh));
+        scene.nodes.push_back(pod::BuildNode(object.name, place, -1, index, index));
+    }
+    scene.meshNodeCount = static_cast<uint32_t>(scene.nodes.size());
+    return scene;
+}
+
+pod::Scene Worm(uint32_t bones, uint32_t frames) {
+    const float length = 4.0f / static_cast<float>(bones);
+    pod::Scene scene = Still({{"floor", Floor(8), {0, 0, 0}}, {"worm", Tube(bones, length), {0, 0, 0}}});
+    scene.frameCount = frames;
+    for (uint32_t bone = 0; bone < bones; ++bone) {
+        pod::Transform keys;
+        keys.positions = {{0, bone ? length : 0, 0}};
+        for (uint32_t i = 0; i < frames; ++i) {
+            const float t = static_cast<float>(i) * 6.2831853f / static_cast<float>(frames);
+            const float phase = 5 * static_cast<float>(bone) / static_cast<float>(bones);
+            keys.rotations.push_back(AboutZ(i ? 3 * std::sin(t - phase) / static_cast<float>(bones) : 0));
+        }
+        scene.nodes.push_back(
+            pod::BuildNode("bone" + std::to_string(bone), keys, bone ? static_cast<int32_t>(bone) + 1 : -1));
+    }
+    return scene;
 }
 
 pod::Scene Grid(uint32_t count) {

@@ -11,6 +11,26 @@ pod::MeshArrays Quad();
 // A cube of edge 2 around the origin, each face its own quad.
 pod::MeshArrays Cube();
 
+// A sphere of radius 1 with tangents and binormals; u goes once around, v = 0 is the lower pole.
+pod::MeshArrays Sphere(uint32_t segments);
+
+// A floor in the XZ plane, `size` across, its texture repeated once a unit.
+pod::MeshArrays Floor(float size);
+
+// A scene of mesh nodes that stand where they are given, each with its own mesh and its own
+// white material.
+struct Object {
+    const char* name;
+    pod::MeshArrays mesh;
+    pod::Vec3 position;
+};
+pod::Scene Still(const std::vector<Object>& objects);
+
+// Two mesh nodes: "floor", 8 across, and "worm", a tube of `bones` bones that stands on it and bends with
+// them over `frames` frames; frame 0 is its bind pose. Its vertices follow two bones each and name them as
+// nodes: it has no batches.
+pod::Scene Worm(uint32_t bones, uint32_t frames);
+
 // `count` mesh nodes on a square grid in the XY plane, one apart, all drawing the same cube at a quarter of
 // its size.
 pod::Scene Grid(uint32_t count);
