@@ -2,6 +2,7 @@
 
 #include "QexGL.h"
 #include "QexLoadPODModel.h"
+#include "QexMemory.h"
 #include "QexModel.h"
 #include "QexPODModel.h"
 
@@ -41,8 +42,9 @@ GLType ToGLType(uint32_t podType) {
 
 struct Element {
     const CPODData* data;
-    bool asFloats;  // converted at upload
-    uint32_t size;  // bytes a vertex in the upload
+    const uint8_t* source;  // of the first vertex
+    bool asFloats;          // converted at upload
+    uint32_t size;          // bytes a vertex in the upload
 };
 
 // The elements that are uploaded, in the order of QexVertexElement.
@@ -67,8 +69,10 @@ Elements ListElements(const QexPODMesh& mesh) {
             i == QEX_ELEMENT_POSITION ? data->type != QEX_POD_FLOAT : !ToGLType(data->type).type;
         const uint32_t bytes = asFloats ? QexPODData_Components(*data) * 4
                                         : QexPODData_ElementSize(data->type, data->componentCount);
-        elements.list[i] = {data, data->componentCount && asFloats,
-                            data->componentCount ? (bytes + 3) / 4 * 4 : 0};
+        if (data->componentCount)
+            elements.list[i] = {data, QexPODMesh_ElementData(&mesh, *data), asFloats, (bytes + 3) / 4 * 4};
+        else
+            elements.list[i] = {data, nullptr, false, 0};
     }
     return elements;
 }
@@ -115,7 +119,7 @@ void Decode(float* out, const uint8_t* source, const CPODData& data) {
 void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position,
                  uint32_t vertex) {
     const CPODData& data = *element.data;
-    const uint8_t* source = QexPODMesh_ElementData(&mesh, data) + uint64_t{vertex} * data.stride;
+    const uint8_t* source = element.source + uint64_t{vertex} * data.stride;
     if (!element.asFloats && !position) {
         memcpy(out, source, QexPODData_ElementSize(data.type, data.componentCount));
         return;
@@ -127,6 +131,46 @@ void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, b
         QexMatrix_TransformVec4(&mesh.unpackMatrix, &value, &value);
     }
     memcpy(out, &value, QexPODData_Components(data) * sizeof(float));
+}
+
+// Some exporters write tangents alone.
+bool LacksBinormals(const QexPODMesh& mesh) {
+    return mesh.tangents.componentCount >= 3 && mesh.normals.componentCount >= 3 &&
+           !mesh.binormals.componentCount && mesh.vertexCount;
+}
+
+QexVec4 ReadElement(const Element& element, uint32_t vertex) {
+    QexVec4 value;
+    Decode(&value.x, element.source + uint64_t{vertex} * element.data->stride, *element.data);
+    return value;
+}
+
+// Normal x tangent, turned round where the texture is mirrored: where its coordinates run clockwise around a
+// triangle.
+bool MakeBinormals(QexScratch<QexVec3>* out, const QexPODMesh& mesh, const Elements& elements) {
+    const uint64_t corners = uint64_t{QexPODMesh_CountTriangles(mesh)} * 3;
+    QexScratch<uint32_t> vertices;
+    if (!out->Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return false;
+    for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
+        const QexVec4 n = ReadElement(elements.list[QEX_ELEMENT_NORMAL], v);
+        const QexVec4 t = ReadElement(elements.list[QEX_ELEMENT_TANGENT], v);
+        (*out)[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+    }
+    const Element& uv = elements.list[QEX_ELEMENT_UV0];
+    if (!uv.size) return true;
+    QexScratch<uint8_t> turned;
+    if (!turned.Alloc(mesh.vertexCount)) return false;
+    memset(turned.Get(), 0, mesh.vertexCount);
+    QexPODMesh_ListCorners(mesh, vertices.Get());
+    for (uint64_t i = 0; i + 3 <= corners; i += 3) {
+        const QexVec4 a = ReadElement(uv, vertices[i]), b = ReadElement(uv, vertices[i + 1]);
+        const QexVec4 c = ReadElement(uv, vertices[i + 2]);
+        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
+        for (int corner = 0; mirrored && corner < 3; ++corner) turned[vertices[i + corner]] = 1;
+    }
+    for (uint32_t v = 0; v < mesh.vertexCount; ++v)
+        if (turned[v]) QexVec3_Scale(&(*out)[v], &(*out)[v], -1);
+    return true;
 }
 
 // Lays the vertices out anew, interleaved and aligned.
@@ -203,8 +247,18 @@ bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
 bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
     memset(upload, 0, sizeof *upload);
     if (!FitBatches(mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
-    const Elements elements = ListElements(*mesh);
-    if (UploadsAsIs(*mesh, elements)) {
+    Elements elements = ListElements(*mesh);
+    QexScratch<QexVec3> made;
+    const CPODData binormals = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
+    if (LacksBinormals(*mesh)) {
+        if (!MakeBinormals(&made, *mesh, elements)) {
+            QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+            return false;
+        }
+        elements.list[QEX_ELEMENT_BINORMAL] = {&binormals, reinterpret_cast<const uint8_t*>(made.Get()),
+                                               false, sizeof(QexVec3)};
+    }
+    if (!made && UploadsAsIs(*mesh, elements)) {
         for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
             const CPODData& data = *elements.list[i].data;
             mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), data, false, data.stride,

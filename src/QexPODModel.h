@@ -13,6 +13,10 @@ inline uint8_t* QexPODMesh_ElementData(const QexPODMesh* mesh, const CPODData& e
     return mesh->interleaved ? mesh->interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
 }
 
+// The triangles of a mesh, those of strips included, and their corners: three vertices each, all wound alike.
+uint32_t QexPODMesh_CountTriangles(const QexPODMesh& mesh);
+void QexPODMesh_ListCorners(const QexPODMesh& mesh, uint32_t* corners);
+
 // The bones that a vertex follows and their weights, zeros behind the last. A bone is an index into its
 // batch's list; in a mesh without batches, a node's.
 void QexPODMesh_ReadInfluences(const QexPODMesh* mesh, uint32_t vertex, float bones[4], float weights[4]);

@@ -33,30 +33,6 @@ struct ElementList {
     uint32_t count = 0;
 };
 
-uint32_t CountTriangles(const QexPODMesh& mesh) {
-    return mesh.stripCount ? QexPODModel_CountIndices(&mesh) - 2 * mesh.stripCount : mesh.faceCount;
-}
-
-// Lists the corners of all triangles; every second one of a strip is turned over.
-void ListCorners(const QexPODMesh& mesh, uint32_t* corners) {
-    uint32_t n = 0;
-    if (!mesh.stripCount)
-        for (; n < mesh.faceCount * 3; ++n) corners[n] = n;
-    uint32_t first = 0;
-    for (uint32_t strip = 0; strip < mesh.stripCount; ++strip) {
-        for (uint32_t i = first; i < first + mesh.stripLengths[strip]; ++i) {
-            const uint32_t odd = (i - first) & 1;
-            corners[n++] = i + odd;
-            corners[n++] = i + 1 - odd;
-            corners[n++] = i + 2;
-        }
-        first += mesh.stripLengths[strip] + 2;
-    }
-    const uint32_t size = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
-    for (uint32_t i = 0; mesh.faces.data && i < n; ++i)
-        QexPODVertex_ReadInt(&corners[i], mesh.faces.data + uint64_t{corners[i]} * size, mesh.faces.type);
-}
-
 // `bones` is a batch's row of the bone table, or null where the vertices hold node indices.
 SkinVertex ReadVertex(const QexPODMesh& mesh, uint32_t vertex, const int32_t* bones) {
     SkinVertex out = {vertex, {}, {}};
@@ -74,7 +50,7 @@ SkinVertex ReadVertex(const QexPODMesh& mesh, uint32_t vertex, const int32_t* bo
 bool ReadTriangles(const QexPODMesh& mesh, Triangles* out) {
     const QexBoneBatches& batches = mesh.boneBatches;
     const uint32_t batchCount = batches.batchCount ? static_cast<uint32_t>(batches.batchCount) : 1;
-    out->count = CountTriangles(mesh);
+    out->count = QexPODMesh_CountTriangles(mesh);
     const uint64_t corners = uint64_t{out->count} * 3;
     struct Seen {
         uint32_t batch;  // counted from 1
@@ -84,7 +60,7 @@ bool ReadTriangles(const QexPODMesh& mesh, Triangles* out) {
     if (!out->corners.Alloc(corners) || !out->vertices.Alloc(corners) || !seen.Alloc(mesh.vertexCount))
         return false;
     memset(seen.Get(), 0, mesh.vertexCount * sizeof(Seen));
-    ListCorners(mesh, out->corners.Get());
+    QexPODMesh_ListCorners(mesh, out->corners.Get());
     for (uint32_t b = 0; b < batchCount; ++b) {
         const bool tables = batches.batchCount > 0;
         const int32_t* bones = tables ? batches.boneTable + int64_t{b} * batches.maxBones : nullptr;
@@ -154,9 +130,33 @@ bool ReplaceVertices(QexPODMesh* mesh, const SkinVertex* vertices, uint32_t coun
 
 }  // namespace
 
+uint32_t QexPODMesh_CountTriangles(const QexPODMesh& mesh) {
+    return mesh.stripCount ? QexPODModel_CountIndices(&mesh) - 2 * mesh.stripCount : mesh.faceCount;
+}
+
+void QexPODMesh_ListCorners(const QexPODMesh& mesh, uint32_t* corners) {
+    uint32_t n = 0;
+    if (!mesh.stripCount)
+        for (; n < mesh.faceCount * 3; ++n) corners[n] = n;
+    uint32_t first = 0;
+    for (uint32_t strip = 0; strip < mesh.stripCount; ++strip) {
+        for (uint32_t i = first; i < first + mesh.stripLengths[strip]; ++i) {
+            // Every second triangle of a strip is turned over.
+            const uint32_t odd = (i - first) & 1;
+            corners[n++] = i + odd;
+            corners[n++] = i + 1 - odd;
+            corners[n++] = i + 2;
+        }
+        first += mesh.stripLengths[strip] + 2;
+    }
+    const uint32_t size = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
+    for (uint32_t i = 0; mesh.faces.data && i < n; ++i)
+        QexPODVertex_ReadInt(&corners[i], mesh.faces.data + uint64_t{corners[i]} * size, mesh.faces.type);
+}
+
 const char* QexPODMesh_MakeBatches(QexPODMesh* mesh, int32_t maxBones) {
     Triangles triangles;
-    if (!CountTriangles(*mesh)) return "it has no faces";
+    if (!QexPODMesh_CountTriangles(*mesh)) return "it has no faces";
     if (!ReadTriangles(*mesh, &triangles)) return kOutOfMemory;
     QexBoneBatches batches;
     uint32_t count = 0;

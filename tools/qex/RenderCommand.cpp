@@ -77,6 +77,7 @@ class Renderer {
 Renderer::~Renderer() {
     EngineOutput quiet;
     shaders_.Release();
+    ReleaseNormalMaps();
     if (modelLoaded_) QexModel_Unload(&model_);
     if (engineStarted_) QexEngine_Shutdown(&engine_);
 }
@@ -111,6 +112,8 @@ bool Renderer::Load() {
     modelLoaded_ = true;
     std::vector<std::string> warnings;
     if (result == 0) warnings = CompleteTextures(&model_, directory);
+    if (result == 0 && options_.effects.shader == "normalmap")
+        for (const std::string& line : LoadNormalMaps(&model_, directory)) warnings.push_back(line);
     output.Stop();
     loadTime_ = Milliseconds(start);
     for (const std::string& line : output.Messages("stands still")) warnings.push_back(line);

@@ -10,7 +10,10 @@
 
 namespace {
 
+constexpr uint32_t kNormalMapUnit = 1;  // of the normal-mapped modules
+
 std::vector<std::string> g_problems;
+std::vector<QexTexture> g_normalMaps;  // by material
 
 // A record that the model will release and free.
 QexTexture* NewTexture() {
@@ -87,6 +90,35 @@ bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
     return true;
 }
 
+// Pictures hold a normal's x in red and y in green; the engine reads them the other way round.
+bool LoadNormalPicture(QexTexture* texture, const std::string& path) {
+    Image image;
+    std::string error;
+    if (!LoadImage(path, &image, &error)) {
+        g_problems.push_back("normal map " + path + ": " + error);
+        return false;
+    }
+    FlipRows(&image);
+    for (size_t i = 0; i < image.pixels.size(); i += 4) std::swap(image.pixels[i], image.pixels[i + 1]);
+    Upload(texture, image, FileName(path));
+    return true;
+}
+
+// Whether a mesh has what a normal map is laid on.
+bool HasTangents(const QexPODMesh& mesh) {
+    return mesh.attributes[QEX_ELEMENT_TANGENT].componentCount &&
+           mesh.attributes[QEX_ELEMENT_BINORMAL].componentCount;
+}
+
+int32_t BindNormalMap(QexModel* model, uint32_t nodeIndex) {
+    const QexPODNode& node = model->scene.nodes[nodeIndex];
+    const size_t material = static_cast<size_t>(node.materialIndex);
+    if (node.materialIndex >= 0 && g_normalMaps[material].glName &&
+        HasTangents(model->scene.meshes[node.objectIndex]))
+        QexTexture_Set(&g_normalMaps[material], kNormalMapUnit);
+    return 0;
+}
+
 int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
     const TextureFile found = FindTexture(path);
     if (found.kind == TextureFile::kMissing) {
@@ -131,6 +163,41 @@ void FindAlpha(QexModel* model, uint32_t material, const std::string& directory)
 }
 
 }  // namespace
+
+std::vector<std::string> LoadNormalMaps(QexModel* model, const std::string& directory) {
+    const QexPODModel& scene = model->scene;
+    g_problems.clear();
+    g_normalMaps.assign(scene.materialCount, {});
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const int32_t index = scene.materials[i].bumpTexture;
+        if (index < 0 || !scene.textures[index].name) continue;
+        const std::string path = directory + scene.textures[index].name;
+        const TextureFile found = FindTexture(path);
+        const std::string extension = Extension(found.path);
+        if (found.kind == TextureFile::kMissing)
+            g_problems.push_back("normal map " + path + " is missing");
+        else if (found.kind == TextureFile::kPicture)
+            LoadNormalPicture(&g_normalMaps[i], found.path);
+        else if ((extension == "ktx" ? QexTexture_LoadKTXFromFile : QexTexture_LoadPVRFromFile)(
+                     &g_normalMaps[i], found.path.c_str(), nullptr, 1, 0) != 0)
+            g_problems.push_back("normal map " + found.path + " cannot be loaded");
+    }
+    for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
+        const QexPODNode& node = scene.nodes[i];
+        if (node.materialIndex >= 0 && g_normalMaps[static_cast<size_t>(node.materialIndex)].glName &&
+            !HasTangents(scene.meshes[node.objectIndex]))
+            g_problems.push_back("mesh node " + std::to_string(i) +
+                                 " has no tangents: its normal map is not used");
+    }
+    model->bindTextureHook = BindNormalMap;
+    return g_problems;
+}
+
+void ReleaseNormalMaps() {
+    for (QexTexture& texture : g_normalMaps)
+        if (texture.glName) QexTexture_Release(&texture);
+    g_normalMaps.clear();
+}
 
 void SetTextureHook(QexModel* model) {
     g_problems.clear();

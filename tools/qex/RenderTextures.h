@@ -14,3 +14,8 @@ void SetTextureHook(QexModel* model);
 // needs no mipmaps, nodes with an alpha texture leave the opaque pass. Returns a line for each texture that
 // is missing or could not be read.
 std::vector<std::string> CompleteTextures(QexModel* model, const std::string& directory);
+
+// Loads the materials' bump textures and has them bound for the normal-mapped modules. Returns what is wrong
+// with them, one line each.
+std::vector<std::string> LoadNormalMaps(QexModel* model, const std::string& directory);
+void ReleaseNormalMaps();
