@@ -18,6 +18,7 @@
 #include "Headless.h"
 #include "ImageFile.h"
 #include "RenderDiagnosis.h"
+#include "RenderFloor.h"
 #include "RenderTextures.h"
 #include "SceneBounds.h"
 #include "TextureFiles.h"
@@ -68,6 +69,7 @@ class Renderer {
     bool modelLoaded_ = false;
     QexCamera camera_ = {};
     SceneShaders shaders_;
+    std::unique_ptr<Floor> floor_;
     std::vector<QexVec3> points_;  // that the automatic camera frames
     std::vector<TransparentSPODNodeInfo> transparent_;
     double loadTime_ = 0;
@@ -77,6 +79,7 @@ class Renderer {
 Renderer::~Renderer() {
     EngineOutput quiet;
     shaders_.Release();
+    floor_.reset();
     ReleaseNormalMaps();
     if (modelLoaded_) QexModel_Unload(&model_);
     if (engineStarted_) QexEngine_Shutdown(&engine_);
@@ -220,12 +223,17 @@ void Renderer::DrawScene(const QexCamera& camera) {
     QexRenderer_SetZTestFunc(3);
     QexRenderer_SetBackFaceCulling(0);
     QexRenderer_SetAlphaBlendModeSeparate(1, 0);
-    DrawMirrored(&model_, options_.effects, lights, camera);
+    QexModel* floor = floor_ ? floor_->Model() : nullptr;
+    if (floor && options_.effects.mirror)
+        floor_->DrawMirrorImage(&model_, lights, camera);
+    else
+        DrawMirrored(&model_, options_.effects, lights, camera);
     QexRenderer_SetBackFaceCulling(0);
     if (options_.effects.shadow) {
-        DrawWithShadow(&engine_, &model_, lights, camera);
+        DrawWithShadow(&engine_, floor, &model_, lights, camera);
         return;
     }
+    if (floor) QexModel_RenderWithCamera(floor, &lights, &camera, nullptr, 0);
     uint32_t count = 0;
     for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
         QexModel_RenderWithCameraEx(&model_, &lights, &camera, nullptr, pass, QEX_RENDER_OPAQUE,
@@ -291,6 +299,11 @@ int Renderer::Run() {
     shaders_.Use(&model_, options_.effects.shader);
     transparent_.resize(model_.scene.meshNodeCount + size_t{1});
     Frame();
+    if (options_.effects.floor) {
+        EngineOutput quiet;
+        floor_ = std::make_unique<Floor>();
+        floor_->Create(points_, *options_.effects.floor, options_.effects.mirror.has_value());
+    }
     const std::vector<double> frames = Frames();
     const bool numbered = options_.sequence || options_.turn;
     gltapResetCounts();

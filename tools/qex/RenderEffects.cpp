@@ -8,6 +8,7 @@
 namespace {
 
 constexpr float kShadowIntensity = 0.4f, kShadowBias = 0.01f;
+constexpr float kCasterMargin = 1.3f;
 constexpr float kMirrorOpacity = 0.6f;  // of the plane over its image
 
 using Create = QexShaderModule* (*)(void);
@@ -55,6 +56,11 @@ std::string NodeNames(const QexPODModel& scene) {
         names += (names.empty() ? "" : ", ") + std::string(scene.nodes[i].name);
     }
     return names.empty() ? "none with a name" : names;
+}
+
+// A skinned node's box goes along with one of its bones; the others may reach beyond it.
+void Widen(QexBoundingBox* box) {
+    for (QexVec3& corner : box->corners) QexVec3_Lerp(&corner, &box->centre, &corner, kCasterMargin);
 }
 
 // Where the shadow's light shines: the first directional light, or from the first point light to the target.
@@ -145,19 +151,21 @@ QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const Qe
     return set;
 }
 
-void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights,
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model, const QexLightSet& lights,
                     const QexCamera& camera) {
     const QexShadowCaster all = {model, 1, nullptr, 0};
     const QexVec3 direction = ShadowDirection(lights, camera);
     GLfloat clear[4];
     glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
     QexModel_UpdateModelBoundingBox(model, nullptr);
+    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) Widen(&model->nodeBoxes[i]);
     QexShadowInfo* info =
         QexModel_InitShadowInfo(&camera, &direction, &all, 1, kShadowIntensity, kShadowBias);
     QexModel_RenderShadow(engine, nullptr, info);
     glDisable(GL_SCISSOR_TEST);
     glClearColor(clear[0], clear[1], clear[2], clear[3]);
     QexRenderer_SetBackFaceCulling(0);
+    if (floor) QexModel_RenderFromCameraWithShadow(floor, &lights, &camera, nullptr, info, 0);
     for (uint32_t pass = 0; pass <= model->scene.highestPass; ++pass)
         QexModel_RenderFromCameraWithShadow(model, &lights, &camera, nullptr, info, pass);
     QexModel_ReleaseShadowInfo(info);

@@ -21,6 +21,7 @@ struct EffectOptions {
     std::vector<QexVec2> picks;  // pixels
     bool shadow = false;
     std::optional<float> mirror;  // height of the plane
+    std::optional<float> floor;   // its height
     std::string mirrorNode;
     uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
     float separation = 0;
@@ -59,8 +60,9 @@ int32_t FindNode(const QexModel& model, const std::string& name, std::string* pr
 // The lights of the options, else the scene's own, else one that shines from the camera.
 QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera);
 
-// Draws all nodes, those with shadow-receiving modules under the shadows of the others.
-void DrawWithShadow(QexRuntimeContext* engine, QexModel* model, const QexLightSet& lights,
+// Draws all nodes of a floor, which may be null, and of the model. Those with shadow-receiving modules show
+// the shadows of the model's nodes.
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model, const QexLightSet& lights,
                     const QexCamera& camera);
 
 // Draws the scene's mirror image in the plane that the options name.

@@ -5,7 +5,6 @@
 
 #include <GLES2/gl2.h>
 
-#include "ImageFile.h"
 #include "TextureFiles.h"
 
 namespace {
@@ -197,6 +196,12 @@ void ReleaseNormalMaps() {
     for (QexTexture& texture : g_normalMaps)
         if (texture.glName) QexTexture_Release(&texture);
     g_normalMaps.clear();
+}
+
+QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
+    QexTexture* texture = NewTexture();
+    if (texture) Upload(texture, image, name);
+    return texture;
 }
 
 void SetTextureHook(QexModel* model) {

@@ -4,11 +4,15 @@
 #include <string>
 #include <vector>
 
+#include "ImageFile.h"
 #include "Qex.h"
 
 // Puts the texture hook into a model. For NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other
 // picture formats of that name; pictures are decoded here, with their alpha channel as the alpha texture.
 void SetTextureHook(QexModel* model);
+
+// A texture of a picture whose first row is its lower edge, with mipmaps. A model that gets it frees it.
+QexTexture* NewPictureTexture(const Image& image, const std::string& name);
 
 // After loading: materials without a texture get one of their diffuse colour, KTX textures a filter that
 // needs no mipmaps, nodes with an alpha texture leave the opaque pass. Returns a line for each texture that

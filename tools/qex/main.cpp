@@ -125,12 +125,13 @@ std::string ParseStereo(const std::string& text, RenderOptions* options) {
     return "";
 }
 
-std::string ParseMirror(const std::string& text, RenderOptions* options) {
+template <std::optional<float> EffectOptions::*kHeight>
+std::string ParseHeight(const std::string& text, RenderOptions* options) {
     float height = 0;
     int consumed = 0;
     if (sscanf(text.c_str(), "%f%n", &height, &consumed) != 1 || static_cast<size_t>(consumed) != text.size())
         return "'" + text + "' is no height; expected a number";
-    options->effects.mirror = height;
+    options->effects.*kHeight = height;
     return "";
 }
 
@@ -188,7 +189,10 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
                 ParseLight);
     app->add_flag("--shadow", options->effects.shadow,
                   "nodes throw shadows on each other (with --shader shadow)");
-    AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options, ParseMirror);
+    AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options,
+              ParseHeight<&EffectOptions::mirror>);
+    AddParsed(app, "--floor", "Y, the height of a floor; it takes shadows and mirrors", options,
+              ParseHeight<&EffectOptions::floor>);
     app->add_option("--mirror-node", options->effects.mirrorNode, "flat node that mirrors the others");
     AddParsed(app, "--stereo", "MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels", options,
               ParseStereo);
