@@ -252,6 +252,18 @@ TEST_F(QexRender, NodesLightsAndEyes) {
     EXPECT_GT(Count(sides, {255, 255, 255}), 100u);
     EXPECT_FALSE(Near(At(sides, 60, 45), kBackground, 1) || Near(At(sides, 160, 45), kBackground, 1));
 
+    // A light from above the camera throws the quad's shadow on the floor behind it, and nowhere else.
+    const Image bright = Picture(scene, {"--floor=-1", "--light", "1,6,20"});
+    const Image shaded = Picture(scene, {"--floor=-1", "--light", "1,6,20", "--shadow"});
+    int darker = 0;
+    for (int y = 0; y < bright.height; ++y)
+        for (int x = 0; x < bright.width; ++x) {
+            const int change = At(shaded, x, y)[0] - At(bright, x, y)[0];
+            EXPECT_TRUE(change == 0 || (change < 0 && y > 50)) << x << " " << y;
+            darker += change < 0;
+        }
+    EXPECT_GT(darker, 20);
+
     WriteScene(Path("scene.pod"), scene);
     const auto run = [&](const std::vector<std::string>& more) {
         std::vector<std::string> arguments = {"render",      Path("scene.pod"), "-o",
