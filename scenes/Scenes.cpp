@@ -159,7 +159,7 @@ pod::Scene Still(const std::vector<Object>& objects) {
         const int32_t index = static_cast<int32_t>(scene.meshes.size());
         scene.materials.push_back(White());
         pod::Transform place;
-        place.positions = {object.position};
+        place.positions.push_back(object.position);
         scene.meshes.push_back(pod::BuildMesh(object.mesh));
         scene.nodes.push_back(pod::BuildNode(object.name, place, -1, index, index));
     }
@@ -173,7 +173,7 @@ pod::Scene Worm(uint32_t bones, uint32_t frames) {
     scene.frameCount = frames;
     for (uint32_t bone = 0; bone < bones; ++bone) {
         pod::Transform keys;
-        keys.positions = {{0, bone ? length : 0, 0}};
+        keys.positions.push_back({0, bone ? length : 0, 0});
         for (uint32_t i = 0; i < frames; ++i) {
             const float t = static_cast<float>(i) * 6.2831853f / static_cast<float>(frames);
             const float phase = 5 * static_cast<float>(bone) / static_cast<float>(bones);

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "Qex.h"
+#include "support/PodScenes.h"
 
 namespace {
 
@@ -200,6 +201,59 @@ TEST(BoneBatch, AnyMeshKeepsItsTriangles) {
     EXPECT_EQ(Batched(Vertices(pairs), triangles, 2).result, -1);
     triangles.resize(512 * 3);
     EXPECT_EQ(Batched(Vertices(pairs), triangles, 2).batches.batchCount, 512);
+}
+
+// A mesh without batches whose 780 triangles follow 780 pairs of 40 nodes: as the batches that are made for
+// it are joined, they need not be one for each pair.
+TEST(BoneBatch, MadeAtLoadAreJoined) {
+    pod::Scene scene;
+    pod::MeshArrays arrays;
+    std::vector<std::pair<int, int>> pairs;
+    for (int a = 0; a < 40; ++a) {
+        scene.nodes.push_back(pod::BuildNode("n", {}, -1, a ? -1 : 0));
+        for (int b = 0; b < a; ++b) pairs.emplace_back(a, b);
+    }
+    for (uint32_t t = 0; t < pairs.size(); ++t)
+        for (const int bone : {pairs[t].first, pairs[t].second, pairs[t].first}) {
+            arrays.indices.push_back(static_cast<uint32_t>(arrays.positions.size()));
+            arrays.positions.push_back({static_cast<float>(t), 0, 0});
+            arrays.boneIndices.push_back({static_cast<uint8_t>(bone), 200, 0, 0});
+            arrays.boneWeights.push_back({255, 0, 0, 0});
+        }
+    scene.meshes = {pod::BuildMesh(arrays)};
+    scene.meshNodeCount = 1;
+    const LoadedPod loaded(scene);
+    ASSERT_EQ(loaded.result, 0) << loaded.log;
+    const QexPODMesh& mesh = loaded.scene.meshes[0];
+    const QexBoneBatches& batches = mesh.boneBatches;
+    EXPECT_EQ(mesh.skinned, 1u);
+    // 780 pairs of 40 nodes, at most 120 pairs to a batch of 16.
+    EXPECT_GE(batches.batchCount, 7);
+    EXPECT_LE(batches.batchCount, 30);
+    std::set<std::pair<int, int>> found;
+    for (int32_t b = 0; b < batches.batchCount; ++b) {
+        EXPECT_LE(batches.bonesPerBatch[b], 16);
+        const uint32_t end = b + 1 < batches.batchCount ? uint32_t(batches.offsets[b + 1]) : mesh.faceCount;
+        for (uint32_t t = uint32_t(batches.offsets[b]); t < end; ++t) {
+            int nodes[3];
+            float position[4] = {};
+            for (uint32_t corner = 0; corner < 3; ++corner) {
+                uint16_t index;
+                memcpy(&index, mesh.faces.data + 2 * (3 * t + corner), 2);
+                const uint8_t* vertex = mesh.interleaved + index * mesh.vertices.stride;
+                const auto at = [&](const CPODData& e) {
+                    return vertex + reinterpret_cast<uintptr_t>(e.data);
+                };
+                memcpy(position, at(mesh.vertices), 12);
+                nodes[corner] = batches.boneTable[b * batches.maxBones + *at(mesh.boneIndices)];
+            }
+            const std::pair<int, int> pair = {nodes[0], nodes[1]};
+            EXPECT_EQ(pair, pairs[size_t(position[0])]);
+            EXPECT_EQ(nodes[2], nodes[0]);
+            found.insert(pair);
+        }
+    }
+    EXPECT_EQ(found.size(), 780u);
 }
 
 }  // namespace
