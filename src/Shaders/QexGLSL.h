@@ -66,10 +66,11 @@
     "    return normalize(lightType[i] == 0 ? lightPosDir[i] - point : -lightPosDir[i]);\n" \
     "}\n"
 
-// The loop over the first `limit` lights, up to lightCount; its body is the statement behind.
+// The loop over the first `limit` lights, up to lightCount; its body is the statement behind. Strict
+// compilers take a constant limit and i++, but not ++i.
 #define QEX_GLSL_EACH_LIGHT(limit)   \
     "    for (int i = 0; i < " limit \
-    "; ++i)\n"                       \
+    "; i++)\n"                       \
     "      if (i < lightCount)\n"
 
 // Diffuse light at a point of the world, for vertex stages: the first `limit` lights count. `precision` is
