@@ -212,21 +212,4 @@ TEST_F(SteadyFrameTest, AllocatesAndCreatesNothing) {
         EXPECT_EQ(gltapCount(name), 0u) << name;
 }
 
-TEST_F(SteadyFrameTest, NoModuleAllocates) {
-    LoadedModel model(Row({0, 1}));
-    const QexLightSet lights = {};
-    for (uint32_t kind = 0; kind < 18; ++kind) {
-        QexShaderModule* module = QexShaders_CreateShaderProgram(kind);
-        if (!module) continue;
-        const auto draw = [&] {
-            module->render(module, &model.model, 0, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
-                           nullptr);
-        };
-        const std::string live = LiveObjects();
-        EXPECT_EQ(CountAllocations(draw).made, 0) << kind;
-        EXPECT_EQ(LiveObjects(), live) << kind;
-        QexShaders_ReleaseShaderProgram(module, kind);
-    }
-}
-
 }  // namespace
