@@ -4,7 +4,6 @@
 #include <cstdlib>
 #include <fstream>
 #include <map>
-#include <regex>
 #include <sstream>
 
 #include "RenderFixture.h"
@@ -50,19 +49,20 @@ void WriteLimits(const std::string& path) {
 // Vectors that the declarations of one storage qualifier fill: one for each variable or column of a matrix.
 // Packed, scalars share vectors with variables of three components, as the language describes it.
 int Vectors(const std::string& source, const std::string& storage, bool packed = false) {
-    const std::regex declaration(storage + R"(\s+(?:(?:low|medium|high)p\s+)?(\w+)\s+\w+(?:\[(\d+)\])?;)");
     int rows[5] = {};  // by number of components
-    std::string::size_type declared = 0;
-    for (std::sregex_iterator at(source.begin(), source.end(), declaration), end; at != end; ++at) {
-        const std::string type = (*at)[1], count = (*at)[2];
+    std::istringstream words(source);
+    for (std::string word, type, name; words >> word;) {
+        if (word != storage) continue;
+        words >> type;
+        if (type == "lowp" || type == "mediump" || type == "highp") words >> type;
+        words >> name;
+        EXPECT_EQ(name.back(), ';') << "not a declaration of one variable: " << type << " " << name;
         const bool matrix = type.compare(0, 3, "mat") == 0, vector = type.find("vec") != std::string::npos;
         const int components = matrix || vector ? type.back() - '0' : 1;
-        rows[components] += (count.empty() ? 1 : std::stoi(count)) * (matrix ? components : 1);
-        ++declared;
+        const size_t bracket = name.find('[');
+        const int count = bracket == std::string::npos ? 1 : std::atoi(&name[bracket + 1]);
+        rows[components] += count * (matrix ? components : 1);
     }
-    const std::regex keyword("\\b" + storage + "\\b");
-    EXPECT_EQ(declared, std::distance(std::sregex_iterator(source.begin(), source.end(), keyword), {}))
-        << "a declaration was not understood";
     if (!packed) return rows[1] + rows[2] + rows[3] + rows[4];
     return rows[4] + rows[3] + rows[2] + std::max(0, rows[1] - rows[3]);
 }
