@@ -21,9 +21,9 @@ struct Corner {
     int weights[3];
 };
 const Corner kCorners[] = {
-    {{-54, -38, 0}, {0.3f, 0.1f, 1}, {1, 0, -0.3f}, {0, 1, 0.1f}, {0, 1, 2, 3}, {120, 60, 45}},
-    {{56, -30, 6}, {-0.4f, 0.2f, 1}, {1, 0.2f, 0.3f}, {0.1f, 1, 0}, {1, 2, 3, 0}, {90, 80, 50}},
-    {{-20, 40, -8}, {0.1f, -0.6f, 1}, {1, 0, 0}, {0, 1, 0.5f}, {2, 3, 0, 1}, {30, 100, 75}}};
+    {{-54, -38, 0}, {0.3f, 0.1f, 1}, {1, 0, -0.3f}, {0, 1, 0.1f}, {0, 1, 2, 3}, {60, 50, 40}},
+    {{56, -30, 6}, {-0.4f, 0.2f, 1}, {1, 0.2f, 0.3f}, {0.1f, 1, 0}, {1, 2, 3, 0}, {40, 60, 50}},
+    {{-20, 40, -8}, {0.1f, -0.6f, 1}, {1, 0, 0}, {0, 1, 0.5f}, {2, 3, 0, 1}, {30, 70, 55}}};
 
 std::array<uint8_t, 4> Weights(const Corner& c, uint32_t influences) {
     std::array<uint8_t, 4> weights = {};
@@ -103,8 +103,8 @@ const glm::mat4 kExtra = glm::rotate(glm::translate(glm::mat4(1), {1, -2, 3}), 0
 const glm::mat4 kBones[] = {
     glm::rotate(glm::translate(glm::mat4(1), {2, 1, 0}), 0.1f, {0, 0, 1}),
     glm::scale(glm::rotate(glm::translate(glm::mat4(1), {3, 4, 1}), -0.12f, {1, 1, 0}), {1, 0.9f, 1}),
-    glm::rotate(glm::translate(glm::mat4(1), {-6, 2, 1}), 0.2f, {1, 0, 0}),
-    glm::rotate(glm::translate(glm::mat4(1), {1, -5, 0}), -0.15f, {0, 1, 1})};
+    glm::rotate(glm::translate(glm::mat4(1), {-6, 2, 1}), 0.5f, {1, 0, 0}),
+    glm::rotate(glm::translate(glm::mat4(1), {1, -5, 0}), -0.6f, {0, 1, 1})};
 
 // World to shadow map: x from 20 to 100, y from 5 to 80; depth rises along both.
 const glm::mat4 kShadowSpace = {
