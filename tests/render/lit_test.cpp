@@ -1,4 +1,5 @@
-// The lit modules against their formulas: a triangle with its own normals, drawn and evaluated on the CPU.
+// The lit modules against their formulas: a triangle with its own normals, drawn and evaluated on the CPU;
+// and what every module sends, binds and leaves behind.
 #include <GLES2/gl2.h>
 
 #include <algorithm>
@@ -332,16 +333,16 @@ struct Order {
     QexShaderModule* (*create)();
     void (*release)(QexShaderModule**);
     bool skinned;
-    std::string slots, uploads, textures;  // units that are bound
+    std::string slots, uploads, textures = "03";  // units that are bound
 };
 #define ORDER(Name, ...) \
     { Name##_CreateProgram, Name##_Release, __VA_ARGS__ }
 const Order kOrders[] = {
-    ORDER(QexGouraudShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices, "03"),
+    ORDER(QexGouraudShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices),
     ORDER(QexGouraudNormalMapShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices,
           "013"),
     ORDER(QexGouraudSpecularShader, false, kMatrices + "cameraPos " + kLights + kSpecular + kAlpha,
-          "cameraPos " + kLights + kSpecular + kAlpha + kMatrices, "03"),
+          "cameraPos " + kLights + kSpecular + kAlpha + kMatrices),
     ORDER(QexGouraudShadowShader, false,
           kMatrices + kLights + kAlpha + "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity ",
           kLights + kAlpha + kMatrices + "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue ",
@@ -352,26 +353,24 @@ const Order kOrders[] = {
           kLights + kAlpha + kMatrices +
               "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue shadowFade ",
           "023"),
-    ORDER(QexTextureShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix ", "03"),
-    ORDER(QexTextureNoAlphaShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix ", "03"),
+    ORDER(QexTextureShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix "),
+    ORDER(QexTextureNoAlphaShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix "),
     ORDER(QexSimpleShader, false, "mvpMatrix ", "mvpMatrix ", ""),
-    ORDER(QexSkinningTextureShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha, kDepthBatch,
-          "03"),
+    ORDER(QexSkinningTextureShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha, kDepthBatch),
     ORDER(QexSkinningTextureNoAlphaShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha,
-          kDepthBatch, "03"),
-    ORDER(QexSkinningGouraudShader, true, kBoneSlots + kLights + kAlpha, kLights + kDepthBatch + kVectors,
-          "03"),
+          kDepthBatch),
+    ORDER(QexSkinningGouraudShader, true, kBoneSlots + kLights + kAlpha, kLights + kDepthBatch + kVectors),
     ORDER(QexSkinningGouraudNormalMapShader, true, kBoneSlots + kLights + kAlpha,
           kLights + kDepthBatch + kVectors, "013"),
     ORDER(QexSkinningGouraudSpecularShader, true, kBoneSlots + "cameraPos " + kLights + kSpecular + kAlpha,
-          "cameraPos " + kLights + kSpecular + kDepthBatch + kVectors, "03"),
+          "cameraPos " + kLights + kSpecular + kDepthBatch + kVectors),
     ORDER(QexUVDisplacementShader, false, "displacement mvpMatrix " + kAlpha,
-          kAlpha + "displacement mvpMatrix ", "03"),
+          kAlpha + "displacement mvpMatrix "),
     ORDER(QexUVDisplacementNoAlphaShader, false, "displacement mvpMatrix " + kAlpha,
-          kAlpha + "displacement mvpMatrix ", "03"),
-    ORDER(QexDepthShader, false, "near far mvpMatrix ", "mvpMatrix ", "03"),
+          kAlpha + "displacement mvpMatrix "),
+    ORDER(QexDepthShader, false, "near far mvpMatrix ", "mvpMatrix "),
     ORDER(QexSkinningDepthShader, true, "near far boneCount boneMatrixArray viewProjMatrix " + kAlpha,
-          kDepthBatch, "03"),
+          kDepthBatch),
 };
 
 const Skin kNoSkin = {0, 0}, kTwoBones = {2, pod::kUint8Norm};
@@ -491,12 +490,12 @@ TEST_F(LitTest, DepthAndShiftedTextures) {
          QexUVDisplacementShader_GetDisplacement, QexUVDisplacementShader_Release, 255},
         {QexUVDisplacementNoAlphaShader_CreateProgram(), QexUVDisplacementNoAlphaShader_SetDisplacement,
          QexUVDisplacementNoAlphaShader_GetDisplacement, QexUVDisplacementNoAlphaShader_Release, 0}};
+    float u, v;
     for (auto row : rows) {
         row.set(row.module, 0.5f, 0.25f);
         model.DrawNode(row.module);
         EXPECT_EQ(Read().Pixel(20, 40), (Rgba{0, 255, 0, row.alpha}));
         EXPECT_EQ(Read().Pixel(100, 40), (Rgba{255, 0, 0, 255}));
-        float u = 0, v = 0;
         row.get(row.module, &u, &v);
         EXPECT_TRUE(u == 0.5f && v == 0.25f);
         row.release(&row.module);
