@@ -19,6 +19,12 @@ struct QexModelSharedShaders {
 
 const QexModelSharedShaders* QexModel_GetSharedShaders();
 
+// Frees an array of casters and their node lists, as shadow and reflection records own one.
+inline void QexModel_FreeCasters(QexShadowCaster* casters, uint32_t count) {
+    for (uint32_t i = 0; i < count; ++i) QexMemory_Free(casters[i].nodeIndices);
+    QexMemory_Free(casters);
+}
+
 // Builds a mesh's attribute layout and box, and its GL buffers' contents where the mesh's own bytes cannot be
 // uploaded as they are.
 struct QexMeshUpload {

@@ -170,8 +170,7 @@ QexShadowInfo* QexModel_InitShadowInfo(const QexCamera* camera, const QexVec3* l
 
 void QexModel_ReleaseShadowInfo(QexShadowInfo* info) {
     if (!info) return;
-    for (uint32_t i = 0; i < info->casterCount; ++i) QexMemory_Free(info->casters[i].nodeIndices);
-    QexMemory_Free(info->casters);
+    QexModel_FreeCasters(info->casters, info->casterCount);
     QexMemory_Free(info);
 }
 

@@ -86,8 +86,7 @@ QexReflection* QexReflection_InitReflectionInfoInfinite(QexModel* model, const Q
 
 void QexReflection_Release(QexReflection* reflection) {
     if (!reflection) return;
-    for (uint32_t i = 0; i < reflection->casterCount; ++i) QexMemory_Free(reflection->casters[i].nodeIndices);
-    QexMemory_Free(reflection->casters);
+    QexModel_FreeCasters(reflection->casters, reflection->casterCount);
     QexMemory_Free(reflection);
 }
 

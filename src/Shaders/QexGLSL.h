@@ -2,28 +2,51 @@
 // is a row of them.
 #pragma once
 
-// Skinned positions and directions: a vertex follows boneCount bones, and the bone matrices lead straight
-// into the world.
-#define QEX_GLSL_SKIN                                                                         \
+// Where a vertex goes. Both families of modules, the static and the skinned ones, have placeVertex, which
+// puts the vertex on the screen, passes its texture coordinate on and returns its world position, and
+// worldVector, which turns a direction of the mesh into one of the world, not of length 1.
+#define QEX_GLSL_STATIC_VERTEX                              \
+    "attribute highp vec3 inVertex;\n"                      \
+    "attribute mediump vec2 inTexCoord;\n"                  \
+    "uniform highp mat4 transMatrix;\n"                     \
+    "uniform highp mat3 normalMatrix;\n"                    \
+    "uniform highp mat4 mvpMatrix;\n"                       \
+    "varying mediump vec2 fTexCoord;\n"                     \
+    "highp vec3 placeVertex() {\n"                          \
+    "    fTexCoord = inTexCoord;\n"                         \
+    "    gl_Position = mvpMatrix * vec4(inVertex, 1.0);\n"  \
+    "    return (transMatrix * vec4(inVertex, 1.0)).xyz;\n" \
+    "}\n"                                                   \
+    "highp vec3 worldVector(highp vec3 v) {\n"              \
+    "    return normalMatrix * v;\n"                        \
+    "}\n"
+
+// A vertex follows boneCount bones, and the bone matrices lead straight into the world.
+#define QEX_GLSL_SKINNED_VERTEX                                                               \
     "attribute highp vec3 inVertex;\n"                                                        \
+    "attribute mediump vec2 inTexCoord;\n"                                                    \
     "attribute mediump vec4 inBoneIndex;\n"                                                   \
     "attribute mediump vec4 inBoneWeight;\n"                                                  \
+    "uniform highp mat4 viewProjMatrix;\n"                                                    \
     "uniform lowp int boneCount;\n"                                                           \
     "uniform highp mat4 boneMatrixArray[16];\n"                                               \
-    "highp vec4 skinPosition() {\n"                                                           \
+    "varying mediump vec2 fTexCoord;\n"                                                       \
+    "highp vec3 placeVertex() {\n"                                                            \
     "    highp vec4 p = vec4(0.0);\n"                                                         \
     "    highp vec4 v = vec4(inVertex, 1.0);\n"                                               \
     "    if (boneCount > 0) p += boneMatrixArray[int(inBoneIndex.x)] * v * inBoneWeight.x;\n" \
     "    if (boneCount > 1) p += boneMatrixArray[int(inBoneIndex.y)] * v * inBoneWeight.y;\n" \
     "    if (boneCount > 2) p += boneMatrixArray[int(inBoneIndex.z)] * v * inBoneWeight.z;\n" \
     "    if (boneCount > 3) p += boneMatrixArray[int(inBoneIndex.w)] * v * inBoneWeight.w;\n" \
-    "    return p;\n"                                                                         \
+    "    fTexCoord = inTexCoord;\n"                                                           \
+    "    gl_Position = viewProjMatrix * p;\n"                                                 \
+    "    return p.xyz;\n"                                                                     \
     "}\n"
 
-// Needs QEX_GLSL_SKIN. The result is not of length 1.
-#define QEX_GLSL_SKIN_VECTOR                                                                     \
+// Needs QEX_GLSL_SKINNED_VERTEX.
+#define QEX_GLSL_SKINNED_VECTOR                                                                  \
     "uniform highp mat3 boneVecMatrixArray[16];\n"                                               \
-    "highp vec3 skinVector(highp vec3 v) {\n"                                                    \
+    "highp vec3 worldVector(highp vec3 v) {\n"                                                   \
     "    highp vec3 r = vec3(0.0);\n"                                                            \
     "    if (boneCount > 0) r += boneVecMatrixArray[int(inBoneIndex.x)] * v * inBoneWeight.x;\n" \
     "    if (boneCount > 1) r += boneVecMatrixArray[int(inBoneIndex.y)] * v * inBoneWeight.y;\n" \
@@ -31,6 +54,9 @@
     "    if (boneCount > 3) r += boneVecMatrixArray[int(inBoneIndex.w)] * v * inBoneWeight.w;\n" \
     "    return r;\n"                                                                            \
     "}\n"
+
+// Normals of modules that light with the mesh's own.
+#define QEX_GLSL_NORMAL(precision) "attribute " precision " vec3 inNormal;\n"
 
 // The direction from a point to light i. Type 0 is a point light, the others are directional.
 #define QEX_GLSL_LIGHT_VECTOR                                                               \
@@ -40,21 +66,24 @@
     "    return normalize(lightType[i] == 0 ? lightPosDir[i] - point : -lightPosDir[i]);\n" \
     "}\n"
 
+// The loop over the first `limit` lights, up to lightCount; its body is the statement behind. Strict
+// compilers take a constant limit and i++, but not ++i.
+#define QEX_GLSL_EACH_LIGHT(limit)   \
+    "    for (int i = 0; i < " limit \
+    "; i++)\n"                       \
+    "      if (i < lightCount)\n"
+
 // Diffuse light at a point of the world, for vertex stages: the first `limit` lights count. `precision` is
 // that of lightCount and lightColor, which must be the same in both stages where both use them. Needs
 // QEX_GLSL_LIGHT_VECTOR.
-#define QEX_GLSL_DIFFUSE(limit, precision)                                                          \
-    "uniform " precision                                                                            \
-    " int lightCount;\n"                                                                            \
-    "uniform " precision                                                                            \
-    " vec4 lightColor[4];\n"                                                                        \
-    "highp vec3 diffuseLight(highp vec3 point, highp vec3 normal) {\n"                              \
-    "    highp vec3 sum = vec3(0.0);\n"                                                             \
-    "    for (int i = 0; i < " limit                                                                \
-    "; ++i)\n"                                                                                      \
-    "        if (i < lightCount)\n"                                                                 \
-    "            sum += clamp(dot(normal, lightVector(i, point)), 0.0, 1.0) * lightColor[i].rgb;\n" \
-    "    return sum;\n"                                                                             \
+#define QEX_GLSL_DIFFUSE(limit, precision) \
+    "uniform " precision " int lightCount;\n" \
+    "uniform " precision " vec4 lightColor[4];\n" \
+    "highp vec3 diffuseLight(highp vec3 point, highp vec3 normal) {\n" \
+    "    highp vec3 sum = vec3(0.0);\n" \
+    QEX_GLSL_EACH_LIGHT(limit) \
+    "        sum += clamp(dot(normal, lightVector(i, point)), 0.0, 1.0) * lightColor[i].rgb;\n" \
+    "    return sum;\n" \
     "}\n"
 
 // Alpha of the modules with an alpha texture.
@@ -75,6 +104,113 @@
     "uniform lowp vec3 sceneDiffuse;\n"                                                         \
     "mediump vec4 surfaceColour(mediump vec3 light) {\n"                                        \
     "    return texture2D(sTexture, fTexCoord) * vec4(light + sceneAmbient, surfaceAlpha());\n" \
+    "}\n"
+
+// Diffuse light per vertex; needs QEX_GLSL_ALPHA and QEX_GLSL_SURFACE.
+#define QEX_GLSL_GOURAUD_FRAGMENT                                  \
+    "varying mediump vec3 fDiffuse;\n"                             \
+    "void main() {\n"                                              \
+    "    gl_FragColor = surfaceColour(sceneDiffuse * fDiffuse);\n" \
+    "}\n"
+
+// The vertex stage of specular highlights by the first `limit` lights. Needs a vertex, inNormal,
+// QEX_GLSL_LIGHT_VECTOR and QEX_GLSL_DIFFUSE.
+#define QEX_GLSL_SPECULAR_VERTEX(limit) \
+    "uniform mediump vec3 cameraPos;\n" \
+    "varying mediump vec3 fHalf[" limit "];\n" \
+    "varying mediump vec3 fNormal;\n" \
+    "varying mediump vec3 fDiffuse;\n" \
+    "void main() {\n" \
+    "    highp vec3 point = placeVertex();\n" \
+    "    highp vec3 normal = normalize(worldVector(inNormal));\n" \
+    "    highp vec3 toCamera = normalize(cameraPos - point);\n" \
+    QEX_GLSL_EACH_LIGHT(limit) \
+    "        fHalf[i] = normalize(toCamera + lightVector(i, point));\n" \
+    "    fNormal = normal;\n" \
+    "    fDiffuse = diffuseLight(point, normal);\n" \
+    "}\n"
+
+// The highlight of a fragment. Shininess reaches 256, more than low precision holds.
+#define QEX_GLSL_HIGHLIGHT(limit) \
+    "uniform mediump int lightCount;\n" \
+    "uniform mediump vec4 lightColor[4];\n" \
+    "uniform lowp vec3 sceneSpecular;\n" \
+    "uniform mediump float shininess;\n" \
+    "varying mediump vec3 fHalf[" limit "];\n" \
+    "varying mediump vec3 fNormal;\n" \
+    "varying mediump vec3 fDiffuse;\n" \
+    "mediump vec3 highlight() {\n" \
+    "    mediump vec3 sum = vec3(0.0);\n" \
+    QEX_GLSL_EACH_LIGHT(limit) \
+    "        sum += pow(clamp(dot(fNormal, fHalf[i]), 0.0, 1.0), shininess) * lightColor[i].rgb;\n" \
+    "    return sceneSpecular * sum;\n" \
+    "}\n"
+
+// Both stages of diffuse light from a normal map by the first `limit` lights. The vertex stage needs a vertex
+// and QEX_GLSL_LIGHT_VECTOR, the fragment stage QEX_GLSL_ALPHA and QEX_GLSL_SURFACE.
+#define QEX_GLSL_NORMAL_MAP_VARYINGS(limit) \
+    "uniform mediump int lightCount;\n"     \
+    "varying mediump vec3 fTangent;\n"      \
+    "varying mediump vec3 fBinormal;\n"     \
+    "varying mediump vec3 fNormal;\n"       \
+    "varying mediump vec3 fLight[" limit "];\n"
+
+#define QEX_GLSL_NORMAL_MAP_VERTEX(limit) \
+    QEX_GLSL_NORMAL_MAP_VARYINGS(limit)   \
+    "attribute mediump vec3 inTangent;\n" \
+    "attribute mediump vec3 inBiNormal;\n" \
+    "attribute mediump vec3 inNormal;\n" \
+    "void main() {\n" \
+    "    highp vec3 point = placeVertex();\n" \
+    QEX_GLSL_EACH_LIGHT(limit) \
+    "        fLight[i] = lightVector(i, point);\n" \
+    "    fTangent = normalize(worldVector(inTangent));\n" \
+    "    fBinormal = normalize(worldVector(inBiNormal));\n" \
+    "    fNormal = normalize(worldVector(inNormal));\n" \
+    "}\n"
+
+// The map holds the direction in the order green, red, blue.
+#define QEX_GLSL_NORMAL_MAP_FRAGMENT(limit) \
+    QEX_GLSL_NORMAL_MAP_VARYINGS(limit)     \
+    "uniform mediump vec4 lightColor[4];\n" \
+    "uniform sampler2D sNormalMap;\n" \
+    "void main() {\n" \
+    "    mediump vec3 texel = normalize((texture2D(sNormalMap, fTexCoord).grb - 0.5) * 2.0);\n" \
+    "    mediump vec3 normal = mat3(fTangent, fBinormal, fNormal) * texel;\n" \
+    "    mediump vec3 diffuse = vec3(0.0);\n" \
+    QEX_GLSL_EACH_LIGHT(limit) \
+    "        diffuse += clamp(dot(normal, fLight[i]), 0.0, 1.0) * lightColor[i].rgb;\n" \
+    "    gl_FragColor = surfaceColour(sceneDiffuse * diffuse);\n" \
+    "}\n"
+
+// The vertex stage of the modules that receive a shadow.
+#define QEX_GLSL_SHADOW_VERTEX                                                                   \
+    "uniform mediump vec3 shadowLightDir;\n"                                                     \
+    "uniform highp mat4 shadowSpaceMatrix;\n"                                                    \
+    "uniform mediump float biasValue;\n"                                                         \
+    "varying highp vec3 fShadow;\n"                                                              \
+    "varying mediump float fFacing;\n"                                                           \
+    "varying mediump vec3 fDiffuse;\n"                                                           \
+    "void main() {\n"                                                                            \
+    "    highp vec3 point = placeVertex();\n"                                                    \
+    "    highp vec3 normal = normalize(worldVector(inNormal));\n"                                \
+    "    fDiffuse = diffuseLight(point, normal);\n"                                              \
+    "    fShadow = (shadowSpaceMatrix * vec4(inVertex, 1.0)).xyz - vec3(0.0, 0.0, biasValue);\n" \
+    "    fFacing = dot(normal, normalize(-shadowLightDir));\n"                                   \
+    "}\n"
+
+// A fragment is in shadow when it faces the light, lies within the map, and the map holds something nearer:
+// the depth between the two, or 0. Needs QEX_GLSL_FRAGMENT_PRECISION.
+#define QEX_GLSL_SHADOW_DEPTH                                                                          \
+    "uniform sampler2D shadowTexture;\n"                                                               \
+    "uniform mediump float shadowIntensity;\n"                                                         \
+    "varying mediump vec3 fDiffuse;\n"                                                                 \
+    "varying vec3 fShadow;\n"                                                                          \
+    "varying mediump float fFacing;\n"                                                                 \
+    "float shadowDepth() {\n"                                                                          \
+    "    float depth = texture2D(shadowTexture, fShadow.xy).r;\n"                                      \
+    "    bool inMap = fShadow.x >= 0.0 && fShadow.x <= 1.0 && fShadow.y >= 0.0 && fShadow.y <= 1.0;\n" \
+    "    return depth < 1.0 && inMap && fFacing > 0.0 ? max(fShadow.z - depth, 0.0) : 0.0;\n"          \
     "}\n"
 
 // Fragments take the best precision that there is.

@@ -3,30 +3,16 @@
 
 namespace {
 
-const char* const kVertexSource = QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
-attribute highp vec3 inVertex;
-attribute highp vec3 inNormal;
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 transMatrix;
-uniform highp mat3 normalMatrix;
-uniform highp mat4 mvpMatrix;
+const char* const kVertexSource =
+    QEX_GLSL_STATIC_VERTEX QEX_GLSL_NORMAL("highp") QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
 varying mediump vec3 fDiffuse;
-varying mediump vec2 fTexCoord;
 void main() {
-    highp vec3 point = (transMatrix * vec4(inVertex, 1.0)).xyz;
-    highp vec3 normal = normalize(normalMatrix * inNormal);
-    fDiffuse = diffuseLight(point, normal);
-    fTexCoord = inTexCoord;
-    gl_Position = mvpMatrix * vec4(inVertex, 1.0);
+    highp vec3 point = placeVertex();
+    fDiffuse = diffuseLight(point, normalize(worldVector(inNormal)));
 }
 )";
 
-const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE R"(
-varying mediump vec3 fDiffuse;
-void main() {
-    gl_FragColor = surfaceColour(sceneDiffuse * fDiffuse);
-}
-)";
+const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
 
 const QexLitShaderType kType = {
     {"src/Shaders/QexGouraudShader",

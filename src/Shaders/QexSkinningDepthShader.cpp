@@ -5,14 +5,10 @@
 
 namespace {
 
-const char* const kVertexSource = QEX_GLSL_SKIN QEX_GLSL_DEPTH R"(
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 viewProjMatrix;
-varying mediump vec2 fTexCoord;
+const char* const kVertexSource = QEX_GLSL_SKINNED_VERTEX QEX_GLSL_DEPTH R"(
 void main() {
-    gl_Position = viewProjMatrix * skinPosition();
+    placeVertex();
     fDepth = depthValue(gl_Position.z);
-    fTexCoord = inTexCoord;
 }
 )";
 

@@ -3,29 +3,16 @@
 
 namespace {
 
-const char* const kVertexSource =
-    QEX_GLSL_SKIN QEX_GLSL_SKIN_VECTOR QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
-attribute mediump vec3 inNormal;
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 viewProjMatrix;
+const char* const kVertexSource = QEX_GLSL_SKINNED_VERTEX QEX_GLSL_SKINNED_VECTOR QEX_GLSL_NORMAL("mediump")
+    QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
 varying mediump vec3 fDiffuse;
-varying mediump vec2 fTexCoord;
 void main() {
-    highp vec4 position = skinPosition();
-    highp vec3 point = position.xyz;
-    highp vec3 normal = normalize(skinVector(inNormal));
-    fDiffuse = diffuseLight(point, normal);
-    fTexCoord = inTexCoord;
-    gl_Position = viewProjMatrix * position;
+    highp vec3 point = placeVertex();
+    fDiffuse = diffuseLight(point, normalize(worldVector(inNormal)));
 }
 )";
 
-const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE R"(
-varying mediump vec3 fDiffuse;
-void main() {
-    gl_FragColor = surfaceColour(sceneDiffuse * fDiffuse);
-}
-)";
+const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
 
 const QexLitShaderType kType = {{"src/Shaders/QexSkinningGouraudShader",
                                  kVertexSource,

@@ -5,13 +5,9 @@
 
 #define QEX_MODULE (draw.type->path)
 
-const char* const kQexSkinningVertexSource = QEX_GLSL_SKIN R"(
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 viewProjMatrix;
-varying mediump vec2 fTexCoord;
+const char* const kQexSkinningVertexSource = QEX_GLSL_SKINNED_VERTEX R"(
 void main() {
-    gl_Position = viewProjMatrix * skinPosition();
-    fTexCoord = inTexCoord;
+    placeVertex();
 }
 )";
 

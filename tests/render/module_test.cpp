@@ -1,8 +1,4 @@
-// The shader modules: uniforms, alpha, textures, and every way in which a mesh may be laid out.
-#include <GLES2/gl2.h>
-
-#include <cmath>
-
+// The texture modules: alpha, textures, and every way in which a mesh may be laid out.
 #include "Scenes.h"
 
 namespace {
@@ -19,7 +15,6 @@ struct ModuleTest : RenderTest {
         QexShaders_ReleaseShaderProgram(texture, QEX_SHADER_TEXTURE);
         QexShaders_ReleaseShaderProgram(noAlpha, QEX_SHADER_TEXTURE_NOALPHA);
         QexSimpleShader_Release(&simple);
-        QexSimpleShader_Release(&simple);
         RenderTest::TearDown();
     }
 
@@ -28,41 +23,6 @@ struct ModuleTest : RenderTest {
 
 pod::Mesh Quad() {
     return pod::BuildMesh(Rectangle(16, 16, 80, 64));
-}
-
-TEST_F(ModuleTest, UniformsInOrderAndTheMatricesMultiplied) {
-    const float half = 0.5f;  // of a turn by 1 about y
-    LoadedModel model(
-        SceneOf(Quad(), {{{1, 2, 3}}, {{0, std::sin(half), 0, std::cos(half)}}, {{2, 2, 2}}, {}}));
-    const glm::mat4 world =
-        glm::scale(glm::rotate(glm::translate(glm::mat4(1), {1, 2, 3}), 2 * half, {0, 1, 0}), {2, 2, 2});
-    const glm::mat4 extra = glm::rotate(glm::translate(glm::mat4(1), {-4, 5, 1}), 0.3f, {1, 0, 0});
-    const glm::mat4 view = glm::lookAt(glm::vec3(10, 20, 30), glm::vec3(0), glm::vec3(0, 1, 0));
-    const glm::mat4 projection = glm::perspective(1.0f, 1.5f, 1.0f, 100.0f);
-    const QexMatrix placed = ToQex(extra), viewMatrix = ToQex(view), projectionMatrix = ToQex(projection);
-    QexTextureShader_SetAlphaThreshold(texture, 0.25f);
-    model.Material().opacity = 0.8f;
-    QexRenderer_SetGlobalAlpha(0.5f);
-    const struct {
-        QexShaderModule* module;
-        std::vector<double> floats;  // opacity and threshold
-    } cases[] = {{texture, {0.4, 0.25}}, {noAlpha, {0.4, 0.5}}, {simple, {}}};
-    for (const auto& c : cases)
-        for (const bool given : {false, true}) {
-            const GLCalls recorded([&] {
-                c.module->render(c.module, &model.model, 0, nullptr, given ? &placed : nullptr, &viewMatrix,
-                                 &projectionMatrix, nullptr);
-            });
-            const auto calls = recorded.Of({"glUniform1f", "glUniformMatrix4fv"});
-            ASSERT_EQ(calls.size(), c.floats.size() + 1);
-            for (size_t i = 0; i < c.floats.size(); ++i) {
-                EXPECT_EQ(calls[i]->argument[0].i, c.module->slots[i + 1].location);
-                EXPECT_NEAR(calls[i]->argument[1].f, c.floats[i], 1e-6);
-            }
-            EXPECT_EQ(calls.back()->argument[0].i, c.module->slots[0].location);
-            EXPECT_TRUE(SameMatrix(calls.back()->data, projection * view * (given ? extra * world : world)));
-        }
-    QexRenderer_SetGlobalAlpha(1);
 }
 
 // The fragment is always written; alpha is opacity times its source where that lies above the threshold.
@@ -83,9 +43,10 @@ TEST_F(ModuleTest, AlphaRuleAndPassOfTheNode) {
         {noAlpha, &red, 1, 0.5f, 153, true},    {noAlpha, nullptr, 1, 0.6f, 0, true},
         {simple, &red, 0.5f, 0, 255, true},
     };
+    QexRenderer_SetGlobalAlpha(0.5f);
     for (const auto& c : cases) {
         model.model.alphaTextures[0] = c.alpha;
-        model.Material().opacity = c.opacity;
+        model.Material().opacity = 2 * c.opacity;
         model.Node().blendFlags = QEX_NODE_OPAQUE;
         if (c.module == texture) QexTextureShader_SetAlphaThreshold(texture, c.threshold);
         if (c.module == noAlpha) QexTextureNoAlphaShader_SetAlphaThreshold(noAlpha, c.threshold);
@@ -95,6 +56,7 @@ TEST_F(ModuleTest, AlphaRuleAndPassOfTheNode) {
         EXPECT_TRUE(Near(Read().Pixel(50, 50), colour, 1)) << c.opacity << " " << c.threshold;
         EXPECT_EQ(model.Node().blendFlags, c.opaque ? QEX_NODE_OPAQUE : 0u);
     }
+    QexRenderer_SetGlobalAlpha(1);
 }
 
 QexTexture* g_hookTexture;
@@ -131,32 +93,6 @@ TEST_F(ModuleTest, HookMaterialAndMissingTextures) {
         model.Node().materialIndex = c.material;
         model.DrawNode(c.module);
         EXPECT_EQ(Read().Pixel(50, 50), c.expected) << c.hookResult << " " << c.material;
-    }
-}
-
-// Of all state a module changes only the program, the active unit and the textures of units 0 and 3.
-TEST_F(ModuleTest, StateLeftBehindAndSkippedNodes) {
-    LoadedModel model(SceneOf(Quad()));
-    const std::string white = std::to_string(Qextexture_GetDefault()->glName);
-    for (const GLenum unit : {GL_TEXTURE0, GL_TEXTURE3, GL_TEXTURE2}) {
-        QexRenderState_ActiveTexture(unit);
-        glBindTexture(GL_TEXTURE_2D, 0);
-    }
-    const struct {
-        QexShaderModule* module;
-        std::string textures;
-    } cases[] = {
-        {simple, ""},
-        {texture, "activeUnit: 2 -> 0\ntexture2D[0]: 0 -> " + white + "\ntexture2D[3]: 0 -> " + white + "\n"},
-        {noAlpha, ""}};
-    for (const auto& c : cases) {
-        QexRenderState_UseProgram(0);
-        EXPECT_EQ(StateChange([&] { model.DrawNode(c.module); }),
-                  "program: 0 -> " + std::to_string(c.module->program) + "\n" + c.textures);
-        EXPECT_EQ(GLCalls([&] { model.DrawNode(c.module, 7); }).Size(), 0u);
-        model.Node().stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
-        EXPECT_EQ(GLCalls([&] { model.DrawNode(c.module); }).Size(), 0u);
-        model.Node().stateFlags |= QEX_NODE_RENDERING_ENABLED;
     }
 }
 

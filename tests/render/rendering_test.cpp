@@ -201,32 +201,16 @@ TEST_F(SteadyFrameTest, AllocatesAndCreatesNothing) {
     };
     frame();
     const std::string live = LiveObjects();
+    EXPECT_TRUE(QEX_SANITIZED || CountAllocations([&] { LoadedModel counted(scene); }) > 0);
     gltapResetCounts();
-    const Allocations allocations = CountAllocations([&] {
+    const auto frames = [&] {
         for (int i = 0; i < 10; ++i) frame();
-    });
-    EXPECT_EQ(allocations.made, 0);
+    };
+    EXPECT_EQ(CountAllocations(frames), 0);
     EXPECT_EQ(LiveObjects(), live);
     EXPECT_EQ(gltapCount("glDrawElements"), 60u);
     for (const char* name : {"glBufferData", "glTexImage2D", "glGetUniformLocation", "glGetIntegerv"})
         EXPECT_EQ(gltapCount(name), 0u) << name;
-}
-
-TEST_F(SteadyFrameTest, NoModuleAllocates) {
-    LoadedModel model(Row({0, 1}));
-    const QexLightSet lights = {};
-    for (uint32_t kind = 0; kind < 18; ++kind) {
-        QexShaderModule* module = QexShaders_CreateShaderProgram(kind);
-        if (!module) continue;
-        const auto draw = [&] {
-            module->render(module, &model.model, 0, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
-                           nullptr);
-        };
-        const std::string live = LiveObjects();
-        EXPECT_EQ(CountAllocations(draw).made, 0) << kind;
-        EXPECT_EQ(LiveObjects(), live) << kind;
-        QexShaders_ReleaseShaderProgram(module, kind);
-    }
 }
 
 }  // namespace

@@ -5,20 +5,32 @@
 
 namespace {
 
-// A floor at y = 0 from -20 to 20, and a square of side 8 at height 10 whose centre is `place`.
-pod::Scene FloorAndSquare(pod::Vec3 place, bool facesDown = false) {
+// A floor at y = 0 from -20 to 20, and a square of side 8 at height 10 whose centre is `place`. Where it is
+// skinned, all of it follows nodes 2 to 5.
+struct Square {
+    pod::Vec3 place;
+    bool facesDown = false, skinned = false;
+};
+constexpr std::array<uint8_t, 4> kWeights = {100, 60, 80, 15};
+
+pod::Scene FloorAndSquare(const Square& wanted) {
     const auto square = [](float half) {
         pod::MeshArrays arrays;
         arrays.positions = {{-half, 0, half}, {half, 0, half}, {-half, 0, -half}, {half, 0, -half}};
         arrays.normals.assign(4, {0, 1, 0});
         arrays.uvs = {{0, 0}, {1, 0}, {0, 1}, {1, 1}};
         arrays.indices = {0, 1, 2, 2, 1, 3};
-        return pod::BuildMesh(arrays);
+        return arrays;
     };
-    pod::Scene scene = SceneOf(square(20));
-    scene.meshes.push_back(square(4));
-    if (facesDown) scene.meshes[1].faces = pod::IndexElement({0, 2, 1, 2, 3, 1});
-    scene.nodes.push_back(pod::BuildNode("square", {{place}, {}, {}, {}}, -1, 1, 0));
+    pod::MeshArrays caster = square(4);
+    if (wanted.facesDown) caster.indices = {0, 2, 1, 2, 3, 1};
+    if (wanted.skinned) caster.boneIndices.assign(4, {0, 1, 2, 3});
+    if (wanted.skinned) caster.boneWeights.assign(4, kWeights);
+    pod::Scene scene = SceneOf(pod::BuildMesh(square(20)));
+    scene.meshes.push_back(wanted.skinned ? SkinnedMesh(caster, 4, pod::kUint8Norm, {{2, 3, 4, 5}}, {0})
+                                          : pod::BuildMesh(caster));
+    scene.nodes.push_back(pod::BuildNode("square", {{wanted.place}, {}, {}, {}}, -1, 1, 0));
+    for (int i = 0; i < 4; ++i) scene.nodes.push_back(pod::BuildNode("bone", {}));
     scene.meshNodeCount = 2;
     return scene;
 }
@@ -86,20 +98,27 @@ const Rgba kLit = {255, 255, 255, 255};
 
 // Light straight down, and light that moves a shadow of height 10 by 5 to the east.
 TEST_F(ShadowTest, FallsWhereTheGeometrySays) {
+    const glm::vec3 moves[] = {{6, 0, 3}, {-8, 0, 1}, {5, 0, -9}, {99, 0, 99}};  // of the bones
     const struct {
         QexVec3 direction;
-        pod::Vec3 square;
+        Square square;
         glm::vec3 centre;
     } cases[] = {
-        {{0, -1, 0}, {0, 10, 0}, {0, 0, 0}},
-        {{1, -2, 0}, {0, 10, 0}, {5, 0, 0}},
-        {{0, -2, 1}, {-6, 10, -4}, {-6, 0, 1}},
+        {{0, -1, 0}, {{0, 10, 0}}, {0, 0, 0}},
+        {{1, -2, 0}, {{0, 10, 0}}, {5, 0, 0}},
+        {{0, -2, 1}, {{-6, 10, -4}}, {-6, 0, 1}},
         // Above the camera, between the light and the view.
-        {{0, -1, 0}, {5, 70, 3}, {5, 0, 3}},
+        {{0, -1, 0}, {{5, 70, 3}}, {5, 0, 3}},
+        // Only the first three bones of a vertex count.
+        {{0, -1, 0},
+         {{1, 10, 2}, false, true},
+         glm::vec3(1, 0, 2) + (100.0f * moves[0] + 60.0f * moves[1] + 80.0f * moves[2]) / 240.0f},
     };
     for (const auto& c : cases) {
         LoadedModel model(FloorAndSquare(c.square));
         ASSERT_EQ(model.log, "");
+        for (uint32_t i = 0; i < 4; ++i)
+            QexModel_SetNodePosition(&model.model, 2 + i, moves[i].x, moves[i].y, moves[i].z);
         const Picture picture = Floor(model, c.direction, {0, 1});
         EXPECT_EQ(drawn_, 2u);
         const float light =
@@ -116,7 +135,7 @@ TEST_F(ShadowTest, FallsWhereTheGeometrySays) {
 }
 
 TEST_F(ShadowTest, WithoutCastersNothingIsDark) {
-    LoadedModel model(FloorAndSquare({0, 10, 0}));
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
     const Picture plain = Floor(model, {0, -1, 0}, {0});
     EXPECT_EQ(At(plain, {0, 0, 0}), kLit) << "a surface does not shade itself";
     for (const auto& list : std::vector<std::vector<int32_t>>{{}, {7, -1}}) {
@@ -124,7 +143,7 @@ TEST_F(ShadowTest, WithoutCastersNothingIsDark) {
         EXPECT_EQ(drawn_, 0u);
     }
     // Out of the view to the side, and switched off.
-    LoadedModel aside(FloorAndSquare({400, 10, 0}));
+    LoadedModel aside(FloorAndSquare({{400, 10, 0}}));
     EXPECT_TRUE(SamePicture(Floor(aside, {0, -1, 0}, {1}), plain));
     EXPECT_EQ(drawn_, 0u);
     model.Node(1).stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
@@ -141,7 +160,7 @@ TEST_F(ShadowTest, TheHookLeavesHoles) {
     const uint8_t texels[] = {255, 0, 0, 255, 0, 0, 0, 255};
     ScopedTexture half(2, 1, texels);
     g_halfHole = &half;
-    LoadedModel model(FloorAndSquare({0, 10, 0}));
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
     model.model.bindTextureHook = BindHole;
     const Picture picture = Floor(model, {0, -1, 0}, {1});
     EXPECT_EQ(At(picture, {2, 0, 0}), kLit);
@@ -149,7 +168,7 @@ TEST_F(ShadowTest, TheHookLeavesHoles) {
 }
 
 TEST_F(ShadowTest, CallsAndStateOfThePass) {
-    LoadedModel model(FloorAndSquare({0, 10, 0}));
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
     QexModel_UpdateModelBoundingBox(&model.model, nullptr);
     const QexShadowCaster all = {&model.model, 1, nullptr, 0};
     const QexVec3 down = {0, -1, 0};
@@ -198,83 +217,58 @@ class ReflectionTest : public RenderTest {
     QexCamera camera_;
 };
 
+// The square hangs over the middle of the floor, and so far aside that its image lies partly beside the
+// floor.
 TEST_F(ReflectionTest, ShowsTheMirroredSceneWithinThePlane) {
     ScopedTexture green({0, 255, 0, 255});
-    LoadedModel model(FloorAndSquare({0, 6, 0}, true));
-    model.model.textures[0] = &green;
-    EXPECT_EQ(model.log, "");
     const glm::mat4 mirror = glm::scale(glm::mat4(1), {1, -1, 1});
     const QexMatrix mirrored = ToQex(mirror);
-    const QexShadowCaster all = {&model.model, 1, nullptr, 0};
-    for (const bool stencil : {false, true}) {
-        QexReflection* reflection = QexReflection_InitReflectionInfo(&model.model, 0, &all, 1, stencil);
-        ASSERT_TRUE(reflection);
-        EXPECT_TRUE(SameMatrix(reflection->reflectionMatrix.m, mirror));
-        // The plane itself stays unseen here, so that the picture is that of the mirrored square alone.
-        model.Node(0).shader = nullptr;
-        Begin();
-        QexRenderer_SetBackFaceCulling(0);
-        QexModel_RenderNodeWithViewProjection(&model.model, 1, nullptr, &mirrored, &camera_.viewMatrix,
-                                              &camera_.projectionMatrix);
-        const Picture direct = Read();
-        Begin();
-        QexReflection_RenderReflection(reflection, nullptr, &camera_);
-        const Picture picture = Read();
-        EXPECT_TRUE(SamePicture(picture, direct));
-        EXPECT_FALSE(model.Node(0).stateFlags & QEX_NODE_RENDERING_ENABLED);
-        EXPECT_FALSE(glIsEnabled(GL_STENCIL_TEST));
-        int shown = 0;
-        for (int i = 0; i < kWidth * kHeight; ++i) shown += picture.Pixel(i % kWidth, i / kWidth)[1] == 255;
-        EXPECT_GT(shown, 50);
-        QexReflection_Release(reflection);
-    }
-}
-
-TEST_F(ReflectionTest, StencilKeepsTheImageInsideThePlane) {
-    ScopedTexture green({0, 255, 0, 255});
-    // The square hangs so far aside that its image lies partly beside the floor.
-    LoadedModel model(FloorAndSquare({24, 6, 0}, true));
-    model.model.textures[0] = &green;
     int32_t square = 1;
-    const QexShadowCaster listed = {&model.model, 0, &square, 1};
-    int inside[2] = {}, outside[2] = {};
-    for (const bool stencil : {false, true}) {
-        QexReflection* reflection = QexReflection_InitReflectionInfo(&model.model, 0, &listed, 1, stencil);
-        // Where the floor is.
-        model.Node(0).stateFlags |= QEX_NODE_RENDERING_ENABLED;
-        Begin();
-        QexRenderer_SetBackFaceCulling(0);
-        QexModel_RenderNodeWithViewProjection(&model.model, 0, nullptr, nullptr, &camera_.viewMatrix,
-                                              &camera_.projectionMatrix);
-        const Picture floor = Read();
-        QexShaderModule* own = model.Node(0).shader;
-        Begin();
-        if (stencil)
-            QexModel_RenderReflectionPlaneStencil(&model.model, 0, nullptr, nullptr, &camera_.viewMatrix,
+    for (const bool aside : {false, true}) {
+        LoadedModel model(FloorAndSquare({{aside ? 24.0f : 0, 6, 0}, true}));
+        EXPECT_EQ(model.log, "");
+        model.model.textures[0] = &green;
+        const QexShadowCaster all = {&model.model, 1, nullptr, 0}, listed = {&model.model, 0, &square, 1};
+        const auto drawn = [&](uint32_t node, const QexMatrix* matrix) {
+            Begin();
+            QexRenderer_SetBackFaceCulling(0);
+            QexModel_RenderNodeWithViewProjection(&model.model, node, nullptr, matrix, &camera_.viewMatrix,
                                                   &camera_.projectionMatrix);
-        EXPECT_EQ(model.Node(0).shader, own);
-        QexModel_RenderNodeWithViewProjection(&model.model, 1, nullptr, &reflection->reflectionMatrix,
-                                              &camera_.viewMatrix, &camera_.projectionMatrix);
-        glDisable(GL_STENCIL_TEST);
-        const Picture picture = Read();
+            return Read();
+        };
+        const Picture floor = drawn(0, nullptr), image = drawn(1, &mirrored);
+        Picture within;
+        int inside = 0, outside = 0;
         for (int i = 0; i < kWidth * kHeight; ++i) {
             const int x = i % kWidth, y = i / kWidth;
-            if (picture.Pixel(x, y)[1] == 255) ++(floor.Pixel(x, y)[1] == 255 ? inside : outside)[stencil];
+            const bool onFloor = floor.Pixel(x, y)[1] == 255;
+            within.Fill(x, y, x + 1, y + 1, onFloor ? image.Pixel(x, y) : Rgba{0, 0, 255, 255});
+            if (image.Pixel(x, y)[1] == 255) ++(onFloor ? inside : outside);
         }
-        QexReflection_Release(reflection);
+        EXPECT_GT(inside, 20);
+        EXPECT_EQ(outside > 20, aside);
+        // The plane itself stays unseen here, so that the picture is that of the mirrored square alone.
+        model.Node(0).shader = nullptr;
+        for (const bool stencil : {false, true}) {
+            QexReflection* reflection =
+                QexReflection_InitReflectionInfo(&model.model, 0, aside ? &listed : &all, 1, stencil);
+            ASSERT_TRUE(reflection);
+            EXPECT_TRUE(SameMatrix(reflection->reflectionMatrix.m, mirror));
+            Begin();
+            QexReflection_RenderReflection(reflection, nullptr, &camera_);
+            EXPECT_TRUE(SamePicture(Read(), stencil ? within : image)) << aside;
+            EXPECT_FALSE(model.Node(0).stateFlags & QEX_NODE_RENDERING_ENABLED);
+            EXPECT_FALSE(glIsEnabled(GL_STENCIL_TEST));
+            QexReflection_Release(reflection);
+        }
+        const QexVec3 up = {0, 1, 0}, origin = {0, 0, 0};
+        QexReflection* endless = QexReflection_InitReflectionInfoInfinite(nullptr, &up, &origin, &listed, 1);
+        EXPECT_TRUE(SameMatrix(endless->reflectionMatrix.m, mirror));
+        Begin();
+        QexReflection_RenderReflection(endless, nullptr, &camera_);
+        EXPECT_TRUE(SamePicture(Read(), image)) << "there is no plane node";
+        QexReflection_Release(endless);
     }
-    EXPECT_GT(inside[0], 20);
-    EXPECT_GT(outside[0], 20);
-    EXPECT_EQ(inside[1], inside[0]);
-    EXPECT_EQ(outside[1], 0);
-    const QexVec3 up = {0, 1, 0}, origin = {0, 0, 0};
-    QexReflection* endless = QexReflection_InitReflectionInfoInfinite(nullptr, &up, &origin, &listed, 1);
-    const glm::vec4 below = glm::make_mat4(endless->reflectionMatrix.m) * glm::vec4(1, 2, 3, 1);
-    EXPECT_EQ(below, glm::vec4(1, -2, 3, 1));
-    model.Node(0).stateFlags |= QEX_NODE_RENDERING_ENABLED;
-    QexReflection_RenderReflection(endless, nullptr, &camera_);
-    EXPECT_TRUE(model.Node(0).stateFlags & QEX_NODE_RENDERING_ENABLED) << "there is no plane node";
-    QexReflection_Release(endless);
     QexReflection_Release(nullptr);
 }
 
