@@ -4,15 +4,17 @@
 
 #include "RenderFixture.h"
 
-static thread_local bool t_counting;
-static thread_local long t_made;
+const bool kAllocationsAreCounted = !QEX_SANITIZED;
 
-long CountAllocations(const std::function<void()>& code) {
-    t_made = 0;
+static thread_local bool t_counting;
+static thread_local Allocations t_counts;
+
+Allocations CountAllocations(const std::function<void()>& code) {
+    t_counts = {};
     t_counting = true;
     code();
     t_counting = false;
-    return t_made;
+    return t_counts;
 }
 
 #if !QEX_SANITIZED
@@ -23,20 +25,26 @@ extern "C" {
 void* __libc_malloc(size_t size);
 void* __libc_calloc(size_t count, size_t size);
 void* __libc_realloc(void* block, size_t size);
+void __libc_free(void* block);
 
 void* malloc(size_t size) {
-    t_made += t_counting;
+    if (t_counting) ++t_counts.made, ++t_counts.balance;
     return __libc_malloc(size);
 }
 
 void* calloc(size_t count, size_t size) {
-    t_made += t_counting;
+    if (t_counting) ++t_counts.made, ++t_counts.balance;
     return __libc_calloc(count, size);
 }
 
 void* realloc(void* block, size_t size) {
-    t_made += t_counting;
+    if (t_counting) ++t_counts.made, t_counts.balance += block ? 0 : 1;
     return __libc_realloc(block, size);
+}
+
+void free(void* block) {
+    if (t_counting && block) --t_counts.balance;
+    __libc_free(block);
 }
 
 }  // extern "C"

@@ -56,8 +56,12 @@ class GLCalls {
 std::string StateChange(const std::function<void()>& draw);
 std::string LiveObjects();
 
-// Blocks that the code took from the heap or moved; 0 under a sanitizer.
-long CountAllocations(const std::function<void()>& code);
+struct Allocations {
+    long made;     // blocks made or moved
+    long balance;  // blocks made less blocks freed
+};
+extern const bool kAllocationsAreCounted;
+Allocations CountAllocations(const std::function<void()>& code);
 
 // The lines of a log that report errors.
 std::string ErrorLines(const std::string& log);

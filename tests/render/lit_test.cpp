@@ -447,7 +447,7 @@ TEST_F(SteadyModuleTest, NoModuleAllocatesOrCreates) {
             module->render(module, &model.model, 0, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
                            &shadow);
         };
-        EXPECT_EQ(CountAllocations(draw), 0) << order.slots;
+        EXPECT_EQ(CountAllocations(draw).made, 0) << order.slots;
         EXPECT_EQ(gltapCount("glDrawElements"), 1u) << order.slots;
         EXPECT_EQ(LiveObjects(), live) << order.slots;
         order.release(&module);

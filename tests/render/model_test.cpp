@@ -5,6 +5,7 @@
 
 #include "PvrWriter.h"
 #include "Scenes.h"
+#include "scenes/Scenes.h"
 #include "support/Capture.h"
 
 namespace {
@@ -187,6 +188,47 @@ TEST_F(ModelTest, FailedLoadsKeepNothingAndTakeNothing) {
     Clear();
     other.Draw();
     EXPECT_EQ(Read().Pixel(60, 40), (Rgba{255, 255, 255, 255})) << "the other model lost its shaders";
+}
+
+// A normal map that leans everything towards the binormal, on a sphere in light from above, with and without
+// a mirrored texture. Normals of a file's own binormals must give what those made for it give.
+TEST_F(ModelTest, TangentsAloneGetBinormals) {
+    ScopedTexture leaning({128 + 76, 128, 128 + 102, 255});
+    const QexLightSet lights = {1, {{QEX_LIGHT_DIRECTIONAL, {0, -1, -0.5f}, {1, 1, 1, 1}}}};
+    QexShaderModule* module = QexGouraudNormalMapShader_CreateProgram();
+    static QexTexture* s_map;
+    const auto draw = [&](const pod::MeshArrays& arrays, QexTexture* map) {
+        LoadedModel model(SceneOf(pod::BuildMesh(arrays)));
+        for (int i = 0; i < 3; ++i) {
+            model.Material().diffuse[i] = 1;
+            model.Material().ambient[i] = 0;
+        }
+        model.Node().shader = module;
+        s_map = map;
+        if (map)
+            model.model.bindTextureHook = [](QexModel*, uint32_t) {
+                QexTexture_Set(s_map, 1);
+                return 0;
+            };
+        Clear();
+        const QexMatrix view = g_sMatIdentity, projection = PixelProjection();
+        QexModel_RenderWithViewProjection(&model.model, &lights, nullptr, &view, &projection, 0);
+        return Read();
+    };
+    pod::MeshArrays sphere = scenes::Sphere(12);
+    for (pod::Vec3& p : sphere.positions) p = {64 + 40 * p[0], 48 + 40 * p[1], 0.5f * p[2]};
+    for (const bool mirrored : {false, true}) {
+        pod::MeshArrays tangents = sphere;
+        for (size_t v = 0; mirrored && v < sphere.uvs.size(); ++v) {
+            tangents.uvs[v][0] = -sphere.uvs[v][0];
+            for (size_t i = 0; i < 3; ++i) tangents.tangents[v][i] = -sphere.tangents[v][i];
+        }
+        const Picture expected = draw(tangents, &leaning);
+        tangents.binormals.clear();
+        EXPECT_TRUE(SamePicture(draw(tangents, &leaning), expected, 1));
+        EXPECT_FALSE(SamePicture(draw(tangents, nullptr), expected, 1));
+    }
+    QexGouraudNormalMapShader_Release(&module);
 }
 
 class ModelMemoryTest : public NullRenderTest {
