@@ -192,7 +192,7 @@ QEX_INLINE Slope MakeSlope(const Word words[4], uint32_t pair, uint16_t width, L
 // alpha's 4; adding a 32nd or a 16th spreads them over 0 to 255: `factor` is 33 or 34.
 QEX_INLINE Lanes NextRow(Slope* slope, uint16_t shift, Lanes factor) {
     const Lanes row = ((slope->sum >> shift) * factor) >> 5;
-    slope->sum += slope->step;
+    slope->sum = slope->sum + slope->step;
     return row;
 }
 
@@ -219,6 +219,7 @@ template <uint32_t kWidth>
 void DecodeCell(const Image& image, int64_t x, int64_t y, const Word words[4]) {
     constexpr uint16_t kShift = kWidth == 8 ? 2 : 1;
     const Lanes columns = {0, 0, 1, 1, 2, 2, 3, 3};
+    const Lanes alphaOnly = QexLanes_Splat(0xFFFF0000u);
     const Lanes colour = QexLanes_Splat(33 | 33 << 16), alpha = QexLanes_Splat(33 | 34 << 16);
     uint64_t weights[4][kWidth / 2];
     CellWeights(words, weights);
@@ -231,10 +232,7 @@ void DecodeCell(const Image& image, int64_t x, int64_t y, const Word words[4]) {
             const Lanes a0 = NextRow(&slopes[0], kShift, colour), a1 = NextRow(&slopes[1], kShift, alpha);
             const Lanes b0 = NextRow(&slopes[2], kShift, colour), b1 = NextRow(&slopes[3], kShift, alpha);
             Lanes greenAlpha = Mix(a1, b1, weight & 15);
-            if (kWidth == 4) {
-                const Lanes flagged = QexLanes_Negative(weight << 8) & QexLanes_Splat(0xFFFF0000u);
-                greenAlpha &= ~flagged;
-            }
+            if (kWidth == 4) greenAlpha = greenAlpha & ~(QexLanes_Negative(weight << 8) & alphaOnly);
             StoreRow(image, x + column, y + row, Mix(a0, b0, weight & 15), greenAlpha);
         }
     }
