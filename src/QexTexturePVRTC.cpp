@@ -117,7 +117,8 @@ constexpr uint64_t InLanes(uint64_t first, uint64_t second) {
     return (first | second << 32) * 0x10001;
 }
 
-// The weights of two pixels of two bits each, by mode, in eighths. The second mode has a pixel without alpha.
+// The weights of two pixels of two bits each, by mode, in eighths. Mode 1 has kNoAlpha beside one of them:
+// that pixel is transparent.
 constexpr uint16_t kNoAlpha = 0x80;
 struct PairTable {
     uint64_t weights[2][16];
@@ -200,7 +201,7 @@ QEX_INLINE Lanes Mix(Lanes a, Lanes b, Lanes weights) {
     return (a * 8 + (b - a) * weights) >> 3;
 }
 
-// Four pixels of a row, those that are in the image. No cell is so far out that the sums overflow.
+// Four pixels of a row, those that are in the image.
 QEX_INLINE void StoreRow(const Image& image, int64_t x, int64_t y, Lanes redBlue, Lanes greenAlpha) {
     if (y < 0 || y >= image.height) return;
     uint8_t* row = image.pixels + 4 * static_cast<size_t>(y * image.width);
@@ -256,10 +257,6 @@ void Decode(const Grid& grid, const Image& image) {
     }
 }
 
-bool IsPowerOf2(int32_t size) {
-    return size > 0 && (size & (size - 1)) == 0;
-}
-
 }  // namespace
 
 void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t width, int32_t height,
@@ -267,7 +264,9 @@ void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t width, int3
     if (width < 1 || height < 1 || !destination) return;
     const uint64_t bytes = uint64_t{4} * static_cast<uint32_t>(width) * static_cast<uint32_t>(height);
     if (bytes > SIZE_MAX) return;
-    if (!source || !IsPowerOf2(width) || !IsPowerOf2(height)) {
+    const bool ordered = util_number_is_power_2(static_cast<uint32_t>(width)) &&
+                         util_number_is_power_2(static_cast<uint32_t>(height));
+    if (!source || !ordered) {
         memset(destination, 0, static_cast<size_t>(bytes));
         return;
     }
