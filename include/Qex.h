@@ -1854,6 +1854,15 @@ QEX_API int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, 
 QEX_API int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t ignored, uint32_t stage,
                                             uint32_t filter, uint32_t wrap, const void* tga);
 
+/** QexTexture_CreateTGAFromMem on an image of known length.
+ *  @param tga   the file
+ *  @param size  its bytes
+ *  @return as QexTexture_CreateTGAFromMem; -1, with a line in the log, when the image does not fit into them.
+ */
+QEX_API int32_t QexTexture_CreateTGAFromMemSized(QexTexture* texture, int32_t ignored, uint32_t stage,
+                                                 uint32_t filter, uint32_t wrap, const void* tga,
+                                                 uint32_t size);
+
 /** QexTexture_CreateTGAFromMem on a file, named after it (GetNameFromFullPath).
  *  @return 0 once the file could be opened, -1 when not. A file that is cut short or of another kind leaves
  *  the record without a GL texture (glName 0) and a line in the log. */
@@ -1931,30 +1940,51 @@ typedef struct QexPVRHeader {
     uint32_t numSurfaces;
 } QexPVRHeader;
 
-/** Loads a legacy PVR image, or a KTX 1.1 image, from memory.
+/** Loads a legacy PVR image, or a KTX 1.1 image, from memory. ETC1 goes to the GL as it is, or is decoded to
+ * RGB where the GL does not take it; PVRTC is decoded to RGBA. Where the header asks for mipmaps that the
+ * file lacks, the GL makes them, except for ETC1 that it takes as it is.
  *  @param texture     out; cleared by the caller: name, stage, filter and wrap are left alone
  *  @param file        the whole file; the caller vouches for its length
  *  @param header      out, the PVR header in its current form, or null
- *  @param decode      not read: no format is decoded in software
+ *  @param decode      0: PVRTC is refused
  *  @param firstLevel  levels above it are skipped; it becomes level 0
  *  @param pixelData   the pixels when they do not follow the header, or null
  *  @return 0; -1, with a line printed, for anything that cannot be loaded; a KTX image gives the result of
- *  QexTexture_LoadKTXFromMem. PVRTC types are refused as not supported. */
+ *  QexTexture_LoadKTXFromMem. */
 QEX_API int32_t QexTexture_LoadPVRFromMem(QexTexture* texture, const void* file, QexPVRHeader* header,
                                           int32_t decode, uint32_t firstLevel, const void* pixelData);
+
+/** QexTexture_LoadPVRFromMem on an image of known length: nothing is read past it.
+ *  @param size       bytes of `file`
+ *  @param pixelData  the pixels when they do not follow the header, or null; the caller vouches for their
+ *                    length
+ *  @return as QexTexture_LoadPVRFromMem; -1, with a line printed, also for an image that is cut short. */
+QEX_API int32_t QexTexture_LoadPVRFromMemSized(QexTexture* texture, const void* file, uint32_t size,
+                                               QexPVRHeader* header, int32_t decode, uint32_t firstLevel,
+                                               const void* pixelData);
 
 /** QexTexture_LoadPVRFromMem on a file; one that is shorter than its header says is refused.
  *  @return as that; -1, with nothing printed, when there is no such file. */
 QEX_API int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path, QexPVRHeader* header,
                                            int32_t decode, uint32_t firstLevel);
 
-/** Loads a KTX 1.1 image from memory: a compressed format that the GL takes as it is, or RGB / RGBA of bytes
- *  or of 16-bit pixels (565, 4444, 5551).
+/** Loads a KTX 1.1 image of either byte order from memory: a compressed format that the GL takes as it is,
+ * ETC1 on any GL, or RGB / RGBA of bytes or of 16-bit pixels (565, 4444, 5551). Rows may be padded to 4 bytes
+ * or tight. No filter is set, and GL's own asks for all mipmaps: those that the file lacks the GL makes,
+ * except for compressed formats that it takes as they are; a single level of those needs
+ * QexTexture_SetFilter.
  *  @param file  the whole file; the caller vouches for its length; the arguments after it are not read
  *  @return 0; -3 when it is no KTX 1.1; -4 for any other uncompressed format; -1, with a line printed, for
  *  sizes that cannot be or a compressed format that the GL does not take. */
 QEX_API int32_t QexTexture_LoadKTXFromMem(QexTexture* texture, const void* file, QexPVRHeader* header,
                                           int32_t decode, uint32_t firstLevel, const void* pixelData);
+
+/** QexTexture_LoadKTXFromMem on an image of known length: nothing is read past it.
+ *  @param size  bytes of `file`; the arguments after it are not read
+ *  @return as QexTexture_LoadKTXFromMem; -1, with a line printed, also for an image that is cut short. */
+QEX_API int32_t QexTexture_LoadKTXFromMemSized(QexTexture* texture, const void* file, uint32_t size,
+                                               QexPVRHeader* header, int32_t decode, uint32_t firstLevel,
+                                               const void* pixelData);
 
 /** QexTexture_LoadKTXFromMem on a file; one that is shorter than its levels is refused.
  *  @return as that; -1 when the file cannot be opened. */

@@ -57,6 +57,11 @@ class QexScratch {
         return block_ != nullptr;
     }
 
+    // Takes a block over, in place of the one it had.
+    void Own(T* block) {
+        QexMemory_Free(block_);
+        block_ = block;
+    }
     T* Take() {
         T* block = block_;
         block_ = nullptr;

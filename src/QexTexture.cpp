@@ -68,10 +68,6 @@ bool ReadFile(FILE* file, QexScratch<uint8_t>* data, uint64_t* size) {
     return data->Alloc(*size) && fread(data->Get(), 1, *size, file) == *size;
 }
 
-bool HoldsTGA(const uint8_t* data, uint64_t size) {
-    return size >= kTGAHeaderSize && kTGAHeaderSize + ReadTGAHeader(data).PixelBytes() <= size;
-}
-
 }  // namespace
 
 uint32_t QexTexture_Target(const QexTexture* texture) {
@@ -136,17 +132,30 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
     return 0;
 }
 
+int32_t QexTexture_CreateTGAFromMemSized(QexTexture* texture, int32_t ignored, uint32_t stage,
+                                         uint32_t filter, uint32_t wrap, const void* tga, uint32_t size) {
+    const uint8_t* file = static_cast<const uint8_t*>(tga);
+    const uint64_t needed =
+        size < kTGAHeaderSize ? kTGAHeaderSize : kTGAHeaderSize + ReadTGAHeader(file).PixelBytes();
+    if (file && needed <= size)
+        return QexTexture_CreateTGAFromMem(texture, ignored, stage, filter, wrap, tga);
+    memset(texture, 0, sizeof *texture);
+    QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %u bytes are not a whole uncompressed TGA image", size);
+    return -1;
+}
+
 int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint32_t stage, uint32_t filter,
                                      uint32_t wrap, const char* path) {
     FILE* file = fopen(path, "rb");
     if (!file) return -1;
     QexScratch<uint8_t> data;
     uint64_t size = 0;
-    if (ReadFile(file, &data, &size) && HoldsTGA(data.Get(), size)) {
-        QexTexture_CreateTGAFromMem(texture, ignored, stage, filter, wrap, data.Get());
+    if (ReadFile(file, &data, &size) && size <= UINT32_MAX) {
+        QexTexture_CreateTGAFromMemSized(texture, ignored, stage, filter, wrap, data.Get(),
+                                         static_cast<uint32_t>(size));
     } else {
         memset(texture, 0, sizeof *texture);
-        QexError(QEX_TAG, "<QexTexture_CreateTGAFromFile> %s is not a whole uncompressed TGA image", path);
+        QexError(QEX_TAG, "<QexTexture_CreateTGAFromFile> %s cannot be read", path);
     }
     fclose(file);
     const char* name = GetNameFromFullPath(path);

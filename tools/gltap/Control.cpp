@@ -100,6 +100,7 @@ void gltapReset(void) {
     gltapResetCounts();
     ForgetRecording();
     ForgetInjections();
+    ForgetPoorer();
     ForgetObjects();
     NullForgetPrograms();
     ResetState();

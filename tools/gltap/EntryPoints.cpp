@@ -79,9 +79,11 @@ template <Fn function, typename... A>
 inline typename Function<function>::Result Perform(A... arguments) {
     if constexpr (std::is_void_v<typename Function<function>::Result>) {
         Answer<function>(arguments...);
+        if constexpr (function == Fn::glGetIntegerv) MakePoorer(arguments...);
         Track(Tag<function>(), arguments...);
     } else {
-        const auto result = Answer<function>(arguments...);
+        auto result = Answer<function>(arguments...);
+        if constexpr (function == Fn::glGetString) result = MakePoorer(arguments..., result);
         Track(Tag<function>(), arguments..., result);
         return result;
     }

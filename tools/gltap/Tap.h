@@ -91,6 +91,11 @@ void ForgetRecording();
 void ForgetInjections();
 size_t ImageBytes(int64_t width, int64_t height, int64_t format, int64_t type, int64_t alignment);
 
+// Poorer.cpp: changes the answer of glGetIntegerv and of glGetString, where it is to.
+void MakePoorer(GLenum name, GLint* out);
+const GLubyte* MakePoorer(GLenum name, const GLubyte* text);
+void ForgetPoorer();
+
 // Text.cpp
 std::string EnumText(uint32_t value);
 std::string CallText(const gltapCall& call);

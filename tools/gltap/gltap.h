@@ -109,6 +109,14 @@ GLTAP_API int gltapInjectError(const char* function, uint32_t nth, uint32_t erro
 /* Injections that still wait for their call. */
 GLTAP_API size_t gltapPendingInjections(void);
 
+/* ---- A poorer GL ---- */
+
+/* From now on glGetIntegerv gives this value for a name: a limit lower than the driver's, or a number of
+ * compressed formats of 0, for example. What the driver takes stays the same. gltapReset forgets it. */
+GLTAP_API void gltapSetInteger(uint32_t name, int32_t value);
+/* Leaves an extension out of what glGetString(GL_EXTENSIONS) gives. gltapReset forgets it. */
+GLTAP_API void gltapHideExtension(const char* name);
+
 /* ---- Objects ---- */
 
 typedef enum gltapObject {
