@@ -76,8 +76,8 @@ bool QexTextureLoad_UploadDecodedETC(uint32_t target, int32_t level, uint32_t wi
 bool QexTexture_IsCompressedFormat(uint32_t internalFormat) {
     GLint count = 0;
     QEX_GL(glGetIntegerv(GL_NUM_COMPRESSED_TEXTURE_FORMATS, &count));
-    QexScratch<GLint> formats(count > 0 ? static_cast<uint64_t>(count) : 1);
-    if (!formats) return false;
+    QexScratch<GLint> formats;
+    if (count <= 0 || !formats.Alloc(static_cast<uint64_t>(count))) return false;
     QEX_GL(glGetIntegerv(GL_COMPRESSED_TEXTURE_FORMATS, formats.Get()));
     for (GLint i = 0; i < count; ++i)
         if (static_cast<uint32_t>(formats[static_cast<uint64_t>(i)]) == internalFormat) return true;

@@ -1,5 +1,6 @@
 // What a GL of less abilities answers to the questions after them.
 #include <map>
+#include <vector>
 
 #include "Tap.h"
 
