@@ -27,6 +27,16 @@ Outcome TryFile(const Bytes& file) {
     return Try([&](QexTexture* t) { return QexTexture_LoadPVRFromFile(t, memory.Path(), nullptr, 1, 0); });
 }
 
+// From a block of just that size.
+Outcome TrySized(const Bytes& file) {
+    const std::unique_ptr<uint8_t[]> block(new uint8_t[file.size()]);
+    std::copy(file.begin(), file.end(), block.get());
+    return Try([&](QexTexture* t) {
+        return QexTexture_LoadPVRFromMemSized(t, block.get(), static_cast<uint32_t>(file.size()), nullptr, 1,
+                                              0, nullptr);
+    });
+}
+
 Bytes File(uint32_t type, uint32_t width, uint32_t height, uint32_t levels = 1, uint32_t surfaces = 1) {
     return pod::WritePvr(PvrNoise(type, width, height, levels, surfaces));
 }
@@ -131,10 +141,8 @@ TEST_F(PvrLoader, RefusesWithItsLineAndWithoutATexture) {
         {"texture should be untwiddled.", {{kFlags, 0x12 | 0x200}}},
         {"pixel type OGL_RGB_555 not supported.", {{kFlags, 0x14}}},
         {"Unable to load GL_BGRA texture as extension GL_IMG_texture_format_BGRA8888 is un", {{kFlags, 0x1A}}},
-        {"PVRTC2 not supported.", {{kFlags, 0x0C}, {kBits, 2}}},
-        {"PVRTC2 not supported.", {{kFlags, 0x18}, {kBits, 2}}},
-        {"PVRTC4 not supported.", {{kFlags, 0x0D}, {kBits, 4}}},
-        {"PVRTC4 not supported.", {{kFlags, 0x19}, {kBits, 4}}},
+        {"texture should be untwiddled.", {{kFlags, 0x20D}, {kBits, 4}}},
+        {"PVRTC of a size that is no power of two.", {{kFlags, 0x19}, {kBits, 4}, {kWidth, 12}}},
         {"pixel type not supported.", {{kFlags, 0x37}}},
         {"bits per pixel do not fit the pixel type.", {{kBits, 16}}},
         {"0 x 8 pixels are not possible here", {{kWidth, 0}}},
@@ -160,9 +168,45 @@ TEST_F(PvrLoader, RefusesWithItsLineAndWithoutATexture) {
     EXPECT_EQ(TryMemory(File(0x12, 8, 8, 4), 4, nullptr).result, -1) << "no fifth level";
 }
 
+TEST_F(PvrLoader, PvrtcIsDecoded) {
+    for (const uint32_t flags : {0x0Cu, 0x0Du, 0x18u, 0x19u, 0x218u, 0x219u}) {
+        SCOPED_TRACE(flags);
+        const bool two = (flags & 0xFF) == 0x0C || (flags & 0xFF) == 0x18;
+        // Two words a side are the least that there is: of all levels but the first.
+        const pod::PvrImage image = PvrNoise(two ? pod::kPvrtc2 : pod::kPvrtc4, 32, 16, 6, 1);
+        Bytes file = pod::WritePvr(image);
+        PutWord(&file, kFlags, flags | 0x100);
+        const Outcome outcome = TryFile(file);
+        const std::string name = two ? "PVRTC2" : "PVRTC4";
+        EXPECT_EQ(outcome.result, 0) << outcome.out;
+        EXPECT_EQ(outcome.out.find("WARNING:<QexTexture_LoadPVRFromMem> " + name +
+                                   " not supported. Converting to RGBA8888 instead.\n"),
+                  0u);
+        EXPECT_EQ(outcome.texture.format, QEX_TEXFMT_RGBA8888);
+        EXPECT_EQ(outcome.texture.rowBytes, 32u * 4);
+        ASSERT_EQ(outcome.uploads.size(), 6u);
+        for (uint32_t level = 0; level < 6; ++level) {
+            const uint32_t width = 32 >> level, height = std::max(16u >> level, 1u);
+            Bytes decoded(size_t{width} * height * 4);
+            QexDecompressPVRTC(image.surfaces[0][level].data(), two, static_cast<int32_t>(width),
+                               static_cast<int32_t>(height), decoded.data());
+            ExpectUpload(outcome.uploads[level], false, 0, level, width, decoded);
+            EXPECT_EQ(outcome.uploads[level].format, GLenum(GL_RGBA));
+        }
+        const Outcome refused = Try(
+            [&](QexTexture* t) { return QexTexture_LoadPVRFromMem(t, file.data(), nullptr, 0, 0, nullptr); });
+        EXPECT_EQ(refused.result, -1);
+        EXPECT_EQ(refused.out.find("ERROR:<QexTexture_LoadPVRFromMem> " + name + " not supported.\n"), 0u);
+        EXPECT_EQ(refused.textures, 0u);
+    }
+}
+
 TEST_F(PvrLoader, NoCutAndNoWordIsTrusted) {
-    for (const Bytes& file : {File(0x10, 8, 4, 4), File(0x36, 4, 4, 2, 6), OldFile(0x15, 5, 3)})
+    for (const Bytes& file :
+         {File(0x10, 8, 4, 4), File(0x36, 4, 4, 2, 6), OldFile(0x15, 5, 3), File(0x19, 8, 8)}) {
         ExpectEveryCutRefused(file, TryFile, "ERROR:<QexTexture_LoadPVRFromMem> ");
+        ExpectEveryCutRefused(file, TrySized, "ERROR:<QexTexture_LoadPVRFromMem> ");
+    }
     ExpectNoWordTrusted(File(0x12, 4, 4, 3, 6), 0, 52, TryFile);
     for (const char* path : {"/nonexistent/x.pvr", "/"}) {
         const Outcome none =

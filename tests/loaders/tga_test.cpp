@@ -75,7 +75,7 @@ TEST_F(TgaLoader, OtherDepthsAndSizesGiveNoTexture) {
 
 TEST_F(TgaLoader, NoCutGivesATexture) {
     Bytes file = TgaFile(3, 2, 32, Noise(24));
-    ExpectEveryCutRefused(file, TryFile, "is not a whole uncompressed TGA image");
+    ExpectEveryCutRefused(file, TryFile, "are not a whole uncompressed TGA image");
     file[12] = file[13] = file[14] = file[15] = 0xFF;
     EXPECT_EQ(TryFile(file).textures, 0u);
 }
