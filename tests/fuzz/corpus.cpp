@@ -25,18 +25,26 @@ std::vector<Entry> Entries() {
     Bytes old = pod::WritePvr(PvrNoise(pod::kPvrRgb565, 5, 3, 1, 1));
     PutWord(&old, 0, 44);
     old.erase(old.begin() + 44, old.begin() + 52);
+    Ktx words = SoundKtx();
+    words.type = GL_UNSIGNED_SHORT_4_4_4_4;
+    words.levels = {{Noise(32)}, {Noise(8)}};
+    pod::Scene unbatched = everything::Scene();
+    unbatched.meshes[0].batchCount = unbatched.meshes[0].batchBoneMax = 0;
     return {
+        {"pod/unbatched", pod::WritePod(unbatched)},
         {"pod/everything", pod::WritePod(everything::Scene())},
         {"pod/empty", empty.bytes},
         {"pod/swapped", swapped.bytes},
         {"pvr/cube", pod::WritePvr(PvrNoise(pod::kPvrRgba4444, 4, 4, 3, 6))},
         {"pvr/etc1", pod::WritePvr(PvrNoise(pod::kPvrEtc1, 8, 8, 4, 1))},
         {"pvr/pvrtc2", pod::WritePvr(PvrNoise(pod::kPvrtc2, 16, 8, 5, 1))},
+        {"pvr/pvrtc4", pod::WritePvr(PvrNoise(pod::kPvrtc4, 16, 16, 5, 6))},
         {"pvr/la88", pod::WritePvr(PvrNoise(pod::kPvrLuminanceAlpha88, 16, 8, 5, 1))},
         {"pvr/old", old},
         {"pvr/ktx", SoundKtx().File()},
         {"ktx/levels", SoundKtx().File()},
         {"ktx/cube", CubeKtx().File()},
+        {"ktx/swapped", SwappedFile(words)},
         {"ktx/etc1", Etc1Ktx().File()},
         {"tga/rgb", TgaFile(3, 2, 24, Noise(18))},
         {"tga/rgba", TgaFile(2, 2, 32, Noise(16))},

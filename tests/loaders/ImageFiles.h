@@ -64,6 +64,25 @@ struct Ktx {
     }
 };
 
+// The file in the other byte order: words turned round, and pixels of 16 bits, but no bytes.
+inline Bytes SwappedFile(const Ktx& ktx) {
+    Bytes file = ktx.File();
+    const auto turn = [&](size_t at, size_t bytes) {
+        std::reverse(file.begin() + static_cast<long>(at), file.begin() + static_cast<long>(at + bytes));
+    };
+    for (size_t at = 12; at < 64; at += 4) turn(at, 4);
+    size_t at = 64 + ktx.keyValues.size();
+    for (const auto& level : ktx.levels) {
+        turn(at, 4);
+        at += 4;
+        for (const Bytes& face : level) {
+            for (size_t i = 0; ktx.type > GL_UNSIGNED_BYTE && i + 1 < face.size(); i += 2) turn(at + i, 2);
+            at += (face.size() + 3) / 4 * 4;
+        }
+    }
+    return file;
+}
+
 // Three levels and key/value data.
 inline Ktx SoundKtx() {
     Ktx ktx;
