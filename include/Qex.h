@@ -3279,6 +3279,82 @@ QEX_API void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_
                              uint32_t colour);
 
 /* ======================================================================================================
+ * Textures on the screen
+ *
+ * Images in pixels, drawn with the font's program: (x, y) is the upper left corner, y counts down from the
+ * upper edge of the surface that the font was created for. Blending, depth test and culling are left as the
+ * application set them; the arrays are the engine's own memory, so no buffer may be bound to GL_ARRAY_BUFFER
+ * or GL_ELEMENT_ARRAY_BUFFER. Where there is no font yet, one is created.
+ * ====================================================================================================== */
+
+/** A rectangle of texels; top and bottom count down from the image's upper edge, right and bottom belong to
+ * it. */
+typedef struct QexRect {
+    int32_t left, top, right, bottom;
+} QexRect;
+
+/** Draws a texture, or a part of it, texel by pixel at scale 1.
+ *  @param texture    its filter and wrap stay as they are; null: the default texture, one pixel at scale 1
+ *  @param rectangle  the part to draw; null, or without a texture: all of it, and one pixel more each way
+ *  @param colour     0xAARRGGBB, multiplies the texels
+ *  @return 0; what the log call returns when there is no font and it cannot be created */
+QEX_API int32_t QexTexture_Draw(const QexRuntimeContext* context, QexTexture* texture, float x, float y,
+                                const QexRect* rectangle, float scaleX, float scaleY, uint32_t colour);
+
+/** As QexTexture_Draw, with the red of a second texture as alpha.
+ *  @param texture       its filter becomes QEX_FILTER_LINEAR; null: the default texture
+ *  @param alphaTexture  sampled at the same coordinates; null: all opaque */
+QEX_API int32_t QexTexture_Draw2(const QexRuntimeContext* context, QexTexture* texture,
+                                 QexTexture* alphaTexture, float x, float y, const QexRect* rectangle,
+                                 float scaleX, float scaleY, uint32_t colour);
+
+/* ======================================================================================================
+ * Render targets
+ *
+ * Framebuffers to draw into instead of the screen, with an RGBA texture for colour and a 16-bit depth buffer.
+ * The record is the caller's. Targets do not follow the size of the screen.
+ * ====================================================================================================== */
+
+/** A render target. */
+typedef struct QexRenderTarget {
+    uint32_t created;        /* 1 after QexRenderTarget_Create */
+    uint32_t framebuffer;    /* GL name, 0 for none, as the two below */
+    QexTexture colorTexture; /* what was drawn; unfiltered, its format the GL enumerant GL_RGBA */
+    uint32_t depthRenderbuffer;
+    int32_t viewport[4];      /* x, y, width, height while it is drawn into */
+    int32_t savedViewport[4]; /* of before QexRenderTarget_BeginScene */
+    int32_t savedFramebuffer;
+} QexRenderTarget;
+
+/** Creates a target of that many pixels; whatever the record held is forgotten, not released. The framebuffer
+ * that is bound stays bound; unit 0 becomes active and keeps the new texture bound. A GL error is fatal.
+ *  @param ignored  not read
+ *  @return 0 */
+QEX_API int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t height,
+                                       int32_t ignored);
+
+/** Does nothing.
+ *  @return 0 */
+QEX_API int32_t QexRenderTarget_CreateFromTexture(QexRenderTarget* target, QexTexture* texture);
+
+/** Draws into the target from now on; framebuffer and viewport of before are kept for
+ * QexRenderTarget_EndScene. Pairs of different targets may nest.
+ *  @return 0 */
+QEX_API int32_t QexRenderTarget_BeginScene(QexRenderTarget* target);
+
+/** Goes back to the framebuffer and the viewport of before QexRenderTarget_BeginScene. */
+QEX_API void QexRenderTarget_EndScene(QexRenderTarget* target);
+
+/** Draws into the target from now on, or into the screen, with the whole of it as viewport. Nothing is kept.
+ *  @param context  its size is the screen's
+ *  @param target   null: the screen
+ *  @return 0 */
+QEX_API int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context, QexRenderTarget* target);
+
+/** Deletes the GL objects that are there. Null and a target that was released do nothing. */
+QEX_API void QexRenderTarget_Release(QexRenderTarget* target);
+
+/* ======================================================================================================
  * Engine: start and end
  *
  * The application owns window, surface and GL context; it makes the context current, initialises the engine
