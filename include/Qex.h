@@ -3223,17 +3223,13 @@ QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
  * ReplaceString and drawn every frame by QexFont_Draw; temporary strings and numbers are drawn at once. x
  * counts from the left edge of the surface, y downwards: a glyph covers the heights H + 16 - y to H + 32 - y
  * above the lower edge of a surface H pixels high, so at y = 32 it touches the upper edge. Characters outside
- * 32 to 127 are drawn as an empty box. Needs a current GL context, except where a function says not.
+ * 32 to 127 are drawn as an empty box. Each 64 glyphs are one draw. Needs a current GL context, except where
+ * a function says not.
  * ====================================================================================================== */
 
 /** The font sheet: RGBA8888, 256 x 48, first row first; 32 columns and 3 rows of cells 8 x 16 with the
  *  characters 32 to 127; white, alpha 0 or 255. */
 QEX_API extern const uint8_t fontdata[49152];
-
-/** Glyphs that the persistent text holds. */
-#define QEX_FONT_MAX_TEXT 64
-/** Characters of a temporary string that are drawn. */
-#define QEX_FONT_MAX_TEMP 16
 
 /** Creates the font for a surface of that size in pixels; the engine's initialisation calls it.
  *  @return 0 (also when it exists already), or -1 when the shaders or memory cannot be had. */
@@ -3248,8 +3244,8 @@ QEX_API void QexFont_ReleaseShader(int32_t ignored);
 /** Releases the font. @return the log call's result. */
 QEX_API int32_t QexFont_Release(void);
 
-/** Appends a string to the persistent text. What lies beyond QEX_FONT_MAX_TEXT glyphs is left out, with a
- * line in the log. Running out of memory ends the process with exit status 1. No GL context needed.
+/** Appends a string to the persistent text. Running out of memory ends the process with exit status 1. No GL
+ * context needed.
  *  @param context     the engine's context; its height is read
  *  @param x, y        pixels
  *  @param r, g, b, a  0 to 255
@@ -3269,7 +3265,8 @@ QEX_API void QexFont_ClearString(void);
  * (source alpha over), the depth function at less or equal. */
 QEX_API void QexFont_Draw(void);
 
-/** Draws a string at once, its first QEX_FONT_MAX_TEMP characters. Leaves the state that QexFont_Draw leaves.
+/** Draws a string at once. The longest so far decides how much memory is kept for it. Leaves the state that
+ * QexFont_Draw leaves.
  *  @param colour  0xAARRGGBB */
 QEX_API void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y,
                                     const char* string, uint32_t colour);

@@ -19,6 +19,8 @@ constexpr uint32_t kSheetColumns = 32;
 constexpr uint32_t kFirstCharacter = 32;
 constexpr uint32_t kLastCharacter = 127;
 constexpr uint32_t kInitialCapacity = 80;
+constexpr uint32_t kTemporaryCapacity = 16;
+constexpr uint32_t kStripGlyphs = 64;  // that byte indices reach
 
 const char* const kVertexSource = R"(#version 100
 attribute highp vec4 a_v4Position;
@@ -51,7 +53,8 @@ struct Colour {
     float r, g, b, a;
 };
 
-// Vertices of a text: four a glyph, and the strip that joins them.
+// Vertices of a text: four a glyph. The strip joins as many as one draw can show; further ones are drawn by
+// further strips of the same indices.
 struct Glyphs {
     float (*positions)[4][3];
     float (*texCoords)[4][2];
@@ -72,13 +75,17 @@ uint32_t IndexCount(uint32_t glyphs) {
     return glyphs * 6 - 2;
 }
 
+uint32_t FirstStrip(uint32_t glyphs) {
+    return glyphs < kStripGlyphs ? glyphs : kStripGlyphs;
+}
+
 // Makes room for that many glyphs; false when memory runs out.
 bool Reserve(Glyphs* glyphs, uint32_t count) {
     if (count <= glyphs->capacity) return true;
     if (!QexMemory_Resize(glyphs->positions, uint64_t{count} * sizeof *glyphs->positions) ||
         !QexMemory_Resize(glyphs->texCoords, uint64_t{count} * sizeof *glyphs->texCoords) ||
         !QexMemory_Resize(glyphs->colours, uint64_t{count} * sizeof *glyphs->colours) ||
-        !QexMemory_Resize(glyphs->indices, IndexCount(count)))
+        !QexMemory_Resize(glyphs->indices, IndexCount(FirstStrip(count))))
         return false;
     glyphs->capacity = count;
     return true;
@@ -96,7 +103,7 @@ void FreeGlyphs(Glyphs* glyphs) {
 // without area.
 void BuildIndices(Glyphs* glyphs) {
     uint8_t* out = glyphs->indices;
-    for (uint32_t glyph = 0; glyph < glyphs->count; ++glyph) {
+    for (uint32_t glyph = 0; glyph < FirstStrip(glyphs->count); ++glyph) {
         const uint8_t first = static_cast<uint8_t>(4 * glyph);
         if (glyph) {
             *out++ = static_cast<uint8_t>(first - 1);
@@ -139,19 +146,8 @@ Colour FromBytes(int32_t r, int32_t g, int32_t b, int32_t a) {
             static_cast<float>(a) / 255.0f};
 }
 
-// Glyphs of the persistent text from `slot` on that a string of that length may use.
-uint32_t FitText(const char* function, uint32_t slot, uint32_t length) {
-    const uint32_t room = QEX_FONT_MAX_TEXT - slot;
-    if (length <= room) return length;
-    QexError(QEX_TAG, "<%s> the text is limited to %d glyphs, %u are left out", function, QEX_FONT_MAX_TEXT,
-             length - room);
-    return room;
-}
-
-void EnableArray(int32_t location, GLint size, const void* data) {
-    const GLuint index = static_cast<GLuint>(location);
-    QEX_GL(glEnableVertexAttribArray(index));
-    QEX_GL(glVertexAttribPointer(index, size, GL_FLOAT, GL_FALSE, 0, data));
+void PointAt(int32_t location, GLint size, const void* data) {
+    QEX_GL(glVertexAttribPointer(static_cast<GLuint>(location), size, GL_FLOAT, GL_FALSE, 0, data));
 }
 
 void SetState() {
@@ -166,14 +162,17 @@ void BindTextures() {
 }
 
 void DrawGlyphs(const Glyphs& glyphs) {
-    EnableArray(s_Program.position, 3, glyphs.positions);
-    EnableArray(s_Program.colour, 4, glyphs.colours);
-    EnableArray(s_Program.texCoord, 2, glyphs.texCoords);
-    QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, static_cast<GLsizei>(IndexCount(glyphs.count)), GL_UNSIGNED_BYTE,
-                          glyphs.indices));
-    QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(s_Program.position)));
-    QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(s_Program.colour)));
-    QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(s_Program.texCoord)));
+    const int32_t arrays[] = {s_Program.position, s_Program.colour, s_Program.texCoord};
+    for (const int32_t array : arrays) QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(array)));
+    for (uint32_t first = 0; first < glyphs.count; first += kStripGlyphs) {
+        PointAt(s_Program.position, 3, glyphs.positions + first);
+        PointAt(s_Program.colour, 4, glyphs.colours + first);
+        PointAt(s_Program.texCoord, 2, glyphs.texCoords + first);
+        QEX_GL(glDrawElements(GL_TRIANGLE_STRIP,
+                              static_cast<GLsizei>(IndexCount(FirstStrip(glyphs.count - first))),
+                              GL_UNSIGNED_BYTE, glyphs.indices));
+    }
+    for (const int32_t array : arrays) QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(array)));
 }
 
 void CreateTexture() {
@@ -208,7 +207,7 @@ int32_t QexFont_Create(int32_t width, int32_t height) {
         QexFont_ReleaseShader(1);
         return -1;
     }
-    if (!Reserve(&s_Text, kInitialCapacity) || !Reserve(&s_Temporary, QEX_FONT_MAX_TEMP)) {
+    if (!Reserve(&s_Text, kInitialCapacity) || !Reserve(&s_Temporary, kTemporaryCapacity)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         FreeGlyphs(&s_Text);
         FreeGlyphs(&s_Temporary);
@@ -262,7 +261,7 @@ int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y
     if (!CheckCreated("QexFont_AddString")) return 0;
     const uint32_t length = static_cast<uint32_t>(strlen(string));
     const uint32_t slot = s_Text.count;
-    const uint32_t count = slot + FitText("QexFont_AddString", slot, length);
+    const uint32_t count = slot + length;
     if (!Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         exit(1);
@@ -277,13 +276,12 @@ int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32
                               int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_ReplaceString")) return 0;
     const uint32_t length = static_cast<uint32_t>(strlen(string));
-    const uint32_t count = FitText("QexFont_ReplaceString", 0, length);
     s_Text.count = 0;
-    if (!Reserve(&s_Text, count)) {
+    if (!Reserve(&s_Text, length)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return static_cast<int32_t>(length);
     }
-    s_Text.count = count;
+    s_Text.count = length;
     BuildIndices(&s_Text);
     WriteString(&s_Text, 0, context, x, y, string, FromBytes(r, g, b, a));
     return static_cast<int32_t>(length);
@@ -306,9 +304,12 @@ void QexFont_Draw(void) {
 void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                             uint32_t colour) {
     if (!CheckCreated("QexFont_DrawTempString")) return;
-    const size_t length = strlen(string);
-    s_Temporary.count = static_cast<uint32_t>(length < QEX_FONT_MAX_TEMP ? length : QEX_FONT_MAX_TEMP);
+    s_Temporary.count = static_cast<uint32_t>(strlen(string));
     if (!s_Temporary.count) return;
+    if (!Reserve(&s_Temporary, s_Temporary.count)) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return;
+    }
     BuildIndices(&s_Temporary);
     WriteString(&s_Temporary, 0, context, x, y, string,
                 FromBytes(colour >> 16 & 0xFF, colour >> 8 & 0xFF, colour & 0xFF, colour >> 24 & 0xFF));

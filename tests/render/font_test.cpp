@@ -103,11 +103,12 @@ TEST_F(FontTest, PersistentTextIsBuiltUp) {
     EXPECT_EQ(IndexCounts(QexFont_Draw), "");
 
     const std::string seventy(70, 'o');
-    Capture log(STDERR_FILENO);
-    EXPECT_EQ(Add(0, 32, seventy.c_str()), 70);
-    EXPECT_EQ(log.Text(), "E/Qex: <QexFont_AddString> the text is limited to 64 glyphs, 6 are left out\n");
-    EXPECT_EQ(IndexCounts(QexFont_Draw), "382 ");
-    EXPECT_EQ(IndexCounts([&] { Temporary(0, 32, seventy); }), "94 ");
+    EXPECT_EQ(Add(-500, 40, seventy.c_str()), 70);
+    expected = background_;
+    Stamp(&expected, -500, 40, seventy, {255, 128, 0, 255});
+    EXPECT_TRUE(SamePicture(Drawn(QexFont_Draw), expected, 1));
+    EXPECT_EQ(IndexCounts(QexFont_Draw), "382 34 ");
+    EXPECT_EQ(IndexCounts([&] { Temporary(-500, 40, seventy); }), "382 34 ");
     EXPECT_EQ(IndexCounts([&] { Temporary(0, 32, ""); }), "");
 }
 

@@ -318,8 +318,6 @@ int Renderer::Run() {
             DrawText();
             quiet.Stop();
             if (!reason.empty()) fprintf(stderr, "qex render: warning: %s\n", reason.c_str());
-            for (const std::string& line : quiet.Messages("left out"))
-                if (i == 0) fprintf(stderr, "qex render: warning: %s\n", line.c_str());
         }
         drawTime_ += Milliseconds(start);
         char number[32] = "";

@@ -183,7 +183,7 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     app->add_option("--turn", options->turn, "N pictures of one turn around the scene")
         ->check(CLI::Range(1, 10000));
     AddParsed(app, "--background", "RRGGBB (404858)", options, ParseColour);
-    app->add_option("--text", options->text, "line of text on the picture, at most 64 characters");
+    app->add_option("--text", options->text, "line of text on the picture");
     AddParsed(app, "--shader", "module to draw with: " + ShaderNames(), options, ParseShader);
     AddRepeated(app, "--light", "X,Y,Z[,RRGGBB], a point light instead of the scene's; up to 4", options,
                 ParseLight);
