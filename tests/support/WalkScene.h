@@ -1,6 +1,4 @@
-// Uses everything in a scene that drawing would use, so that whatever the reader let through shows: world
-// matrices at frames in and beyond the animation, cameras, lights, planes, boxes, every element of every
-// vertex, every index and every bone.
+// Reads a loaded scene as drawing would.
 #pragma once
 
 #include <cmath>
@@ -8,6 +6,29 @@
 
 #include "Qex.h"
 
+// An element's value at a vertex, wherever the mesh keeps it.
+inline QexVec4 VertexValue(const QexPODMesh& mesh, const CPODData& element, uint64_t vertex) {
+    const uint8_t* first =
+        mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
+    QexVec4 value;
+    QexPODVertex_ReadVec(&value.x, first + vertex * element.stride, element.type,
+                         static_cast<int32_t>(element.componentCount));
+    return value;
+}
+
+// The vertex of the i-th corner of a mesh's triangles or strips.
+inline uint32_t VertexOfCorner(const QexPODMesh& mesh, uint32_t i) {
+    uint32_t index = i;
+    if (mesh.faces.data)
+        QexPODVertex_ReadInt(&index,
+                             mesh.faces.data + (mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4u : 2u) * i,
+                             mesh.faces.type);
+    return index;
+}
+
+// Uses everything in a scene that drawing would use, so that whatever the reader let through shows: world
+// matrices at frames in and beyond the animation, cameras, lights, planes, boxes, every element of every
+// vertex, every index and every bone.
 class SceneWalk {
   public:
     // Null when all is well, else what a frame would have stumbled over.
@@ -77,29 +98,11 @@ class SceneWalk {
             Require(IsNoneOrOf(*i, scene_->textureCount), "a material's texture");
     }
 
-    static const uint8_t* Data(const QexPODMesh& mesh, const CPODData& element, uint64_t vertex) {
-        const uint8_t* first =
-            mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
-        return first + vertex * element.stride;
-    }
-
     void WalkElement(const QexPODMesh& mesh, const CPODData& element) {
-        if (!element.componentCount) return;
-        for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
-            float value[4];
-            QexPODVertex_ReadVec(value, Data(mesh, element, v), element.type,
-                                 static_cast<int32_t>(element.componentCount));
-            Add(value, 4);
+        for (uint32_t v = 0; element.componentCount && v < mesh.vertexCount; ++v) {
+            const QexVec4 value = VertexValue(mesh, element, v);
+            Add(&value.x, 4);
         }
-    }
-
-    uint32_t Index(const QexPODMesh& mesh, uint32_t i) const {
-        uint32_t index = i;
-        if (mesh.faces.data)
-            QexPODVertex_ReadInt(&index,
-                                 mesh.faces.data + (mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4u : 2u) * i,
-                                 mesh.faces.type);
-        return index;
     }
 
     void WalkMesh(const QexPODMesh& mesh) {
@@ -107,7 +110,8 @@ class SceneWalk {
         for (const CPODData* e = &mesh.colours; e <= &mesh.boneWeights; ++e) WalkElement(mesh, *e);
         for (uint32_t i = 0; i < mesh.uvwChannelCount; ++i) WalkElement(mesh, mesh.uvws[i]);
         const uint32_t count = QexPODModel_CountIndices(&mesh);
-        for (uint32_t i = 0; i < count; ++i) Require(Index(mesh, i) < mesh.vertexCount, "an index of a mesh");
+        for (uint32_t i = 0; i < count; ++i)
+            Require(VertexOfCorner(mesh, i) < mesh.vertexCount, "an index of a mesh");
         if (mesh.interleaved && mesh.vertices.type == QEX_POD_FLOAT && mesh.vertices.componentCount == 3) {
             QexBoundingBox box;
             QexBoundingBox_ComputeInterleaved(
@@ -146,12 +150,10 @@ class SceneWalk {
         const uint32_t end =
             batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
         for (uint32_t i = static_cast<uint32_t>(b.offsets[batch]) * 3; i < end * 3; ++i) {
-            float indices[4];
-            const auto count = static_cast<int32_t>(mesh.boneIndices.componentCount);
-            QexPODVertex_ReadVec(indices, Data(mesh, mesh.boneIndices, Index(mesh, i)), mesh.boneIndices.type,
-                                 count);
-            for (int32_t c = 0; c < count; ++c)
-                Require(indices[c] >= 0 && indices[c] < static_cast<float>(bones), "a vertex's bone");
+            const QexVec4 indices = VertexValue(mesh, mesh.boneIndices, VertexOfCorner(mesh, i));
+            for (uint32_t c = 0; c < mesh.boneIndices.componentCount; ++c)
+                Require((&indices.x)[c] >= 0 && (&indices.x)[c] < static_cast<float>(bones),
+                        "a vertex's bone");
         }
     }
 

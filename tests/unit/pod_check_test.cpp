@@ -70,7 +70,7 @@ const Refusal kRefusals[] = {
     {"2 batches of 3 bones, but shorter tables", [](Scene&, Mesh& m) { m.batchBoneMax = 3; }},
     {"-1 batches of 2 bones", [](Scene&, Mesh& m) { m.batchCount = -1; }},
     {"2147483647 batches of 2147483647 bones", [](Scene&, Mesh& m) { m.batchCount = m.batchBoneMax = INT32_MAX; }},
-    {"3 bone indices, but 2 weights a vertex", [](Scene&, Mesh& m) { m.boneWeights.components = 2; }},
+    {"4 bone indices, but 2 weights a vertex", [](Scene&, Mesh& m) { m.boneWeights.components = 2; }},
     // The second batch has one bone; vertex 4 follows its second.
     {"vertex 4 follows bone 1 of a batch of 1",
      [](Scene&, Mesh& m) { m.vertexBlock[4 * m.boneIndices.stride + m.boneIndices.offset] = 1; }},
