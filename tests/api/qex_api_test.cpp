@@ -1,40 +1,11 @@
-// The shared library as an application sees it: its symbols, and a run from start-up to shutdown.
-#include <dlfcn.h>
+// The shared library as an application sees it: a run from start-up to shutdown.
 #include <gtest/gtest.h>
 
-#include <fstream>
-#include <set>
-
 #include "gltap.h"
-#include "support/PodScenes.h"
+#include "Qex.h"
+#include "support/Capture.h"
 
 namespace {
-
-std::set<std::string> Exports() {
-    std::ifstream file(QEX_EXPORTS);
-    std::set<std::string> names;
-    for (std::string line; std::getline(file, line);)
-        if (!line.empty() && line[0] != '#') names.insert(line);
-    return names;
-}
-
-TEST(QexApi, EveryExportIsTheLibrarys) {
-    const auto names = Exports();
-    ASSERT_GT(names.size(), 300u);
-    void* library = dlopen(QEX_LIBRARY, RTLD_NOW);
-    ASSERT_NE(library, nullptr) << dlerror();
-    for (const std::string& name : names) {
-        void* symbol = dlsym(library, name.c_str());
-        Dl_info info = {};
-        ASSERT_TRUE(symbol && dladdr(symbol, &info)) << name;
-        EXPECT_NE(std::string(info.dli_fname).find("libqex"), std::string::npos)
-            << name << " in " << info.dli_fname;
-    }
-    // What the library keeps to itself cannot be found by the name that C would give it.
-    EXPECT_EQ(dlsym(library, "QexLoadPODModel_Check"), nullptr);
-    EXPECT_EQ(dlsym(library, "QexTexture_Target"), nullptr);
-    dlclose(library);
-}
 
 // Without a driver: the tap answers, and counts what is made and deleted.
 class QexRun : public testing::Test {

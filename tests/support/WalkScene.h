@@ -26,6 +26,13 @@ inline uint32_t VertexOfCorner(const QexPODMesh& mesh, uint32_t i) {
     return index;
 }
 
+inline int32_t BatchOfTriangle(const QexBoneBatches& batches, uint32_t triangle) {
+    int32_t batch = 0;
+    while (batch + 1 < batches.batchCount && batches.offsets[batch + 1] <= static_cast<int32_t>(triangle))
+        ++batch;
+    return batch;
+}
+
 // Uses everything in a scene that drawing would use, so that whatever the reader let through shows: world
 // matrices at frames in and beyond the animation, cameras, lights, planes, boxes, every element of every
 // vertex, every index and every bone.
@@ -134,26 +141,23 @@ class SceneWalk {
         if (mesh.interleaved && mesh.normals.componentCount)
             QexPODModel_GetNodePlaneNormal(scene_, index, at);
         Add(at, 3);
-        for (int32_t batch = 0; mesh.skinned && batch < mesh.boneBatches.batchCount; ++batch)
-            WalkBatch(&node, mesh, batch);
+        if (mesh.skinned) WalkBones(&node, mesh);
     }
 
-    void WalkBatch(QexPODNode* node, const QexPODMesh& mesh, int32_t batch) {
+    void WalkBones(QexPODNode* node, const QexPODMesh& mesh) {
         const QexBoneBatches& b = mesh.boneBatches;
-        const int32_t bones = b.bonesPerBatch[batch];
-        for (int32_t i = 0; i < bones; ++i) {
-            QexMatrix m;
-            QexPODModel_GetBoneWorldMatrix(scene_, &m, node,
-                                           &scene_->nodes[b.boneTable[batch * b.maxBones + i]]);
-            Add(m.m, 16);
-        }
-        const uint32_t end =
-            batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
-        for (uint32_t i = static_cast<uint32_t>(b.offsets[batch]) * 3; i < end * 3; ++i) {
+        for (int32_t batch = 0; batch < b.batchCount; ++batch)
+            for (int32_t i = 0; i < b.bonesPerBatch[batch]; ++i) {
+                QexMatrix m;
+                QexPODModel_GetBoneWorldMatrix(scene_, &m, node,
+                                               &scene_->nodes[b.boneTable[batch * b.maxBones + i]]);
+                Add(m.m, 16);
+            }
+        for (uint32_t i = 0; i < 3 * mesh.faceCount; ++i) {
+            const auto bones = static_cast<float>(b.bonesPerBatch[BatchOfTriangle(b, i / 3)]);
             const QexVec4 indices = VertexValue(mesh, mesh.boneIndices, VertexOfCorner(mesh, i));
             for (uint32_t c = 0; c < mesh.boneIndices.componentCount; ++c)
-                Require((&indices.x)[c] >= 0 && (&indices.x)[c] < static_cast<float>(bones),
-                        "a vertex's bone");
+                Require((&indices.x)[c] >= 0 && (&indices.x)[c] < bones, "a vertex's bone");
         }
     }
 

@@ -184,45 +184,6 @@ TEST_F(ForwardTap, FollowsTheStateThatTheDriverHas) {
     EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
 }
 
-TEST_F(NullTap, StateDifferencesAreNamed) {
-    gltapState before, after;
-    gltapGetState(&before);
-    glDepthFunc(GL_LEQUAL);
-    glActiveTexture(GL_TEXTURE2);
-    glBindTexture(GL_TEXTURE_2D, 9);
-    glEnableVertexAttribArray(1);
-    glBlendFunc(GL_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA);
-    gltapGetState(&after);
-    EXPECT_EQ(
-        "activeUnit: 0 -> 2\ntexture2D[2]: 0 -> 9\nattributeArrays: 0x0 -> 0x2\n"
-        "blendSource[0]: 1 -> GL_SRC_ALPHA\nblendSource[1]: 1 -> GL_SRC_ALPHA\n"
-        "blendDestination[0]: 0 -> GL_ONE_MINUS_SRC_ALPHA\n"
-        "blendDestination[1]: 0 -> GL_ONE_MINUS_SRC_ALPHA\ndepthFunc: GL_LESS -> GL_LEQUAL\n",
-        Text([&](char* text, size_t size) { return gltapDiffState(&before, &after, text, size); }));
-    EXPECT_EQ(0u, gltapDiffState(&after, &after, nullptr, 0));
-}
-
-TEST_F(NullTap, BuildsProgramsWithoutAContext) {
-    const GLuint shader = glCreateShader(GL_VERTEX_SHADER), program = glCreateProgram();
-    GLint compiled = 0, linked = 0;
-    glGetShaderiv(shader, GL_COMPILE_STATUS, &compiled);
-    glGetProgramiv(program, GL_LINK_STATUS, &linked);
-    EXPECT_TRUE(shader && program && compiled && linked);
-    const GLint color = glGetUniformLocation(program, "color");
-    EXPECT_NE(color, glGetUniformLocation(program, "matrix"));
-    EXPECT_EQ(color, glGetUniformLocation(program, "color"));
-    glBindAttribLocation(program, 0, "normal");
-    EXPECT_EQ(0, glGetAttribLocation(program, "normal"));
-    EXPECT_EQ(1, glGetAttribLocation(program, "position"));
-
-    EXPECT_EQ(GLenum(GL_FRAMEBUFFER_COMPLETE), glCheckFramebufferStatus(GL_FRAMEBUFFER));
-    // Rows of 3 bytes, padded to 4: seven bytes are written and no more.
-    GLubyte pixels[8] = {1, 1, 1, 1, 1, 1, 1, 1};
-    glReadPixels(0, 0, 1, 2, GL_RGB, GL_UNSIGNED_BYTE, pixels);
-    EXPECT_EQ(0, pixels[6]);
-    EXPECT_EQ(1, pixels[7]);
-}
-
 TEST_F(NullTap, RecordsCopiesThatReplayIdentically) {
     GLfloat matrix[16] = {1, 2.5f, -3};
     GLubyte image[2 * 2 * 3] = {10, 20, 30};
@@ -274,51 +235,6 @@ TEST_F(NullTap, RecordsCopiesThatReplayIdentically) {
     EXPECT_FALSE(gltapSameRecording(other.get(), first.get(), difference, sizeof(difference)));
     EXPECT_TRUE(Contains(difference, "call 0: glUniform4fv(0, 1, {1, 9, -3, 0}) | glUniformMatrix4fv(3, 1,"))
         << difference;
-}
-
-TEST_F(ForwardTap, InjectedErrorComesOnceAndTheCallIsNotCarriedOut) {
-    ASSERT_TRUE(gltapInjectError("glClear", 2, GL_OUT_OF_MEMORY));
-    glClearColor(1, 0, 0, 1);
-    glClear(GL_COLOR_BUFFER_BIT);
-    EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
-    glClearColor(0, 1, 0, 1);
-    glClear(GL_COLOR_BUFFER_BIT);
-    EXPECT_EQ(GLenum(GL_OUT_OF_MEMORY), glGetError());
-    EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
-    EXPECT_EQ((Rgba{255, 0, 0, 255}), PixelAt(context_->ReadPixels(), 0));
-    glClear(GL_COLOR_BUFFER_BIT);
-    EXPECT_EQ((Rgba{0, 255, 0, 255}), PixelAt(context_->ReadPixels(), 0));
-    EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
-    EXPECT_EQ(0u, gltapPendingInjections());
-    for (const char* name : {"glNothing", "glGetError"})
-        EXPECT_FALSE(gltapInjectError(name, 1, GL_INVALID_ENUM)) << name;
-}
-
-void CreateAndDelete() {
-    GLuint textures[3], buffer;
-    glGenTextures(3, textures);
-    glGenBuffers(1, &buffer);
-    const GLuint shader = glCreateShader(GL_FRAGMENT_SHADER), program = glCreateProgram();
-    uint32_t live[2] = {};
-    EXPECT_EQ(3u, gltapLiveObjects(GLTAP_TEXTURE, live, 2));
-    EXPECT_EQ(textures[1], live[1]);
-    const GLuint gone[] = {textures[0], 0, textures[2]};
-    glDeleteTextures(3, gone);
-    glDeleteShader(shader);
-    glDeleteProgram(program);
-    EXPECT_EQ(
-        "textures: 1 (" + std::to_string(textures[1]) + ")\nbuffers: 1 (" + std::to_string(buffer) + ")\n",
-        Text(gltapDescribeObjects));
-    glDeleteTextures(1, &textures[1]);
-    glDeleteBuffers(1, &buffer);
-    EXPECT_EQ("", Text(gltapDescribeObjects));
-}
-
-TEST_F(ForwardTap, AccountsForObjects) {
-    CreateAndDelete();
-}
-TEST_F(NullTap, AccountsForObjects) {
-    CreateAndDelete();
 }
 
 using GLTapPreload = FolderTest;

@@ -43,28 +43,24 @@ size_t ExpectSameTriangles(const std::vector<VertexBones>& vertices, const std::
         std::set<std::pair<uint32_t, std::array<uint8_t, 4>>> different;
         for (size_t v = 0; v < piece.sources.size(); ++v)
             EXPECT_TRUE(different.insert({piece.sources[v], piece.boneIndices.at(v)}).second);
-        for (size_t b = 0; b < piece.batchBones.size(); ++b) {
-            const std::vector<int32_t>& bones = piece.batchBones[b];
+        size_t next = 0;  // the batch behind that of the triangle
+        Triangle triangle;
+        for (size_t i = 0; i < piece.indices.size(); ++i) {
+            if (next < piece.batchBones.size() && i == 3 * size_t(piece.batchOffsets[next])) ++next;
+            const std::vector<int32_t>& bones = piece.batchBones.at(next - 1);
             EXPECT_LE(bones.size(), size_t(maxBones));
-            const size_t end = b + 1 < piece.batchBones.size() ? 3 * size_t(piece.batchOffsets[b + 1])
-                                                               : piece.indices.size();
-            EXPECT_LT(3 * size_t(piece.batchOffsets[b]), end);
-            for (size_t i = 3 * size_t(piece.batchOffsets[b]); i < end; i += 3) {
-                Triangle triangle;
-                for (size_t corner = 0; corner < 3; ++corner) {
-                    const uint32_t vertex = piece.indices.at(i + corner);
-                    const VertexBones& source = vertices[triangle[corner] = piece.sources.at(vertex)];
-                    for (size_t k = 0; k < 4; ++k) {
-                        const uint8_t local = piece.boneIndices[vertex][k];
-                        if (source.weights[k])
-                            EXPECT_EQ(uint32_t(bones.at(local)), source.bones[k]);
-                        else
-                            EXPECT_EQ(local, 0);
-                    }
-                }
-                out.insert(triangle);
+            const uint32_t vertex = piece.indices[i];
+            const VertexBones& source = vertices[triangle[i % 3] = piece.sources.at(vertex)];
+            for (size_t k = 0; k < 4; ++k) {
+                const uint8_t local = piece.boneIndices[vertex][k];
+                if (source.weights[k])
+                    EXPECT_EQ(uint32_t(bones.at(local)), source.bones[k]);
+                else
+                    EXPECT_EQ(local, 0);
             }
+            if (i % 3 == 2) out.insert(triangle);
         }
+        EXPECT_EQ(next, piece.batchBones.size()) << "a batch without triangles";
     }
     EXPECT_EQ(in, out);
     return batches;
@@ -212,11 +208,10 @@ size_t ExpectSkinned(QexPODModel* scene, float frame, const std::multimap<Place,
         const QexPODMesh& mesh = scene->meshes[node->objectIndex];
         const QexBoneBatches& batches = mesh.boneBatches;
         EXPECT_TRUE(mesh.skinned);
-        int32_t batch = 0;
         for (uint32_t i = 0; i < 3 * mesh.faceCount; ++i, ++count) {
-            while (batch + 1 < batches.batchCount && batches.offsets[batch + 1] <= int32_t(i / 3)) ++batch;
             const uint32_t vertex = VertexOfCorner(mesh, i);
-            const aiVector3D moved = Move(scene, node, &batches.boneTable[batch * batches.maxBones], vertex);
+            const int32_t* bones = &batches.boneTable[BatchOfTriangle(batches, i / 3) * batches.maxBones];
+            const aiVector3D moved = Move(scene, node, bones, vertex);
             const QexVec4 place = VertexValue(mesh, mesh.vertices, vertex);
             const auto [begin, end] = expected.equal_range({place.x, place.y, place.z});
             if (std::any_of(begin, end, [&, &at = moved](const auto& e) {
@@ -283,23 +278,17 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
 
 // Two triangles with an edge in common, which follow two bones; six vertices in the file.
 TEST_F(ConvertSkin, JoinsVerticesThatFollowTheSameBones) {
-    const float vertices[6][3] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}};
-    for (const uint8_t joint : {1, 0}) {
-        float matrices[2][16] = {}, weights[6][4] = {};
+    struct {
+        float vertices[6][3] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}};
+        QexMatrix matrices[2] = {g_sMatIdentity, g_sMatIdentity};
+        float weights[6][4] = {{1}, {1}, {1}, {1}, {1}, {1}};
         uint8_t joints[6][4] = {};
-        for (int b = 0; b < 2; ++b)
-            for (int i = 0; i < 4; ++i) matrices[b][5 * i] = 1;
-        for (int v = 0; v < 6; ++v) weights[v][0] = 1;
-        for (int v = 3; v < 6; ++v) joints[v][0] = joint;
-        Bytes bin;
-        const auto append = [&bin](const void* data, size_t size) {
-            const auto* bytes = static_cast<const uint8_t*>(data);
-            bin.insert(bin.end(), bytes, bytes + size);
-        };
-        append(vertices, sizeof vertices);
-        append(matrices, sizeof matrices);
-        append(weights, sizeof weights);
-        append(joints, sizeof joints);
+    } data;
+    static_assert(sizeof data == 320);
+    for (const uint8_t joint : {1, 0}) {
+        for (int v = 3; v < 6; ++v) data.joints[v][0] = joint;
+        Bytes bin(sizeof data);
+        std::memcpy(bin.data(), &data, sizeof data);
         WriteBytes(Path("s.bin"), bin);
         WriteText(Path("s.gltf"), R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0,1,2]}],
  "nodes":[{"mesh":0,"skin":0},{"name":"j0"},{"name":"j1"}],"skins":[{"joints":[1,2],"inverseBindMatrices":1}],
@@ -323,6 +312,14 @@ struct MadeBone {
     std::vector<std::pair<unsigned, float>> weights;
 };
 
+// The scene's records own arrays that they delete themselves.
+template <class T>
+T* Array(const std::vector<T>& values) {
+    T* array = new T[values.size()];
+    std::copy(values.begin(), values.end(), array);
+    return array;
+}
+
 std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& meshes) {
     auto scene = std::make_unique<aiScene>();
     const aiVector3D one(1, 1, 1);
@@ -343,28 +340,28 @@ std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& mes
         mesh->mName = "mesh" + std::to_string(m);
         mesh->mPrimitiveTypes = aiPrimitiveType_TRIANGLE;
         mesh->mNumVertices = 3;
-        mesh->mVertices =
-            new aiVector3D[3]{{1.0f + float(m), 0, 0}, {0, 1.0f + float(m), 0}, {0, 0, 1.0f + float(m)}};
+        const float size = 1 + float(m);
+        mesh->mVertices = Array<aiVector3D>({{size, 0, 0}, {0, size, 0}, {0, 0, size}});
         mesh->mNumFaces = 1;
         mesh->mFaces = new aiFace[1];
         mesh->mFaces[0].mNumIndices = 3;
-        mesh->mFaces[0].mIndices = new unsigned[3]{0, 1, 2};
-        mesh->mNumBones = unsigned(meshes[m].size());
-        mesh->mBones = new aiBone*[meshes[m].size()];
-        for (unsigned b = 0; b < meshes[m].size(); ++b) {
-            const MadeBone& from = meshes[m][b];
-            aiBone* bone = mesh->mBones[b] = new aiBone;
-            bone->mName = from.node;
-            bone->mOffsetMatrix = from.offset;
-            bone->mNumWeights = unsigned(from.weights.size());
-            bone->mWeights = new aiVertexWeight[from.weights.size()];
-            for (size_t k = 0; k < from.weights.size(); ++k)
-                bone->mWeights[k] = aiVertexWeight(from.weights[k].first, from.weights[k].second);
+        mesh->mFaces[0].mIndices = Array<unsigned>({0, 1, 2});
+        std::vector<aiBone*> bones;
+        for (const MadeBone& from : meshes[m]) {
+            std::vector<aiVertexWeight> weights;
+            for (const auto& [vertex, weight] : from.weights) weights.emplace_back(vertex, weight);
+            bones.push_back(new aiBone);
+            bones.back()->mName = from.node;
+            bones.back()->mOffsetMatrix = from.offset;
+            bones.back()->mNumWeights = unsigned(weights.size());
+            bones.back()->mWeights = Array(weights);
         }
+        mesh->mNumBones = unsigned(bones.size());
+        mesh->mBones = Array(bones);
         aiNode* holder =
             node(mesh->mName.C_Str(), scene->mRootNode, aiMatrix4x4(one, tilt, {0, 0, float(m)}));
         holder->mNumMeshes = 1;
-        holder->mMeshes = new unsigned[1]{m};
+        holder->mMeshes = Array<unsigned>({m});
     }
     // Over two seconds "a" turns and "b" moves.
     scene->mNumAnimations = 1;
