@@ -1,4 +1,4 @@
-/* The library from C: every exported symbol. */
+/* The library from C: every exported symbol, and a call. */
 #include <stdio.h>
 
 #include "Qex.h"
@@ -17,6 +17,7 @@ int main(void) {
 #undef QEX_EXPORT
     const size_t count = sizeof symbols / sizeof symbols[0];
     int failures = count < 300;
+    QexEngineConfig config = {0};
     size_t i, j;
     for (i = 0; i < count; ++i)
         for (j = 0; j < i; ++j)
@@ -24,5 +25,6 @@ int main(void) {
                 fprintf(stderr, "%s is %s\n", symbols[i].name, symbols[j].name);
                 ++failures;
             }
+    failures += QexEngine_Init(NULL, QEX_ENGINE_CONFIG_SIZE, &config) != -1;
     return failures != 0;
 }
