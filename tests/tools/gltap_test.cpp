@@ -130,7 +130,6 @@ TEST_F(GLTap, RecordsCopiesThatReplayIdentically) {
     GLfloat matrix[16] = {1, 2.5f, -3};
     GLubyte image[2 * 2 * 3] = {10, 20, 30};
     GLushort indices[3] = {0, 1, 2};
-    char name[] = "position";
     const GLchar* sources[] = {"void ma", "in() {}//"};
     const GLint lengths[] = {-1, 7};
     const Recording first = Record([&] {
@@ -141,11 +140,10 @@ TEST_F(GLTap, RecordsCopiesThatReplayIdentically) {
         glBufferData(GL_ARRAY_BUFFER, sizeof(image), image, GL_STATIC_DRAW);
         glDrawElements(GL_TRIANGLES, 3, GL_UNSIGNED_SHORT, indices);
         glShaderSource(8, 2, sources, lengths);
-        glBindAttribLocation(8, 1, name);
         glGetUniformLocation(8, "color");
         glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
     });
-    matrix[1] = name[0] = 0;
+    matrix[1] = 0;
     image[1] = 0;
     indices[2] = 0;
     const char* expected[] = {
@@ -156,7 +154,6 @@ TEST_F(GLTap, RecordsCopiesThatReplayIdentically) {
         "glBufferData(GL_ARRAY_BUFFER, 12, <12 bytes>, GL_STATIC_DRAW)",
         "glDrawElements(GL_TRIANGLES, 3, GL_UNSIGNED_SHORT, <6 bytes>)",
         "glShaderSource(8, 1, \"void main() {}\", NULL)",
-        "glBindAttribLocation(8, 1, \"position\")",
         "glGetUniformLocation(8, \"color\") = 0",
         "glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT)",
     };
