@@ -130,6 +130,16 @@ inline Outcome Try(const std::function<int32_t(QexTexture*)>& load, const QexTex
 // Loads a file of the given bytes.
 using TryFunction = Outcome (*)(const Bytes& file);
 
+// A file that is refused with a result and a line, without a texture.
+inline void ExpectRefused(const Bytes& file, TryFunction tryFile, int32_t result, const std::string& line) {
+    const Outcome outcome = tryFile(file);
+    EXPECT_EQ(outcome.result, result) << line;
+    EXPECT_EQ(outcome.textures, 0u) << line;
+    EXPECT_EQ(outcome.texture.glName, 0u) << line;
+    EXPECT_NE(outcome.out.find(line), std::string::npos) << line << "\n" << outcome.out;
+    EXPECT_EQ(outcome.out.empty(), line.empty()) << outcome.out;
+}
+
 // No beginning of a file is a texture, and each is refused with the line.
 inline void ExpectEveryCutRefused(const Bytes& file, TryFunction tryFile, const std::string& line) {
     for (size_t size = 0; size < file.size(); ++size) {
@@ -154,11 +164,27 @@ inline void ExpectNoWordTrusted(const Bytes& file, size_t begin, size_t end, Try
         }
 }
 
-// Uploads in the file's order: faces of a level, or levels of a face, are counted by the caller.
+// The upload of a level of a face with its bytes.
 inline void ExpectUpload(const Upload& upload, bool cube, size_t face, size_t level, uint32_t width,
                          const Bytes& data) {
     EXPECT_EQ(upload.target, cube ? GL_TEXTURE_CUBE_MAP_POSITIVE_X + face : GLenum(GL_TEXTURE_2D));
     EXPECT_EQ(upload.level, static_cast<GLint>(level));
     EXPECT_EQ(upload.width, static_cast<GLsizei>(width));
     EXPECT_EQ(upload.data, data);
+}
+
+// A single upload in a format, and what the record says of it: bytes a pixel, and a code.
+inline void ExpectFormat(const Outcome& outcome, GLenum format, GLenum type, int64_t alignment,
+                         uint32_t bytesPerPixel, uint32_t code) {
+    ASSERT_EQ(outcome.result, 0);
+    ASSERT_EQ(outcome.uploads.size(), 1u);
+    const Upload& u = outcome.uploads[0];
+    EXPECT_EQ(u.format, format);
+    EXPECT_EQ(u.type, type);
+    EXPECT_FALSE(u.mismatch);
+    EXPECT_EQ(u.alignment, alignment);
+    EXPECT_EQ(outcome.texture.bytesPerPixel, bytesPerPixel);
+    EXPECT_EQ(outcome.texture.format, code);
+    EXPECT_EQ(outcome.texture.rowBytes, bytesPerPixel * static_cast<uint32_t>(u.width));
+    EXPECT_EQ(outcome.textures, 1u);
 }

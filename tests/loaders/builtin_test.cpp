@@ -6,41 +6,6 @@ namespace {
 
 using BuiltInTextures = LoaderTest;
 
-GLuint Compile(GLenum kind, const char* source) {
-    const GLuint shader = glCreateShader(kind);
-    glShaderSource(shader, 1, &source, nullptr);
-    glCompileShader(shader);
-    return shader;
-}
-
-// Fills a size x size corner with the texture of unit 0, level of detail 0 at its own size; the corner's
-// pixels.
-Bytes Draw(GLsizei size) {
-    const GLuint vertex = Compile(GL_VERTEX_SHADER,
-                                  "attribute vec2 p; varying vec2 t;"
-                                  "void main() { t = p * 0.5 + 0.5; gl_Position = vec4(p, 0.0, 1.0); }");
-    const GLuint fragment = Compile(GL_FRAGMENT_SHADER,
-                                    "precision mediump float; varying vec2 t; uniform sampler2D s;"
-                                    "void main() { gl_FragColor = texture2D(s, t); }");
-    const GLuint program = glCreateProgram();
-    glAttachShader(program, vertex);
-    glAttachShader(program, fragment);
-    glBindAttribLocation(program, 0, "p");
-    glLinkProgram(program);
-    glUseProgram(program);
-    const float corners[] = {-1, -1, 3, -1, -1, 3};
-    glVertexAttribPointer(0, 2, GL_FLOAT, GL_FALSE, 0, corners);
-    glEnableVertexAttribArray(0);
-    glViewport(0, 0, size, size);
-    glDrawArrays(GL_TRIANGLES, 0, 3);
-    Bytes pixels(static_cast<size_t>(size * size * 4));
-    glReadPixels(0, 0, size, size, GL_RGBA, GL_UNSIGNED_BYTE, pixels.data());
-    glDeleteShader(vertex);
-    glDeleteShader(fragment);
-    glDeleteProgram(program);
-    return pixels;
-}
-
 TEST_F(BuiltInTextures, AreMadeOnceOfTwelveLevels) {
     ASSERT_EQ(QexTexture_IsETCSupported(), 1);
     std::string log;
@@ -66,14 +31,6 @@ TEST_F(BuiltInTextures, AreMadeOnceOfTwelveLevels) {
     EXPECT_EQ(calls.Parameter(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S), GLenum(GL_REPEAT));
     EXPECT_EQ(LiveTextures(), 2u);
 
-    for (const GLsizei size : {1, 4}) {
-        QexTexture_Set(nullptr, 0);
-        EXPECT_EQ(Draw(size), Bytes(static_cast<size_t>(4 * size * size), 255)) << "white";
-        QexTexture_SetBlankNormalMap(0);
-        const Bytes normal = Draw(size);
-        for (size_t i = 0; i < normal.size(); ++i)
-            EXPECT_EQ(normal[i], i % 4 < 2 ? 128 : 255) << "straight up";
-    }
     QexTexture_ReleaseDefault();
     QexTexture_ReleaseDefault();
     EXPECT_EQ(LiveTextures(), 0u);

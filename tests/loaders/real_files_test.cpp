@@ -1,33 +1,17 @@
-// Files that others made. QEX_REAL_FILES names a folder with scenes/ and textures/; without it these are
-// skipped.
-#include <algorithm>
-#include <cstdlib>
-#include <filesystem>
+// Files that others made; without them these tests are skipped.
 #include <fstream>
 #include <map>
-#include <sstream>
 
 #include "LoaderSupport.h"
+#include "support/RealFiles.h"
 #include "support/WalkScene.h"
 
 namespace {
 
-namespace fs = std::filesystem;
-
-std::vector<fs::path> Files(const fs::path& folder, const std::vector<std::string>& extensions) {
-    std::vector<fs::path> files;
-    if (fs::is_directory(folder))
-        for (const auto& entry : fs::recursive_directory_iterator(folder))
-            if (std::find(extensions.begin(), extensions.end(), entry.path().extension()) != extensions.end())
-                files.push_back(entry.path());
-    std::sort(files.begin(), files.end());
-    return files;
-}
-
-// What the folder's tables say about each file, all columns in one.
-std::map<std::string, std::string> Descriptions(const fs::path& folder) {
+// What tables beside the textures say about each file, all columns in one.
+std::map<std::string, std::string> Descriptions() {
     std::map<std::string, std::string> descriptions;
-    for (const fs::path& table : Files(folder, {".tsv"})) {
+    for (const std::string& table : RealFilesIn("textures", ".tsv")) {
         std::ifstream stream(table);
         for (std::string line; std::getline(stream, line);)
             descriptions[line.substr(0, line.find('\t'))] = line;
@@ -63,50 +47,46 @@ Fate Expected(const std::string& text) {
 class RealFiles : public LoaderTest {
   protected:
     void SetUp() override {
-        const char* folder = std::getenv("QEX_REAL_FILES");
-        if (!folder || !*folder) GTEST_SKIP() << "QEX_REAL_FILES names no folder of real scenes and textures";
-        folder_ = folder;
+        if (RealFilesIn("scenes", ".pod").empty())
+            GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";
         LoaderTest::SetUp();
     }
-    fs::path folder_;
 };
 
 TEST_F(RealFiles, ScenesLoadAndCanBeUsed) {
-    const auto files = Files(folder_ / "scenes", {".pod"});
-    ASSERT_FALSE(files.empty());
-    for (const fs::path& path : files) {
-        SCOPED_TRACE(path.filename());
+    for (const std::string& path : RealFilesIn("scenes", ".pod")) {
+        SCOPED_TRACE(path);
         std::ifstream stream(path, std::ios::binary);
-        const Bytes bytes((std::istreambuf_iterator<char>(stream)), {});
-        QexPODModel fromFile, fromMemory;
+        LoadedPod fromMemory(Bytes(std::istreambuf_iterator<char>(stream), {}));
+        QexPODModel fromFile;
         {
             BothOutputs quiet;
             QexPODModel_ReadFromFile(&fromFile, path.c_str(), 0, 0, 0, 0);
-            const auto size = static_cast<uint32_t>(bytes.size());
-            QexPODModel_ReadFromMemory(&fromMemory, bytes.data(), size, 0, 0, 0, 0);
         }
         EXPECT_NE(fromFile.runtime, nullptr);
-        EXPECT_NE(fromMemory.runtime, nullptr);
-        if (fromFile.runtime && fromMemory.runtime) {
-            const SceneWalk a(&fromFile), b(&fromMemory);
+        EXPECT_NE(fromMemory.scene.runtime, nullptr);
+        if (fromFile.runtime && fromMemory.scene.runtime) {
+            const SceneWalk a(&fromFile), b(&fromMemory.scene);
             EXPECT_EQ(a.fault, nullptr);
             EXPECT_EQ(a.sum, b.sum) << "from memory it is another scene";
             EXPECT_TRUE(std::isfinite(a.sum));
         }
         QexPODModel_Release(&fromFile);
-        QexPODModel_Release(&fromMemory);
     }
 }
 
 TEST_F(RealFiles, TexturesLoadAsTheirHeadersPromise) {
-    const auto files = Files(folder_ / "textures", {".pvr", ".ktx", ".tga"});
-    const auto descriptions = Descriptions(folder_ / "textures");
+    const auto descriptions = Descriptions();
+    std::vector<std::string> files;
+    for (const char* extension : {".pvr", ".ktx", ".tga"})
+        for (const std::string& file : RealFilesIn("textures", extension)) files.push_back(file);
     ASSERT_FALSE(files.empty());
-    for (const fs::path& path : files) {
-        const auto described = descriptions.find(path.filename());
+    for (const std::string& path : files) {
+        const std::string name = path.substr(path.rfind('/') + 1);
+        const auto described = descriptions.find(name);
         const std::string description = described == descriptions.end() ? "" : described->second;
-        SCOPED_TRACE(path.filename().string() + ": " + description);
-        const bool tga = path.extension() == ".tga";
+        SCOPED_TRACE(name + ": " + description);
+        const bool tga = name.substr(name.size() - 4) == ".tga";
         const Outcome outcome = Try([&](QexTexture* t) {
             if (!tga) return QexTexture_LoadPVRFromFile(t, path.c_str(), nullptr, 1, 0);
             return QexTexture_CreateTGAFromFile(t, 0, 0, QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, path.c_str());
@@ -114,7 +94,7 @@ TEST_F(RealFiles, TexturesLoadAsTheirHeadersPromise) {
         const bool loaded = outcome.texture.glName != 0;
         EXPECT_TRUE(tga || loaded == (outcome.result == 0)) << outcome.out;
         EXPECT_EQ(outcome.textures, loaded ? 1u : 0u);
-        const Fate fate = Expected(path.filename().string() + description);
+        const Fate fate = Expected(name + description);
         EXPECT_TRUE(fate == Fate::Either || loaded == (fate == Fate::Loads)) << outcome.out;
         const size_t size = description.find(" w=");
         if (!loaded || size == std::string::npos) continue;

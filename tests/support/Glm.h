@@ -11,9 +11,22 @@
 #include <glm/gtc/matrix_transform.hpp>
 #include <glm/gtc/quaternion.hpp>
 #include <glm/gtc/type_ptr.hpp>
+#include <random>
 #include <string>
 
 #include "Qex.h"
+
+// The same numbers in every run, evenly between -limit and limit.
+class Random {
+  public:
+    float operator()(float limit = 1) {
+        return std::uniform_real_distribution<float>(-limit, limit)(engine_);
+    }
+    glm::vec3 Vec3(float limit = 1) { return {(*this)(limit), (*this)(limit), (*this)(limit)}; }
+
+  private:
+    std::mt19937 engine_{42};
+};
 
 inline QexMatrix FromGlm(const glm::mat4& g) {
     QexMatrix m;

@@ -101,42 +101,27 @@ constexpr uint32_t kFrames = 4;
 enum Node { kSkinned, kPlain, kStrips, kSun, kLamp, kEye, kHip, kKnee, kMatrices, kIndexed, kOlder, kNodes };
 
 // Two triangles of three vertices each, a batch to each. Vertex v follows bone 0 of its batch, and in the
-// first batch half of it bone 1; the last bone index of a vertex has no weight and says 99.
+// first batch half of it bone 1; the third bone index of a vertex has no weight and says 99.
 inline pod::Mesh SkinnedMesh() {
+    using Byte4 = std::array<uint8_t, 4>;
     pod::MeshArrays arrays;
     for (int v = 0; v < 6; ++v) {
         const auto f = static_cast<float>(v);
         arrays.positions.push_back({f, f * 2 - 3, 1 / (f + 1)});
-        arrays.normals.push_back({0, 0, 1});
-        arrays.tangents.push_back({1, 0, 0});
-        arrays.binormals.push_back({0, 1, 0});
         arrays.uvs.push_back({f / 6, 1 - f / 6});
         arrays.colours.push_back({static_cast<uint8_t>(v), 20, 30, 255});
+        arrays.boneIndices.push_back({0, v < 3, 99, 0});
+        arrays.boneWeights.push_back(v < 3 ? Byte4{128, 127, 0, 0} : Byte4{255, 0, 0, 0});
     }
+    arrays.normals.assign(6, {0, 0, 1});
+    arrays.tangents.assign(6, {1, 0, 0});
+    arrays.binormals.assign(6, {0, 1, 0});
     arrays.indices = {0, 1, 2, 3, 4, 5};
     pod::Mesh mesh = pod::BuildMesh(arrays);
-
-    const uint32_t old = mesh.vertices.stride, stride = old + 4 + 12;
-    std::vector<uint8_t> block(6 * stride);
-    for (uint32_t v = 0; v < 6; ++v) {
-        uint8_t* vertex = block.data() + v * stride;
-        const float weights[3] = {v < 3 ? 0.5f : 1, v < 3 ? 0.5f : 0, 0};
-        const uint8_t bones[4] = {0, static_cast<uint8_t>(v < 3), 99, 0};
-        std::memcpy(vertex, mesh.vertexBlock.data() + v * old, old);
-        std::memcpy(vertex + old, bones, 4);
-        std::memcpy(vertex + old + 4, weights, 12);
-    }
-    mesh.vertexBlock = block;
-    for (pod::Element* e :
-         {&mesh.vertices, &mesh.normals, &mesh.tangents, &mesh.binormals, &mesh.uvw[0], &mesh.colours})
-        e->stride = stride;
-    mesh.boneIndices = {pod::kUint8, 3, stride, old, {}};
-    mesh.boneWeights = {pod::kFloat32, 3, stride, old + 4, {}};
     mesh.batchBones = {kHip, kKnee, kKnee, -1};
     mesh.bonesPerBatch = {2, 1};
     mesh.batchOffsets = {0, 1};
-    mesh.batchBoneMax = 2;
-    mesh.batchCount = 2;
+    mesh.batchBoneMax = mesh.batchCount = 2;
     return mesh;
 }
 

@@ -1,6 +1,4 @@
-// Uses everything in a scene that drawing would use, so that whatever the reader let through shows: world
-// matrices at frames in and beyond the animation, cameras, lights, planes, boxes, every element of every
-// vertex, every index and every bone.
+// Reads a loaded scene as drawing would.
 #pragma once
 
 #include <cmath>
@@ -8,6 +6,36 @@
 
 #include "Qex.h"
 
+// An element's value at a vertex, wherever the mesh keeps it.
+inline QexVec4 VertexValue(const QexPODMesh& mesh, const CPODData& element, uint64_t vertex) {
+    const uint8_t* first =
+        mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
+    QexVec4 value;
+    QexPODVertex_ReadVec(&value.x, first + vertex * element.stride, element.type,
+                         static_cast<int32_t>(element.componentCount));
+    return value;
+}
+
+// The vertex of the i-th corner of a mesh's triangles or strips.
+inline uint32_t VertexOfCorner(const QexPODMesh& mesh, uint32_t i) {
+    uint32_t index = i;
+    if (mesh.faces.data)
+        QexPODVertex_ReadInt(&index,
+                             mesh.faces.data + (mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4u : 2u) * i,
+                             mesh.faces.type);
+    return index;
+}
+
+inline int32_t BatchOfTriangle(const QexBoneBatches& batches, uint32_t triangle) {
+    int32_t batch = 0;
+    while (batch + 1 < batches.batchCount && batches.offsets[batch + 1] <= static_cast<int32_t>(triangle))
+        ++batch;
+    return batch;
+}
+
+// Uses everything in a scene that drawing would use, so that whatever the reader let through shows: world
+// matrices at frames in and beyond the animation, cameras, lights, planes, boxes, every element of every
+// vertex, every index and every bone.
 class SceneWalk {
   public:
     // Null when all is well, else what a frame would have stumbled over.
@@ -77,29 +105,11 @@ class SceneWalk {
             Require(IsNoneOrOf(*i, scene_->textureCount), "a material's texture");
     }
 
-    static const uint8_t* Data(const QexPODMesh& mesh, const CPODData& element, uint64_t vertex) {
-        const uint8_t* first =
-            mesh.interleaved ? mesh.interleaved + reinterpret_cast<uintptr_t>(element.data) : element.data;
-        return first + vertex * element.stride;
-    }
-
     void WalkElement(const QexPODMesh& mesh, const CPODData& element) {
-        if (!element.componentCount) return;
-        for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
-            float value[4];
-            QexPODVertex_ReadVec(value, Data(mesh, element, v), element.type,
-                                 static_cast<int32_t>(element.componentCount));
-            Add(value, 4);
+        for (uint32_t v = 0; element.componentCount && v < mesh.vertexCount; ++v) {
+            const QexVec4 value = VertexValue(mesh, element, v);
+            Add(&value.x, 4);
         }
-    }
-
-    uint32_t Index(const QexPODMesh& mesh, uint32_t i) const {
-        uint32_t index = i;
-        if (mesh.faces.data)
-            QexPODVertex_ReadInt(&index,
-                                 mesh.faces.data + (mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4u : 2u) * i,
-                                 mesh.faces.type);
-        return index;
     }
 
     void WalkMesh(const QexPODMesh& mesh) {
@@ -107,7 +117,8 @@ class SceneWalk {
         for (const CPODData* e = &mesh.colours; e <= &mesh.boneWeights; ++e) WalkElement(mesh, *e);
         for (uint32_t i = 0; i < mesh.uvwChannelCount; ++i) WalkElement(mesh, mesh.uvws[i]);
         const uint32_t count = QexPODModel_CountIndices(&mesh);
-        for (uint32_t i = 0; i < count; ++i) Require(Index(mesh, i) < mesh.vertexCount, "an index of a mesh");
+        for (uint32_t i = 0; i < count; ++i)
+            Require(VertexOfCorner(mesh, i) < mesh.vertexCount, "an index of a mesh");
         if (mesh.interleaved && mesh.vertices.type == QEX_POD_FLOAT && mesh.vertices.componentCount == 3) {
             QexBoundingBox box;
             QexBoundingBox_ComputeInterleaved(
@@ -130,28 +141,23 @@ class SceneWalk {
         if (mesh.interleaved && mesh.normals.componentCount)
             QexPODModel_GetNodePlaneNormal(scene_, index, at);
         Add(at, 3);
-        for (int32_t batch = 0; mesh.skinned && batch < mesh.boneBatches.batchCount; ++batch)
-            WalkBatch(&node, mesh, batch);
+        if (mesh.skinned) WalkBones(&node, mesh);
     }
 
-    void WalkBatch(QexPODNode* node, const QexPODMesh& mesh, int32_t batch) {
+    void WalkBones(QexPODNode* node, const QexPODMesh& mesh) {
         const QexBoneBatches& b = mesh.boneBatches;
-        const int32_t bones = b.bonesPerBatch[batch];
-        for (int32_t i = 0; i < bones; ++i) {
-            QexMatrix m;
-            QexPODModel_GetBoneWorldMatrix(scene_, &m, node,
-                                           &scene_->nodes[b.boneTable[batch * b.maxBones + i]]);
-            Add(m.m, 16);
-        }
-        const uint32_t end =
-            batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
-        for (uint32_t i = static_cast<uint32_t>(b.offsets[batch]) * 3; i < end * 3; ++i) {
-            float indices[4];
-            const auto count = static_cast<int32_t>(mesh.boneIndices.componentCount);
-            QexPODVertex_ReadVec(indices, Data(mesh, mesh.boneIndices, Index(mesh, i)), mesh.boneIndices.type,
-                                 count);
-            for (int32_t c = 0; c < count; ++c)
-                Require(indices[c] >= 0 && indices[c] < static_cast<float>(bones), "a vertex's bone");
+        for (int32_t batch = 0; batch < b.batchCount; ++batch)
+            for (int32_t i = 0; i < b.bonesPerBatch[batch]; ++i) {
+                QexMatrix m;
+                QexPODModel_GetBoneWorldMatrix(scene_, &m, node,
+                                               &scene_->nodes[b.boneTable[batch * b.maxBones + i]]);
+                Add(m.m, 16);
+            }
+        for (uint32_t i = 0; i < 3 * mesh.faceCount; ++i) {
+            const auto bones = static_cast<float>(b.bonesPerBatch[BatchOfTriangle(b, i / 3)]);
+            const QexVec4 indices = VertexValue(mesh, mesh.boneIndices, VertexOfCorner(mesh, i));
+            for (uint32_t c = 0; c < mesh.boneIndices.componentCount; ++c)
+                Require((&indices.x)[c] >= 0 && (&indices.x)[c] < bones, "a vertex's bone");
         }
     }
 

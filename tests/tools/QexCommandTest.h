@@ -7,12 +7,12 @@
 #include <unistd.h>
 
 #include <cmath>
-#include <cstdlib>
 
 #include "FolderTest.h"
 #include "loaders/ImageFiles.h"
 #include "PodBuild.h"
 #include "PvrWriter.h"
+#include "support/RealFiles.h"
 
 struct CommandResult {
     int status = -1;  // exit status, or 1000 + the signal that ended it
@@ -52,21 +52,6 @@ class QexCommandTest : public FolderTest {
         EXPECT_EQ(result.err.rfind("qex", 0), 0u) << result.err;
     }
 };
-
-// The files of the folder that QEX_REAL_FILES names, largest first; empty without it.
-inline std::vector<std::string> RealFiles(const std::string& subfolder, const std::string& extension) {
-    std::vector<std::string> files;
-    const char* root = std::getenv("QEX_REAL_FILES");
-    std::error_code error;
-    if (!root) return files;
-    for (const auto& entry :
-         std::filesystem::recursive_directory_iterator(std::filesystem::path(root) / subfolder, error))
-        if (entry.path().extension() == extension) files.push_back(entry.path().string());
-    std::sort(files.begin(), files.end(), [](const std::string& a, const std::string& b) {
-        return std::filesystem::file_size(a) > std::filesystem::file_size(b);
-    });
-    return files;
-}
 
 // A quad in the plane z = 0, its UVs running from (0, 0) at the low corner to (1, 1).
 inline pod::MeshArrays Quad(float x0, float y0, float x1, float y1) {

@@ -1,5 +1,6 @@
-// A small GLES2 program that knows nothing of the tap: the test preloads it. Prints the colour it cleared to
-// and the errors it met. With "--no-context" it opens no context, which only the null driver survives.
+// A small GLES2 program that knows nothing of the tap: the test preloads it. Clears to green, then to red,
+// and prints the errors it met and the colour in the end. With "--no-context" it opens no context, which only
+// the null driver survives.
 
 #include <GLES2/gl2.h>
 
@@ -21,8 +22,9 @@ int main(int argc, char** argv) {
     glGenTextures(2, textures);
     glBindTexture(GL_TEXTURE_2D, textures[1]);
     for (int i = 0; i < 3; ++i) {
-        glClearColor(0.0f, 1.0f, 0.0f, 1.0f);
-        glClear(GL_COLOR_BUFFER_BIT);
+        const GLfloat red = i ? 1.0f : 0.0f;
+        glClearColor(red, 1 - red, 0, 1);
+        if (i < 2) glClear(GL_COLOR_BUFFER_BIT);
         std::printf("error %04x\n", glGetError());
     }
     GLubyte pixel[4] = {};

@@ -243,8 +243,8 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
     std::string error;
     const auto context = qex::HeadlessContext::Create(16, 16, &error);
     ASSERT_TRUE(context) << error;
-    std::vector<std::string> files = RealFiles("textures", ".pvr");
-    for (const std::string& ktx : RealFiles("textures", ".ktx")) files.push_back(ktx);
+    std::vector<std::string> files = RealFilesIn("textures", ".pvr");
+    for (const std::string& ktx : RealFilesIn("textures", ".ktx")) files.push_back(ktx);
     const auto add = [&](const std::string& name, const Bytes& bytes) {
         WriteBytes(Path(name), bytes);
         files.push_back(Path(name));
@@ -283,7 +283,7 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
 
 // Each file in this process, from a block of its exact size; every 40th as the command sees it, too.
 TEST_F(QexInfo, LargestRealSceneDamaged) {
-    const std::vector<std::string> scenes = RealFiles("scenes", ".pod");
+    const std::vector<std::string> scenes = RealFilesIn("scenes", ".pod");
     if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";
     const Bytes whole = ReadBytes(scenes[0]);
     size_t number = 0;

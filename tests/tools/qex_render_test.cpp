@@ -276,7 +276,7 @@ TEST_F(QexRender, NodesLightsAndEyes) {
 }
 
 TEST_F(QexRender, RealScenesShow) {
-    const std::vector<std::string> scenes = RealFiles("scenes", ".pod");
+    const std::vector<std::string> scenes = RealFilesIn("scenes", ".pod");
     if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";
     for (const std::string& scene : scenes) {
         Render(scene, "out.png");

@@ -2,10 +2,12 @@
 #pragma once
 
 #include <array>
+#include <stdexcept>
 
 #include "ConvertCommand.h"
 #include "FolderTest.h"
-#include "PodWalker.h"
+#include "support/PodScenes.h"
+#include "support/WalkScene.h"
 
 using Pixel = std::array<uint8_t, 4>;  // red, green, blue, alpha
 
@@ -24,19 +26,27 @@ class ConvertTest : public FolderTest {
         said_ = testing::internal::GetCapturedStderr();
         return status;
     }
-    // Converts to out.pod, keeps what was said on standard error and returns the scene.
-    PodBlock Convert(const std::string& input, const std::string& format = "rgba8888", double fps = 30) {
+    // The scene in out.pod, which lives until the next one is read.
+    QexPODModel& Read() {
+        pod_ = std::make_unique<LoadedPod>(ReadBytes(Path("out.pod")));
+        if (pod_->result) throw std::runtime_error(pod_->log);
+        return pod_->scene;
+    }
+    // Converts to out.pod, keeps what was said on standard error and reads the scene.
+    QexPODModel& Convert(const std::string& input, const std::string& format = "rgba8888", double fps = 30,
+                         const std::string& clip = "") {
         ConvertOptions options;
         options.input = input;
         options.output = Path("out.pod");
         options.textureFormat = format;
         options.fps = fps;
+        options.clip = clip;
         options.quiet = true;
         EXPECT_EQ(Run(options), 0) << said_;
-        return PodWalker::Walk(ReadBytes(Path("out.pod")))[1001];
+        return Read();
     }
     // A quad in the z = 0 plane with the whole picture on it, in the material "m" of a material file.
-    PodBlock ConvertQuad(const std::string& material, const std::string& format = "rgba8888") {
+    QexPODModel& ConvertQuad(const std::string& material, const std::string& format = "rgba8888") {
         WriteText(Path("q.obj"),
                   "mtllib m.mtl\nusemtl m\nv -1 -1 0\nv 1 -1 0\nv 1 1 0\nv -1 1 0\n"
                   "vt 0 0\nvt 1 0\nvt 1 1\nvt 0 1\nvn 0 0 1\nf 1/1/1 2/2/1 3/3/1 4/4/1\n");
@@ -52,4 +62,5 @@ class ConvertTest : public FolderTest {
     }
 
     std::string said_;
+    std::unique_ptr<LoadedPod> pod_;
 };

@@ -13,43 +13,44 @@ void ExpectNear(const Floats& actual, const Floats& expected, float tolerance = 
     for (size_t i = 0; i < actual.size(); ++i)
         EXPECT_NEAR(actual[i], expected[i], tolerance) << "entry " << i;
 }
+void ExpectNear(const float* actual, const Floats& expected, float tolerance = 1e-5f) {
+    ASSERT_NE(actual, nullptr);
+    ExpectNear(Floats(actual, actual + expected.size()), expected, tolerance);
+}
 
-// A column, 0 to 2, of the rotation that a node's stored key (x, y, z, -w) stands for.
-Floats Axis(const PodBlock& node, size_t column, size_t key = 0) {
-    const Floats keys = node[5008].Floats();
-    const float x = keys.at(4 * key), y = keys[4 * key + 1], z = keys[4 * key + 2], w = -keys[4 * key + 3];
-    const Floats columns[3] = {{1 - 2 * y * y - 2 * z * z, 2 * x * y + 2 * z * w, 2 * x * z - 2 * y * w},
-                               {2 * x * y - 2 * z * w, 1 - 2 * x * x - 2 * z * z, 2 * y * z + 2 * x * w},
-                               {2 * x * z + 2 * y * w, 2 * y * z - 2 * x * w, 1 - 2 * x * x - 2 * y * y}};
-    return columns[column];
+// A column, 0 to 2, of a node's rotation at a frame.
+Floats Axis(QexPODModel* scene, QexPODNode* node, size_t column, uint32_t frame = 0) {
+    QexMatrix m;
+    QexPODModel_SetNodeAnimationFrameA(scene, node, static_cast<float>(frame));
+    QexPODModel_GetRotationMatrix(scene, &m, node);
+    return Floats(m.m + 4 * column, m.m + 4 * column + 3);
 }
 
 TEST_F(ConvertTest, QuadKeepsPositionsUvsAndMaterial) {
-    const PodBlock s = ConvertQuad("Kd 0.5 0.25 1\nKa 0.125 0 0\nKs 1 1 1\nNs 64\nd 0.75\n");
-    const PodBlock& mesh = s[2012];
-    ASSERT_EQ(mesh[6000].U32(), 4u);
-    ASSERT_EQ(mesh[6001].U32(), 2u);
-    ASSERT_EQ(mesh[6006][9002].U32(), 32u);
-    const Floats v = mesh[6014].Floats();
-    const size_t uv = mesh[6010][9003].U32() / 4, normal = mesh[6007][9003].U32() / 4;
-    ASSERT_EQ(v.size(), 32u);
-    for (size_t i = 0; i < 32; i += 8) {
+    const QexPODModel& s = ConvertQuad("Kd 0.5 0.25 1\nKa 0.125 0 0\nKs 1 1 1\nNs 64\nd 0.75\n");
+    const QexPODMesh& mesh = s.meshes[0];
+    ASSERT_EQ(mesh.vertexCount, 4u);
+    ASSERT_EQ(mesh.faceCount, 2u);
+    const auto at = [&](uint32_t vertex) { return VertexValue(mesh, mesh.vertices, vertex); };
+    for (uint32_t i = 0; i < 4; ++i) {
         // v = 0 is the lower edge: on this quad u = (x + 1) / 2 and v = (y + 1) / 2.
-        EXPECT_FLOAT_EQ(v[i + uv], (v[i] + 1) / 2);
-        EXPECT_FLOAT_EQ(v[i + uv + 1], (v[i + 1] + 1) / 2);
-        EXPECT_FLOAT_EQ(v[i + normal + 2], 1);
+        const QexVec4 uv = VertexValue(mesh, mesh.uvws[0], i);
+        EXPECT_FLOAT_EQ(uv.x, (at(i).x + 1) / 2);
+        EXPECT_FLOAT_EQ(uv.y, (at(i).y + 1) / 2);
+        EXPECT_FLOAT_EQ(VertexValue(mesh, mesh.normals, i).z, 1);
     }
     // Both triangles keep their counter-clockwise order.
-    const auto f = mesh[6003][9003].As<uint16_t>();
-    ASSERT_EQ(f.size(), 6u);
-    for (size_t t = 0; t < 6; t += 3) {
-        const float *a = &v[8 * f[t]], *b = &v[8 * f[t + 1]], *c = &v[8 * f[t + 2]];
-        EXPECT_FLOAT_EQ((b[0] - a[0]) * (c[1] - a[1]) - (b[1] - a[1]) * (c[0] - a[0]), 4);
+    for (uint32_t t = 0; t < 6; t += 3) {
+        const QexVec4 a = at(VertexOfCorner(mesh, t)), b = at(VertexOfCorner(mesh, t + 1)),
+                      c = at(VertexOfCorner(mesh, t + 2));
+        EXPECT_FLOAT_EQ((b.x - a.x) * (c.y - a.y) - (b.y - a.y) * (c.x - a.x), 4);
     }
-    const std::pair<uint32_t, Floats> material[] = {
-        {3004, {0.5f, 0.25f, 1}}, {3003, {0.125f, 0, 0}}, {3006, {64 / 256.0f}}, {3002, {0.75f}}};
-    for (const auto& [id, values] : material) EXPECT_EQ(s[2015][id].Floats(), values) << id;
-    EXPECT_EQ(s[2015][3001].I32(), -1);
+    const QexPODMaterial& material = s.materials[0];
+    ExpectNear(material.diffuse, {0.5f, 0.25f, 1}, 0);
+    ExpectNear(material.ambient, {0.125f, 0, 0}, 0);
+    EXPECT_EQ(material.shininess, 64 / 256.0f);
+    EXPECT_EQ(material.opacity, 0.75f);
+    EXPECT_EQ(material.diffuseTexture, -1);
 }
 
 TEST_F(ConvertTest, LargeMeshIsSplitWithoutLoss) {
@@ -72,14 +73,14 @@ TEST_F(ConvertTest, LargeMeshIsSplitWithoutLoss) {
         obj += "f " + x + " " + std::to_string(i + 1) + " " + std::to_string(i + 2) + "\n";
     }
     WriteText(Path("large.obj"), obj);
-    const PodBlock s = Convert(Path("large.obj"));
+    const QexPODModel& s = Convert(Path("large.obj"));
     uint32_t vertices = 0, triangles = 0;
-    for (const PodBlock* mesh : s.All(2012)) {
-        EXPECT_LE((*mesh)[6000].U32(), 65535u);
-        vertices += (*mesh)[6000].U32();
-        triangles += (*mesh)[6001].U32();
+    for (uint32_t i = 0; i < s.meshCount; ++i) {
+        EXPECT_LE(s.meshes[i].vertexCount, 65535u);
+        vertices += s.meshes[i].vertexCount;
+        triangles += s.meshes[i].faceCount;
     }
-    EXPECT_EQ(s[2006].U32(), 2u);
+    EXPECT_EQ(s.meshNodeCount, 2u);
     EXPECT_EQ(vertices, 70002u);
     EXPECT_EQ(triangles, 23334u);
 }
@@ -119,33 +120,30 @@ class ConvertNodes : public ConvertTest {
   {"bufferView":0,"byteOffset":44,"componentType":5126,"count":2,"type":"VEC3"},
   {"bufferView":0,"byteOffset":68,"componentType":5126,"count":2,"type":"VEC4"}],
  "bufferViews":[{"buffer":0,"byteLength":100}],"buffers":[{"byteLength":100,"uri":"a.bin"}]})");
-        scene_ = Convert(Path("a.gltf"), "etc1", 4);
-        for (const PodBlock& block : scene_.children)
-            if (block.id == 2013) nodes_[block[5001].Text()] = block;
+        scene_ = &Convert(Path("a.gltf"), "etc1", 4);
+        for (uint32_t i = 0; i < scene_->nodeCount; ++i) nodes_[scene_->nodes[i].name] = &scene_->nodes[i];
     }
 
-    PodBlock scene_;
-    std::map<std::string, PodBlock> nodes_;
+    QexPODModel* scene_;
+    std::map<std::string, QexPODNode*> nodes_;
 };
 
 TEST_F(ConvertNodes, KeysFollowTheAnimation) {
-    EXPECT_EQ(scene_[2009].U32(), 5u);
-    EXPECT_EQ(scene_[2017].U32(), 4u);
+    EXPECT_EQ(scene_->frameCount, 5u);
+    EXPECT_EQ(scene_->framesPerSecond, 4u);
     // Only the position of "tri" is animated: five keys on a straight line.
-    const PodBlock &tri = nodes_["tri"], &fly = nodes_["fly"];
-    EXPECT_EQ(tri[5012].U32(), 1u);
-    ExpectNear(tri[5007].Floats(), {0, 0, 0, 0.5f, 1, 1.5f, 1, 2, 3, 1.5f, 3, 4.5f, 2, 4, 6});
-    ExpectNear(tri[5008].Floats(), {0, 0, 0, -1});
-    EXPECT_EQ(tri[5009].Floats().size(), 7u);
+    const QexPODNode& tri = *nodes_["tri"];
+    EXPECT_EQ(tri.animationFlags, QEX_NODE_POSITION_ANIMATED);
+    ExpectNear(tri.position, {0, 0, 0, 0.5f, 1, 1.5f, 1, 2, 3, 1.5f, 3, 4.5f, 2, 4, 6});
+    ExpectNear(tri.rotation, {0, 0, 0, 1});
 
     // "fly" turns a quarter about +Y. A camera node looks along -Y with -Z up, so at first its Y axis is +Z
     // and its Z axis -Y; at the end the view along -Z has become one along -X.
-    EXPECT_EQ(fly[5012].U32(), 2u);
-    ASSERT_EQ(fly[5008].Floats().size(), 20u);
-    for (size_t k = 0; k < 5; ++k) {
+    EXPECT_EQ(nodes_["fly"]->animationFlags, QEX_NODE_ROTATION_ANIMATED);
+    for (uint32_t k = 0; k < 5; ++k) {
         const float angle = float(k) * 22.5f * 3.14159265f / 180;
-        ExpectNear(Axis(fly, 1, k), {std::sin(angle), 0, std::cos(angle)});
-        ExpectNear(Axis(fly, 2, k), {0, -1, 0});
+        ExpectNear(Axis(scene_, nodes_["fly"], 1, k), {std::sin(angle), 0, std::cos(angle)});
+        ExpectNear(Axis(scene_, nodes_["fly"], 2, k), {0, -1, 0});
     }
 }
 
@@ -155,43 +153,35 @@ TEST_F(ConvertNodes, ComeInOrderWithCamerasAndLights) {
         int object, parent;
     } rows[] = {{"tri", 0, -1}, {"mirror", 0, -1}, {"shear", 0, -1},
                 {"lamp", 0, 0}, {"eye", 0, 0},     {"fly", 1, -1}};
-    const auto nodes = scene_.All(2013);
-    ASSERT_EQ(nodes.size(), 6u);
-    EXPECT_EQ(scene_[2006].U32(), 3u);
+    ASSERT_EQ(scene_->nodeCount, 6u);
+    EXPECT_EQ(scene_->meshNodeCount, 3u);
     for (size_t i = 0; i < 6; ++i) {
-        EXPECT_EQ((*nodes[i])[5001].Text(), rows[i].name);
-        EXPECT_EQ((*nodes[i])[5000].I32(), rows[i].object);
-        EXPECT_EQ((*nodes[i])[5003].I32(), rows[i].parent);
+        EXPECT_STREQ(scene_->nodes[i].name, rows[i].name);
+        EXPECT_EQ(scene_->nodes[i].objectIndex, rows[i].object);
+        EXPECT_EQ(scene_->nodes[i].parentIndex, rows[i].parent);
     }
     // A quarter turn about +X carries the light's -Z to +Y; lights shine along their node's -Z.
-    ExpectNear(Axis(nodes_["lamp"], 2), {0, -1, 0});
-    const PodBlock &lamp = scene_[2011], &eye = scene_[2010];
-    EXPECT_EQ(lamp[7002].U32(), 2u);
-    ExpectNear(lamp[7001].Floats(), {1, 0.5f, 0.25f});
-    ExpectNear(lamp[7006].Floats(), {0.5f});
-    ExpectNear(nodes_["eye"][5007].Floats(), {1, 2, 3});
+    ExpectNear(Axis(scene_, nodes_["lamp"], 2), {0, -1, 0});
+    const QexPODLight& lamp = scene_->lights[0];
+    EXPECT_EQ(lamp.type, uint32_t{pod::kSpotLight});
+    ExpectNear(lamp.colour, {1, 0.5f, 0.25f});
+    EXPECT_NEAR(lamp.fallOffAngle, 0.5f, 1e-5f);
+    ExpectNear(nodes_["eye"]->position, {1, 2, 3});
     // The width's angle of a height's angle 0.6 at an aspect of 1.5: 2 atan(1.5 tan 0.3).
-    ExpectNear(eye[8001].Floats(), {0.868878f});
-    ExpectNear(eye[8002].Floats(), {50}, 1e-4f);
-    ExpectNear(eye[8003].Floats(), {0.1f});
-    EXPECT_EQ(eye[8000].I32(), -1);
+    const QexPODCamera& eye = scene_->cameras[0];
+    ExpectNear({eye.fov, eye.farPlane, eye.nearPlane}, {0.868878f, 50, 0.1f});
+    EXPECT_EQ(eye.targetIndex, -1);
 }
 
 TEST_F(ConvertNodes, MirrorAndShear) {
-    const PodBlock &mirror = nodes_["mirror"], &shear = nodes_["shear"];
-    ExpectNear(mirror[5007].Floats(), {5, 6, 7});
-    const Floats scale = mirror[5009].Floats();
-    const float lengths[3] = {-2, 3, 4};
-    for (size_t column = 0; column < 3; ++column) {
-        Floats expected(3), axis = Axis(mirror, column);
-        expected[column] = lengths[column];
-        for (float& value : axis) value *= scale.at(column);
-        ExpectNear(axis, expected);
-    }
+    QexMatrix world;
+    QexPODModel_GetWorldMatrix(scene_, &world, nodes_["mirror"]);
+    ExpectNear(world.m, {-2, 0, 0, 0, 0, 3, 0, 0, 0, 0, 4, 0, 5, 6, 7, 1});
     // No rotation and scale make a shear: the node has a column-major matrix instead.
-    EXPECT_FALSE(shear.Has(5007));
-    ExpectNear(shear[5011].Floats(), {1, 0, 0, 0, 1, 1, 0, 0, 0, 0, 1, 0, 5, 6, 7, 1});
-    EXPECT_EQ(shear[5012].U32(), 0u);
+    const QexPODNode& shear = *nodes_["shear"];
+    EXPECT_EQ(shear.position, nullptr);
+    ExpectNear(shear.matrix, {1, 0, 0, 0, 1, 1, 0, 0, 0, 0, 1, 0, 5, 6, 7, 1});
+    EXPECT_EQ(shear.animationFlags, 0u);
 }
 
 TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
@@ -247,29 +237,25 @@ TEST_F(ConvertTest, ModelsFromThePackages) {
                 {assimp + "glTF2/BoxTextured-glTF-Binary/BoxTextured.glb", 12, 0, 0, 1},
                 {glmark + "horse.3ds", 7172, 0, 0, 0},
                 {assimp + "Collada/duck.dae", 4212, 1, 1, 1}};
-    PodBlock s;
+    QexPODModel* s = nullptr;
     for (const auto& row : rows) {
         if (!std::filesystem::exists(row.file)) GTEST_SKIP() << row.file << " is not installed";
-        s = Convert(row.file, "etc1");
+        s = &Convert(row.file, "etc1");
         uint32_t triangles = 0;
-        for (const PodBlock* mesh : s.All(2012)) {
-            triangles += (*mesh)[6001].U32();
-            const uint32_t vertices = (*mesh)[6000].U32();
-            EXPECT_EQ((*mesh)[6014].data.size(), size_t((*mesh)[6006][9002].U32()) * vertices);
-            for (const uint16_t index : (*mesh)[6003][9003].As<uint16_t>()) ASSERT_LT(index, vertices);
-        }
+        for (uint32_t i = 0; i < s->meshCount; ++i) triangles += s->meshes[i].faceCount;
         EXPECT_EQ(triangles, row.triangles) << row.file;
-        EXPECT_EQ(s[2002].U32(), row.cameras);
-        EXPECT_EQ(s[2003].U32(), row.lights);
-        EXPECT_EQ(s[2007].U32(), row.textures);
-        for (const PodBlock* t : s.All(2014)) EXPECT_FALSE(ReadBytes(Path((*t)[4000].Text())).empty());
+        EXPECT_EQ(s->cameraCount, row.cameras);
+        EXPECT_EQ(s->lightCount, row.lights);
+        EXPECT_EQ(s->textureCount, row.textures);
+        for (uint32_t i = 0; i < s->textureCount; ++i)
+            EXPECT_FALSE(ReadBytes(Path(s->textures[i].name)).empty());
     }
     // The duck's camera: 37.8492 degrees high at an aspect of 1.5 is 54.43 degrees across. It looks along its
     // node's -Z, which the file's matrix gives as (-0.536475, -0.621148, 0.571288).
-    ExpectNear(s[2010][8001].Floats(), {0.950019f}, 1e-4f);
-    for (const PodBlock* node : s.All(2013))
-        if ((*node)[5001].Text() == "camera1")
-            return ExpectNear(Axis(*node, 1), {0.536475f, 0.621148f, -0.571288f}, 1e-4f);
+    EXPECT_NEAR(s->cameras[0].fov, 0.950019f, 1e-4f);
+    for (uint32_t i = 0; i < s->nodeCount; ++i)
+        if (s->nodes[i].name == std::string("camera1"))
+            return ExpectNear(Axis(s, &s->nodes[i], 1), {0.536475f, 0.621148f, -0.571288f}, 1e-4f);
     FAIL() << "no node camera1";
 }
 

@@ -1,3 +1,5 @@
+#include <set>
+
 #include "ConvertSupport.h"
 #include "ConvertTextures.h"
 
@@ -15,10 +17,10 @@ std::vector<uint32_t> Header(const Bytes& pvr) {
 
 TEST_F(ConvertTexture, StoresTheLowerEdgeFirstWithAllMipmaps) {
     WriteTga("Wood Floor.tga", 4, 2, {kRed, kRed, kRed, kRed, kBlue, kBlue, kBlue, kGreen});
-    const PodBlock s = ConvertQuad("Kd 1 1 1\nmap_Kd Wood Floor.tga\n");
+    const QexPODModel& s = ConvertQuad("Kd 1 1 1\nmap_Kd Wood Floor.tga\n");
     EXPECT_EQ(said_, "");
-    EXPECT_EQ(s[2014][4000].Text(), "Wood_Floor.pvr");
-    EXPECT_EQ(s[2015][3001].I32(), 0);
+    EXPECT_STREQ(s.textures[0].name, "Wood_Floor.pvr");
+    EXPECT_EQ(s.materials[0].diffuseTexture, 0);
     const Bytes pvr = ReadBytes(Path("Wood_Floor.pvr"));
     ASSERT_EQ(pvr.size(), 52u + 4 * (8 + 2 + 1));
     EXPECT_EQ(Header(pvr), (std::vector<uint32_t>{52, 2, 4, 2, 0x10112, 44, 32, 0, 0, 0, 0, 0x21525650, 1}));
@@ -30,12 +32,12 @@ TEST_F(ConvertTexture, StoresTheLowerEdgeFirstWithAllMipmaps) {
 
 TEST_F(ConvertTexture, AlphaGoesToAFileOfItsOwn) {
     WriteTga("leaf.tga", 1, 2, {{10, 20, 30, 128}, kRed});
-    const PodBlock material = ConvertQuad("map_Kd leaf.tga\n", "rgb888")[2015];
+    const QexPODMaterial& material = ConvertQuad("map_Kd leaf.tga\n", "rgb888").materials[0];
     EXPECT_EQ(PvrBytes("leaf.pvr", 0, 6), (Bytes{255, 0, 0, 10, 20, 30}));
     EXPECT_EQ(PvrBytes("leaf_a.pvr", 0, 6), (Bytes{255, 255, 255, 128, 128, 128}));
     // Source alpha and one minus source alpha.
-    EXPECT_EQ(material[3018].U32(), 0x302u);
-    EXPECT_EQ(material[3020].U32(), 0x303u);
+    EXPECT_EQ(material.blendSrcColour, 0x302u);
+    EXPECT_EQ(material.blendDstColour, 0x303u);
 
     WriteTga("c.tga", 1, 1, {kGreen});
     WriteTga("mask.tga", 1, 1, {{77, 77, 77, 255}});
@@ -52,9 +54,9 @@ TEST_F(ConvertTexture, NamesAreUniqueEvenWithTheAlphaSuffix) {
     WriteTga("X/wood_A.tga", 1, 1, {kRed});  // found whatever its case
     WriteTga("y/wood.tga", 1, 1, {kRed});
     WriteTga("wood.tga", 1, 1, {kBlue});  // found by its name alone
-    const PodBlock scene = Convert(Path("q.obj"));
+    const QexPODModel& scene = Convert(Path("q.obj"));
     std::set<std::string> names;
-    for (const PodBlock* t : scene.All(2014)) names.insert((*t)[4000].Text());
+    for (uint32_t i = 0; i < scene.textureCount; ++i) names.insert(scene.textures[i].name);
     ASSERT_EQ(names.size(), 3u) << said_;
     // wood.pvr would take Wood_a.pvr for its alpha.
     EXPECT_EQ(names.count("wood.pvr"), 0u);
@@ -62,21 +64,20 @@ TEST_F(ConvertTexture, NamesAreUniqueEvenWithTheAlphaSuffix) {
 }
 
 TEST_F(ConvertTexture, MissingPictureIsAWarning) {
-    const PodBlock s = ConvertQuad("map_Kd gone.png\n");
+    const QexPODModel& s = ConvertQuad("map_Kd gone.png\n");
     EXPECT_TRUE(Contains(said_, "gone.png not found in " + folder_.string())) << said_;
-    EXPECT_EQ(s[2015][3001].I32(), -1);
-    EXPECT_EQ(s[2007].U32(), 0u);
+    EXPECT_EQ(s.materials[0].diffuseTexture, -1);
+    EXPECT_EQ(s.textureCount, 0u);
 }
 
 TEST_F(ConvertTexture, NormalMapBringsTangentsAndSwapsRedWithGreen) {
     WriteTga("n.tga", 1, 1, {{140, 120, 250, 255}});
-    const PodBlock s = ConvertQuad("norm n.tga\n");
-    const PodBlock& mesh = s[2012];
-    const std::vector<float> v = mesh[6014].Floats();
+    const QexPODModel& s = ConvertQuad("norm n.tga\n");
+    const QexPODMesh& mesh = s.meshes[0];
     // The picture's right is +X on this quad and its top is +Y.
-    EXPECT_NEAR(v.at(mesh[6008][9003].U32() / 4), 1, 1e-5);
-    EXPECT_NEAR(v.at(mesh[6009][9003].U32() / 4 + 1), 1, 1e-5);
-    EXPECT_EQ(s[2015][3012].I32(), 0);
+    EXPECT_NEAR(VertexValue(mesh, mesh.tangents, 0).x, 1, 1e-5);
+    EXPECT_NEAR(VertexValue(mesh, mesh.binormals, 0).y, 1, 1e-5);
+    EXPECT_EQ(s.materials[0].bumpTexture, 0);
     EXPECT_EQ(PvrBytes("n.pvr", 0, 4), (Bytes{120, 140, 250, 255}));
 }
 

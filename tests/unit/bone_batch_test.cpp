@@ -9,6 +9,7 @@
 
 #include "Qex.h"
 #include "support/PodScenes.h"
+#include "support/WalkScene.h"
 
 namespace {
 
@@ -174,11 +175,8 @@ TEST(BoneBatch, AnyMeshKeepsItsTriangles) {
         ASSERT_EQ(made.result, 0);
         std::multiset<std::array<uint32_t, 3>> before, after;
         for (size_t t = 0; t < 300; t += 3) before.insert({triangles[t], triangles[t + 1], triangles[t + 2]});
-        int32_t batch = 0;
         for (size_t t = 0; t < 300; t += 3) {
-            while (batch + 1 < made.batches.batchCount && made.batches.offsets[batch + 1] <= int(t / 3))
-                ++batch;
-            const std::vector<int32_t> table = made.Bones(batch);
+            const auto table = made.Bones(BatchOfTriangle(made.batches, static_cast<uint32_t>(t / 3)));
             after.insert({made.At(t).number, made.At(t + 1).number, made.At(t + 2).number});
             for (size_t corner = t; corner < t + 3; ++corner) {
                 const Vertex& v = made.At(corner);
@@ -231,27 +229,19 @@ TEST(BoneBatch, MadeAtLoadAreJoined) {
     EXPECT_GE(batches.batchCount, 7);
     EXPECT_LE(batches.batchCount, 30);
     std::set<std::pair<int, int>> found;
-    for (int32_t b = 0; b < batches.batchCount; ++b) {
-        EXPECT_LE(batches.bonesPerBatch[b], 16);
-        const uint32_t end = b + 1 < batches.batchCount ? uint32_t(batches.offsets[b + 1]) : mesh.faceCount;
-        for (uint32_t t = uint32_t(batches.offsets[b]); t < end; ++t) {
-            int nodes[3];
-            float position[4] = {};
-            for (uint32_t corner = 0; corner < 3; ++corner) {
-                uint16_t index;
-                memcpy(&index, mesh.faces.data + 2 * (3 * t + corner), 2);
-                const uint8_t* vertex = mesh.interleaved + index * mesh.vertices.stride;
-                const auto at = [&](const CPODData& e) {
-                    return vertex + reinterpret_cast<uintptr_t>(e.data);
-                };
-                memcpy(position, at(mesh.vertices), 12);
-                nodes[corner] = batches.boneTable[b * batches.maxBones + *at(mesh.boneIndices)];
-            }
-            const std::pair<int, int> pair = {nodes[0], nodes[1]};
-            EXPECT_EQ(pair, pairs[size_t(position[0])]);
-            EXPECT_EQ(nodes[2], nodes[0]);
-            found.insert(pair);
+    for (int32_t b = 0; b < batches.batchCount; ++b) EXPECT_LE(batches.bonesPerBatch[b], 16);
+    for (uint32_t t = 0; t < mesh.faceCount; ++t) {
+        const int32_t* bones = batches.boneTable + BatchOfTriangle(batches, t) * batches.maxBones;
+        int nodes[3];
+        for (uint32_t corner = 0; corner < 3; ++corner) {
+            const uint32_t vertex = VertexOfCorner(mesh, 3 * t + corner);
+            nodes[corner] = bones[int(VertexValue(mesh, mesh.boneIndices, vertex).x)];
         }
+        const std::pair<int, int> pair = {nodes[0], nodes[1]};
+        const float source = VertexValue(mesh, mesh.vertices, VertexOfCorner(mesh, 3 * t)).x;
+        EXPECT_EQ(pair, pairs[size_t(source)]);
+        EXPECT_EQ(nodes[2], nodes[0]);
+        found.insert(pair);
     }
     EXPECT_EQ(found.size(), 780u);
 }

@@ -1,6 +1,5 @@
 #include <cmath>
 #include <limits>
-#include <random>
 
 #include "support/Glm.h"
 
@@ -16,23 +15,15 @@ QexVec3 Apply(const QexMatrix& m, QexVec3 v, float w = 1) {
     return v;
 }
 
-class Random {
-  public:
-    float operator()(float limit = 1) {
-        return std::uniform_real_distribution<float>(-limit, limit)(engine_);
-    }
-    vec3 Vec3(float limit = 1) { return {(*this)(limit), (*this)(limit), (*this)(limit)}; }
-    mat4 Matrix() {
-        mat4 m;
-        for (int i = 0; i < 16; ++i) glm::value_ptr(m)[i] = (*this)();
-        return m;
-    }
-    // The last row is that of an affine transform.
-    mat4 Affine() { return glm::row(Matrix(), 3, glm::vec4(0, 0, 0, 1)); }
-
-  private:
-    std::mt19937 engine_{42};
-};
+mat4 RandomMatrix(Random& random) {
+    mat4 m;
+    for (int i = 0; i < 16; ++i) glm::value_ptr(m)[i] = random();
+    return m;
+}
+// The last row is that of an affine transform.
+mat4 RandomAffine(Random& random) {
+    return glm::row(RandomMatrix(random), 3, glm::vec4(0, 0, 0, 1));
+}
 
 TEST(Matrix, BuildersAgreeWithGlm) {
     const mat4 one(1);
@@ -66,7 +57,7 @@ TEST(Matrix, BuildersAgreeWithGlm) {
 TEST(Matrix, ProductsAndInversesAgreeWithGlm) {
     Random random;
     for (int i = 0; i < 200; ++i) {
-        const mat4 ga = random.Matrix(), gb = random.Matrix(), affine = random.Affine();
+        const mat4 ga = RandomMatrix(random), gb = RandomMatrix(random), affine = RandomAffine(random);
         const QexMatrix a = FromGlm(ga), b = FromGlm(gb);
         QexMatrix m, left = a, right = b;
         QexMatrix_Multiply(&m, &a, &b);
@@ -107,7 +98,7 @@ TEST(Matrix, InverseRefusesSingularMatricesOfEverySizeAndNoOthers) {
     Random random;
     for (const float scale : {1e-6f, 1.0f, 1e6f}) {
         for (int i = 0; i < 50; ++i) {
-            mat4 flat = random.Affine();
+            mat4 flat = RandomAffine(random);
             flat[1] = flat[0];
             EXPECT_FALSE(invert(FromGlm(flat), scale));
         }
@@ -118,7 +109,8 @@ TEST(Matrix, InverseRefusesSingularMatricesOfEverySizeAndNoOthers) {
 }
 
 TEST(Matrix, TransformsAgreeWithGlm) {
-    const mat4 g = Random().Matrix();
+    Random random;
+    const mat4 g = RandomMatrix(random);
     const QexMatrix m = FromGlm(g);
     const glm::vec4 gv(1, -2, 3, 0.5f), product = g * gv, transposed = gv * g;
     QexVec4 v = {gv.x, gv.y, gv.z, gv.w}, raw = v;

@@ -37,6 +37,7 @@ const Refusal kRefusals[] = {
     {"camera 0: its target is node 11 of 11", [](Scene& s, Mesh&) { s.cameras[0].target = 11; }},
     {"light 1: its target is node -5 of 11", [](Scene& s, Mesh&) { s.lights[1].target = -5; }},
     {"the scene counts 12 node records but holds 11", [](Scene& s, Mesh&) { s.counts.nodes = 12; }},
+    {"4294967295 node records, more than the file can hold", [](Scene& s, Mesh&) { s.counts.nodes = UINT32_MAX; }},
     {"more node records than the 10", [](Scene& s, Mesh&) { s.counts.nodes = 10; }},
 
     {"positions of unknown type 18", [](Scene&, Mesh& m) { m.vertices.type = 18; }},
@@ -70,7 +71,7 @@ const Refusal kRefusals[] = {
     {"2 batches of 3 bones, but shorter tables", [](Scene&, Mesh& m) { m.batchBoneMax = 3; }},
     {"-1 batches of 2 bones", [](Scene&, Mesh& m) { m.batchCount = -1; }},
     {"2147483647 batches of 2147483647 bones", [](Scene&, Mesh& m) { m.batchCount = m.batchBoneMax = INT32_MAX; }},
-    {"3 bone indices, but 2 weights a vertex", [](Scene&, Mesh& m) { m.boneWeights.components = 2; }},
+    {"4 bone indices, but 2 weights a vertex", [](Scene&, Mesh& m) { m.boneWeights.components = 2; }},
     // The second batch has one bone; vertex 4 follows its second.
     {"vertex 4 follows bone 1 of a batch of 1",
      [](Scene&, Mesh& m) { m.vertexBlock[4 * m.boneIndices.stride + m.boneIndices.offset] = 1; }},
@@ -187,10 +188,9 @@ TEST(PodCheck, OddCamerasAndBonesArePutRight) {
 
     const QexPODMesh& mesh = loaded.scene.meshes[0];
     for (uint32_t v = 0; v < 6; ++v) {
-        const uint8_t* bones = mesh.interleaved + v * mesh.boneIndices.stride +
-                               reinterpret_cast<uintptr_t>(mesh.boneIndices.data);
-        EXPECT_EQ(bones[2], 0) << "bone 99 without weight";
-        EXPECT_EQ(bones[1], v < 3 ? 1 : 0);
+        const QexVec4 bones = VertexValue(mesh, mesh.boneIndices, v);
+        EXPECT_EQ(bones.z, 0) << "bone 99 without weight";
+        EXPECT_EQ(bones.y, v < 3 ? 1 : 0);
     }
     // Strips of batched bones, and vertices without batches that follow no node, are drawn as they are.
     for (const bool strips : {false, true}) {

@@ -23,8 +23,9 @@ void ExpectSame(const Read* read, const Written& written, const char* what) {
 
 void ExpectSameElement(const CPODData& read, const pod::Element& written, bool interleaved,
                        const char* what) {
-    EXPECT_EQ(read.type, written.type) << what;
     EXPECT_EQ(read.componentCount, written.components) << what;
+    if (!written.components) return;
+    EXPECT_EQ(read.type, written.type) << what;
     EXPECT_EQ(read.stride, written.stride) << what;
     if (interleaved)
         EXPECT_EQ(reinterpret_cast<uintptr_t>(read.data), written.offset) << what;
@@ -38,17 +39,11 @@ void ExpectSameMesh(const QexPODMesh& read, const pod::Mesh& written) {
     EXPECT_EQ(read.uvwChannelCount, written.uvw.size());
     EXPECT_EQ(read.stripCount, written.stripLengths.size());
     ExpectSameElement(read.faces, written.faces, false, "faces");
-    const std::pair<const CPODData&, const pod::Element&> elements[] = {
-        {read.vertices, written.vertices},      {read.normals, written.normals},
-        {read.tangents, written.tangents},      {read.binormals, written.binormals},
-        {read.colours, written.colours},        {read.boneIndices, written.boneIndices},
-        {read.boneWeights, written.boneWeights}};
-    for (const auto& [r, w] : elements) {
-        if (w.components)
-            ExpectSameElement(r, w, written.interleaved, "element");
-        else
-            EXPECT_EQ(r.componentCount, 0u);
-    }
+    // Both records have these in the same order, but for the UV channels.
+    const CPODData* elements[] = {&read.vertices, &read.normals,     &read.tangents,   &read.binormals,
+                                  &read.colours,  &read.boneIndices, &read.boneWeights};
+    for (size_t i = 0; i < std::size(elements); ++i)
+        ExpectSameElement(*elements[i], (&written.vertices)[i], written.interleaved, "element");
     for (size_t i = 0; i < written.uvw.size(); ++i)
         ExpectSameElement(read.uvws[i], written.uvw[i], written.interleaved, "uvw");
     if (!written.stripLengths.empty()) ExpectSame(read.stripLengths, written.stripLengths, "strips");
@@ -251,29 +246,6 @@ TEST(PodReader, VersionByteOrderAndOptions) {
     }
     EXPECT_EQ(LoadedPod(swapped.bytes).out, "  - POD endianness mismatch!\n");
     EXPECT_EQ(LoadedPod(empty.bytes).out, "  - POD version string AB.POD.2.0\n");
-}
-
-TEST(PodReader, CountsThatLieFailAndTakeNoMemory) {
-    const std::vector<uint8_t> file = pod::WritePod(everything::Scene());
-    int counts = 0;
-    for (const size_t at : WordOffsets(file)) {
-        uint32_t marker[2] = {};
-        std::memcpy(marker, &file[at], 8);
-        if (marker[1] != 4 || marker[0] < 2002 || marker[0] > 2008 || marker[0] == 2006) continue;
-        ++counts;
-        for (const uint32_t value : {0u, UINT32_MAX, 0x7FFFFFFFu, 0x01000000u, 1000u, 100u, 12u}) {
-            std::vector<uint8_t> lying = file;
-            std::memcpy(&lying[at + 8], &value, 4);
-            const size_t before = HeapBytes();
-            LoadedPod loaded(lying);
-            EXPECT_EQ(loaded.result, -1) << marker[0] << " " << value;
-            const char* line = value > file.size() ? "more than the file can hold" : "the scene ";
-            EXPECT_NE(loaded.Error().find(line), std::string::npos) << loaded.log;
-            // The block and the records, which are larger here than in the file.
-            EXPECT_LT(HeapBytes(), before + 8 * file.size()) << marker[0] << " " << value;
-        }
-    }
-    EXPECT_EQ(counts, 6);
 }
 
 TEST(PodReader, EveryCutFailsWithALine) {

@@ -59,25 +59,22 @@ TEST(PodVertex, EveryTypeBothWays) {
 }
 
 TEST(PodVertex, UnknownTypesAreLeftAlone) {
+    const float ones[4] = {1, 1, 1, 1};
     for (const uint32_t type : {0u, 18u, UINT32_MAX}) {
-        uint8_t bytes[16] = {1, 2, 3, 4};
-        const float ones[4] = {1, 1, 1, 1};
+        uint32_t word = 77, index = 78;
         float value[4];
-        uint32_t index = 77;
-        QexPODVertex_ReadVec(value, bytes, type, 4);
-        EXPECT_TRUE(value[0] == 0 && value[1] == 0 && value[2] == 0 && value[3] == 1);
-        QexVertexWriteVec(bytes, type, 4, ones);
-        EXPECT_EQ(bytes[0], 1);
-        QexPODVertex_ReadInt(&index, bytes, type);
-        EXPECT_EQ(index, 77u);
+        QexPODVertex_ReadVec(value, &word, type, 4);
+        EXPECT_EQ(std::vector<float>(value, value + 4), (std::vector<float>{0, 0, 0, 1}));
+        QexVertexWriteVec(&word, type, 4, ones);
+        QexPODVertex_ReadInt(&index, &word, type);
+        EXPECT_EQ(word + index, 77u + 78u);
     }
     const uint8_t bytes[5] = {0xAA, 4, 3, 2, 0x81};
-    for (const auto& [type, expected] :
-         {std::pair{QEX_POD_UNSIGNED_SHORT, 0x0304u}, {QEX_POD_UNSIGNED_INT, 0x81020304u}}) {
-        uint32_t index = 0;
-        QexPODVertex_ReadInt(&index, bytes + 1, type);
-        EXPECT_EQ(index, expected);
-    }
+    uint32_t index16 = 0, index32 = 0;
+    QexPODVertex_ReadInt(&index16, bytes + 1, QEX_POD_UNSIGNED_SHORT);
+    QexPODVertex_ReadInt(&index32, bytes + 1, QEX_POD_UNSIGNED_INT);
+    EXPECT_EQ(index16, 0x0304u);
+    EXPECT_EQ(index32, 0x81020304u);
 }
 
 // Writing truncates, and still what was read comes back the same for every value of a type.

@@ -1,6 +1,5 @@
 #include <algorithm>
 #include <cmath>
-#include <random>
 
 #include "support/Glm.h"
 
@@ -9,9 +8,11 @@ namespace {
 constexpr double kPi = 3.141592653589793;
 
 QexQuaternion Unit(double x, double y, double z, double w) {
-    const double length = std::sqrt(x * x + y * y + z * z + w * w);
-    return {static_cast<float>(x / length), static_cast<float>(y / length), static_cast<float>(z / length),
-            static_cast<float>(w / length)};
+    const glm::dvec4 unit = glm::normalize(glm::dvec4(x, y, z, w));
+    return {float(unit.x), float(unit.y), float(unit.z), float(unit.w)};
+}
+QexQuaternion Unit(Random& random) {
+    return Unit(double{random()}, double{random()}, double{random()}, double{random()});
 }
 
 void ExpectNear(const QexQuaternion& actual, const QexQuaternion& expected, float tolerance) {
@@ -35,20 +36,18 @@ void SlerpByDefinition(double out[4], QexQuaternion a, QexQuaternion b, float t)
 }
 
 TEST(Quaternion, SlerpIsWithinAMillionthOfItsDefinition) {
-    std::mt19937 engine(7);
-    std::uniform_real_distribution<double> symmetric(-1, 1), unit(0, 1);
-    const auto random = [&] { return symmetric(engine); };
+    Random random;
     double worst = 0;
     for (int i = 0; i < 100000; ++i) {
-        const QexQuaternion a = Unit(random(), random(), random(), random());
-        QexQuaternion b = Unit(random(), random(), random(), random()), q;
+        const QexQuaternion a = Unit(random);
+        QexQuaternion b = Unit(random), q;
         if (i % 4 != 0) {
             // Near a, or near its opposite, by a distance of any size down to the last bits.
-            const double distance = std::pow(10.0, -8 * unit(engine)), side = i % 4 == 1 ? -1 : 1;
-            b = Unit(side * a.x + distance * random(), side * a.y + distance * random(),
-                     side * a.z + distance * random(), side * a.w + distance * random());
+            const double distance = std::pow(10.0, -8 * std::fabs(random())), side = i % 4 == 1 ? -1 : 1;
+            b = Unit(side * a.x + distance * b.x, side * a.y + distance * b.y, side * a.z + distance * b.z,
+                     side * a.w + distance * b.w);
         }
-        const float t = i % 100 == 0 ? 1.0f : static_cast<float>(unit(engine));
+        const float t = i % 100 == 0 ? 1.0f : std::fabs(random());
         double expected[4];
         QexQuaternion_Slerp(&q, &a, &b, t);
         SlerpByDefinition(expected, a, b, t);
@@ -82,12 +81,9 @@ TEST(Quaternion, RulesAtTheEdges) {
 }
 
 TEST(Quaternion, MatricesProductsAndAxesAgreeWithGlm) {
-    std::mt19937 engine(11);
-    std::uniform_real_distribution<double> symmetric(-1, 1);
-    const auto random = [&] { return symmetric(engine); };
+    Random random;
     for (int i = 0; i < 100; ++i) {
-        const QexQuaternion a = Unit(random(), random(), random(), random());
-        const QexQuaternion b = Unit(random(), random(), random(), random());
+        const QexQuaternion a = Unit(random), b = Unit(random);
         const glm::quat ga(a.w, a.x, a.y, a.z), gb(b.w, b.x, b.y, b.z), product = ga * gb;
         QexMatrix m;
         QexQuaternion_ToRotationMatrix(&m, &a);
