@@ -1,4 +1,4 @@
-// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx and tga.
+// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx, tga, etc and pvrtc.
 #include <cstdio>
 #include <filesystem>
 #include <string>
@@ -9,6 +9,14 @@
 namespace {
 
 using Entry = std::pair<const char*, Bytes>;
+
+// What the decoders' targets take: two bytes of size, and noise.
+Bytes Level(uint8_t width, uint8_t height, size_t size) {
+    Bytes level = Noise(size + 2);
+    level[0] = width;
+    level[1] = height;
+    return level;
+}
 
 std::vector<Entry> Entries() {
     PodBlocks empty, swapped;
@@ -33,6 +41,13 @@ std::vector<Entry> Entries() {
         {"tga/rgb", TgaFile(3, 2, 24, Noise(18))},
         {"tga/rgba", TgaFile(2, 2, 32, Noise(16))},
         {"tga/grey", TgaFile(2, 2, 8, Noise(4))},
+        {"etc/whole", Level(8, 4, 16)},
+        {"etc/cut", Level(6, 3, 16)},
+        {"etc/small", Level(1, 2, 8)},
+        {"pvrtc/four", Level(4 << 1, 3 << 1, 64)},
+        {"pvrtc/two", Level(5 << 1 | 1, 3 << 1, 64)},
+        {"pvrtc/small", Level(1 << 1, 0, 32)},
+        {"pvrtc/odd", Level(0x80 | 12, 3 << 1, 32)},
     };
 }
 
