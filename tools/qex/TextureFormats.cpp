@@ -69,15 +69,20 @@ std::vector<uint8_t> EncodePixels(const PixelFormat& format, const Image& image)
     return bytes;
 }
 
-// Blocks that reach beyond the picture are fitted to the pixels inside it.
+// Blocks that reach beyond the picture repeat its edge: etc1_encode_image takes what it finds there into
+// their colours.
 std::vector<uint8_t> EncodeEtc1(const Image& image) {
+    const int width = (image.width + 3) / 4 * 4, height = (image.height + 3) / 4 * 4;
     std::vector<uint8_t> rgb;
-    rgb.reserve(image.pixels.size() / 4 * 3);
-    for (size_t i = 0; i < image.pixels.size(); i += 4)
-        rgb.insert(rgb.end(), {image.pixels[i], image.pixels[i + 1], image.pixels[i + 2]});
-    const auto width = static_cast<etc1_uint32>(image.width), height = static_cast<etc1_uint32>(image.height);
-    std::vector<uint8_t> blocks(etc1_get_encoded_data_size(width, height));
-    etc1_encode_image(rgb.data(), width, height, 3, width * 3, blocks.data());
+    rgb.reserve(static_cast<size_t>(width) * static_cast<size_t>(height) * 3);
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+            const uint8_t* pixel = image.Pixel(std::min(x, image.width - 1), std::min(y, image.height - 1));
+            rgb.insert(rgb.end(), pixel, pixel + 3);
+        }
+    const auto w = static_cast<etc1_uint32>(width), h = static_cast<etc1_uint32>(height);
+    std::vector<uint8_t> blocks(etc1_get_encoded_data_size(w, h));
+    etc1_encode_image(rgb.data(), w, h, 3, w * 3, blocks.data());
     return blocks;
 }
 
