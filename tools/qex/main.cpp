@@ -231,19 +231,23 @@ void SetUpTexture(CLI::App* app, TextureOptions* options) {
     app->add_option("IN", options->input, "PNG, JPEG, TGA, ... picture, or PVR or KTX texture");
     app->add_option("-o,--output", options->output, "PNG picture, or PVR or KTX texture, by its extension")
         ->required();
-    app->add_option("--format", options->format,
-                    FormatNames() +
-                        " (rgba8888 with alpha, rgb888 without); etc1 puts alpha into NAME_a; "
-                        "KTX has no l8, la88, a8; PVRTC is read only");
-    app->add_flag("--mipmaps", options->mipmaps,
-                  "write the whole mipmap chain, as GL wants it of a KTX texture");
-    app->add_flag("--flip", options->flip, "turn the rows over; else the picture's top row is the first");
-    app->add_option("--faces", options->faces, "+X -X +Y -Y +Z -Z, square pictures of a cube map, not IN")
+    app->add_option("--format", options->format, FormatNames() + " (rgba8888 with alpha, rgb888 without)");
+    app->add_flag("--mipmaps", options->mipmaps, "write the whole mipmap chain");
+    app->add_flag("--flip", options->flip, "turn the rows over; else the first is the picture's top");
+    app->add_option("--faces", options->faces, "instead of IN: squares +X -X +Y -Y +Z -Z of a cube map")
         ->expected(1, 100);
     app->add_option("--level", options->level, "mipmap level of the texture IN (0)")
         ->check(CLI::Range(0, 31));
     app->add_option("--face", options->face, "face of the cube map IN (PNG: 0; PVR and KTX: all)")
         ->check(CLI::Range(0, 5));
+    app->footer(
+        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88 "
+        "and\n"
+        "a8, and are black until QexTexture_SetFilter is called unless they have --mipmaps. PVRTC is read, "
+        "not\n"
+        "written. In a picture luminance is grey, and alpha 8 is white with alpha. From texture to texture "
+        "blocks\n"
+        "and mipmaps are made anew.");
 }
 
 // The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
