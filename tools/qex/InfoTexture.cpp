@@ -1,6 +1,3 @@
-#include <algorithm>
-#include <cstdio>
-
 #include "Info.h"
 
 namespace {
