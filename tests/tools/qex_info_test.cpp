@@ -273,9 +273,7 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
         const CommandResult result = Run({"info", "--json", file});
         const Json document = Json::parse(result.out, nullptr, false);
         // Compressed KTX formats other than ETC1 are up to the GL.
-        if (!document.is_discarded() && document["format"] == "KTX" && document["loads"] == true &&
-            !document["problems"].empty())
-            continue;
+        if (Contains(result.out, "only a GL with the extension")) continue;
         const bool said = result.status == 0 && document["loads"] == true;
         EXPECT_EQ(said, loads) << file << "\n" << result.out << result.err;
     }

@@ -1,4 +1,4 @@
-# The pictures and the converter of the qex command, as static libraries.
+# The pictures, the textures and the converter of the qex command, as static libraries.
 find_package(assimp REQUIRED)
 find_package(nlohmann_json REQUIRED)
 find_path(ETC1_INCLUDE_DIR ETC1/etc1.h PATH_SUFFIXES android REQUIRED)
@@ -12,6 +12,18 @@ target_include_directories(qex_image PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_include_directories(qex_image SYSTEM PRIVATE ${STB_INCLUDE_DIR})
 target_link_libraries(qex_image PRIVATE qex_warnings)
 
+add_library(qex_texture STATIC
+    ${CMAKE_CURRENT_LIST_DIR}/TextureCommand.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureContainer.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureFiles.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureFormats.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureKtx.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TexturePvr.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureWrite.cpp)
+target_include_directories(qex_texture PUBLIC ${CMAKE_CURRENT_LIST_DIR})
+target_include_directories(qex_texture SYSTEM PRIVATE ${ETC1_INCLUDE_DIR})
+target_link_libraries(qex_texture PUBLIC qex_podwriter qex_image PRIVATE ${ETC1_LIBRARY} qex_engine qex_warnings)
+
 add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertAnimation.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertBatches.cpp
@@ -24,6 +36,5 @@ add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertSkin.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
-target_include_directories(qex_convert SYSTEM PRIVATE ${ETC1_INCLUDE_DIR})
-target_link_libraries(qex_convert PUBLIC qex_podwriter qex_image assimp::assimp PRIVATE ${ETC1_LIBRARY}
+target_link_libraries(qex_convert PUBLIC qex_texture assimp::assimp PRIVATE
     nlohmann_json::nlohmann_json qex_engine qex_warnings)

@@ -1,12 +1,12 @@
 #include "ConvertTextures.h"
 
 #include <assimp/scene.h>
-#include <ETC1/etc1.h>
 #include <algorithm>
 #include <filesystem>
+#include <iterator>
 
 #include "PodWriter.h"
-#include "PvrWriter.h"
+#include "TextureWrite.h"
 
 namespace fs = std::filesystem;
 
@@ -50,55 +50,8 @@ std::string CleanPath(std::string path) {
     return path;
 }
 
-Image FlipRows(const Image& image) {
-    Image out = image;
-    const size_t row = static_cast<size_t>(image.width) * 4;
-    for (int y = 0; y < image.height; ++y) {
-        std::copy_n(image.Pixel(0, image.height - 1 - y), row, &out.pixels[static_cast<size_t>(y) * row]);
-    }
-    return out;
-}
-
-std::vector<uint8_t> ToRgb(const Image& image) {
-    std::vector<uint8_t> rgb;
-    rgb.reserve(image.pixels.size() / 4 * 3);
-    for (size_t i = 0; i < image.pixels.size(); i += 4) {
-        rgb.insert(rgb.end(), {image.pixels[i], image.pixels[i + 1], image.pixels[i + 2]});
-    }
-    return rgb;
-}
-
-std::vector<uint8_t> ToEtc1(const Image& image) {
-    const std::vector<uint8_t> rgb = ToRgb(image);
-    const auto width = static_cast<etc1_uint32>(image.width), height = static_cast<etc1_uint32>(image.height);
-    std::vector<uint8_t> blocks(etc1_get_encoded_data_size(width, height));
-    etc1_encode_image(rgb.data(), width, height, 3, width * 3, blocks.data());
-    return blocks;
-}
-
-struct FormatInfo {
-    const char* name;
-    TextureFormat format;
-    uint32_t pvrType;
-    std::vector<uint8_t> (*encode)(const Image&);
-};
-
-constexpr FormatInfo kFormats[] = {
-    {"etc1", TextureFormat::kEtc1, pod::kPvrEtc1, ToEtc1},
-    {"rgba8888", TextureFormat::kRgba8888, pod::kPvrRgba8888,
-     [](const Image& image) { return image.pixels; }},
-    {"rgb888", TextureFormat::kRgb888, pod::kPvrRgb888, ToRgb},
-};
-
-// A picture whose red, green and blue all hold the alpha channel.
-Image AlphaAsGrey(const Image& image) {
-    Image out = image;
-    for (size_t i = 0; i < out.pixels.size(); i += 4) {
-        std::fill_n(&out.pixels[i], 3, out.pixels[i + 3]);
-        out.pixels[i + 3] = 255;
-    }
-    return out;
-}
+// In the order of TextureFormat.
+constexpr const char* kFormatNames[] = {"etc1", "rgba8888", "rgb888"};
 
 void MakeOpaque(Image* image) {
     for (size_t i = 3; i < image->pixels.size(); i += 4) image->pixels[i] = 255;
@@ -121,9 +74,9 @@ void SwapRedGreen(Image* image) {
 }  // namespace
 
 bool ParseTextureFormat(const std::string& name, TextureFormat* format) {
-    for (const FormatInfo& info : kFormats) {
-        if (name != info.name) continue;
-        *format = info.format;
+    for (size_t i = 0; i < std::size(kFormatNames); ++i) {
+        if (name != kFormatNames[i]) continue;
+        *format = static_cast<TextureFormat>(i);
         return true;
     }
     return false;
@@ -137,24 +90,13 @@ int PowerOfTwoSide(int side) {
 }
 
 std::vector<uint8_t> EncodePvr(const Image& image, TextureFormat format) {
-    const FormatInfo& info = kFormats[static_cast<size_t>(format)];
     Image level = FlipRows(image);
     const int width = PowerOfTwoSide(image.width), height = PowerOfTwoSide(image.height);
-    if (width != image.width || height != image.height) level = ResizeImage(level, width, height);
-
-    pod::PvrImage pvr;
-    pvr.type = info.pvrType;
-    pvr.width = static_cast<uint32_t>(width);
-    pvr.height = static_cast<uint32_t>(height);
-    pvr.flags = pod::kPvrFlipped;
-    if (format == TextureFormat::kRgba8888 && image.hasAlpha) pvr.flags |= pod::kPvrAlpha;
-    pvr.surfaces.resize(1);
-    pvr.surfaces[0].push_back(info.encode(level));
-    while (level.width > 1 || level.height > 1) {
-        level = HalveImage(level);
-        pvr.surfaces[0].push_back(info.encode(level));
+    if (width != image.width || height != image.height) {
+        level = ResizeImage(level, width, height);
+        level.hasAlpha = image.hasAlpha;
     }
-    return pod::WritePvr(pvr);
+    return EncodePvrFile({level}, *FindFormat(kFormatNames[static_cast<size_t>(format)]), true, true);
 }
 
 TextureSet::TextureSet(const aiScene* scene, std::string inputPath, std::string outputDirectory,

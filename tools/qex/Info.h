@@ -11,6 +11,7 @@
 
 #include "EngineOutput.h"
 #include "Qex.h"
+#include "TextureContainer.h"
 
 using Json = nlohmann::ordered_json;
 
@@ -35,18 +36,9 @@ bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* 
 bool DescribeTga(const std::vector<uint8_t>& file, Json* document, std::string* error);
 bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* error);
 
-bool IsKtx(const std::vector<uint8_t>& start);
-bool IsPvr(const std::vector<uint8_t>& start);
+constexpr char kNoMipmaps[] = "its sides are no powers of two: with mipmaps it is black on a plain GL ES 2.0";
 
-uint32_t ReadLE32(const std::vector<uint8_t>& bytes, size_t at);
-
-// Levels of a whole mipmap chain.
-uint32_t FullChain(uint32_t width, uint32_t height);
-
-// InfoCommand.cpp. The first `most` bytes of a file; false, with the reason, when it cannot be read.
-bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error);
-
-// Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.
+// InfoCommand.cpp. Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.
 bool DescribeContainer(const std::string& path, Json* document, std::string* error);
 
 // InfoText.cpp. Prints the document on standard output.

@@ -1,12 +1,7 @@
 #include "InfoCommand.h"
 
-#include <algorithm>
-#include <cerrno>
 #include <cstdint>
 #include <cstdio>
-#include <cstring>
-#include <filesystem>
-#include <memory>
 
 #include "Info.h"
 #include "RenderDiagnosis.h"
@@ -46,28 +41,6 @@ std::string CleanText(const std::string& text) {
     for (char& c : clean)
         if ((c >= 0 && c < ' ') || c == 127) c = c == '\n' || c == '\r' || c == '\t' ? ' ' : '?';
     return clean;
-}
-
-bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error) {
-    bytes->clear();
-    if (!IsRegularFile(path)) {
-        *error = "is not a file that can be read";
-        return false;
-    }
-    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
-    if (!file) {
-        *error = std::string("cannot be opened: ") + strerror(errno);
-        return false;
-    }
-    uint8_t chunk[65536];
-    while (bytes->size() < most) {
-        const size_t got = fread(chunk, 1, std::min(sizeof chunk, most - bytes->size()), file.get());
-        if (!got) break;
-        bytes->insert(bytes->end(), chunk, chunk + got);
-    }
-    if (!ferror(file.get())) return true;
-    *error = std::string("cannot be read: ") + strerror(errno);
-    return false;
 }
 
 bool DescribeContainer(const std::string& path, Json* document, std::string* error) {

@@ -2,7 +2,11 @@
 
 #include <algorithm>
 #include <cctype>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
 #include <filesystem>
+#include <memory>
 
 bool IsRegularFile(const std::string& path) {
     std::error_code error;
@@ -44,4 +48,26 @@ TextureFile FindTexture(const std::string& path) {
     for (const char* picture : {".png", ".jpg", ".jpeg", ".tga", ".bmp"})
         if (IsRegularFile(base + picture)) return {TextureFile::kPicture, base + picture};
     return {};
+}
+
+bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error) {
+    bytes->clear();
+    if (!IsRegularFile(path)) {
+        *error = "is not a file that can be read";
+        return false;
+    }
+    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
+    if (!file) {
+        *error = std::string("cannot be opened: ") + strerror(errno);
+        return false;
+    }
+    uint8_t chunk[65536];
+    while (bytes->size() < most) {
+        const size_t got = fread(chunk, 1, std::min(sizeof chunk, most - bytes->size()), file.get());
+        if (!got) break;
+        bytes->insert(bytes->end(), chunk, chunk + got);
+    }
+    if (!ferror(file.get())) return true;
+    *error = std::string("cannot be read: ") + strerror(errno);
+    return false;
 }

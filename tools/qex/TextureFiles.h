@@ -1,7 +1,9 @@
-// Which file stands for a texture name of a scene.
+// Which file stands for a texture name of a scene, and what is in a file.
 #pragma once
 
+#include <cstdint>
 #include <string>
+#include <vector>
 
 struct TextureFile {
     enum Kind { kMissing, kContainer, kPicture };  // container: PVR or KTX, which the engine loads itself
@@ -21,3 +23,6 @@ std::string Directory(const std::string& path);  // with its separator; empty fo
 std::string Extension(const std::string& path);  // lower case, without the dot
 std::string WithoutExtension(const std::string& path);
 bool IsRegularFile(const std::string& path);
+
+// The first `most` bytes of a file; false, with the reason, when it cannot be read.
+bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error);

@@ -9,6 +9,8 @@
 #include "InfoCommand.h"
 #include "RenderCommand.h"
 #include "SheetCommand.h"
+#include "TextureCommand.h"
+#include "TextureFormats.h"
 
 namespace {
 
@@ -225,6 +227,29 @@ void SetUpSheet(CLI::App* app, SheetOptions* options) {
     app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(CLI::Range(0, 1000));
 }
 
+void SetUpTexture(CLI::App* app, TextureOptions* options) {
+    app->add_option("IN", options->input, "PNG, JPEG, TGA, ... picture, or PVR or KTX texture");
+    app->add_option("-o,--output", options->output, "PNG picture, or PVR or KTX texture, by its extension")
+        ->required();
+    app->add_option("--format", options->format, FormatNames() + " (rgba8888 with alpha, rgb888 without)");
+    app->add_flag("--mipmaps", options->mipmaps, "write the whole mipmap chain");
+    app->add_flag("--flip", options->flip, "turn the rows over; else the first is the picture's top");
+    app->add_option("--faces", options->faces, "instead of IN: squares +X -X +Y -Y +Z -Z of a cube map")
+        ->expected(1, 100);
+    app->add_option("--level", options->level, "mipmap level of the texture IN (0)")
+        ->check(CLI::Range(0, 31));
+    app->add_option("--face", options->face, "face of the cube map IN (PNG: 0; PVR and KTX: all)")
+        ->check(CLI::Range(0, 5));
+    app->footer(
+        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88 "
+        "and\n"
+        "a8, and are black until QexTexture_SetFilter is called unless they have --mipmaps. PVRTC is read, "
+        "not\n"
+        "written. In a picture luminance is grey, and alpha 8 is white with alpha. From texture to texture "
+        "blocks\n"
+        "and mipmaps are made anew.");
+}
+
 // The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
 // word or option there is named instead.
 int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, char** argv) {
@@ -234,7 +259,7 @@ int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, cha
     text = text.substr(0, text.find('\n'));
     if (verb.empty() && argc > 1)
         text = (argv[1][0] == '-' ? "unknown option '" : "unknown verb '") + std::string(argv[1]) +
-               "'; expected info, render, convert or sheet";
+               "'; expected info, render, convert, texture or sheet";
     fprintf(stderr, "qex%s: %s\n", verb.c_str(), text.c_str());
     return 2;
 }
@@ -248,6 +273,7 @@ int main(int argc, char** argv) {
     InfoOptions info;
     RenderOptions render;
     ConvertOptions convert;
+    TextureOptions texture;
     SheetOptions sheet;
     CLI::App* infoApp = app.add_subcommand("info", "what is in a POD, PVR, KTX or TGA file");
     infoApp->add_option("FILE", info.input, "file to look into")->required();
@@ -256,6 +282,8 @@ int main(int argc, char** argv) {
     SetUpRender(renderApp, &render);
     CLI::App* convertApp = app.add_subcommand("convert", "make a POD scene from another format");
     SetUpConvert(convertApp, &convert);
+    CLI::App* textureApp = app.add_subcommand("texture", "make a texture of a picture, or a picture of one");
+    SetUpTexture(textureApp, &texture);
     CLI::App* sheetApp = app.add_subcommand("sheet", "put several pictures into one");
     SetUpSheet(sheetApp, &sheet);
     try {
@@ -266,6 +294,7 @@ int main(int argc, char** argv) {
     }
     if (infoApp->parsed()) return RunInfo(info);
     if (renderApp->parsed()) return RunRender(render);
+    if (textureApp->parsed()) return RunTexture(texture);
     if (sheetApp->parsed()) return RunSheet(sheet);
     return RunConvert(convert);
 }
