@@ -39,7 +39,6 @@ std::string PvrRefusal(const PvrFile& pvr);
 // ---- KTX 1.1 ----
 
 struct KtxFile {
-    uint32_t endianness;
     bool swapped;  // the header is in the other byte order
     uint32_t glType, glTypeSize, glFormat, glInternalFormat, glBaseInternalFormat;
     uint32_t width, height, depth, arrayElements, faces, levels, keyValueBytes;

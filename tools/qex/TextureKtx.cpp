@@ -6,7 +6,7 @@
 
 namespace {
 
-constexpr uint32_t kNativeEndianness = 0x04030201, kSwappedEndianness = 0x01020304;
+constexpr uint32_t kSwappedEndianness = 0x01020304;  // anything else counts as little-endian
 const uint8_t kIdentifier[12] = {0xAB, 'K', 'T', 'X', ' ', '1', '1', 0xBB, '\r', '\n', 0x1A, '\n'};
 constexpr uint32_t kRgb = 0x1907, kRgba = 0x1908;
 
@@ -66,7 +66,6 @@ uint64_t RowBytes(const PixelFormat& format, uint32_t width, uint32_t height, ui
 
 // What is wrong with a file whatever reads it.
 std::string KtxFault(const KtxFile& ktx) {
-    if (ktx.endianness != kNativeEndianness && !ktx.swapped) return "its byte order is none of the two";
     if (ktx.faces != 1 && ktx.faces != 6) return std::to_string(ktx.faces) + " faces instead of 1 or 6";
     if (!ktx.width || !ktx.height) return "it has no pixels of two dimensions";
     return SizeFault(ktx.format, ktx.width, ktx.height, ktx.faces == 6, std::max(ktx.levels, 1u));
@@ -109,8 +108,7 @@ bool ReadKtxHeader(const TextureBytes& file, KtxFile* ktx) {
         &ktx->glType, &ktx->glTypeSize,   &ktx->glFormat, &ktx->glInternalFormat, &ktx->glBaseInternalFormat,
         &ktx->width,  &ktx->height,       &ktx->depth,    &ktx->arrayElements,    &ktx->faces,
         &ktx->levels, &ktx->keyValueBytes};
-    ktx->endianness = ReadLE32(file, 12);
-    ktx->swapped = ktx->endianness == kSwappedEndianness;
+    ktx->swapped = ReadLE32(file, 12) == kSwappedEndianness;
     uint64_t at = 16;
     for (uint32_t* field : fields) {
         *field = KtxWord(file, *ktx, at);
