@@ -58,8 +58,9 @@ bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* 
     Json& problems = (*document)["problems"];
     if (refusal.empty() && !MipmapsFit(pvr.width, pvr.height, pvr.levels))
         problems.push_back(kNoMipmaps);
-    else if (refusal.empty() && pvr.levels > 1 && pvr.levels < FullChain(pvr.width, pvr.height))
-        problems.push_back("its mipmap chain is not whole: it is black");
+    else if (refusal.empty() && pvr.format->coding == PixelFormat::kEtc1 && pvr.levels > 1 &&
+             pvr.levels < FullChain(pvr.width, pvr.height))
+        problems.push_back("its mipmap chain is not whole: it is black where the GL takes ETC1");
     if (refusal.empty() && !pvr.cube && pvr.surfaces > 1)
         problems.push_back("it is no cube map: the last of its surfaces is what shows");
     if (refusal.empty() && pvr.cube && pvr.surfaces < 6)

@@ -71,7 +71,7 @@ bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* 
     const uint32_t chain = FullChain(ktx.width, ktx.height);
     if (!MipmapsFit(ktx.width, ktx.height, ktx.levels ? ktx.levels : chain))
         problems.push_back(kNoMipmaps);
-    else if (ktx.levels && ktx.levels < chain)
+    else if (ktx.Compressed() && ktx.levels < chain)
         problems.push_back("its mipmap chain is not whole: black until QexTexture_SetFilter is called");
     if (ktx.depth > 1 || ktx.arrayElements > 0)
         problems.push_back("only the first picture is read of a volume or an array");

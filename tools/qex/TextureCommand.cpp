@@ -137,7 +137,7 @@ Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& f
     if (failure.status) return failure;
     const std::string warning = options.output + ": warning: ";
     if (options.mipmaps && !MipmapsFit(width, height, FullChain(width, height)))
-        Say(warning + "its sides are no powers of two; with mipmaps it is black on a plain GL ES 2.0");
+        Say(warning + "its sides are no powers of two; a plain GL ES 2.0 has no mipmaps for it");
     if (format.coding != PixelFormat::kEtc1) {
         if (alpha && !format.alpha) Say(warning + "the picture's alpha is lost in " + format.name);
         return {};

@@ -241,13 +241,10 @@ void SetUpTexture(CLI::App* app, TextureOptions* options) {
     app->add_option("--face", options->face, "face of the cube map IN (PNG: 0; PVR and KTX: all)")
         ->check(CLI::Range(0, 5));
     app->footer(
-        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88 "
-        "and\n"
-        "a8, and are black until QexTexture_SetFilter is called unless they have --mipmaps. PVRTC is read, "
-        "not\n"
-        "written. In a picture luminance is grey, and alpha 8 is white with alpha. From texture to texture "
-        "blocks\n"
-        "and mipmaps are made anew.");
+        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88\n"
+        "and a8; those in etc1 are black until QexTexture_SetFilter is called, unless they have --mipmaps.\n"
+        "PVRTC is read, not written. In a picture luminance is grey, and alpha 8 is white with alpha. From\n"
+        "texture to texture blocks and mipmaps are made anew.");
 }
 
 // The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
