@@ -68,21 +68,21 @@ bool AreFinite(const float* values, size_t count) {
 // What is wrong with an emitter from a file, or null. Colours, animations and slots that are not in use may
 // hold anything.
 const char* Fault(const QexParticleEmitter& e) {
-    if (e.colorCount < 0 || e.colorCount > QEX_EMITTER_MAX_COLORS) return "colour count is not 0 to 10";
+    if (e.colorCount < 0 || e.colorCount > QEX_EMITTER_MAX_COLORS) return "a colour count is not 0 to 10";
     if (e.animationCount < 0 || e.animationCount > QEX_EMITTER_MAX_ANIMATIONS)
-        return "animation count is not 0 to 10";
-    if (e.particleCount < 0 || e.particleCount > QEX_EMITTER_SLOTS) return "particle count is not 0 to 300";
+        return "an animation count is not 0 to 10";
+    if (e.particleCount < 0 || e.particleCount > QEX_EMITTER_SLOTS) return "a particle count is not 0 to 300";
     for (int32_t i = 0; i < e.animationCount; ++i) {
         const QexParticleAnimation& animation = e.animations[i];
         if (animation.frameCount < 0 || animation.frameCount > QEX_ANIMATION_MAX_FRAMES)
-            return "frame count is not 0 to 10";
-        if (!std::isfinite(animation.frameDuration)) return "frame duration is not a finite number";
+            return "a frame count is not 0 to 10";
+        if (!std::isfinite(animation.frameDuration)) return "a frame duration is not a finite number";
     }
     constexpr size_t kAfterColors = offsetof(QexParticleEmitter, startOpacity) / 4;
     const float* opacity = &e.startOpacity;
     if (!AreFinite(&e.emitDuration, 5) || !AreFinite(&e.colors[0].x, static_cast<size_t>(e.colorCount) * 4) ||
         !AreFinite(opacity, kSettingWords - kAfterColors) || !AreFinite(&e.currentRate, 2))
-        return "setting is not a finite number";
+        return "a setting is not a finite number";
     return nullptr;
 }
 
@@ -104,7 +104,7 @@ QexParticleEmitter* Read(const char* path, FILE* file) {
     if (!ReadWhole(path, file, bytes.Get())) return nullptr;
     Carry({bytes.Get(), false}, emitter.Get());
     if (const char* fault = Fault(emitter[0])) {
-        QexError(QEX_TAG, "<QexParticleEmitter_CreateFromBinFile> %s: a %s", path, fault);
+        QexError(QEX_TAG, "<QexParticleEmitter_CreateFromBinFile> %s: %s", path, fault);
         return nullptr;
     }
     // Without their billboards the particles are nothing.
