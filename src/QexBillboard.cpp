@@ -91,17 +91,6 @@ void RotateTowardsEye(QexMatrix* out, const QexBillboard& b, const QexVec3& eye)
     QexMatrix_Multiply(out, &pitch, out);
 }
 
-void Rotate(QexMatrix* out, const QexBillboard& b, const QexCamera& camera) {
-    // Facing the screen, the rotation could show in the bottom row of a view with perspective only.
-    const float* view = camera.viewMatrix.m;
-    if (b.mode == QEX_BILLBOARD_SCREEN && view[3] == 0 && view[7] == 0 && view[11] == 0)
-        *out = g_sMatIdentity;
-    else if (b.mode == QEX_BILLBOARD_CAMERA || b.mode == QEX_BILLBOARD_YAW)
-        RotateTowardsEye(out, b, camera.eye);
-    else
-        QexMatrix_RotateXYZ(out, b.rotation.x, b.rotation.y, b.rotation.z);
-}
-
 void SetAxis(QexMatrix* m, int column, float x, float y, float z) {
     m->m[4 * column] = x;
     m->m[4 * column + 1] = y;
@@ -110,7 +99,10 @@ void SetAxis(QexMatrix* m, int column, float x, float y, float z) {
 
 void BuildMVP(QexMatrix* out, const QexBillboard& b, const QexCamera& camera) {
     const float width = b.width * b.scale.x, height = b.height * b.scale.y;
-    Rotate(out, b, camera);
+    if (b.mode == QEX_BILLBOARD_CAMERA || b.mode == QEX_BILLBOARD_YAW)
+        RotateTowardsEye(out, b, camera.eye);
+    else
+        QexMatrix_RotateXYZ(out, b.rotation.x, b.rotation.y, b.rotation.z);
     // Translation * rotation * scaling, put together in place.
     Store4(out->m, Load4(out->m) * width);
     Store4(out->m + 4, Load4(out->m + 4) * height);
@@ -122,6 +114,23 @@ void BuildMVP(QexMatrix* out, const QexBillboard& b, const QexCamera& camera) {
         SetAxis(out, 2, 0, 0, 1);
     }
     QexMatrix_Multiply(out, &camera.projectionMatrix, out);
+}
+
+// The same for a billboard that faces the screen, under a view without perspective: only its position goes
+// through the view. Particles are like that.
+void BuildScreenMVP(QexMatrix* out, const QexBillboard& b, const QexCamera& camera) {
+    const float *v = camera.viewMatrix.m, *p = camera.projectionMatrix.m;
+    const Float4 p0 = Load4(p), p1 = Load4(p + 4), p2 = Load4(p + 8), p3 = Load4(p + 12);
+    const Float4 position = {b.position.x, b.position.y, b.position.z, 1};
+    const Float4 at = Combine3(Load4(v), Load4(v + 4), Load4(v + 8), position) + Load4(v + 12);
+    Store4(out->m, p0 * (b.width * b.scale.x));
+    Store4(out->m + 4, p1 * (b.height * b.scale.y));
+    Store4(out->m + 8, p2);
+    Store4(out->m + 12, Combine3(p0, p1, p2, at) + p3 * Splat<3>(at));
+}
+
+bool HasPerspective(const QexMatrix& view) {
+    return view.m[3] != 0 || view.m[7] != 0 || view.m[11] != 0;
 }
 
 }  // namespace
@@ -172,7 +181,8 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
     const GLuint position = static_cast<GLuint>(g_BillboardInPosLoc);
     const GLuint texCoord = static_cast<GLuint>(g_BillboardUVLoc);
     QexMatrix mvp;
-    BuildMVP(&mvp, *billboard, *camera);
+    const bool simple = billboard->mode == QEX_BILLBOARD_SCREEN && !HasPerspective(camera->viewMatrix);
+    (simple ? BuildScreenMVP : BuildMVP)(&mvp, *billboard, *camera);
     QexRenderState_UseProgram(g_BillboardShaderProgramID);
     glUniform1f(g_BillboardOpacityLoc, billboard->opacity);
     glUniform1f(g_BillboardAlphaThresholdLoc, kAlphaThreshold);
