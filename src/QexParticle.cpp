@@ -195,5 +195,5 @@ void QexParticleSet_Release(QexParticleSet* set) {
 
 static_assert(sizeof(QexParticleSetEntry) == 28, "7 floats");
 #if UINTPTR_MAX == UINT32_MAX
-static_assert(sizeof(QexParticleSet) == 148, "37 words");
+static_assert(sizeof(QexParticleSet) == 144, "36 words");
 #endif
