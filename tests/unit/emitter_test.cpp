@@ -3,6 +3,7 @@
 
 #include <cmath>
 #include <cstring>
+#include <iterator>
 #include <limits>
 #include <memory>
 
@@ -49,22 +50,15 @@ TEST(EmitterFile, DefaultsLieAtTheirOffsets) {
     const EmitterPointer emitter = NewEmitter();
     const std::vector<uint8_t> bytes = Written(*emitter);
     ASSERT_EQ(bytes.size(), 45304u);
-    const struct {
-        size_t offset;
-        std::vector<float> values;
-    } floats[] = {{4, {-1, 0.5f, 0.8f, 5, 6, 1, 1, 1, 1, 0}},
-                  {188, {1, 0, 1, 1, 1, 1, 1, 1, 1, 0, 0, 0, 0, 0, 0}},
-                  {248, std::vector<float>(18)},
-                  {320, {-80, 300, -80, 80, 400, 80, 0, -98, 0, 0, -98, 0}},
-                  {412, {0}},
-                  {45300, {0}}};
-    for (const auto& row : floats)
-        for (size_t i = 0; i < row.values.size(); ++i)
-            EXPECT_EQ(At<float>(bytes, row.offset + 4 * i), row.values[i]) << "offset " << row.offset + 4 * i;
-    const std::pair<size_t, int32_t> integers[] = {{0, 1},   {184, 1}, {368, 0},  {408, 1},
-                                                   {416, 0}, {888, 1}, {45292, 0}};
-    for (const auto& [offset, value] : integers) EXPECT_EQ(At<int32_t>(bytes, offset), value) << offset;
-    EXPECT_EQ(At<float>(bytes, 45296), emitter->currentRate);
+    const std::pair<size_t, std::vector<float>> floats[] = {
+        {4, {-1, 0.5f, 0.8f, 5, 6, 1, 1, 1, 1}}, {188, {1}},   {196, {1, 1, 1, 1, 1, 1, 1}},
+        {320, {-80, 300, -80, 80, 400, 80}},     {348, {-98}}, {360, {-98}},
+        {45296, {emitter->currentRate}}};
+    std::vector<uint8_t> expected(45304);
+    for (const auto& [offset, values] : floats)
+        for (size_t i = 0; i < values.size(); ++i) Put(&expected, offset + 4 * i, values[i]);
+    for (const size_t offset : {0, 184, 408, 888}) Put<int32_t>(&expected, offset, 1);
+    EXPECT_EQ(bytes, expected);
     EXPECT_GE(emitter->currentRate, 0.5f);
     EXPECT_LE(emitter->currentRate, 0.8f);
 }
@@ -88,27 +82,38 @@ TEST(EmitterFile, EveryFieldKeepsItsPlace) {
     EXPECT_EQ(Written(*emitter), bytes);
 
     const QexParticleEmitter& e = *emitter;
-    EXPECT_EQ(e.lifetime[1], 20);
-    EXPECT_EQ(e.colors[9].w, 180);
-    EXPECT_EQ(e.endOpacity, 192);
-    EXPECT_EQ(e.scaleMax.y, 212);
-    EXPECT_EQ(e.scaleFactor, 220);
-    EXPECT_EQ(e.rotationMax.x, 236);
-    EXPECT_EQ(e.angularVelocityMin.z, 256);
-    EXPECT_EQ(e.angularAccelerationMax.x, 284);
-    EXPECT_EQ(e.positionSpread.x, 308);
-    EXPECT_EQ(e.accelerationMax.z, 364);
-    EXPECT_EQ(e.animations[9].frameCount, 9);
-    EXPECT_EQ(e.animations[9].frameDuration, 368 + 9 * 52 + 44);
     const QexParticleEx& p = e.particles[299];
-    const float start = 892 + 299 * 148;
-    const std::pair<float, float> fields[] = {
-        {p.age, 4},           {p.lifetime, 8},    {p.color.w, 24},     {p.opacity, 28},
-        {p.startOpacity, 32}, {p.endOpacity, 36}, {p.scale.x, 40},     {p.scaleFactor, 52},
-        {p.rotation.x, 56},   {p.position.x, 92}, {p.velocity.x, 104}, {p.acceleration.z, 124},
-        {p.frameAge, 136}};
-    for (const auto& [value, offset] : fields) EXPECT_EQ(value, start + offset);
-    EXPECT_EQ(e.accumulator, 45300);
+    constexpr float kSlot = 892 + 299 * 148;
+    const float values[] = {e.lifetime[1],
+                            e.colors[9].w,
+                            e.endOpacity,
+                            e.scaleMax.y,
+                            e.scaleFactor,
+                            e.rotationMax.x,
+                            e.angularVelocityMin.z,
+                            e.angularAccelerationMax.x,
+                            e.positionSpread.x,
+                            e.accelerationMax.z,
+                            e.animations[9].frameDuration,
+                            e.accumulator,
+                            p.lifetime,
+                            p.color.w,
+                            p.opacity,
+                            p.endOpacity,
+                            p.scale.x,
+                            p.scaleFactor,
+                            p.rotation.x,
+                            p.position.x,
+                            p.velocity.x,
+                            p.acceleration.z,
+                            p.frameAge};
+    const float offsets[] = {20,         180,        192,         212,         220,        236,
+                             256,        284,        308,         364,         880,        45300,
+                             kSlot + 8,  kSlot + 24, kSlot + 28,  kSlot + 36,  kSlot + 40, kSlot + 52,
+                             kSlot + 56, kSlot + 92, kSlot + 104, kSlot + 124, kSlot + 136};
+    static_assert(sizeof values == sizeof offsets, "one for each");
+    for (size_t i = 0; i < std::size(values); ++i) EXPECT_EQ(values[i], offsets[i]);
+    EXPECT_EQ(e.animations[9].frameCount, 9);
 
     // Pointers of another process are never followed.
     for (size_t offset = 0; offset < bytes.size(); offset += 4)
