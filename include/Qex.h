@@ -3283,7 +3283,9 @@ QEX_API void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_
  *
  * A textured quad in the scene, turned by one of five modes. One texel of its texture is one unit wide and
  * high at scale 1. All billboards share one program, which lives from the first QexBillboard_Create to the
- * last QexBillboard_Release. Needs a current GL context, except where a function says not.
+ * last QexBillboard_Release: an application whose emitters run empty in between keeps a billboard of its own,
+ * so that it is not built anew in the middle of a frame. Needs a current GL context, except where a function
+ * says not.
  * ====================================================================================================== */
 
 /** Modes; with any other number the billboard has the rotation of its own (x, y, z) alone. */
@@ -3463,10 +3465,10 @@ typedef struct QexParticleEx {
 } QexParticleEx;
 
 /** An emitter; the application writes the settings directly. Where a minimum is below its maximum, particles
- *  draw a value between them at random; otherwise they take the minimum. */
+ *  draw a value between them at random; otherwise they take the minimum. After the semicolon: the default. */
 typedef struct QexParticleEmitter {
     int32_t emitting;      /* 1 while new particles are spawned; 1 at first */
-    float emitDuration;    /* seconds left to emit; 0 stops at the next update, negative never; -1 */
+    float emitDuration;    /* seconds left to emit, 0 stops at the next update, negative never; -1 */
     float emissionRate[2]; /* particles an update, minimum and maximum; 0.5, 0.8 */
     float lifetime[2];     /* seconds, minimum and maximum, negative for endless; 5, 6 */
     QexVec4 colors[QEX_EMITTER_MAX_COLORS]; /* RGBA, one of them for each particle; the first (1, 1, 1, 1) */

@@ -35,13 +35,6 @@ EmitterPointer ReadBack(const std::vector<uint8_t>& bytes) {
 }
 
 template <class T>
-T At(const std::vector<uint8_t>& bytes, size_t offset) {
-    T value;
-    memcpy(&value, &bytes.at(offset), sizeof value);
-    return value;
-}
-
-template <class T>
 void Put(std::vector<uint8_t>* bytes, size_t offset, T value) {
     memcpy(&bytes->at(offset), &value, sizeof value);
 }
