@@ -3352,6 +3352,269 @@ QEX_API int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context
 QEX_API void QexRenderTarget_Release(QexRenderTarget* target);
 
 /* ======================================================================================================
+ * Billboards
+ *
+ * A textured quad in the scene, turned by one of five modes. One texel of its texture is one unit wide and
+ * high at scale 1. All billboards share one program, which lives from the first QexBillboard_Create to the
+ * last QexBillboard_Release: an application whose emitters run empty in between keeps a billboard of its own,
+ * so that it is not built anew in the middle of a frame. Needs a current GL context, except where a function
+ * says not.
+ * ====================================================================================================== */
+
+/** Modes; with any other number the billboard has the rotation of its own (x, y, z) alone. */
+#define QEX_BILLBOARD_SCREEN 1  /* faces the screen, unrotated */
+#define QEX_BILLBOARD_UPRIGHT 2 /* faces the screen about its own up axis */
+#define QEX_BILLBOARD_CAMERA 3  /* turned towards the eye in pitch and yaw, then rotated about z */
+#define QEX_BILLBOARD_YAW 4     /* turned towards the eye in yaw alone, then rotated about z */
+
+/** A billboard. The application writes scale, rotation, position, mode and opacity directly. */
+typedef struct QexBillboard {
+    QexTexture* texture; /* image, the application's; alive as long as the billboard */
+    float width;         /* of the texture, pixels */
+    float height;
+    float unitScale;  /* 1; not read */
+    QexVec3 scale;    /* x and y multiply the size; z is not read */
+    QexVec3 rotation; /* degrees about x, y and z, x first */
+    QexVec3 position; /* centre, world space */
+    int32_t mode;     /* QEX_BILLBOARD_... */
+    float opacity;    /* multiplies the texture's alpha; products of 0.001 and less become 0 */
+} QexBillboard;
+
+/** GL names of the shared program and its shaders, 0 while there is none. Read only. */
+QEX_API extern uint32_t g_BillboardVShader;
+QEX_API extern uint32_t g_BillboardFShader;
+QEX_API extern uint32_t g_BillboardShaderProgramID;
+/** Attribute locations of inVertex and inTexCoord. Read only. */
+QEX_API extern int32_t g_BillboardInPosLoc;
+QEX_API extern int32_t g_BillboardUVLoc;
+/** Uniform locations of mvpMatrix, opacity, alphaThreshold and sTexture. Read only. */
+QEX_API extern int32_t g_BillboardMvpMatrixLoc;
+QEX_API extern int32_t g_BillboardOpacityLoc;
+QEX_API extern int32_t g_BillboardAlphaThresholdLoc;
+QEX_API extern int32_t g_BillboardTextureLoc;
+/** Billboards created and not released. Read only. */
+QEX_API extern int32_t g_BillboardCount;
+/** The unit quad: four positions (x, y, z), texture coordinates (s, t), and the indices of its strip. */
+QEX_API extern const float g_BB_Vertices[12];
+QEX_API extern const float g_BB_UVs[8];
+QEX_API extern const uint8_t g_BB_indices[4];
+/** The directions (0, 1, 0) and (0, 0, 1), which building the program sets. */
+QEX_API extern QexVec3 g_VecUp;
+QEX_API extern QexVec3 g_VecNormal;
+
+/** Creates a billboard in mode QEX_BILLBOARD_SCREEN at the origin, of scale 1 and opacity 1.
+ *  @param texture  see QexBillboard.texture; null means the default texture
+ *  @return the billboard, to be released with QexBillboard_Release, or null when memory runs out or the
+ *  program cannot be built. */
+QEX_API QexBillboard* QexBillboard_Create(QexTexture* texture);
+
+/** Gives a billboard another image: its texture, width, height and unitScale change. No GL context needed.
+ *  @param billboard  billboard; null does nothing
+ *  @param texture    as for QexBillboard_Create */
+QEX_API void QexBillboard_SetTexture(QexBillboard* billboard, QexTexture* texture);
+
+/** Draws a billboard from the engine's own memory: no GL buffer may be bound. Blending and depth are the
+ *  caller's. Leaves culling on and unit 0 active, and issues no GL error check of its own.
+ *  @param billboard  billboard; null does nothing
+ *  @param camera     eye, view and projection; null draws nothing */
+QEX_API void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera);
+
+/** Releases a billboard; the last one deletes the program. The texture stays.
+ *  @param billboard  not to be used afterwards; null does nothing */
+QEX_API void QexBillboard_Release(QexBillboard* billboard);
+
+/* ======================================================================================================
+ * Particles: sets and emitters
+ *
+ * A set is a batch of point sprites that the vertex shader moves: the application fills the buffer, triggers
+ * the set, and updates and draws it every frame until its duration has passed. An emitter spawns particles at
+ * random, moves them on the CPU and draws each as a billboard. Random numbers come from GetRandomNumber.
+ * ====================================================================================================== */
+
+/** A particle of a set, which lies at startPosition + time * velocity + the set's centerPosition. */
+typedef struct QexParticleSetEntry {
+    float lifetime;        /* seconds, > 0; fades and shrinks until then, and does not show later */
+    QexVec3 velocity;      /* units a second */
+    QexVec3 startPosition; /* model space */
+} QexParticleSetEntry;
+
+/** A particle set; the application allocates it, QexParticleSet_Create fills it. */
+typedef struct QexParticleSet {
+    QexTexture* texture; /* sprite, or null for the default texture; the application's */
+    QexTexture*
+        alphaTexture; /* its red channel multiplies alpha, and leaves out what is <= 0.004; likewise */
+    QexParticleSetEntry* buffer; /* count entries, the set's */
+    uint32_t count;              /* particles */
+    float pointSize;             /* pixels across at time 0; see QexParticleSet_Create */
+    float duration;              /* seconds after which the set stops */
+    QexVec4 startColor;          /* RGBA at time 0, (1, 1, 1, 1) at first */
+    QexVec4 endColor;            /* RGBA at the end of a lifetime, (1, 1, 1, 1) at first */
+    QexVec3 centerPosition;      /* added to every position, 0 at first */
+    QexMatrix mvpMatrix;         /* of the last update */
+    float time;                  /* seconds since the trigger */
+    uint32_t active;             /* 1 while running */
+    /* called as onFinished(set, 1, 0) when the duration is reached, may be null; may trigger the set again or
+     * release it */
+    void (*onFinished)(struct QexParticleSet* set, int32_t finished, int32_t zero);
+} QexParticleSet;
+
+/** Creates a set. Needs a current GL context. The point size is kept in the program that all sets share, so
+ *  that the set created last decides it for all.
+ *  @param set           out, cleared first; null is refused
+ *  @param texture       see QexParticleSet
+ *  @param alphaTexture  see QexParticleSet
+ *  @param count         particles; their entries are 0 until the application fills them
+ *  @param pointSize     pixels, >= 0
+ *  @param duration      seconds
+ *  @return 0, or -1 when the shared program cannot be built or memory runs out; the set is inert then. */
+QEX_API int32_t QexParticleSet_Create(QexParticleSet* set, QexTexture* texture, QexTexture* alphaTexture,
+                                      uint32_t count, float pointSize, float duration);
+
+/** Gives the entries of a set to fill. No GL context needed.
+ *  @param buffer  out, valid until the set's release; may be null
+ *  @param count   out, number of entries; may be null
+ *  @return 0, or -1, with nothing written, when the set is null or has no buffer. */
+QEX_API int32_t QexParticleSet_GetBuffer(QexParticleSet* set, QexParticleSetEntry** buffer, uint32_t* count);
+
+/** Starts a set, or starts it again. No GL context needed. @param set  null or released: does nothing */
+QEX_API void QexParticleSet_Trigger(QexParticleSet* set);
+
+/** Moves a running set on, or ends it when its time reaches the duration. Needs a current GL context.
+ *  @param set      null or not running: does nothing
+ *  @param elapsed  seconds since the last update
+ *  @param camera   view and projection, not null
+ *  @param model    the set's model matrix; null means the identity */
+QEX_API void QexParticleSet_Update(QexParticleSet* set, float elapsed, const QexCamera* camera,
+                                   const QexMatrix* model);
+
+/** Draws a running set from its own memory: no GL buffer may be bound. Blending is the caller's. Leaves the
+ *  depth test on (less or equal) with depth writes on, and unit 3 active. Needs a current GL context.
+ *  @param set  null or not running: does nothing */
+QEX_API void QexParticleSet_Draw(QexParticleSet* set);
+
+/** Frees a set's buffer; the last set deletes the program. Needs a current GL context.
+ *  @param set  stays the application's; null or already released: does nothing */
+QEX_API void QexParticleSet_Release(QexParticleSet* set);
+
+/** Slots of an emitter, and how many particles live at most. */
+#define QEX_EMITTER_SLOTS 300
+#define QEX_EMITTER_MAX_PARTICLES 299
+#define QEX_EMITTER_MAX_COLORS 10
+#define QEX_EMITTER_MAX_ANIMATIONS 10
+#define QEX_ANIMATION_MAX_FRAMES 10
+/** Bytes of an emitter file, and of QexParticleEmitter on 32-bit targets. */
+#define QEX_EMITTER_FILE_SIZE 45304
+
+/** A texture animation of an emitter. */
+typedef struct QexParticleAnimation {
+    QexTexture* frames[QEX_ANIMATION_MAX_FRAMES]; /* the application's; null means the default texture */
+    int32_t frameCount;                           /* frames in use, 0 to 10 */
+    float frameDuration;                          /* seconds */
+    int32_t loop;                                 /* 0 holds the last frame, others go back to the first */
+} QexParticleAnimation;
+
+/** A particle of an emitter. */
+typedef struct QexParticleEx {
+    int32_t active;                  /* 1 while it lives */
+    float age;                       /* seconds */
+    float lifetime;                  /* seconds; negative: endless */
+    QexVec4 color;                   /* RGBA, for the application: drawing does not read it */
+    float opacity;                   /* at present */
+    float startOpacity;              /* at age 0 */
+    float endOpacity;                /* at the end of the lifetime */
+    QexVec3 scale;                   /* of the billboard */
+    float scaleFactor;               /* multiplies the scale at every update */
+    QexVec3 rotation;                /* degrees about x, y and z */
+    QexVec3 angularVelocity;         /* degrees a second */
+    QexVec3 angularAcceleration;     /* degrees a second, a second */
+    QexVec3 position;                /* world space */
+    QexVec3 velocity;                /* units a second */
+    QexVec3 acceleration;            /* units a second, a second */
+    QexParticleAnimation* animation; /* entry of its emitter */
+    int32_t frame;                   /* of the animation, at present */
+    float frameAge;                  /* age at the last change of frame */
+    QexBillboard* billboard;         /* the particle's; null draws nothing */
+    uint32_t spare;                  /* not read */
+} QexParticleEx;
+
+/** An emitter; the application writes the settings directly. Where a minimum is below its maximum, particles
+ *  draw a value between them at random; otherwise they take the minimum. After the semicolon: the default. */
+typedef struct QexParticleEmitter {
+    int32_t emitting;      /* 1 while new particles are spawned; 1 at first */
+    float emitDuration;    /* seconds left to emit, 0 stops at the next update, negative never; -1 */
+    float emissionRate[2]; /* particles an update, minimum and maximum; 0.5, 0.8 */
+    float lifetime[2];     /* seconds, minimum and maximum, negative for endless; 5, 6 */
+    QexVec4 colors[QEX_EMITTER_MAX_COLORS]; /* RGBA, one of them for each particle; the first (1, 1, 1, 1) */
+    int32_t colorCount;                     /* colours in use, 1 to 10; 1 */
+    float startOpacity;                     /* 1 */
+    float endOpacity;                       /* 0 */
+    QexVec3 scaleMin;                       /* (1, 1, 1) */
+    QexVec3 scaleMax;                       /* (1, 1, 1) */
+    float scaleFactor;                      /* at every update; 1 */
+    QexVec3 rotationMin;                    /* degrees about x, y and z; 0 */
+    QexVec3 rotationMax;
+    QexVec3 angularVelocityMin; /* degrees a second; 0 */
+    QexVec3 angularVelocityMax;
+    QexVec3 angularAccelerationMin; /* degrees a second, a second; 0 */
+    QexVec3 angularAccelerationMax;
+    QexVec3 position;        /* of the emitter; 0 */
+    QexVec3 positionSpread;  /* plus or minus, for each axis where it is above 0; 0 */
+    QexVec3 velocityMin;     /* units a second; (-80, 300, -80) */
+    QexVec3 velocityMax;     /* (80, 400, 80) */
+    QexVec3 accelerationMin; /* units a second, a second; (0, -98, 0) */
+    QexVec3 accelerationMax; /* (0, -98, 0) */
+    QexParticleAnimation animations[QEX_EMITTER_MAX_ANIMATIONS]; /* one of them for each particle */
+    int32_t animationCount;                     /* animations in use, 1 to 10; 1, of the default texture */
+    QexParticleEx particles[QEX_EMITTER_SLOTS]; /* the living ones come first, in order of age */
+    int32_t particleCount;                      /* living particles, 0 to 299 */
+    float currentRate;                          /* particles an update, drawn from emissionRate */
+    float accumulator;                          /* particles due, below 1 after an update */
+} QexParticleEmitter;
+
+/** Creates an emitter of the defaults that its fields name. No GL context needed.
+ *  @return the emitter, to be released with QexParticleEmitter_Release, or null when memory runs out. */
+QEX_API QexParticleEmitter* QexParticleEmitter_Create(void);
+
+/** Moves the particles on, drops those whose lifetime was over at the update before, and spawns the ones that
+ *  are due, each with a billboard. Writes a line a particle to the log, tag "Emitter". Needs a current GL
+ *  context where particles are spawned or dropped.
+ *  @param emitter  null does nothing
+ *  @param elapsed  seconds since the last update
+ *  @param ignored  not read */
+QEX_API void QexParticleEmitter_Update(QexParticleEmitter* emitter, float elapsed, void* ignored);
+
+/** Moves one particle on. No GL context needed.
+ *  @param particle  null or not active: does nothing
+ *  @param elapsed   seconds since its last update */
+QEX_API void QexParticleEx_Update(QexParticleEx* particle, float elapsed);
+
+/** Draws an emitter's particles as billboards, in order, without depth writes, which are on afterwards.
+ * Writes a line to the log, tag "Particle emitter". Nothing is drawn, nor written, when the emitter is at its
+ * end. Otherwise as QexBillboard_Draw.
+ *  @param emitter  null does nothing
+ *  @param camera   see QexBillboard_Draw */
+QEX_API void QexParticleEmitter_Draw(QexParticleEmitter* emitter, const QexCamera* camera);
+
+/** Writes an emitter to a file of QEX_EMITTER_FILE_SIZE bytes: the record as it lies in memory on 32-bit
+ *  little-endian targets, pointers as 0. No GL context needed.
+ *  @param path  file, created or replaced
+ *  @return 0; -2 when an argument is null; -1 when the file cannot be created or, with a line in the log,
+ *  written. */
+QEX_API int32_t QexParticleEmitter_WriteToBinFile(const QexParticleEmitter* emitter, const char* path);
+
+/** Reads an emitter from a file of QexParticleEmitter_WriteToBinFile. Its pointers are null: set the frame
+ *  textures of the animations in use, or they show the default texture. Living particles in the file are left
+ *  out, with a line in the log. No GL context needed.
+ *  @return the emitter, to be released with QexParticleEmitter_Release; null when the path is null or the
+ * file cannot be opened, and, with a line in the log, when it is cut, a count in it is out of range, a
+ * setting is no finite number, or memory runs out. */
+QEX_API QexParticleEmitter* QexParticleEmitter_CreateFromBinFile(const char* path);
+
+/** Frees an emitter and its living particles' billboards, which needs a current GL context if there are any.
+ *  @param emitter  not to be used afterwards; null does nothing */
+QEX_API void QexParticleEmitter_Release(QexParticleEmitter* emitter);
+
+/* ======================================================================================================
  * Engine: start and end
  *
  * The application owns window, surface and GL context; it makes the context current, initialises the engine

@@ -1,0 +1,184 @@
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <cmath>
+#include <cstring>
+#include <iterator>
+#include <limits>
+#include <memory>
+
+#include "Qex.h"
+#include "support/Capture.h"
+
+namespace {
+
+using EmitterPointer = std::unique_ptr<QexParticleEmitter, decltype(&QexParticleEmitter_Release)>;
+
+EmitterPointer NewEmitter() {
+    return {QexParticleEmitter_Create(), QexParticleEmitter_Release};
+}
+
+std::vector<uint8_t> Written(const QexParticleEmitter& emitter) {
+    const std::string path = testing::TempDir() + "emitter_test." + std::to_string(getpid());
+    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(&emitter, path.c_str()), 0);
+    std::vector<uint8_t> bytes(100000);
+    FILE* file = fopen(path.c_str(), "rb");
+    bytes.resize(fread(bytes.data(), 1, bytes.size(), file));
+    fclose(file);
+    remove(path.c_str());
+    return bytes;
+}
+
+EmitterPointer ReadBack(const std::vector<uint8_t>& bytes) {
+    const MemoryFile file(bytes);
+    return {QexParticleEmitter_CreateFromBinFile(file.Path()), QexParticleEmitter_Release};
+}
+
+template <class T>
+void Put(std::vector<uint8_t>* bytes, size_t offset, T value) {
+    memcpy(&bytes->at(offset), &value, sizeof value);
+}
+
+TEST(EmitterFile, DefaultsLieAtTheirOffsets) {
+    const EmitterPointer emitter = NewEmitter();
+    const std::vector<uint8_t> bytes = Written(*emitter);
+    ASSERT_EQ(bytes.size(), 45304u);
+    const std::pair<size_t, std::vector<float>> floats[] = {
+        {4, {-1, 0.5f, 0.8f, 5, 6, 1, 1, 1, 1}}, {188, {1}},   {196, {1, 1, 1, 1, 1, 1, 1}},
+        {320, {-80, 300, -80, 80, 400, 80}},     {348, {-98}}, {360, {-98}},
+        {45296, {emitter->currentRate}}};
+    std::vector<uint8_t> expected(45304);
+    for (const auto& [offset, values] : floats)
+        for (size_t i = 0; i < values.size(); ++i) Put(&expected, offset + 4 * i, values[i]);
+    for (const size_t offset : {0, 184, 408, 888}) Put<int32_t>(&expected, offset, 1);
+    EXPECT_EQ(bytes, expected);
+    EXPECT_GE(emitter->currentRate, 0.5f);
+    EXPECT_LE(emitter->currentRate, 0.8f);
+}
+
+// A value of its own in every word shows where each one goes, and that all come back.
+TEST(EmitterFile, EveryFieldKeepsItsPlace) {
+    std::vector<uint8_t> bytes(45304);
+    const auto isPointer = [](size_t offset) {
+        if (offset >= 368 && offset < 888) return (offset - 368) % 52 < 40;
+        const size_t inSlot = (offset - 892) % 148;
+        return offset >= 892 && offset < 45292 && (inSlot == 128 || inSlot == 140);
+    };
+    for (size_t offset = 0; offset < bytes.size(); offset += 4)
+        Put(&bytes, offset, isPointer(offset) ? 0.0f : static_cast<float>(offset));
+    for (size_t i = 0; i < 10; ++i) Put<int32_t>(&bytes, 408 + 52 * i, static_cast<int32_t>(i));
+    Put<int32_t>(&bytes, 184, 10);
+    Put<int32_t>(&bytes, 888, 10);
+    Put<int32_t>(&bytes, 45292, 0);
+    EmitterPointer emitter = ReadBack(bytes);
+    ASSERT_TRUE(emitter);
+    EXPECT_EQ(Written(*emitter), bytes);
+
+    const QexParticleEmitter& e = *emitter;
+    const QexParticleEx& p = e.particles[299];
+    constexpr float kSlot = 892 + 299 * 148;
+    const float values[] = {e.lifetime[1],
+                            e.colors[9].w,
+                            e.endOpacity,
+                            e.scaleMax.y,
+                            e.scaleFactor,
+                            e.rotationMax.x,
+                            e.angularVelocityMin.z,
+                            e.angularAccelerationMax.x,
+                            e.positionSpread.x,
+                            e.accelerationMax.z,
+                            e.animations[9].frameDuration,
+                            e.accumulator,
+                            p.lifetime,
+                            p.color.w,
+                            p.opacity,
+                            p.endOpacity,
+                            p.scale.x,
+                            p.scaleFactor,
+                            p.rotation.x,
+                            p.position.x,
+                            p.velocity.x,
+                            p.acceleration.z,
+                            p.frameAge};
+    const float offsets[] = {20,         180,        192,         212,         220,        236,
+                             256,        284,        308,         364,         880,        45300,
+                             kSlot + 8,  kSlot + 24, kSlot + 28,  kSlot + 36,  kSlot + 40, kSlot + 52,
+                             kSlot + 56, kSlot + 92, kSlot + 104, kSlot + 124, kSlot + 136};
+    static_assert(sizeof values == sizeof offsets, "one for each");
+    for (size_t i = 0; i < std::size(values); ++i) EXPECT_EQ(values[i], offsets[i]);
+    EXPECT_EQ(e.animations[9].frameCount, 9);
+
+    // Pointers of another process are never followed.
+    for (size_t offset = 0; offset < bytes.size(); offset += 4)
+        if (isPointer(offset)) Put<uint32_t>(&bytes, offset, 0xDEADBEEF);
+    emitter = ReadBack(bytes);
+    ASSERT_TRUE(emitter);
+    EXPECT_EQ(emitter->animations[3].frames[9], nullptr);
+    EXPECT_EQ(emitter->particles[299].animation, nullptr);
+    EXPECT_EQ(emitter->particles[299].billboard, nullptr);
+}
+
+TEST(EmitterFile, BrokenFilesAreRefused) {
+    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(nullptr, "x"), -2);
+    const EmitterPointer emitter = NewEmitter();
+    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(emitter.get(), nullptr), -2);
+    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(emitter.get(), "/no/such/folder/file"), -1);
+    EXPECT_EQ(QexParticleEmitter_CreateFromBinFile(nullptr), nullptr);
+    EXPECT_EQ(QexParticleEmitter_CreateFromBinFile("/no/such/file"), nullptr);
+    {
+        Capture log(STDERR_FILENO);
+        EXPECT_EQ(QexParticleEmitter_WriteToBinFile(emitter.get(), "/dev/full"), -1);
+        EXPECT_EQ(QexParticleEmitter_CreateFromBinFile("/"), nullptr);
+        EXPECT_NE(log.Text().find("/dev/full cannot be written"), std::string::npos);
+    }
+
+    const std::vector<uint8_t> whole = Written(*emitter);
+    for (const size_t size : {0, 100, 45300, 45303}) {
+        Capture log(STDERR_FILENO);
+        EXPECT_FALSE(ReadBack({whole.begin(), whole.begin() + static_cast<long>(size)})) << size;
+        EXPECT_NE(log.Text().find(std::to_string(size) + " bytes, not 45304\n"), std::string::npos);
+    }
+    const float nan = std::nanf(""), infinity = std::numeric_limits<float>::infinity();
+    const auto bits = [](float value) {
+        int32_t word;
+        memcpy(&word, &value, sizeof word);
+        return word;
+    };
+    const struct {
+        size_t offset;
+        int32_t value;
+        bool loads;
+        const char* line;
+    } cases[] = {{184, 11, false, "a colour count is not 0 to 10\n"},
+                 {184, -1, false, "a colour count"},
+                 {888, 11, false, "an animation count"},
+                 {888, INT32_MIN, false, "animation count"},
+                 {408, 11, false, "frame count"},
+                 {408 + 52, -7, true, ""},  // of an animation that is not in use
+                 {45292, 301, false, "particle count"},
+                 {45292, -1, false, "particle count"},
+                 {45292, 300, true, "300 living particles are left out\n"},
+                 {412, bits(nan), false, "frame duration"},
+                 {4, bits(nan), false, "setting is not a finite number"},
+                 {20, bits(infinity), false, "setting"},
+                 {36, bits(nan), false, "setting"},
+                 {40, bits(nan), true, ""},  // of a colour that is not in use
+                 {188, bits(nan), false, "setting"},
+                 {364, bits(-infinity), false, "setting"},
+                 {900, bits(nan), true, ""},
+                 {45296, bits(nan), false, "setting"},
+                 {45300, bits(infinity), false, "setting"}};
+    for (const auto& c : cases) {
+        std::vector<uint8_t> bytes = whole;
+        Put(&bytes, c.offset, c.value);
+        Capture log(STDERR_FILENO);
+        const EmitterPointer read = ReadBack(bytes);
+        const std::string text = log.Text();
+        EXPECT_EQ(read != nullptr, c.loads) << c.offset;
+        EXPECT_NE(text.find(c.line), std::string::npos) << c.offset << ": " << text;
+        EXPECT_EQ(text.empty(), !*c.line) << text;
+        EXPECT_EQ(read ? read->particleCount : 0, 0);
+    }
+}
+
+}  // namespace
