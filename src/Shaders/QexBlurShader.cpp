@@ -95,7 +95,8 @@ void QexBlurShader_SetParameters(QexShaderModule* module, const void*, float dir
                                  float samples, float blurSize) {
     const QexMatrix projection = ProjectionOf(module);
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kDirection), direction));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSigma), sigma));
+    // GPUs differ in how they compare what is no number.
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSigma), sigma == sigma ? sigma : 0));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kSamples), samples));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kBlurSize), blurSize));
     QEX_GL(
