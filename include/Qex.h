@@ -3463,7 +3463,8 @@ QEX_API int32_t QexPostProcessing_Finalize(void);
  *  @param sigma     as QexBlurShader's, in steps
  *  @param samples   9, 7, 5 or any other number, as QexBlurShader's
  *  @param mode      below 2: blurs at half the resolution, else at full
- *  @param zNear     nearest depth, in clip-space z, as QexDepthShader_SetParameters takes it
+ *  @param zNear     nearest depth, in clip-space z as QexDepthShader_SetParameters takes it, which
+ * QexCamera_Project lets run from 0 at the near plane to 1 at the far plane
  *  @param zFar      farthest depth, above zNear
  *  @return 0, or as said above. */
 QEX_API int32_t QexPostProcessing_DrawDOF(QexRuntimeContext* context, void* user1, void* user2, void* user3,
