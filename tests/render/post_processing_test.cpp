@@ -135,8 +135,8 @@ class PostProcessingTest : public RenderTest {
         EXPECT_EQ(LiveObjects(), before_);
         RenderTest::TearDown();
     }
-    int32_t DrawDOF(float focus, float range, int mode) {
-        return QexPostProcessing_DrawDOF(&runtime_, &runtime_, nullptr, this, DrawBlocks, focus, range,
+    int32_t DrawDOF(float focus, float range, int mode, QexSceneCallback callback = DrawBlocks) {
+        return QexPostProcessing_DrawDOF(&runtime_, &runtime_, nullptr, this, callback, focus, range,
                                          1.0f / kWidth, 1.0f / kHeight, 5, 9, mode, 0.25f, 8);
     }
 
@@ -297,32 +297,28 @@ TEST_F(PostProcessingTest, RefusesWhatCannotBeDrawn) {
     EXPECT_EQ(QexPP_GetRenderTarget(5), nullptr);
     QexRenderTarget small, *full = QexPP_GetRenderTarget(3);
     QexRenderTarget_Create(&small, 300, 240, 0);
-    QexTexture* source = &QexPP_GetRenderTarget(2)->colorTexture;
+    QexTexture* picture = &QexPP_GetRenderTarget(2)->colorTexture;
     const auto blur = [&](QexTexture* texture, QexRenderTarget* first, QexRenderTarget* second) {
         return QexPP_DrawBlurImage(&wide, nullptr, nullptr, nullptr, 5, 9, 0.1f, 0.1f, texture, first,
                                    second);
     };
-    EXPECT_EQ(blur(source, &small, full), -10);
+    EXPECT_EQ(blur(picture, &small, full), -10);
     QexRenderTarget_EndScene(&small);
     QexRenderTarget_Release(&small);
-    EXPECT_EQ(StateChange([&] {
-                  EXPECT_EQ(blur(source, nullptr, full), -9);
-                  EXPECT_EQ(blur(source, full, nullptr), -9);
-                  EXPECT_EQ(blur(nullptr, full, full), -9);
-                  EXPECT_EQ(QexPP_DrawImage(&wide, nullptr, nullptr, nullptr, nullptr, nullptr), -9);
-                  EXPECT_EQ(QexPP_DrawNormalScene(&runtime_, nullptr, nullptr, nullptr, nullptr, full), -9);
-                  EXPECT_EQ(QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, nullptr, 0, 0, 0,
-                                                      0, 5, 9, 0, 0, 1),
-                            -9);
-              }),
-              "");
-
-    const char* const sources[] = {pVertexShaderPP, pFragmentShaderPP};
+    const std::string refused = StateChange([&] {
+        EXPECT_EQ(blur(picture, nullptr, full), -9);
+        EXPECT_EQ(blur(picture, full, nullptr), -9);
+        EXPECT_EQ(blur(nullptr, full, full), -9);
+        EXPECT_EQ(QexPP_DrawNormalScene(&runtime_, nullptr, nullptr, nullptr, nullptr, full), -9);
+        EXPECT_EQ(DrawDOF(0, 0, 0, nullptr), -9);
+    });
+    EXPECT_EQ(refused, "");
+    const char* const source = pFragmentShaderPP;
     pFragmentShaderPP = "this is no shader";
     EXPECT_EQ(QexPP_CreateShader(&wide), -1);
     EXPECT_EQ(QexPostProcessing_Initialize(&wide), -1);
     EXPECT_EQ(LiveObjects(), before_);
-    pFragmentShaderPP = sources[1];
+    pFragmentShaderPP = source;
     for (const QexShaderModule* module : {depthShaderProgram, blurShaderProgram, DOFShaderProgram})
         EXPECT_EQ(module, nullptr);
     QexPostProcessing_Finalize();
@@ -335,14 +331,16 @@ TEST_F(PostProcessingTest, RefusesWhatCannotBeDrawn) {
 class PostProcessingFrame : public NullRenderTest {};
 
 TEST_F(PostProcessingFrame, AllocatesNothing) {
-    ASSERT_EQ(QexPostProcessing_Initialize(&runtime_), 0);
     const QexSceneCallback nothing = [](QexRuntimeContext*, void*, void*, void*, QexShaderModule*,
                                         QexShaderModule*, const float*) { return 0; };
-    const auto frame = [&] {
-        QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, nothing, 0, 1, 0.1f, 0.1f, 5, 9, 2, 0,
-                                  1);
-    };
-    EXPECT_EQ(CountAllocations(frame).made, 0);
+    QexPostProcessing_Initialize(&runtime_);
+    const Allocations frame = CountAllocations([&] {
+        for (const int mode : {0, 2})
+            EXPECT_EQ(QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, nothing, 0, 1, 0.1f,
+                                                0.1f, 5, 9, mode, 0, 1),
+                      0);
+    });
+    EXPECT_EQ(frame.made, 0);
     QexPostProcessing_Finalize();
 }
 
