@@ -2476,6 +2476,52 @@ QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* mo
                                            const QexMatrix* view, const QexMatrix* projection,
                                            const QexShadowInfo* shadow);
 
+/* QexBlurShader (no kind, no render function): one direction of a Gaussian blur, for quads over the screen;
+ * it reads the attributes a_v4Position and a_v2TexCoord and the texture on unit 0. A pixel becomes the mean
+ * of those beside it, the one i steps away weighted with exp(-i * i / (2 * sigma * sigma)), its alpha 1.
+ * `samples` is 9, 7, 5 or anything else, no number included: 4, 3, 2 or 1 pixels on each side. The sign of
+ * sigma does not count; 0 leaves the picture as it is, as does, where the GPU tells it, what is no number.
+ * Slots: a_v4Position, u_m4Projection, a_v2TexCoord, u_s2dTexture, sigma, blurSize, horizontal_or_vertical,
+ * samples locations; the projection, 16 floats by columns. */
+
+/** Creates the blur module with sigma 5, 9 samples, steps of a pixel of the screen, for the upper left
+ *  quarter of the screen.
+ *  @param context  its size is the screen's, 1 and more
+ *  @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context);
+/** Compiles and links into a module's record, whose projection is set; CreateProgram calls it. @return 0. */
+QEX_API int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module,
+                                           float sigma, float samples);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexBlurShader_Release(QexShaderModule** module);
+/** Sets the uniforms and the record's projection for the module's program, which must be current.
+ *  @param ignored    not read
+ *  @param direction  0: blurs along s, else along t
+ *  @param sigma      standard deviation in steps
+ *  @param samples    9, 7, 5 or another number, see above
+ *  @param blurSize   one step in texture coordinates: 1 / width of the texture is a pixel */
+QEX_API void QexBlurShader_SetParameters(QexShaderModule* module, const void* ignored, float direction,
+                                         float sigma, float samples, float blurSize);
+
+/* QexDOFShader (no kind, no render function): the mix of a sharp and a blurred picture (units 0 and 2) by
+ * clamp(range * |focus - depth|, 0, 1), depth being the red of a third (unit 1); for quads over the screen,
+ * attributes as QexBlurShader. A range of 0 or below gives the sharp picture.
+ * Slots: a_v4Position, u_m4Projection, a_v2TexCoord, u_s2dNormal, u_s2dDepth, u_s2dBlur, focus, range
+ * locations. */
+
+/** Creates the depth-of-field module; focus and range are not set yet. Its projection shows the whole screen.
+ *  @param context  its size is the screen's, 1 and more
+ *  @return as QexTextureShader_CreateProgram. */
+QEX_API QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context);
+/** Compiles and links into a module's record, with the projection of the module created last; CreateProgram
+ *  calls it. @param context  not read  @return 0. */
+QEX_API int32_t QexDOFShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module);
+/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
+QEX_API void QexDOFShader_Release(QexShaderModule** module);
+/** Sets focus, a depth from 0 to 1, and range, blur per unit of depth, for the module's program, which must
+ * be current. */
+QEX_API void QexDOFShader_SetParameters(QexShaderModule* module, float focus, float range);
+
 /* ======================================================================================================
  * Models: records and loading
  *
@@ -3613,6 +3659,146 @@ QEX_API QexParticleEmitter* QexParticleEmitter_CreateFromBinFile(const char* pat
 /** Frees an emitter and its living particles' billboards, which needs a current GL context if there are any.
  *  @param emitter  not to be used afterwards; null does nothing */
 QEX_API void QexParticleEmitter_Release(QexParticleEmitter* emitter);
+
+/* ======================================================================================================
+ * Post-processing
+ *
+ * Depth of field. The application draws its scene in a callback, once in colour and once as depth; the
+ * engine blurs the colours in two passes and mixes sharp and blurred pixels by their distance from a focus.
+ * Start it once the screen's size is known, and anew when the size changes. Functions that draw return -1,
+ * with a line in the log, before QexPostProcessing_Initialize, and -9 without an argument they need, and
+ * draw nothing then. Quads are drawn without depth test, blending and culling, which are put back; the
+ * program, the active unit and the textures of units 0 to 2 change. Needs a current GL context without bound
+ * buffers.
+ * ====================================================================================================== */
+
+#define QEX_POST_PROCESSING_TARGETS 5
+
+/** Draws the application's scene, clearing first, into the framebuffer and the viewport that are set.
+ *  @param user1, user2, user3  as given by the application in the colour pass, null in the depth pass
+ *  @param shader         what to draw all nodes with, null in the colour pass: their own modules
+ *  @param skinnedShader  the same for skinned nodes; QexModel_SetShaderProgramForAllNode takes both
+ *  @param colour         null in the colour pass; else red, green and blue of the farthest depth, to clear to
+ *  @return not read */
+typedef int32_t (*QexSceneCallback)(QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                    QexShaderModule* shader, QexShaderModule* skinnedShader,
+                                    const float* colour);
+
+/** The targets. 0 and 1: first and second blur pass at half resolution; 2: the sharp picture; 3: the first
+ *  blur pass at full resolution, then the depth; 4: the second blur pass at full resolution. */
+QEX_API extern QexRenderTarget PostProcessingRenderTargets[QEX_POST_PROCESSING_TARGETS];
+
+/** The modules between QexPostProcessing_Initialize and QexPostProcessing_Finalize, null otherwise. */
+QEX_API extern QexShaderModule* depthShaderProgram;
+QEX_API extern QexShaderModule* skinningDepthShaderProgram;
+QEX_API extern QexShaderModule* blurShaderProgram;
+QEX_API extern QexShaderModule* DOFShaderProgram;
+
+/** GL name of the program that copies a picture, 0 while there is none. */
+QEX_API extern uint32_t m_iProgNamePP;
+
+/** The sources that QexPP_CreateShader compiles. Others may be put in their place, with the attributes
+ *  a_v4Position and a_v2TexCoord and the uniforms u_m4Projection, u_s2dTexture (unit 0) and u_s2dAlpha (unit
+ *  3). */
+QEX_API extern const char* pVertexShaderPP;
+QEX_API extern const char* pFragmentShaderPP;
+
+/** Creates the quad, the targets and the programs for a screen. What an earlier call made is released first.
+ *  @param context  its size is the screen's
+ *  @return 0; -9 for null; -1, with a line in the log, for a size below 1; -1 when a program cannot be made.
+ *  Nothing is left then. */
+QEX_API int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context);
+
+/** Releases what QexPostProcessing_Initialize made; without it, nothing. @return 0. */
+QEX_API int32_t QexPostProcessing_Finalize(void);
+
+/** Draws the scene with depth of field into the framebuffer and the viewport that are set, which stay so.
+ *  @param user1, user2, user3  for the callback's colour pass
+ *  @param callback  draws the scene, called twice
+ *  @param focus     depth that stays sharp, 0 to 1, as QexDepthShader computes it from zNear and zFar
+ *  @param range     blur per unit of depth; a pixel is all blurred 1 / range away from the focus; 0 and
+ * below: all sharp. What is no number in focus or range leaves the picture undefined
+ *  @param blurH     step between samples in texture coordinates; 1 / width is a pixel of the screen
+ *  @param blurV     the same for columns; 1 / height
+ *  @param sigma     as QexBlurShader's, in steps
+ *  @param samples   9, 7, 5 or any other number, as QexBlurShader's
+ *  @param mode      below 2: blurs at half the resolution, else at full
+ *  @param zNear     nearest depth, in clip-space z as QexDepthShader_SetParameters takes it, which
+ * QexCamera_Project lets run from 0 at the near plane to 1 at the far plane
+ *  @param zFar      farthest depth, above zNear
+ *  @return 0, or as said above. */
+QEX_API int32_t QexPostProcessing_DrawDOF(QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                          QexSceneCallback callback, float focus, float range, float blurH,
+                                          float blurV, float sigma, float samples, int32_t mode, float zNear,
+                                          float zFar);
+
+/** Sets the quad that QexPP_DrawDOF and QexPP_DrawImage draw: the screen, and a pixel more on the right and
+ *  below. No GL context needed. @return 0; -9 for null. */
+QEX_API int32_t QexPP_CreateQuad(const QexRuntimeContext* context);
+
+/** Creates the copy program; one that is there is released first.
+ *  @param context  its size is the screen's
+ *  @return 0; -9 for null; -1 when a source does not compile or they do not link. */
+QEX_API int32_t QexPP_CreateShader(const QexRuntimeContext* context);
+
+/** Deletes the copy program and its shaders, if they are there. */
+QEX_API void QexPP_ReleaseShader(void);
+
+/** @param index  0 to 4  @return that target; null from 5 on. No GL context needed. */
+QEX_API QexRenderTarget* QexPP_GetRenderTarget(uint32_t index);
+
+/** Colour pass: calls the callback, its shaders and colour null.
+ *  @param target  drawn into, then framebuffer and viewport of before are back; null: the screen, which stays
+ *                 set
+ *  @return 0; -9 without a context or a callback. */
+QEX_API int32_t QexPP_DrawNormalScene(QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                      QexSceneCallback callback, QexRenderTarget* target);
+
+/** Blurs a picture of the screen's size, first along its rows, then along its columns.
+ *  @param user1, user2, user3  not read
+ *  @param sigma, samples, blurH, blurV  as in QexPostProcessing_DrawDOF
+ *  @param source  the picture, none of the targets' own
+ *  @param first   takes the rows: as wide as the screen, or half as wide, rounded down
+ *  @param second  takes the result, of the same size
+ *  @return 0; -10 for another width, and `first` stays bound (QexRenderTarget_EndScene takes it back). */
+QEX_API int32_t QexPP_DrawBlurImage(const QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                    float sigma, float samples, float blurH, float blurV, QexTexture* source,
+                                    QexRenderTarget* first, QexRenderTarget* second);
+
+/** Draws a texture blurred in one direction, with the blur module's projection: from the upper left corner of
+ *  the screen one unit a texel, and one more.
+ *  @param direction  0: along rows, 1: along columns
+ *  @param half       non-zero: at half the texture's size
+ *  @return 0, or as said above. */
+QEX_API int32_t QexPP_DrawBlurQuad(const QexRuntimeContext* context, QexTexture* texture, float direction,
+                                   float sigma, float samples, float blurSize, int32_t half);
+
+/** Depth pass: sets near and far of both depth modules and calls the callback with them, white, and null for
+ *  the application's arguments.
+ *  @param user1, user2, user3  not read
+ *  @param zNear, zFar  as in QexPostProcessing_DrawDOF
+ *  @param target       drawn into
+ *  @return 0, or as said above. */
+QEX_API int32_t QexPP_DrawDepthImage(QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                     QexSceneCallback callback, float zNear, float zFar,
+                                     QexRenderTarget* target);
+
+/** Mixes three pictures of the screen's shape with QexDOFShader into the framebuffer that is bound.
+ *  @param user1, user2, user3  not read
+ *  @param focus, range  as in QexPostProcessing_DrawDOF
+ *  @param ignored       not read
+ *  @return 0, or as said above. */
+QEX_API int32_t QexPP_DrawDOF(const QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                              float focus, float range, QexTexture* sharp, QexTexture* depth,
+                              QexTexture* blurred, int32_t ignored);
+
+/** Shows a target as it is.
+ *  @param user1, user2, user3  not read
+ *  @param destination  another target, then framebuffer and viewport of before are back; null: the screen,
+ *                      which stays set
+ *  @return 0, or as said above. */
+QEX_API int32_t QexPP_DrawImage(const QexRuntimeContext* context, void* user1, void* user2, void* user3,
+                                QexRenderTarget* source, QexRenderTarget* destination);
 
 /* ======================================================================================================
  * Engine: start and end

@@ -229,3 +229,14 @@
     "highp float depthValue(highp float z) {\n"                       \
     "    return z < near ? 0.0 : z > far ? 1.0 : z / (far - near);\n" \
     "}\n"
+
+// The vertex stage of the programs that draw quads over the screen.
+#define QEX_GLSL_SCREEN_VERTEX                           \
+    "attribute highp vec4 a_v4Position;\n"               \
+    "attribute mediump vec2 a_v2TexCoord;\n"             \
+    "uniform highp mat4 u_m4Projection;\n"               \
+    "varying mediump vec2 v_v2TexCoord;\n"               \
+    "void main() {\n"                                    \
+    "    gl_Position = u_m4Projection * a_v4Position;\n" \
+    "    v_v2TexCoord = a_v2TexCoord;\n"                 \
+    "}\n"

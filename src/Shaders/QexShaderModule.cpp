@@ -46,13 +46,18 @@ void DrawRange(const QexShaderModuleType* type, bool indexed, GLenum mode, uint3
 
 // ---- Lifetime ----
 
-QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
+QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type) {
     QexShaderModule* module = static_cast<QexShaderModule*>(QexMemory_Alloc(sizeof(QexShaderModule)));
-    if (!module) {
+    if (module)
+        memset(static_cast<void*>(module), 0, sizeof *module);
+    else
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return nullptr;
-    }
-    memset(static_cast<void*>(module), 0, sizeof *module);
+    return module;
+}
+
+QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
+    QexShaderModule* module = QexShaderModule_Alloc(type);
+    if (!module) return nullptr;
     QexShaderModule_Setup(type, module);
     if (type->hasThreshold) {
         module->slots[type->thresholdSlot].value = kDefaultThreshold;
@@ -75,8 +80,10 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
     if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names,
                                 attributeCount, log) != 0)
         QexError(QEX_TAG, "<%s> link failed: %s", type->path, log);
-    for (uint32_t i = 0; type->uniforms[i]; ++i)
+    for (uint32_t i = 0; type->uniforms[i]; ++i) {
+        if (!*type->uniforms[i]) continue;
         QEX_GL(module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]));
+    }
     for (const QexShaderSampler* sampler = type->samplers; sampler->name; ++sampler) {
         GLint location;
         QEX_GL(location = glGetUniformLocation(module->program, sampler->name));

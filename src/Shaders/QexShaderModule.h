@@ -27,7 +27,7 @@ constexpr uint32_t kMaxShaderAttributes = 7;
 constexpr uint32_t kMaxShaderUniforms = 20;
 constexpr uint32_t kMaxShaderSamplers = 4;
 
-// Lists end at the first entry without a name.
+// Lists end at the first entry without a name. A uniform whose name is empty leaves its slot to the module.
 struct QexShaderModuleType {
     const char* path;  // of the module's source, without extension
     const char* vertexSource;
@@ -41,7 +41,8 @@ struct QexShaderModuleType {
     float secondDefault = 0;  // of the slot behind the threshold, in modules that have a parameter there
 };
 
-// Lifetime.
+// Lifetime. Alloc gives a cleared record, or null with a line in the log; Create sets it up, too.
+QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type);
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type);
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module);
 void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module);

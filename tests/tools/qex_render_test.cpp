@@ -275,6 +275,23 @@ TEST_F(QexRender, NodesLightsAndEyes) {
     EXPECT_NE(run({"--node", "quad=hide"}).err.find("warning"), std::string::npos);
 }
 
+// The quad lies a tenth of the way to the far plane, the background at it. Columns 97 and 103 are beside the
+// quad's left edge.
+TEST_F(QexRender, DepthOfFieldIsSharpAtItsFocus) {
+    const Rgb red = {255, 0, 0}, depth = {23, 23, 23};  // of 255, (10 - 1) / (100 - 1)
+    EXPECT_TRUE(Near(At(Picture(QuadScene(), {"--shader", "depth"}), 120, 40), depth, 1));
+    const Image near = Picture(QuadScene(), {"--dof", "0.09,50"});
+    EXPECT_TRUE(Near(At(near, 103, 40), red, 4));
+    EXPECT_GT(At(near, 97, 40)[0], kBackground[0] + 20);
+    const Image far = Picture(QuadScene(), {"--dof", "1,50,3,5"});
+    EXPECT_TRUE(Near(At(far, 97, 40), kBackground, 2));
+    EXPECT_LT(At(far, 103, 40)[0], 235);
+    // The nodes have their own modules again for the next picture.
+    WriteScene(Path("scene.pod"), MovingScene());
+    EXPECT_EQ(Render(Path("scene.pod"), "run.png", {"--frames", "0:1:1", "--dof", "0.09,1"}).err, "");
+    EXPECT_TRUE(Near(At(Load("run-0001.png"), 110, 40), red, 4));
+}
+
 TEST_F(QexRender, RealScenesShow) {
     const std::vector<std::string> scenes = RealFilesIn("scenes", ".pod");
     if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";

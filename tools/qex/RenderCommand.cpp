@@ -47,7 +47,9 @@ class Renderer {
     void Frame();
     void PlaceCamera(float turned);
     void Draw(double frame, float turned);
+    void Clear(uint32_t colour);
     void DrawScene(const QexCamera& camera);
+    void DrawDepth(QexShaderModule* module, QexShaderModule* skinned);
     void DrawBothEyes();
     bool Save(const std::string& path);
     void SetFrame(double frame);
@@ -82,6 +84,7 @@ Renderer::~Renderer() {
     floor_.reset();
     ReleaseNormalMaps();
     if (modelLoaded_) QexModel_Unload(&model_);
+    if (engineStarted_ && options_.effects.depthOfField) QexPostProcessing_Finalize();
     if (engineStarted_) QexEngine_Shutdown(&engine_);
 }
 
@@ -97,6 +100,7 @@ bool Renderer::Start() {
     config.width = options_.width;
     config.height = options_.height;
     engineStarted_ = QexEngine_Init(&engine_, sizeof config, &config) == 0;
+    if (options_.effects.depthOfField) QexPostProcessing_Initialize(&engine_);
     return engineStarted_;
 }
 
@@ -185,18 +189,39 @@ void Renderer::PlaceCamera(float turned) {
 void Renderer::Draw(double frame, float turned) {
     SetFrame(frame);
     PlaceCamera(turned);
-    shaders_.SetCamera(camera_);
-    const auto channel = [&](int shift) {
-        return static_cast<float>(options_.background >> shift & 0xFF) / 255.0f;
-    };
     glViewport(0, 0, options_.width, options_.height);
-    QexRenderer_SetZWrite(1);
-    glClearColor(channel(16), channel(8), channel(0), 1);
-    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
+    if (options_.effects.depthOfField) {
+        DrawWithDepthOfField(&engine_, *options_.effects.depthOfField,
+                             [this](QexShaderModule* module, QexShaderModule* skinned) {
+                                 Clear(module ? 0xFFFFFF : options_.background);
+                                 module ? DrawDepth(module, skinned) : DrawScene(camera_);
+                             });
+        return;
+    }
+    Clear(options_.background);
     if (options_.effects.stereo)
         DrawBothEyes();
     else
         DrawScene(camera_);
+}
+
+void Renderer::Clear(uint32_t colour) {
+    const auto channel = [&](int shift) { return static_cast<float>(colour >> shift & 0xFF) / 255.0f; };
+    QexRenderer_SetZWrite(1);
+    glClearColor(channel(16), channel(8), channel(0), 1);
+    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
+}
+
+// Everything that can be seen, with modules that show its depth.
+void Renderer::DrawDepth(QexShaderModule* module, QexShaderModule* skinned) {
+    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetAlphaBlendMode(0);
+    QexModel* floor = floor_ ? floor_->Model() : nullptr;
+    const ShaderOverride floorDepth(floor, module, skinned), modelDepth(&model_, module, skinned);
+    if (floor) QexModel_RenderWithCamera(floor, nullptr, &camera_, nullptr, 0);
+    for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
+        QexModel_RenderWithCamera(&model_, nullptr, &camera_, nullptr, pass);
 }
 
 // The eyes are a thirtieth of the way to the target apart.

@@ -7,6 +7,8 @@
 
 namespace {
 
+// The clip-space z of a camera's near and far plane.
+constexpr float kNearDepth = 0, kFarDepth = 1;
 constexpr float kShadowIntensity = 0.4f, kShadowBias = 0.01f;
 constexpr float kCasterMargin = 1.3f;
 constexpr float kMirrorOpacity = 0.6f;  // of the plane over its image
@@ -63,6 +65,15 @@ void Widen(QexBoundingBox* box) {
     for (QexVec3& corner : box->corners) QexVec3_Lerp(&corner, &box->centre, &corner, kCasterMargin);
 }
 
+// What draws the passes of a frame: the depth pass gets no arguments of its caller.
+const DrawPass* s_drawPass;
+
+int32_t CallDrawPass(QexRuntimeContext*, void*, void*, void*, QexShaderModule* module,
+                     QexShaderModule* skinned, const float*) {
+    (*s_drawPass)(module, skinned);
+    return 0;
+}
+
 // Where the shadow's light shines: the first directional light, or from the first point light to the target.
 QexVec3 ShadowDirection(const QexLightSet& lights, const QexCamera& camera) {
     for (uint32_t i = 0; i < lights.count; ++i) {
@@ -97,23 +108,30 @@ void SceneShaders::Use(QexModel* model, const std::string& name) {
     row_ = static_cast<size_t>(row - kShaders);
     static_ = row->create();
     if (row->createSkinned) skinned_ = row->createSkinned();
-    QexModel_SetShaderProgramForAllNode(model, static_, skinned_);
-}
-
-void SceneShaders::SetCamera(const QexCamera& camera) const {
-    const ShaderRow& row = kShaders[row_];
-    const std::pair<SetParameters, QexShaderModule*> modules[] = {{row.setDepth, static_},
-                                                                  {row.setSkinnedDepth, skinned_}};
+    const std::pair<SetParameters, QexShaderModule*> modules[] = {{row->setDepth, static_},
+                                                                  {row->setSkinnedDepth, skinned_}};
     for (const auto& [set, module] : modules) {
         if (!set || !module) continue;
         QexRenderState_UseProgram(module->program);
-        set(module, 0, camera.farPlane);  // grey from the near plane on
+        set(module, kNearDepth, kFarDepth);
     }
+    QexModel_SetShaderProgramForAllNode(model, static_, skinned_);
 }
 
 void SceneShaders::Release() {
     if (static_) kShaders[row_].release(&static_);
     if (skinned_) kShaders[row_].releaseSkinned(&skinned_);
+}
+
+ShaderOverride::ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned)
+    : model_(model) {
+    if (!model) return;
+    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) own_.push_back(model->scene.nodes[i].shader);
+    QexModel_SetShaderProgramForAllNode(model, module, skinned);
+}
+
+ShaderOverride::~ShaderOverride() {
+    for (size_t i = 0; i < own_.size(); ++i) model_->scene.nodes[i].shader = own_[i];
 }
 
 int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem) {
@@ -188,6 +206,17 @@ void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightS
     glClear(GL_STENCIL_BUFFER_BIT);
     QexReflection_RenderReflection(reflection, &lights, &camera);
     QexReflection_Release(reflection);
+}
+
+void DrawWithDepthOfField(QexRuntimeContext* engine, const DepthOfField& effect, const DrawPass& draw) {
+    // Steps of a pixel of the targets, which are half as wide and high as the picture.
+    const float stepX = 2 / static_cast<float>(engine->width), stepY = 2 / static_cast<float>(engine->height);
+    for (uint32_t half : {0, 1})
+        QexTexture_SetFilter(&QexPP_GetRenderTarget(half)->colorTexture, QEX_FILTER_LINEAR);
+    s_drawPass = &draw;
+    QexPostProcessing_DrawDOF(engine, nullptr, nullptr, nullptr, CallDrawPass, effect.focus, effect.range,
+                              stepX, stepY, effect.sigma, effect.samples, 0, kNearDepth, kFarDepth);
+    s_drawPass = nullptr;
 }
 
 void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,

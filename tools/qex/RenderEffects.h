@@ -2,6 +2,7 @@
 // shadow, mirror, stereo, picking.
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
@@ -12,6 +13,11 @@ struct NodeChange {
     std::string node;
     std::string what;  // hide, move, rotate or face
     QexVec3 value;     // a place, or degrees
+};
+
+struct DepthOfField {
+    float focus, range;  // as QexPostProcessing_DrawDOF takes them
+    float sigma = 5, samples = 9;
 };
 
 struct EffectOptions {
@@ -25,6 +31,7 @@ struct EffectOptions {
     std::string mirrorNode;
     uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
     float separation = 0;
+    std::optional<DepthOfField> depthOfField;
 };
 
 // The names of the shader modules, ", " between them.
@@ -41,14 +48,25 @@ class SceneShaders {
 
     // Gives them to the nodes, static or skinned to match.
     void Use(QexModel* model, const std::string& name);
-    // What the modules need to know of the camera.
-    void SetCamera(const QexCamera& camera) const;
     void Release();
 
   private:
     size_t row_ = 0;
     QexShaderModule* static_ = nullptr;
     QexShaderModule* skinned_ = nullptr;
+};
+
+// Gives all nodes of a model, which may be null, other modules for as long as it lives.
+class ShaderOverride {
+  public:
+    ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned);
+    ~ShaderOverride();
+    ShaderOverride(const ShaderOverride&) = delete;
+    ShaderOverride& operator=(const ShaderOverride&) = delete;
+
+  private:
+    QexModel* model_;
+    std::vector<QexShaderModule*> own_;
 };
 
 // Carries the changes out. Returns a line that says which node there is not, or nothing.
@@ -68,6 +86,11 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model,
 // Draws the scene's mirror image in the plane that the options name.
 void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
                   const QexCamera& camera);
+
+// Draws a scene sharp near one depth and blurred elsewhere. `draw` clears and draws it: once with null, once
+// with the modules that show depth, on white. Between QexPostProcessing_Initialize and ..._Finalize.
+using DrawPass = std::function<void(QexShaderModule* module, QexShaderModule* skinned)>;
+void DrawWithDepthOfField(QexRuntimeContext* engine, const DepthOfField& effect, const DrawPass& draw);
 
 // Prints the mesh nodes under each point, one line a point.
 void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,

@@ -127,6 +127,22 @@ std::string ParseStereo(const std::string& text, RenderOptions* options) {
     return "";
 }
 
+std::string ParseDepthOfField(const std::string& text, RenderOptions* options) {
+    DepthOfField dof = {};
+    int consumed = 0, samples = 9;
+    const int count = sscanf(text.c_str(), "%f,%f%n,%f,%d%n", &dof.focus, &dof.range, &consumed, &dof.sigma,
+                             &samples, &consumed);
+    dof.samples = static_cast<float>(samples);
+    options->effects.depthOfField = dof;
+    const bool whole = (count == 2 || count == 4) && static_cast<size_t>(consumed) == text.size();
+    if (!whole || !(dof.focus >= 0 && dof.focus <= 1) || !(dof.range >= 0 && dof.range <= 1e6f) ||
+        !(dof.sigma > 0 && dof.sigma <= 100) || samples < 3 || samples > 9 || samples % 2 == 0)
+        return "'" + text +
+               "' is no depth of field; expected FOCUS,RANGE[,SIGMA,SAMPLES]: FOCUS 0 to 1, RANGE from 0 on, "
+               "SIGMA above 0 and up to 100, SAMPLES 3, 5, 7 or 9";
+    return "";
+}
+
 template <std::optional<float> EffectOptions::*kHeight>
 std::string ParseHeight(const std::string& text, RenderOptions* options) {
     float height = 0;
@@ -138,9 +154,9 @@ std::string ParseHeight(const std::string& text, RenderOptions* options) {
 }
 
 // An option whose text goes through one of the parsers above.
-void AddParsed(CLI::App* app, const std::string& name, const std::string& help, RenderOptions* options,
-               std::string (*parse)(const std::string&, RenderOptions*)) {
-    app->add_option_function<std::string>(
+CLI::Option* AddParsed(CLI::App* app, const std::string& name, const std::string& help,
+                       RenderOptions* options, std::string (*parse)(const std::string&, RenderOptions*)) {
+    return app->add_option_function<std::string>(
         name,
         [=](const std::string& text) {
             const std::string problem = parse(text, options);
@@ -191,13 +207,24 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
                 ParseLight);
     app->add_flag("--shadow", options->effects.shadow,
                   "nodes throw shadows on each other (with --shader shadow)");
-    AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options,
-              ParseHeight<&EffectOptions::mirror>);
+    CLI::Option* mirror = AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options,
+                                    ParseHeight<&EffectOptions::mirror>);
     AddParsed(app, "--floor", "Y, the height of a floor; it takes shadows and mirrors", options,
               ParseHeight<&EffectOptions::floor>);
-    app->add_option("--mirror-node", options->effects.mirrorNode, "flat node that mirrors the others");
-    AddParsed(app, "--stereo", "MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels", options,
-              ParseStereo);
+    CLI::Option* mirrorNode =
+        app->add_option("--mirror-node", options->effects.mirrorNode, "flat node that mirrors the others");
+    CLI::Option* stereo =
+        AddParsed(app, "--stereo", "MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels", options,
+                  ParseStereo);
+    // The pictures that it is made from have no stencil, and one eye.
+    AddParsed(
+        app, "--dof",
+        "FOCUS,RANGE[,SIGMA,SAMPLES], depth of field: FOCUS 0 to 1 as --shader depth shows it, blur per "
+        "unit of depth (sigma 5, 9 samples)",
+        options, ParseDepthOfField)
+        ->excludes(mirror)
+        ->excludes(mirrorNode)
+        ->excludes(stereo);
     AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
     AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");

@@ -1,0 +1,106 @@
+#include <cstring>
+
+#include "QexGLSL.h"
+#include "QexScreenShader.h"
+
+#define QEX_MODULE (kType.path)
+
+namespace {
+
+// One direction of a Gaussian. Its factor 1 / (sqrt(2 pi) sigma) is left out, as the sum is divided by its
+// weight: so a sigma of 0 leaves the centre alone. `g` steps from the weight of one pixel to the next.
+const char* const kFragmentSource = R"(#version 100
+precision mediump float;
+uniform sampler2D u_s2dTexture;
+uniform float sigma;
+uniform float blurSize;
+uniform float horizontal_or_vertical;
+uniform float samples;
+varying vec2 v_v2TexCoord;
+void main() {
+    vec2 pixel = horizontal_or_vertical == 0.0 ? vec2(blurSize, 0.0) : vec2(0.0, blurSize);
+    int pixelsAside = samples == 9.0 ? 4 : samples == 7.0 ? 3 : samples == 5.0 ? 2 : 1;
+    float fall = abs(sigma) > 0.0 ? exp(-0.5 / (sigma * sigma)) : 0.0;
+    vec3 g = vec3(1.0, fall, fall * fall);
+    vec3 sum = texture2D(u_s2dTexture, v_v2TexCoord).rgb;
+    float weight = 1.0;
+    for (int i = 1; i <= 4; i++) {
+        if (i > pixelsAside) break;
+        g.xy *= g.yz;
+        vec2 offset = float(i) * pixel;
+        sum += g.x * texture2D(u_s2dTexture, v_v2TexCoord - offset).rgb;
+        sum += g.x * texture2D(u_s2dTexture, v_v2TexCoord + offset).rgb;
+        weight += 2.0 * g.x;
+    }
+    gl_FragColor = vec4(sum / weight, 1.0);
+}
+)";
+
+enum { kTexture = kScreenSlots, kSigma, kBlurSize, kDirection, kSamples, kProjectionMatrix };
+static_assert(kProjectionMatrix + 16 <= QEX_SHADER_SLOTS, "the matrix fits into the slots");
+
+constexpr float kDefaultSigma = 5, kDefaultSamples = 9;
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexBlurShader",
+    QEX_GLSL_SCREEN_VERTEX,
+    kFragmentSource,
+    nullptr,
+    {},
+    {"", "u_m4Projection", "", "u_s2dTexture", "sigma", "blurSize", "horizontal_or_vertical", "samples"},
+    {{"u_s2dTexture", kDiffuseUnit}},
+    false,
+    0,
+};
+
+QexMatrix ProjectionOf(const QexShaderModule* module) {
+    QexMatrix projection;
+    memcpy(projection.m, module->slots + kProjectionMatrix, sizeof projection.m);
+    return projection;
+}
+
+}  // namespace
+
+void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* projection) {
+    memcpy(module->slots + kProjectionMatrix, projection->m, sizeof projection->m);
+}
+
+extern "C" {
+
+QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context) {
+    QexShaderModule* module = QexShaderModule_Alloc(&kType);
+    if (!module) return nullptr;
+    const float width = static_cast<float>(context->width), height = static_cast<float>(context->height);
+    QexMatrix projection;
+    QexMatrix_Orthographic(&projection, 0, width * 0.5f, height * 0.5f, height, 0, 1);
+    QexBlurShader_SetProjection(module, &projection);
+    QexBlurShader_SetupProgram(context, module, kDefaultSigma, kDefaultSamples);
+    return module;
+}
+
+int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module, float sigma,
+                                   float samples) {
+    const QexMatrix projection = ProjectionOf(module);
+    QexScreenShader_Setup(&kType, module, &projection);
+    QexBlurShader_SetParameters(module, nullptr, 0, sigma, samples,
+                                1.0f / static_cast<float>(context->width));
+    return 0;
+}
+
+void QexBlurShader_Release(QexShaderModule** module) {
+    QexShaderModule_Release(&kType, module);
+}
+
+void QexBlurShader_SetParameters(QexShaderModule* module, const void*, float direction, float sigma,
+                                 float samples, float blurSize) {
+    const QexMatrix projection = ProjectionOf(module);
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kDirection), direction));
+    // GPUs differ in how they compare what is no number.
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSigma), sigma == sigma ? sigma : 0));
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSamples), samples));
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kBlurSize), blurSize));
+    QEX_GL(
+        glUniformMatrix4fv(QexShaderModule_Location(module, kScreenProjection), 1, GL_FALSE, projection.m));
+}
+
+}  // extern "C"

@@ -1,0 +1,68 @@
+#include "QexGLSL.h"
+#include "QexScreenShader.h"
+
+#define QEX_MODULE (kType.path)
+
+namespace {
+
+const char* const kFragmentSource = R"(#version 100
+precision mediump float;
+uniform sampler2D u_s2dNormal;
+uniform sampler2D u_s2dDepth;
+uniform sampler2D u_s2dBlur;
+uniform float focus;
+uniform float range;
+varying vec2 v_v2TexCoord;
+void main() {
+    float depth = texture2D(u_s2dDepth, v_v2TexCoord).r;
+    vec4 sharp = texture2D(u_s2dNormal, v_v2TexCoord);
+    vec4 blurred = texture2D(u_s2dBlur, v_v2TexCoord);
+    gl_FragColor = mix(sharp, blurred, clamp(range * abs(focus - depth), 0.0, 1.0));
+}
+)";
+
+enum { kNormal = kScreenSlots, kDepth, kBlur, kFocus, kRange };
+
+const QexShaderModuleType kType = {
+    "src/Shaders/QexDOFShader",
+    QEX_GLSL_SCREEN_VERTEX,
+    kFragmentSource,
+    nullptr,
+    {},
+    {"", "u_m4Projection", "", "u_s2dNormal", "u_s2dDepth", "u_s2dBlur", "focus", "range"},
+    {{"u_s2dNormal", 0}, {"u_s2dDepth", 1}, {"u_s2dBlur", 2}},
+    false,
+    0,
+};
+
+// Of the module created last.
+QexMatrix s_Projection;
+
+}  // namespace
+
+extern "C" {
+
+QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context) {
+    QexShaderModule* module = QexShaderModule_Alloc(&kType);
+    if (!module) return nullptr;
+    QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(context->width), 0,
+                           static_cast<float>(context->height), 0, 1);
+    QexDOFShader_SetupProgram(context, module);
+    return module;
+}
+
+int32_t QexDOFShader_SetupProgram(const QexRuntimeContext*, QexShaderModule* module) {
+    QexScreenShader_Setup(&kType, module, &s_Projection);
+    return 0;
+}
+
+void QexDOFShader_Release(QexShaderModule** module) {
+    QexShaderModule_Release(&kType, module);
+}
+
+void QexDOFShader_SetParameters(QexShaderModule* module, float focus, float range) {
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kFocus), focus));
+    QEX_GL(glUniform1f(QexShaderModule_Location(module, kRange), range));
+}
+
+}  // extern "C"

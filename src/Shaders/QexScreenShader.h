@@ -1,0 +1,16 @@
+// The modules that draw quads over the screen and not nodes: blur and depth of field. They have no render
+// function; post-processing feeds them its own vertices. Their linker places the attributes, so the locations
+// are read afterwards.
+#pragma once
+
+#include "QexShaderModule.h"
+
+// The first slots of such a module. Its description leaves the names of the two attributes empty.
+enum { kScreenPosition, kScreenProjection, kScreenTexCoord, kScreenSlots };
+
+// Compiles, links, fills the slots and sets the projection; the program stays current.
+void QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
+                           const QexMatrix* projection);
+
+// What QexBlurShader_SetParameters uploads from now on.
+void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* projection);
