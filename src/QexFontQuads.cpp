@@ -14,7 +14,7 @@ float s_TexCoords[4][2];
 float s_Colours[4][4];
 const uint8_t kIndices[4] = {0, 2, 1, 3};
 
-// The part of a texture that is shown, and the size of its picture, in texels.
+// The part of a texture that is shown, in texture coordinates, and the size of its picture in texels.
 struct Span {
     float left, right, top, bottom, width, height;
 };
@@ -22,18 +22,16 @@ struct Span {
 Span FindSpan(const QexTexture* texture, const QexRect* rectangle) {
     const float w = texture ? static_cast<float>(texture->width) : kNoTextureSize;
     const float h = texture ? static_cast<float>(texture->height) : kNoTextureSize;
-    if (!texture || !rectangle) return {0, w, h, 0, w + 1, h + 1};
+    if (!texture || !rectangle) return {0, 1, 1, 0, w + 1, h + 1};
     const float left = static_cast<float>(rectangle->left), right = static_cast<float>(rectangle->right);
     const float top = h - static_cast<float>(rectangle->top);
     const float bottom = h - static_cast<float>(rectangle->bottom);
-    return {left, right, top, bottom, right + 1 - left, top + 1 - bottom};
+    return {left / w, right / w, top / h, bottom / h, right + 1 - left, top + 1 - bottom};
 }
 
 void WriteQuad(const QexRuntimeContext* context, const QexTexture* texture, const QexRect* rectangle, float x,
                float y, float scaleX, float scaleY, uint32_t colour) {
     const Span span = FindSpan(texture, rectangle);
-    const float w = texture ? static_cast<float>(texture->width) : kNoTextureSize;
-    const float h = texture ? static_cast<float>(texture->height) : kNoTextureSize;
     if (!texture) {
         scaleX /= kNoTextureSize;
         scaleY /= kNoTextureSize;
@@ -44,8 +42,8 @@ void WriteQuad(const QexRuntimeContext* context, const QexTexture* texture, cons
         s_Positions[i][0] = i & 1 ? right : x;
         s_Positions[i][1] = i > 1 ? down : up;
         s_Positions[i][2] = 0;
-        s_TexCoords[i][0] = (i & 1 ? span.right : span.left) / w;
-        s_TexCoords[i][1] = (i > 1 ? span.bottom : span.top) / h;
+        s_TexCoords[i][0] = i & 1 ? span.right : span.left;
+        s_TexCoords[i][1] = i > 1 ? span.bottom : span.top;
         for (int c = 0; c < 4; ++c) {
             const int shift = c == 3 ? 24 : 16 - 8 * c;
             s_Colours[i][c] = static_cast<float>(colour >> shift & 0xFF) / 255.0f;

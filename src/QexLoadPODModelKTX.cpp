@@ -164,16 +164,6 @@ bool UploadLevels(const KTX& ktx, const QexTextureBytes& image) {
     return true;
 }
 
-int32_t LoadFile(QexTexture* texture, const char* path) {
-    QexResFile file;
-    int32_t result = -1;
-    QexResFile_Create(&file, path);
-    if (QexResFile_IsOpen(&file))
-        result = QexTextureLoad_KTX(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)});
-    QexResFile_Release(&file);
-    return result;
-}
-
 }  // namespace
 
 bool QexTextureLoad_IsKTX(const QexTextureBytes& image) {
@@ -219,7 +209,13 @@ int32_t QexTexture_LoadKTXFromMemSized(QexTexture* texture, const void* file, ui
 }
 
 int32_t QexTexture_LoadKTXFromFile(QexTexture* texture, const char* path, QexPVRHeader*, int32_t, uint32_t) {
-    return LoadFile(texture, path);
+    QexResFile file;
+    int32_t result = -1;
+    QexResFile_Create(&file, path);
+    if (QexResFile_IsOpen(&file))
+        result = QexTextureLoad_KTX(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)});
+    QexResFile_Release(&file);
+    return result;
 }
 
 }  // extern "C"

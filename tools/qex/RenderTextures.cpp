@@ -6,6 +6,7 @@
 #include <GLES2/gl2.h>
 
 #include "TextureFiles.h"
+#include "TextureWrite.h"
 
 namespace {
 
@@ -35,18 +36,6 @@ int NextPowerOfTwo(int size) {
     return power;
 }
 
-void FlipRows(Image* image) {
-    const size_t row = static_cast<size_t>(image->width) * 4;
-    std::vector<uint8_t> line(row);
-    for (int top = 0, bottom = image->height - 1; top < bottom; ++top, --bottom) {
-        uint8_t* a = &image->pixels[static_cast<size_t>(top) * row];
-        uint8_t* b = &image->pixels[static_cast<size_t>(bottom) * row];
-        memcpy(line.data(), a, row);
-        memcpy(a, b, row);
-        memcpy(b, line.data(), row);
-    }
-}
-
 // Uploads pixels with mipmaps, repeating; GL ES 2.0 wants powers of two for that.
 void Upload(QexTexture* texture, Image image, const std::string& name) {
     GLint most = 0;
@@ -63,15 +52,6 @@ void Upload(QexTexture* texture, Image image, const std::string& name) {
     QexTexture_SetName(texture, name.c_str());
 }
 
-Image AlphaAsRed(Image image) {
-    for (size_t i = 0; i < image.pixels.size(); i += 4) {
-        const uint8_t alpha = image.pixels[i + 3];
-        image.pixels[i] = image.pixels[i + 1] = image.pixels[i + 2] = alpha;
-        image.pixels[i + 3] = 255;
-    }
-    return image;
-}
-
 // Reads a picture into the model's texture of a material; its first row is the picture's lower edge.
 bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
     Image image;
@@ -80,12 +60,12 @@ bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
         g_problems.push_back("texture " + path + ": " + error);
         return false;
     }
-    FlipRows(&image);
+    image = FlipRows(image);
     Upload(model->textures[material], image, FileName(path));
     if (!image.hasAlpha) return true;
     model->alphaTextures[material] = NewTexture();
     if (model->alphaTextures[material])
-        Upload(model->alphaTextures[material], AlphaAsRed(image), FileName(path));
+        Upload(model->alphaTextures[material], AlphaAsGrey(image), FileName(path));
     return true;
 }
 
@@ -97,7 +77,7 @@ bool LoadNormalPicture(QexTexture* texture, const std::string& path) {
         g_problems.push_back("normal map " + path + ": " + error);
         return false;
     }
-    FlipRows(&image);
+    image = FlipRows(image);
     for (size_t i = 0; i < image.pixels.size(); i += 4) std::swap(image.pixels[i], image.pixels[i + 1]);
     Upload(texture, image, FileName(path));
     return true;
