@@ -3,6 +3,7 @@
 #include "QexGL.h"
 #include "QexMath.h"
 #include "QexMemory.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexBillboard"
 
@@ -38,20 +39,9 @@ void main() {
 
 const char* const kAttributes[] = {"inVertex", "inTexCoord"};
 
-void DeleteProgram() {
-    QexRenderState_UseProgram(0);
-    if (g_BillboardShaderProgramID) QEX_GL(glDeleteProgram(g_BillboardShaderProgramID));
-    if (g_BillboardVShader) QEX_GL(glDeleteShader(g_BillboardVShader));
-    if (g_BillboardFShader) QEX_GL(glDeleteShader(g_BillboardFShader));
-    g_BillboardShaderProgramID = g_BillboardVShader = g_BillboardFShader = 0;
-}
-
 bool CreateProgram() {
-    if (QexShader_Create(&g_BillboardVShader, kVertexSource, GL_VERTEX_SHADER) != 0 ||
-        QexShader_Create(&g_BillboardFShader, kFragmentSource, GL_FRAGMENT_SHADER) != 0 ||
-        QexShader_CreateProgram(&g_BillboardShaderProgramID, g_BillboardVShader, g_BillboardFShader,
-                                kAttributes, 2, nullptr) != 0) {
-        DeleteProgram();
+    if (!QexShader_BuildProgram(&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader,
+                                kVertexSource, kFragmentSource, kAttributes, 2)) {
         QexError(QEX_TAG, "<QexBillboard_Create> the billboards' program cannot be built");
         return false;
     }
@@ -203,7 +193,8 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
 void QexBillboard_Release(QexBillboard* billboard) {
     if (!billboard) return;
     QexMemory_Free(billboard);
-    if (--g_BillboardCount == 0) DeleteProgram();
+    if (--g_BillboardCount == 0)
+        QexShader_DeleteProgram(&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader);
 }
 
 }  // extern "C"

@@ -6,6 +6,7 @@
 
 #include "QexGL.h"
 #include "QexMemory.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexFont"
 
@@ -239,11 +240,7 @@ int32_t QexFont_CreateShader(void) {
 }
 
 void QexFont_ReleaseShader(int32_t) {
-    QexRenderState_UseProgram(0);
-    if (s_Program.program) QEX_GL(glDeleteProgram(s_Program.program));
-    if (s_Program.fragmentShader) QEX_GL(glDeleteShader(s_Program.fragmentShader));
-    if (s_Program.vertexShader) QEX_GL(glDeleteShader(s_Program.vertexShader));
-    s_Program.program = s_Program.fragmentShader = s_Program.vertexShader = 0;
+    QexShader_DeleteProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader);
 }
 
 int32_t QexFont_Release(void) {

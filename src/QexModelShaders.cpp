@@ -2,6 +2,7 @@
 
 #include "QexGL.h"
 #include "QexModel.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexModel"
 
@@ -128,14 +129,6 @@ void DeleteShadowTarget() {
     s_Shared.shadowDepth = s_Shared.shadowFramebuffer = s_Shared.shadowTexture = 0;
 }
 
-void DeleteShadowProgram(uint32_t* program, ShadowShaders* shaders) {
-    if (*program) QEX_GL(glDeleteProgram(*program));
-    if (shaders->vertex) QEX_GL(glDeleteShader(shaders->vertex));
-    if (shaders->fragment) QEX_GL(glDeleteShader(shaders->fragment));
-    *program = 0;
-    *shaders = {0, 0};
-}
-
 }  // namespace
 
 const QexModelSharedShaders* QexModel_GetSharedShaders() {
@@ -168,10 +161,11 @@ int32_t QexModel_CreateDefaultShader(void) {
 
 void QexModel_ReleaseShader(int32_t force) {
     if (s_ReferenceCount > 0 && --s_ReferenceCount > 0 && force != 1) return;
-    QexRenderState_UseProgram(0);
     DeleteShadowTarget();
-    DeleteShadowProgram(&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders);
-    DeleteShadowProgram(&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders);
+    QexShader_DeleteProgram(&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders.vertex,
+                            &s_SkinShadowShaders.fragment);
+    QexShader_DeleteProgram(&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders.vertex,
+                            &s_ModelShadowShaders.fragment);
     QexTextureShader_Release(&s_Shared.texture);
     QexSkinningTextureShader_Release(&s_Shared.skinning);
     QexSimpleShader_Release(&s_Shared.simple);

@@ -1,5 +1,6 @@
 #include "QexGL.h"
 #include "QexMemory.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexParticle"
 
@@ -63,20 +64,9 @@ const struct {
                  {&s_Program.alphaTexture, "alphaTexture"},
                  {&s_Program.mvpMatrix, "MVPMatrix"}};
 
-void DeleteProgram() {
-    QexRenderState_UseProgram(0);
-    if (s_Program.program) QEX_GL(glDeleteProgram(s_Program.program));
-    if (s_Program.vertexShader) QEX_GL(glDeleteShader(s_Program.vertexShader));
-    if (s_Program.fragmentShader) QEX_GL(glDeleteShader(s_Program.fragmentShader));
-    s_Program = {};
-}
-
 bool CreateProgram() {
-    if (QexShader_Create(&s_Program.vertexShader, kVertexSource, GL_VERTEX_SHADER) != 0 ||
-        QexShader_Create(&s_Program.fragmentShader, kFragmentSource, GL_FRAGMENT_SHADER) != 0 ||
-        QexShader_CreateProgram(&s_Program.program, s_Program.vertexShader, s_Program.fragmentShader, nullptr,
-                                0, nullptr) != 0) {
-        DeleteProgram();
+    if (!QexShader_BuildProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader,
+                                kVertexSource, kFragmentSource, nullptr, 0)) {
         QexError(QEX_TAG, "<QexParticleSet_Create> the particle sets' program cannot be built");
         return false;
     }
@@ -88,7 +78,8 @@ bool CreateProgram() {
 }
 
 void ReleaseProgram() {
-    if (--s_Program.users == 0) DeleteProgram();
+    if (--s_Program.users == 0)
+        QexShader_DeleteProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader);
 }
 
 bool IsRunning(const QexParticleSet* set) {

@@ -2,6 +2,7 @@
 // third, and a mix of the three on the screen. The modules are Shaders/QexBlurShader, QexDOFShader and the
 // two depth modules; the copy program, which shows a target as it is, is made here.
 #include "QexGL.h"
+#include "QexShader.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 
@@ -97,13 +98,6 @@ int32_t Check(const char* function, bool argumentsAreThere, bool programIsThere)
     return kFailed;
 }
 
-bool CompileCopyProgram() {
-    return QexShader_Create(&s_VertexShader, pVertexShaderPP, GL_VERTEX_SHADER) == 0 &&
-           QexShader_Create(&s_FragmentShader, pFragmentShaderPP, GL_FRAGMENT_SHADER) == 0 &&
-           QexShader_CreateProgram(&m_iProgNamePP, s_VertexShader, s_FragmentShader, nullptr, 0, nullptr) ==
-               0;
-}
-
 }  // namespace
 
 extern "C" {
@@ -178,10 +172,9 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     QexMatrix projection;
     QexMatrix_Orthographic(&projection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
     QexPP_ReleaseShader();
-    if (!CompileCopyProgram()) {
-        QexPP_ReleaseShader();
+    if (!QexShader_BuildProgram(&m_iProgNamePP, &s_VertexShader, &s_FragmentShader, pVertexShaderPP,
+                                pFragmentShaderPP, nullptr, 0))
         return kFailed;
-    }
     GLint location;
     QEX_GL(s_Position = glGetAttribLocation(m_iProgNamePP, "a_v4Position"));
     QEX_GL(s_TexCoord = glGetAttribLocation(m_iProgNamePP, "a_v2TexCoord"));
@@ -196,11 +189,7 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
 }
 
 void QexPP_ReleaseShader(void) {
-    QexRenderState_UseProgram(0);
-    if (m_iProgNamePP) QEX_GL(glDeleteProgram(m_iProgNamePP));
-    if (s_VertexShader) QEX_GL(glDeleteShader(s_VertexShader));
-    if (s_FragmentShader) QEX_GL(glDeleteShader(s_FragmentShader));
-    m_iProgNamePP = s_VertexShader = s_FragmentShader = 0;
+    QexShader_DeleteProgram(&m_iProgNamePP, &s_VertexShader, &s_FragmentShader);
 }
 
 QexRenderTarget* QexPP_GetRenderTarget(uint32_t index) {

@@ -1,3 +1,5 @@
+#include "QexShader.h"
+
 #include <cstring>
 
 #include "QexGL.h"
@@ -44,6 +46,26 @@ void ReadLinkLog(uint32_t program, char* log) {
 }
 
 }  // namespace
+
+bool QexShader_BuildProgram(uint32_t* program, uint32_t* vertexShader, uint32_t* fragmentShader,
+                            const char* vertexSource, const char* fragmentSource,
+                            const char* const* attributes, int32_t attributeCount) {
+    if (QexShader_Create(vertexShader, vertexSource, GL_VERTEX_SHADER) == 0 &&
+        QexShader_Create(fragmentShader, fragmentSource, GL_FRAGMENT_SHADER) == 0 &&
+        QexShader_CreateProgram(program, *vertexShader, *fragmentShader, attributes, attributeCount,
+                                nullptr) == 0)
+        return true;
+    QexShader_DeleteProgram(program, vertexShader, fragmentShader);
+    return false;
+}
+
+void QexShader_DeleteProgram(uint32_t* program, uint32_t* vertexShader, uint32_t* fragmentShader) {
+    QexRenderState_UseProgram(0);
+    if (*program) QEX_GL(glDeleteProgram(*program));
+    if (*vertexShader) QEX_GL(glDeleteShader(*vertexShader));
+    if (*fragmentShader) QEX_GL(glDeleteShader(*fragmentShader));
+    *program = *vertexShader = *fragmentShader = 0;
+}
 
 extern "C" {
 
