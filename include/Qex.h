@@ -3410,8 +3410,10 @@ QEX_API void QexRenderTarget_Release(QexRenderTarget* target);
 /** Modes; with any other number the billboard has the rotation of its own (x, y, z) alone. */
 #define QEX_BILLBOARD_SCREEN 1  /* faces the screen, unrotated */
 #define QEX_BILLBOARD_UPRIGHT 2 /* faces the screen about its own up axis */
-#define QEX_BILLBOARD_CAMERA 3  /* turned towards the eye in pitch and yaw, then rotated about z */
-#define QEX_BILLBOARD_YAW 4     /* turned towards the eye in yaw alone, then rotated about z */
+/* turned towards the eye in yaw, rotated about z, and tilted about the world's x axis by the eye's pitch: the
+ * upper edge comes forward where the eye is above, so this mode is for eyes at about the same height */
+#define QEX_BILLBOARD_CAMERA 3
+#define QEX_BILLBOARD_YAW 4 /* turned towards the eye in yaw alone, then rotated about z */
 
 /** A billboard. The application writes scale, rotation, position, mode and opacity directly. */
 typedef struct QexBillboard {

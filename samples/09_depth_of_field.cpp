@@ -1,8 +1,8 @@
-// Sample 9: depth of field. A row of spheres goes away from the camera, twice: on the left half of the
-// picture the near ones are sharp, on the right the far ones.
+// Sample 9: depth of field. A row of spheres goes away from the camera. On the left of the picture the near
+// ones are sharp, on the right the far ones; above the rest is blurred at full resolution, below at half.
 #include "Sample.h"
 
-constexpr int kHalf = Sample::kWidth / 2;
+constexpr int kWidth = Sample::kWidth / 2, kHeight = Sample::kHeight / 2;
 
 struct Row {
     QexModel* model;
@@ -43,21 +43,27 @@ int main(int argc, char** argv) {
     QexShaderModule* lit = QexGouraudShader_CreateProgram();
     QexModel_SetShaderProgramForAllNode(&row.model, lit, nullptr);
     s_Row.model = &row.model;
-    s_Row.camera = sample.Camera({0, 0.5f, 7}, {0.3f, 0.8f, 0});
-    QexCamera_Project(&s_Row.camera, 0.7f, static_cast<float>(kHalf) / Sample::kHeight, 1, 22);
+    s_Row.camera = sample.Camera({0.3f, 0.5f, 7.4f}, {0.7f, 0.8f, 0});
+    QexCamera_Project(&s_Row.camera, 0.7f, static_cast<float>(kWidth) / kHeight, 1, 22);
     s_Row.lights.count = 1;
     s_Row.lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {1, -2, -1.5f}, {1, 1, 1, 1}};
 
-    // The effect takes half of the picture for its screen.
-    QexRuntimeContext half = sample.engine;
-    half.width = kHalf;
-    QexPostProcessing_Initialize(&half);
+    // The effect takes a quarter of the picture for its screen.
+    QexRuntimeContext quarter = sample.engine;
+    quarter.width = kWidth;
+    quarter.height = kHeight;
+    QexPostProcessing_Initialize(&quarter);
+    for (const uint32_t halfTarget : {0, 1})
+        QexTexture_SetFilter(&QexPP_GetRenderTarget(halfTarget)->colorTexture, QEX_FILTER_LINEAR);
     sample.Clear();
-    for (const bool far : {false, true}) {
-        glViewport(far ? kHalf : 0, 0, kHalf, Sample::kHeight);
-        QexPostProcessing_DrawDOF(&half, nullptr, nullptr, nullptr, DrawRow, far ? 0.8f : 0.25f, 2.5f,
-                                  1.0f / kHalf, 1.0f / Sample::kHeight, 3, 9, 2, 0, 1);
-    }
+    for (const bool half : {false, true})
+        for (const bool far : {false, true}) {
+            glViewport(far ? kWidth : 0, half ? 0 : kHeight, kWidth, kHeight);
+            // Both blur as far: a pixel at half the resolution is two.
+            const float step = half ? 2 : 1, sigma = half ? 1.5f : 3;
+            QexPostProcessing_DrawDOF(&quarter, nullptr, nullptr, nullptr, DrawRow, far ? 0.8f : 0.25f, 2.5f,
+                                      step / kWidth, step / kHeight, sigma, 9, half ? 0 : 2, 0, 1);
+        }
     QexPostProcessing_Finalize();
 
     const int status = sample.Finish();

@@ -2,6 +2,8 @@
 // made in memory, the picture at the end. Sample 1 does all of it by itself.
 #pragma once
 
+#include <algorithm>
+#include <cmath>
 #include <cstdint>
 #include <cstdio>
 #include <memory>
@@ -56,6 +58,12 @@ class Sample {
         glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT | GL_STENCIL_BUFFER_BIT);
     }
 
+    // A file of that name in the picture's directory.
+    std::string Beside(const std::string& name) const {
+        const size_t slash = output_.rfind('/');
+        return slash == std::string::npos ? name : output_.substr(0, slash + 1) + name;
+    }
+
     // Saves what was drawn; the result is the program's exit status.
     int Finish() const {
         const std::vector<uint8_t> pixels = gl_->ReadPixels();
@@ -72,6 +80,41 @@ class Sample {
     std::unique_ptr<qex::HeadlessContext> gl_;
     bool started_ = false;
 };
+
+// A texture painted in code: paint(s, t) is a pixel's colour, red, green, blue and alpha from 0 to 1, with s
+// counted from the left and t from the lower edge, 0 to 1. An application loads one from a file instead.
+class SampleTexture {
+  public:
+    template <class Paint>
+    SampleTexture(int width, int height, Paint paint) {
+        for (int y = 0; y < height; ++y)
+            for (int x = 0; x < width; ++x) {
+                const QexVec4 colour = paint((static_cast<float>(x) + 0.5f) / static_cast<float>(width),
+                                             (static_cast<float>(y) + 0.5f) / static_cast<float>(height));
+                for (const float channel : {colour.x, colour.y, colour.z, colour.w})
+                    pixels_.push_back(static_cast<uint8_t>(255 * std::clamp(channel, 0.0f, 1.0f) + 0.5f));
+            }
+        QexTexture_CreateFromPixels(&texture, width, height, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_LINEAR,
+                                    QEX_WRAP_CLAMP, pixels_.data());
+    }
+    ~SampleTexture() { QexTexture_Release(&texture); }
+    SampleTexture(const SampleTexture&) = delete;
+    SampleTexture& operator=(const SampleTexture&) = delete;
+
+    QexTexture texture;
+
+  private:
+    std::vector<uint8_t> pixels_;
+};
+
+// A round spot, dense in the middle, as smoke, sparks and drops are made of.
+inline SampleTexture SoftSpot(int size, const QexVec3& colour) {
+    return SampleTexture(size, size, [&](float s, float t) {
+        const float distance = 2 * std::hypot(s - 0.5f, t - 0.5f);
+        const float density = std::max(0.0f, 1 - distance);
+        return QexVec4{colour.x, colour.y, colour.z, density * density * (3 - 2 * density)};
+    });
+}
 
 // A model of a scene built in code. An application calls QexModel_LoadContent with a directory and a file
 // instead; from memory, the bytes stay as long as the model.

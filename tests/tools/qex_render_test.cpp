@@ -283,6 +283,11 @@ TEST_F(QexRender, DepthOfFieldIsSharpAtItsFocus) {
     const Image near = Picture(QuadScene(), {"--dof", "0.09,50"});
     EXPECT_TRUE(Near(At(near, 103, 40), red, 4));
     EXPECT_GT(At(near, 97, 40)[0], kBackground[0] + 20);
+    // Four steps to either side: eight pixels at half the resolution, four at full.
+    EXPECT_GT(At(near, 94, 40)[0], kBackground[0] + 5);
+    const Image full = Picture(QuadScene(), {"--dof", "0.09,50", "--dof-full"});
+    EXPECT_GT(At(full, 97, 40)[0], kBackground[0] + 5);
+    EXPECT_TRUE(Near(At(full, 94, 40), kBackground, 1));
     const Image far = Picture(QuadScene(), {"--dof", "1,50,3,5"});
     EXPECT_TRUE(Near(At(far, 97, 40), kBackground, 2));
     EXPECT_LT(At(far, 103, 40)[0], 235);

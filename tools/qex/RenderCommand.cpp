@@ -191,7 +191,7 @@ void Renderer::Draw(double frame, float turned) {
     PlaceCamera(turned);
     glViewport(0, 0, options_.width, options_.height);
     if (options_.effects.depthOfField) {
-        DrawWithDepthOfField(&engine_, *options_.effects.depthOfField,
+        DrawWithDepthOfField(&engine_, options_.effects,
                              [this](QexShaderModule* module, QexShaderModule* skinned) {
                                  Clear(module ? 0xFFFFFF : options_.background);
                                  module ? DrawDepth(module, skinned) : DrawScene(camera_);

@@ -208,14 +208,18 @@ void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightS
     QexReflection_Release(reflection);
 }
 
-void DrawWithDepthOfField(QexRuntimeContext* engine, const DepthOfField& effect, const DrawPass& draw) {
-    // Steps of a pixel of the targets, which are half as wide and high as the picture.
-    const float stepX = 2 / static_cast<float>(engine->width), stepY = 2 / static_cast<float>(engine->height);
+void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, const DrawPass& draw) {
+    const DepthOfField& effect = *options.depthOfField;
+    // Steps of a pixel of the targets.
+    const float step = options.fullBlur ? 1 : 2;
+    const float stepX = step / static_cast<float>(engine->width),
+                stepY = step / static_cast<float>(engine->height);
     for (uint32_t half : {0, 1})
         QexTexture_SetFilter(&QexPP_GetRenderTarget(half)->colorTexture, QEX_FILTER_LINEAR);
     s_drawPass = &draw;
     QexPostProcessing_DrawDOF(engine, nullptr, nullptr, nullptr, CallDrawPass, effect.focus, effect.range,
-                              stepX, stepY, effect.sigma, effect.samples, 0, kNearDepth, kFarDepth);
+                              stepX, stepY, effect.sigma, effect.samples, options.fullBlur ? 2 : 0,
+                              kNearDepth, kFarDepth);
     s_drawPass = nullptr;
 }
 

@@ -32,6 +32,7 @@ struct EffectOptions {
     uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
     float separation = 0;
     std::optional<DepthOfField> depthOfField;
+    bool fullBlur = false;  // depth of field blurs at full resolution, not at half
 };
 
 // The names of the shader modules, ", " between them.
@@ -87,10 +88,11 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model,
 void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
                   const QexCamera& camera);
 
-// Draws a scene sharp near one depth and blurred elsewhere. `draw` clears and draws it: once with null, once
-// with the modules that show depth, on white. Between QexPostProcessing_Initialize and ..._Finalize.
+// Draws a scene with the depth of field of the options, which there is. `draw` clears and draws it: once with
+// null, once with the modules that show depth, on white. Between QexPostProcessing_Initialize and
+// ..._Finalize.
 using DrawPass = std::function<void(QexShaderModule* module, QexShaderModule* skinned)>;
-void DrawWithDepthOfField(QexRuntimeContext* engine, const DepthOfField& effect, const DrawPass& draw);
+void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, const DrawPass& draw);
 
 // Prints the mesh nodes under each point, one line a point.
 void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,

@@ -217,14 +217,14 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
         AddParsed(app, "--stereo", "MODE,SEPARATION: 1 red-blue, 2 red-cyan, 3 side by side; pixels", options,
                   ParseStereo);
     // The pictures that it is made from have no stencil, and one eye.
-    AddParsed(
+    CLI::Option* dof = AddParsed(
         app, "--dof",
         "FOCUS,RANGE[,SIGMA,SAMPLES], depth of field: FOCUS 0 to 1 as --shader depth shows it, blur per "
         "unit of depth (sigma 5, 9 samples)",
-        options, ParseDepthOfField)
-        ->excludes(mirror)
-        ->excludes(mirrorNode)
-        ->excludes(stereo);
+        options, ParseDepthOfField);
+    dof->excludes(mirror)->excludes(mirrorNode)->excludes(stereo);
+    app->add_flag("--dof-full", options->effects.fullBlur, "blur at full resolution instead of half")
+        ->needs(dof);
     AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
     AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
