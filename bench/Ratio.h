@@ -64,8 +64,8 @@ class RatioBench {
             const double a = Median(reporter.times[c.name + " [qex]"]) / c.items;
             const double b = Median(reporter.times[c.name + " [reference]"]) / c.items;
             if (!(a > 0) || !(b > 0)) continue;  // filtered out
-            printf("%-52s %12.2f %12.2f %7.2f %7.2f%s\n", c.name.c_str(), a, b, a / b, c.limit,
-                   a / b > c.limit ? "  OVER" : "");
+            printf("%-52s %12.2f %12.2f %7.*f %7.2f%s\n", c.name.c_str(), a, b, a / b < 0.1 ? 4 : 2, a / b,
+                   c.limit, a / b > c.limit ? "  OVER" : "");
             over += a / b > c.limit;
         }
         return check_ && over ? 1 : 0;

@@ -2,11 +2,9 @@
 // the tap's null driver: what is left is the engine's own work.
 #include <cstdlib>
 
+#include "BenchEngine.h"
 #include "gltap.h"
-#include "Qex.h"
 #include "Ratio.h"
-#include "Scenes.h"
-#include "Silence.h"
 
 namespace {
 
@@ -17,26 +15,10 @@ constexpr uint32_t kNodes = 1000;
 int main(int argc, char** argv) {
     RatioBench bench(&argc, argv);
     gltapSetMode(GLTAP_NULL);
-    const std::vector<uint8_t> file = pod::WritePod(scenes::Grid(kNodes));
-    QexRuntimeContext context;
-    QexEngineConfig config = {};
-    config.width = 640;
-    config.height = 480;
-    QexModel model;
-    QexModel_Create(&model);
-    {
-        const Silence silence;
-        QexEngine_Init(&context, sizeof config, &config);
-        QexModel_LoadContentFromCache(&model, file.data(), static_cast<uint32_t>(file.size()), nullptr);
-    }
-    if (QexModel_GetNumMeshNodes(&model) != kNodes) abort();
-
-    QexCamera camera;
-    QexCamera_Create(&camera, 0);
-    const QexVec3 eye = {16, 16, 60}, target = {16, 16, 0};
-    QexCamera_LookAt(&camera, &eye, &target, nullptr);
-    QexCamera_Project(&camera, 0.785f, 4.0f / 3.0f, 1, 100);
-    const auto draw = [&] { QexModel_RenderWithCamera(&model, nullptr, &camera, nullptr, 0); };
+    BenchEngine engine(640, 480, scenes::Grid(kNodes));
+    if (QexModel_GetNumMeshNodes(&engine.model) != kNodes) abort();
+    const QexCamera camera = BenchEngine::Camera({16, 16, 60}, {16, 16, 0}, 4.0f / 3);
+    const auto draw = [&] { QexModel_RenderWithCamera(&engine.model, nullptr, &camera, nullptr, 0); };
 
     draw();
     gltapBeginRecording();
@@ -49,8 +31,5 @@ int main(int argc, char** argv) {
     const int status = bench.Result();
     printf("GL calls a node: %.1f\n", static_cast<double>(calls) / kNodes);
     gltapReleaseRecording(recording);
-    const Silence silence;
-    QexModel_Unload(&model);
-    QexEngine_Shutdown(&context);
     return status;
 }

@@ -3,10 +3,9 @@
 #include <cstdio>
 #include <cstdlib>
 
+#include "BenchEngine.h"
 #include "gltap.h"
-#include "Qex.h"
 #include "Ratio.h"
-#include "Silence.h"
 
 namespace {
 
@@ -88,25 +87,17 @@ struct Arrays {
 int main(int argc, char** argv) {
     RatioBench bench(&argc, argv);
     gltapSetMode(GLTAP_NULL);
-    QexRuntimeContext context;
-    QexEngineConfig config = {};
-    config.width = 640;
-    config.height = 480;
+    const BenchEngine engine(640, 480);
     // The emitters' log lines, one a particle and update, go nowhere.
     if (!freopen("/dev/null", "w", stderr)) abort();
     std::vector<QexParticleEmitter*> emitters;
     {
         const Silence silence;
-        QexEngine_Init(&context, sizeof config, &config);
         for (int i = 0; i < kEmitters; ++i) emitters.push_back(FilledEmitter(kEach));
         emitters.push_back(FilledEmitter(QEX_EMITTER_MAX_PARTICLES));
     }
     QexParticleEmitter* drawn = emitters.back();
-    QexCamera camera;
-    QexCamera_Create(&camera, 0);
-    const QexVec3 eye = {16, 16, 60}, target = {16, 16, 0};
-    QexCamera_LookAt(&camera, &eye, &target, nullptr);
-    QexCamera_Project(&camera, 0.785f, 4.0f / 3.0f, 1, 100);
+    const QexCamera camera = BenchEngine::Camera({16, 16, 60}, {16, 16, 0}, 4.0f / 3);
 
     const auto draw = [&] { QexParticleEmitter_Draw(drawn, &camera); };
     draw();
@@ -148,6 +139,5 @@ int main(int argc, char** argv) {
     gltapReleaseRecording(recording);
     const Silence silence;
     for (QexParticleEmitter* e : emitters) QexParticleEmitter_Release(e);
-    QexEngine_Shutdown(&context);
     return status;
 }

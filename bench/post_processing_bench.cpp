@@ -4,27 +4,31 @@
 
 #include <GLES2/gl2.h>
 
+#include "BenchEngine.h"
 #include "gltap.h"
 #include "Headless.h"
-#include "Qex.h"
 #include "Ratio.h"
-#include "Scenes.h"
-#include "Silence.h"
 
 namespace {
 
 constexpr int kWidth = 960, kHeight = 540;
-QexModel s_Model;
-QexCamera s_Camera;
+
+struct View {
+    QexModel* model;
+    const QexCamera* camera;
+};
+// The depth pass is called without the application's arguments.
+const View* s_View;
 
 int32_t DrawScene(QexRuntimeContext*, void*, void*, void*, QexShaderModule* module, QexShaderModule* skinned,
                   const float* colour) {
-    QexShaderModule* own = s_Model.scene.nodes[0].shader;
+    QexModel* model = s_View->model;
+    QexShaderModule* own = model->scene.nodes[0].shader;
     glClearColor(colour ? colour[0] : 0, colour ? colour[1] : 0, colour ? colour[2] : 0, 1);
     glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
-    if (module) QexModel_SetShaderProgramForAllNode(&s_Model, module, skinned);
-    QexModel_RenderWithCamera(&s_Model, nullptr, &s_Camera, nullptr, 0);
-    if (module) QexModel_SetShaderProgramForAllNode(&s_Model, own, own);
+    if (module) QexModel_SetShaderProgramForAllNode(model, module, skinned);
+    QexModel_RenderWithCamera(model, nullptr, s_View->camera, nullptr, 0);
+    if (module) QexModel_SetShaderProgramForAllNode(model, own, own);
     return 0;
 }
 
@@ -38,29 +42,19 @@ int main(int argc, char** argv) {
         fprintf(stderr, "post_processing_bench: %s\n", error.c_str());
         return 1;
     }
-    const std::vector<uint8_t> file = pod::WritePod(scenes::Grid(100));
-    QexRuntimeContext context;
-    QexEngineConfig config = {};
-    config.width = kWidth;
-    config.height = kHeight;
-    QexModel_Create(&s_Model);
-    {
-        const Silence silence;
-        QexEngine_Init(&context, sizeof config, &config);
-        QexModel_LoadContentFromCache(&s_Model, file.data(), static_cast<uint32_t>(file.size()), nullptr);
-        if (QexPostProcessing_Initialize(&context) != 0) abort();
-    }
-    QexCamera_Create(&s_Camera, 0);
-    const QexVec3 eye = {4.5f, 4.5f, 14}, target = {4.5f, 4.5f, 0};
-    QexCamera_LookAt(&s_Camera, &eye, &target, nullptr);
-    QexCamera_Project(&s_Camera, 0.785f, static_cast<float>(kWidth) / kHeight, 1, 100);
+    BenchEngine engine(kWidth, kHeight, scenes::Grid(100));
+    const QexCamera camera =
+        BenchEngine::Camera({4.5f, 4.5f, 14}, {4.5f, 4.5f, 0}, static_cast<float>(kWidth) / kHeight);
+    View view = {&engine.model, &camera};
+    s_View = &view;
+    if (QexPostProcessing_Initialize(&engine.context) != 0) abort();
     QexRenderer_SetZTestFunc(3);
 
     for (const bool half : {false, true}) {
-        const auto draw = [&context, half] {
+        const auto draw = [&engine, half] {
             const float step = half ? 2 : 1;
-            QexPostProcessing_DrawDOF(&context, nullptr, nullptr, nullptr, DrawScene, 0.5f, 4, step / kWidth,
-                                      step / kHeight, 3, 9, half ? 0 : 2, 0, 1);
+            QexPostProcessing_DrawDOF(&engine.context, nullptr, nullptr, nullptr, DrawScene, 0.5f, 4,
+                                      step / kWidth, step / kHeight, 3, 9, half ? 0 : 2, 0, 1);
             glFinish();
         };
         bench.Compare(
@@ -75,9 +69,6 @@ int main(int argc, char** argv) {
     }
     const int status = bench.Result();
     printf("GL: %s\n", gl->Renderer().c_str());
-    const Silence silence;
     QexPostProcessing_Finalize();
-    QexModel_Unload(&s_Model);
-    QexEngine_Shutdown(&context);
     return status;
 }

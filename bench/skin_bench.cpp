@@ -11,11 +11,9 @@
 #include <glm/gtc/quaternion.hpp>
 #include <glm/gtc/type_ptr.hpp>
 
+#include "BenchEngine.h"
 #include "gltap.h"
-#include "Qex.h"
 #include "Ratio.h"
-#include "Scenes.h"
-#include "Silence.h"
 
 namespace {
 
@@ -128,18 +126,8 @@ int main(int argc, char** argv) {
         std::any_of(argv, argv + argc, [](const char* a) { return strcmp(a, "--check") == 0; });
     RatioBench bench(&argc, argv);
     gltapSetMode(GLTAP_NULL);
-    const std::vector<uint8_t> file = pod::WritePod(scenes::Worm(kBones, kFrames));
-    QexRuntimeContext context;
-    QexEngineConfig config = {};
-    config.width = 640;
-    config.height = 480;
-    QexModel model;
-    QexModel_Create(&model);
-    {
-        const Silence silence;
-        QexEngine_Init(&context, sizeof config, &config);
-        QexModel_LoadContentFromCache(&model, file.data(), static_cast<uint32_t>(file.size()), nullptr);
-    }
+    BenchEngine engine(640, 480, scenes::Worm(kBones, kFrames));
+    QexModel& model = engine.model;
     QexPODModel* scene = &model.scene;
     if (QexModel_GetNumMeshNodes(&model) != 2 || !scene->meshes[1].boneBatches.batchCount) abort();
 
@@ -161,11 +149,7 @@ int main(int argc, char** argv) {
         },
         kBones);
 
-    QexCamera camera;
-    QexCamera_Create(&camera, 0);
-    const QexVec3 eye = {0, 2, 10}, target = {0, 2, 0};
-    QexCamera_LookAt(&camera, &eye, &target, nullptr);
-    QexCamera_Project(&camera, 0.785f, 4.0f / 3.0f, 1, 100);
+    const QexCamera camera = BenchEngine::Camera({0, 2, 10}, {0, 2, 0}, 4.0f / 3);
     const auto draw = [&] {
         QexPODModel_SetFrame(scene, next(&drawFrame));
         QexModel_RenderNodeWithCamera(&model, 1, nullptr, &camera, nullptr);
@@ -185,8 +169,5 @@ int main(int argc, char** argv) {
            kBatchingLimit, batching > kBatchingLimit ? "  OVER" : "");
     if (check && batching > kBatchingLimit) status = 1;
     gltapReleaseRecording(recording);
-    const Silence silence;
-    QexModel_Unload(&model);
-    QexEngine_Shutdown(&context);
     return status;
 }
