@@ -48,8 +48,9 @@ struct Ktx {
         Bytes file(identifier, identifier + 12);
         const auto count = levelCount.value_or(static_cast<uint32_t>(levels.size()));
         const auto extra = static_cast<uint32_t>(keyValues.size());
+        const uint32_t typeSize = type > GL_UNSIGNED_BYTE ? 2 : 1;
         // clang-format off
-        const uint32_t words[] = {0x04030201, type, 1, format, internal, base, width, height, 0, 0, faces, count, extra};
+        const uint32_t words[] = {0x04030201, type, typeSize, format, internal, base, width, height, 0, 0, faces, count, extra};
         // clang-format on
         for (const uint32_t word : words) PutWord(&file, file.size(), word);
         file.insert(file.end(), keyValues.begin(), keyValues.end());

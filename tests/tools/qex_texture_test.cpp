@@ -236,12 +236,9 @@ TEST_F(QexTextureVerb, ReadsWhatOthersWrite) {
     ktx.levels = {{{255, 0, 0, 0, 0, 255}}};
     holds("tight_rows.ktx", ktx.File(), redBlue);
     ktx.type = GL_UNSIGNED_SHORT_5_6_5;
-    ktx.levels = {{{0xF8, 0x00, 0x00, 0x1F}}};
+    ktx.levels = {{{0x00, 0xF8, 0x1F, 0x00}}};
     ktx.levelCount = 0;
-    Bytes swapped = ktx.File();
-    swapped[20] = 2;  // glTypeSize
-    for (size_t at = 12; at < 68; at += 4) std::reverse(&swapped[at], &swapped[at] + 4);
-    holds("swapped.ktx", swapped, redBlue);
+    holds("swapped.ktx", SwappedFile(ktx), redBlue);
 
     pod::PvrImage image;
     image.type = pod::kPvrBgra8888;
