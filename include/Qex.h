@@ -3803,6 +3803,84 @@ QEX_API int32_t QexPP_DrawImage(const QexRuntimeContext* context, void* user1, v
                                 QexRenderTarget* source, QexRenderTarget* destination);
 
 /* ======================================================================================================
+ * Sky and water
+ *
+ * A cube around the camera with a sky on it, and, if wanted, a plane of water at one height that mirrors the
+ * scene and the sky. There is one of them a process: QexSkyBox_Create, QexSkyBox_Update once a frame, which
+ * draws it together with the application's scene, and QexSkyBox_Release. Needs a current GL context.
+ * ====================================================================================================== */
+
+/** What the sky box is made of; the application's, alive until QexSkyBox_Release. */
+typedef struct QexSkyBox {
+    /* Cube map, not null. A look along a direction d shows the texel of -d: the face for +X lies at -X, and
+     * so on, and pictures appear turned about accordingly. Also see QexSky_NewVertices. */
+    QexTexture* skyTexture;
+    /* Waves, repeating: the normal's x, y (up) and z as 0 to 1 in red, green and blue, so that (0.5, 1, 0.5)
+     * is flat. One repetition covers about 800 units of the first and 2,000 of the second layer, which are
+     * added. Null: smooth water. */
+    QexTexture* waterNormalTexture;
+    float size;              /* edge of the sky cube; its corners have to be within the far distance */
+    int32_t waterEnabled;    /* 1 draws the water, any other value the sky alone */
+    QexVec4 waterColour;     /* its red, green and blue become the clear colour; the water does not show it */
+    QexVec3 centre;          /* of the sky cube; following the eye keeps the sky at a distance */
+    const QexCamera* camera; /* not null; its eye, target, up, fov, aspect, near and far count */
+    uint32_t reserved[4];    /* not read */
+    float waterHeight;       /* the water's surface is at y = -waterHeight, set by QexSkyBox_Create */
+    /* Draws the application's scene, opaque parts first, with view and projection as given, which differ from
+     * the camera's in the reflection; null draws none. Called before the sky is drawn, for the reflection
+     * (with water) and for the screen. It leaves depth writes on and no buffer bound, and does not clear. */
+    void (*drawScene)(struct QexSkyBox* box, const QexMatrix* view, const QexMatrix* projection);
+} QexSkyBox;
+
+/** A program that draws texture coordinates' texels; the application may use it. */
+typedef struct QexTex2DProgram {
+    uint32_t program;     /* GL name, attributes 0 inVertex, 1 inNormal, 2 inTexCoord; unit 0 */
+    int32_t mvpMatrixLoc; /* uniform MVPMatrix */
+} QexTex2DProgram;
+
+/** A program that draws a texture, unit 0, as it lies over the screen. */
+typedef struct QexPlaneTexProgram {
+    uint32_t program;         /* GL name, attribute 0 inVertex */
+    int32_t mvpMatrixLoc;     /* uniform MVPMatrix */
+    int32_t rcpWindowSizeLoc; /* uniform RcpWindowSize: 1 / width, 1 / height */
+} QexPlaneTexProgram;
+
+/** The programs between QexSkyBox_Create and QexSkyBox_Release; their program is 0 otherwise. Read only. */
+QEX_API extern QexTex2DProgram m_Tex2DShader;
+QEX_API extern QexPlaneTexProgram m_PlaneTexShader;
+
+/** Makes the vertices of a cube: back, right, front, left, top, bottom, a triangle strip of four each.
+ *  No GL context needed.
+ *  @param scale        half an edge
+ *  @param inset        non-zero keeps texture coordinates 4 texels away from the texture's edges
+ *  @param textureSize  texels along an edge, > 0 with inset
+ *  @param vertices     out, 24 times (x, y, z); to be freed with QexMemory_Free; null when memory runs out
+ *  @param texCoords    out, 24 times (s, t), likewise */
+QEX_API void QexSky_NewVertices(float scale, int32_t inset, int32_t textureSize, float** vertices,
+                                float** texCoords);
+
+/** Creates buffer, textures (two of 256 x 256 with framebuffers), programs. What an earlier call made is
+ *  released first. Sets the clear colour, depth writes, depth test (less or equal), culling and blending
+ *  (source alpha over). The framebuffer that is bound stays bound.
+ *  @param box  see QexSkyBox
+ *  @return 0, also, with a line on standard output, when a program cannot be built, and then nothing is
+ * drawn; -1, with a line, when the record, its sky texture or its camera is null, memory runs out, or a
+ * framebuffer is incomplete, with what is made so far left to QexSkyBox_Release. */
+QEX_API int32_t QexSkyBox_Create(QexSkyBox* box);
+
+/** Draws scene, sky and water into the framebuffer that is bound, without clearing it. With water the
+ *  viewport becomes that of the screen, and a line with the waves' figures goes to standard output. No water
+ *  is drawn for an eye below it. Leaves the depth test (less or equal, with water) and culling on.
+ *  Null for a parameter, and no sky box created, do nothing.
+ *  @param context  its size is the screen's
+ *  @param box      the record given to QexSkyBox_Create
+ *  @param value    kept, not used */
+QEX_API void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, void* value);
+
+/** Deletes all that QexSkyBox_Create made; without it, nothing. */
+QEX_API void QexSkyBox_Release(void);
+
+/* ======================================================================================================
  * Engine: start and end
  *
  * The application owns window, surface and GL context; it makes the context current, initialises the engine
