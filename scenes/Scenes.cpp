@@ -87,6 +87,63 @@ pod::MeshArrays Tube(uint32_t bones, float length) {
     return arrays;
 }
 
+// A flat polygon, counter-clockwise from the side that is seen.
+void AddPolygon(const std::vector<pod::Vec3>& corners, pod::MeshArrays* arrays) {
+    const auto side = [&corners](size_t corner, size_t axis) {
+        return corners[corner][axis] - corners[0][axis];
+    };
+    pod::Vec3 normal;
+    for (size_t i = 0; i < 3; ++i) {
+        const size_t j = (i + 1) % 3, k = (i + 2) % 3;
+        normal[i] = side(1, j) * side(2, k) - side(1, k) * side(2, j);
+    }
+    const float length = std::hypot(normal[0], normal[1], normal[2]);
+    const auto first = static_cast<uint32_t>(arrays->positions.size());
+    for (const pod::Vec3& corner : corners) {
+        arrays->positions.push_back(corner);
+        arrays->normals.push_back({normal[0] / length, normal[1] / length, normal[2] / length});
+        arrays->uvs.push_back({corner[0], corner[1]});
+    }
+    for (uint32_t i = 2; i < corners.size(); ++i)
+        for (uint32_t index : {0u, i - 1, i}) arrays->indices.push_back(first + index);
+}
+
+// Both sides, port first, ribs from stern to bow: upper edge and keel of each side.
+pod::MeshArrays Hull() {
+    const struct {
+        float x, top, keel, halfTop, halfKeel;
+    } ribs[] = {{-1, 0.3f, -0.2f, 0.45f, 0.2f},
+                {0.2f, 0.25f, -0.25f, 0.5f, 0.25f},
+                {1.4f, 0.4f, -0.05f, 0.02f, 0.01f}};
+    std::vector<pod::Vec3> port, portKeel, keel, starboard;
+    for (const auto& r : ribs) {
+        port.push_back({r.x, r.top, -r.halfTop});
+        portKeel.push_back({r.x, r.keel, -r.halfKeel});
+        keel.push_back({r.x, r.keel, r.halfKeel});
+        starboard.push_back({r.x, r.top, r.halfTop});
+    }
+    pod::MeshArrays arrays;
+    AddPolygon({port[0], portKeel[0], keel[0], starboard[0]}, &arrays);
+    for (size_t i = 0, j = 1; j < 3; ++i, ++j) {
+        AddPolygon({portKeel[j], portKeel[i], port[i], port[j]}, &arrays);
+        AddPolygon({keel[i], keel[j], starboard[j], starboard[i]}, &arrays);
+        AddPolygon({portKeel[i], portKeel[j], keel[j], keel[i]}, &arrays);
+        AddPolygon({port[i], starboard[i], starboard[j], port[j]}, &arrays);
+    }
+    return arrays;
+}
+
+pod::MeshArrays Sails() {
+    const pod::Vec3 mast[] = {{0.15f, 0.4f, 0}, {0.15f, 2.2f, 0}}, boom = {-0.95f, 0.55f, 0.2f},
+                    bow = {1.3f, 0.5f, 0};
+    pod::MeshArrays arrays;
+    AddPolygon({mast[0], mast[1], boom}, &arrays);
+    AddPolygon({boom, mast[1], mast[0]}, &arrays);
+    AddPolygon({mast[0], bow, mast[1]}, &arrays);
+    AddPolygon({mast[1], bow, mast[0]}, &arrays);
+    return arrays;
+}
+
 // A bumpy sheet of size x size vertices.
 pod::MeshArrays Sheet(uint32_t size) {
     pod::MeshArrays arrays;
@@ -183,6 +240,35 @@ pod::Scene Worm(uint32_t bones, uint32_t frames) {
             pod::BuildNode("bone" + std::to_string(bone), keys, bone ? static_cast<int32_t>(bone) + 1 : -1));
     }
     return scene;
+}
+
+pod::Scene Boat() {
+    return Still({{"hull", Hull(), {0, 0, 0}}, {"sails", Sails(), {0, 0, 0}}});
+}
+
+pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint) {
+    // The directions of a face's middle, its columns and its rows, as cube maps have them.
+    constexpr Face kFaces[6] = {{{1, 0, 0}, {0, 0, -1}, {0, -1, 0}}, {{-1, 0, 0}, {0, 0, 1}, {0, -1, 0}},
+                                {{0, 1, 0}, {1, 0, 0}, {0, 0, 1}},   {{0, -1, 0}, {1, 0, 0}, {0, 0, -1}},
+                                {{0, 0, 1}, {1, 0, 0}, {0, -1, 0}},  {{0, 0, -1}, {-1, 0, 0}, {0, -1, 0}}};
+    pod::PvrImage image;
+    image.width = image.height = size;
+    for (const Face& face : kFaces) {
+        std::vector<uint8_t> texels;
+        for (uint32_t i = 0; i < size * size; ++i) {
+            const auto along = [size](uint32_t at) {
+                return (2 * static_cast<float>(at) + 1) / static_cast<float>(size) - 1;
+            };
+            const float s = along(i % size), t = along(i / size);
+            pod::Vec3 look;  // the texel opposite is shown
+            for (size_t axis = 0; axis < 3; ++axis)
+                look[axis] = -(face.normal[axis] + s * face.u[axis] + t * face.v[axis]);
+            const auto colour = paint(look);
+            texels.insert(texels.end(), colour.begin(), colour.end());
+        }
+        image.surfaces.push_back({texels});
+    }
+    return image;
 }
 
 pod::Scene Grid(uint32_t count) {

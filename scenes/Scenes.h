@@ -1,7 +1,10 @@
 // Scenes built in code, for samples, tests and benchmarks alike.
 #pragma once
 
+#include <functional>
+
 #include "PodBuild.h"
+#include "PvrWriter.h"
 
 namespace scenes {
 
@@ -25,6 +28,14 @@ struct Object {
     pod::Vec3 position;
 };
 pod::Scene Still(const std::vector<Object>& objects);
+
+// A boat of about 2.4 along X, afloat at y = 0: the nodes "hull" and "sails", a material each.
+pod::Scene Boat();
+
+// The cube map of a sky box that shows `paint` (red, green, blue, alpha) in the directions that it is given,
+// in which one of x, y and z is 1 or -1 and the others are between.
+using SkyPaint = std::function<std::array<uint8_t, 4>(const pod::Vec3& direction)>;
+pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint);
 
 // Two mesh nodes: "floor", 8 across, and "worm", a tube of `bones` bones that stands on it and bends with
 // them over `frames` frames; frame 0 is its bind pose. Its vertices follow two bones each and name them as

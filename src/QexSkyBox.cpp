@@ -209,10 +209,14 @@ void DrawReflection(QexSkyBox* box) {
     DrawScene(box);
 }
 
+float WaveStep(float velocity) {
+    return static_cast<float>(fmod(static_cast<double>(velocity) * 100, 1));
+}
+
 void SetWaves() {
     QexVec2 translations[2];
     for (int i = 0; i < 2; ++i)
-        translations[i] = {fmodf(kBumpVelocities[i].x * 100, 1), fmodf(kBumpVelocities[i].y * 100, 1)};
+        translations[i] = {WaveStep(kBumpVelocities[i].x), WaveStep(kBumpVelocities[i].y)};
     printf("T0:%f, S0:%f, T1:%f, S1:%f\n", static_cast<double>(translations[0].x),
            static_cast<double>(kBumpScales[0].x), static_cast<double>(translations[1].x),
            static_cast<double>(kBumpScales[1].x));
