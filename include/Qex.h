@@ -3398,6 +3398,110 @@ QEX_API int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context
 QEX_API void QexRenderTarget_Release(QexRenderTarget* target);
 
 /* ======================================================================================================
+ * Sky box and water
+ *
+ * A sky from a cube map around the camera and, on demand, water at a fixed height out to the horizon. The
+ * application describes both in a record and draws its own scene in a callback; QexSkyBox_Update draws the
+ * frame in up to four passes: the scene mirrored, into a texture of 256 x 256 pixels; the water's surface,
+ * which is that texture distorted by waves, into another one; scene and sky as they are; the water over them,
+ * with the second texture. There is one sky box a process. Needs a current GL context, except where a
+ * function says not.
+ *
+ * The sky: in direction d of the world the cube map is looked up at -d. What is to be seen towards +X is the
+ * image of face -X, turned by half a turn, and so on for each axis: each face shows, unmirrored, the picture
+ * that one sees from inside, its first row the lower edge and each row from right to left. Upright is +Y; the
+ * pictures above and below continue the one towards -Z.
+ *
+ * The sky's corners are size * 0.87 from its centre; beyond the far plane they are cut off. Water outside of
+ * the sky's cube is hidden by it: the horizon is where the two meet. A centre that follows the eye keeps the
+ * sky at its distance.
+ *
+ * The water: its normal map repeats 833 and 2000 units apart, in two layers, and shifts the reflection by 30
+ * units times the normal over the distance. A scene of a few units is to be scaled up, or its waves are flat
+ * and its reflection torn: it looks best without a normal map. The waves stand still.
+ * ====================================================================================================== */
+
+struct QexSkyBox;
+
+/** Draws the application's scene, with culling and depth as set; afterwards the engine draws the sky.
+ *  @param skyBox      the record given to QexSkyBox_Update
+ *  @param view        view matrix; in the reflection mirrored in the water, so that front faces turn
+ * clockwise and QexRenderer_SetBackFaceCulling(2), set before, hides back faces
+ *  @param projection  projection matrix; in the reflection its near plane lies 2.5 units under the water */
+typedef void (*QexSkySceneCallback)(struct QexSkyBox* skyBox, const QexMatrix* view,
+                                    const QexMatrix* projection);
+
+/** A sky box. The application fills it and keeps it, with all that it points at, until QexSkyBox_Release. */
+typedef struct QexSkyBox {
+    QexTexture* skyTexture;         /* cube map, not null */
+    QexTexture* waterNormalTexture; /* 2 * colour - 1 is the normal: across in red and blue (x and z), up in
+                                       green; repeated. Null: the water is smooth */
+    float size;                     /* edge of the sky's cube */
+    int32_t waterEnabled;           /* 1: with water; any other value: sky alone */
+    float waterColour[4];           /* red, green and blue become the GL's clear colour in QexSkyBox_Create */
+    QexVec3 centre;                 /* of the sky's cube */
+    QexCamera* camera;              /* eye, target, up, fov, aspect, nearPlane, farPlane; its matrices are not
+                                       read. Not null */
+    int32_t reserved[4];            /* not read */
+    float waterHeight;              /* d of the plane y + d = 0: the negative of the height. Read by
+                                       QexSkyBox_Create */
+    QexSkySceneCallback drawScene;  /* called once with, once without the mirror; null: no scene */
+} QexSkyBox;
+
+/** A program that shows a texture by texture coordinates. */
+typedef struct QexTex2DShader {
+    uint32_t program;     /* GL name, 0 while there is none */
+    int32_t mvpMatrixLoc; /* "MVPMatrix" */
+} QexTex2DShader;
+
+/** One for the application's use: attributes 0 inVertex, 1 inNormal, 2 inTexCoord, the texture on unit 0.
+ * Read only. */
+QEX_API extern QexTex2DShader m_Tex2DShader;
+
+/** A program that shows a texture by the pixel's place on the screen. */
+typedef struct QexPlaneTexShader {
+    uint32_t program;         /* GL name, 0 while there is none */
+    int32_t mvpMatrixLoc;     /* "MVPMatrix" */
+    int32_t rcpWindowSizeLoc; /* "RcpWindowSize" */
+} QexPlaneTexShader;
+
+/** The one that draws the water: attribute 0 inVertex, the texture on unit 0. Read only. */
+QEX_API extern QexPlaneTexShader m_PlaneTexShader;
+
+/** Makes the sky's cube: six faces of four vertices, each a triangle strip, in the order -Z, +X, +Z, -X, +Y,
+ *  -Y. Both arrays are freed by the caller with QexMemory_Free. No GL context needed.
+ *  @param scale        half the edge
+ *  @param inset        not 0: texture coordinates keep four texels from the edge, 0: they are 0 and 1
+ *  @param textureSize  texels along an edge, read for the inset alone
+ *  @param vertices     out, 24 positions of three floats; null does nothing
+ *  @param texCoords    out, 24 texture coordinates of two floats; null does nothing. Both results are null,
+ *                      with a line in the log, when memory runs out */
+QEX_API void QexSky_NewVertices(float scale, int32_t inset, int32_t textureSize, float** vertices,
+                                float** texCoords);
+
+/** Makes everything that sky and water need; what an earlier call made is released first. The framebuffer
+ *  stays bound; depth test (mode 3), depth writing, culling of back faces and blending (mode 1) are on
+ *  afterwards. Where a program does not link, a line says so, and Update does nothing.
+ *  @param skyBox  record, filled; size, waterHeight and the sky texture's width count as they are now
+ *  @return 0; -1, with a line in the log, for null, without camera or sky texture, when memory runs out, or
+ *  when the GL cannot draw into 256 x 256 pixels. QexSkyBox_Release frees what there is then. */
+QEX_API int32_t QexSkyBox_Create(QexSkyBox* skyBox);
+
+/** Draws a frame: scene, sky and water. Neither clears the screen nor allocates. Sky alone leaves framebuffer
+ *  and viewport untouched. Water prints one line on standard output, "T0:..., S0:..., T1:..., S1:...", binds
+ *  units 0 to 2, and sets the viewport to the screen's size, depth test to mode 3 and culling to back faces;
+ *  the framebuffer stays bound. A camera that sees no water, or is under it, gets none.
+ *  @param context  its size is the screen's; null draws nothing
+ *  @param skyBox   the record; null, or without camera or sky texture, draws nothing, as before a
+ *                  QexSkyBox_Create that gave 0
+ *  @param value    not read */
+QEX_API void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* skyBox, int32_t value);
+
+/** Deletes what QexSkyBox_Create made, after a failure too; otherwise, and the second time, nothing. The
+ *  record and what it points at stay. */
+QEX_API void QexSkyBox_Release(void);
+
+/* ======================================================================================================
  * Billboards
  *
  * A textured quad in the scene, turned by one of five modes. One texel of its texture is one unit wide and
@@ -3801,84 +3905,6 @@ QEX_API int32_t QexPP_DrawDOF(const QexRuntimeContext* context, void* user1, voi
  *  @return 0, or as said above. */
 QEX_API int32_t QexPP_DrawImage(const QexRuntimeContext* context, void* user1, void* user2, void* user3,
                                 QexRenderTarget* source, QexRenderTarget* destination);
-
-/* ======================================================================================================
- * Sky and water
- *
- * A cube around the camera with a sky on it, and, if wanted, a plane of water at one height that mirrors the
- * scene and the sky. There is one of them a process: QexSkyBox_Create, QexSkyBox_Update once a frame, which
- * draws it together with the application's scene, and QexSkyBox_Release. Needs a current GL context.
- * ====================================================================================================== */
-
-/** What the sky box is made of; the application's, alive until QexSkyBox_Release. */
-typedef struct QexSkyBox {
-    /* Cube map, not null. A look along a direction d shows the texel of -d: the face for +X lies at -X, and
-     * so on, and pictures appear turned about accordingly. Also see QexSky_NewVertices. */
-    QexTexture* skyTexture;
-    /* Waves, repeating: the normal's x, y (up) and z as 0 to 1 in red, green and blue, so that (0.5, 1, 0.5)
-     * is flat. One repetition covers about 800 units of the first and 2,000 of the second layer, which are
-     * added. Null: smooth water. */
-    QexTexture* waterNormalTexture;
-    float size;              /* edge of the sky cube; its corners have to be within the far distance */
-    int32_t waterEnabled;    /* 1 draws the water, any other value the sky alone */
-    QexVec4 waterColour;     /* its red, green and blue become the clear colour; the water does not show it */
-    QexVec3 centre;          /* of the sky cube; following the eye keeps the sky at a distance */
-    const QexCamera* camera; /* not null; its eye, target, up, fov, aspect, near and far count */
-    uint32_t reserved[4];    /* not read */
-    float waterHeight;       /* the water's surface is at y = -waterHeight, set by QexSkyBox_Create */
-    /* Draws the application's scene, opaque parts first, with view and projection as given, which differ from
-     * the camera's in the reflection; null draws none. Called before the sky is drawn, for the reflection
-     * (with water) and for the screen. It leaves depth writes on and no buffer bound, and does not clear. */
-    void (*drawScene)(struct QexSkyBox* box, const QexMatrix* view, const QexMatrix* projection);
-} QexSkyBox;
-
-/** A program that draws texture coordinates' texels; the application may use it. */
-typedef struct QexTex2DProgram {
-    uint32_t program;     /* GL name, attributes 0 inVertex, 1 inNormal, 2 inTexCoord; unit 0 */
-    int32_t mvpMatrixLoc; /* uniform MVPMatrix */
-} QexTex2DProgram;
-
-/** A program that draws a texture, unit 0, as it lies over the screen. */
-typedef struct QexPlaneTexProgram {
-    uint32_t program;         /* GL name, attribute 0 inVertex */
-    int32_t mvpMatrixLoc;     /* uniform MVPMatrix */
-    int32_t rcpWindowSizeLoc; /* uniform RcpWindowSize: 1 / width, 1 / height */
-} QexPlaneTexProgram;
-
-/** The programs between QexSkyBox_Create and QexSkyBox_Release; their program is 0 otherwise. Read only. */
-QEX_API extern QexTex2DProgram m_Tex2DShader;
-QEX_API extern QexPlaneTexProgram m_PlaneTexShader;
-
-/** Makes the vertices of a cube: back, right, front, left, top, bottom, a triangle strip of four each.
- *  No GL context needed.
- *  @param scale        half an edge
- *  @param inset        non-zero keeps texture coordinates 4 texels away from the texture's edges
- *  @param textureSize  texels along an edge, > 0 with inset
- *  @param vertices     out, 24 times (x, y, z); to be freed with QexMemory_Free; null when memory runs out
- *  @param texCoords    out, 24 times (s, t), likewise */
-QEX_API void QexSky_NewVertices(float scale, int32_t inset, int32_t textureSize, float** vertices,
-                                float** texCoords);
-
-/** Creates buffer, textures (two of 256 x 256 with framebuffers), programs. What an earlier call made is
- *  released first. Sets the clear colour, depth writes, depth test (less or equal), culling and blending
- *  (source alpha over). The framebuffer that is bound stays bound.
- *  @param box  see QexSkyBox
- *  @return 0, also, with a line on standard output, when a program cannot be built, and then nothing is
- * drawn; -1, with a line, when the record, its sky texture or its camera is null, memory runs out, or a
- * framebuffer is incomplete, with what is made so far left to QexSkyBox_Release. */
-QEX_API int32_t QexSkyBox_Create(QexSkyBox* box);
-
-/** Draws scene, sky and water into the framebuffer that is bound, without clearing it. With water the
- *  viewport becomes that of the screen, and a line with the waves' figures goes to standard output. No water
- *  is drawn for an eye below it. Leaves the depth test (less or equal, with water) and culling on.
- *  Null for a parameter, and no sky box created, do nothing.
- *  @param context  its size is the screen's
- *  @param box      the record given to QexSkyBox_Create
- *  @param value    kept, not used */
-QEX_API void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, void* value);
-
-/** Deletes all that QexSkyBox_Create made; without it, nothing. */
-QEX_API void QexSkyBox_Release(void);
 
 /* ======================================================================================================
  * Engine: start and end

@@ -79,7 +79,7 @@ int main(int argc, char** argv) {
     box.waterNormalTexture = &normals;
     box.size = 4000;
     box.waterEnabled = 1;
-    box.waterColour = {0.2f, 0.3f, 0.4f, 1};
+    for (float& channel : box.waterColour) channel = 0.3f;
     box.centre = camera.eye;
     box.camera = &camera;
     box.waterHeight = 0;
@@ -87,7 +87,7 @@ int main(int argc, char** argv) {
     sample.Clear();
     int status = 1;
     if (QexSkyBox_Create(&box) == 0) {
-        QexSkyBox_Update(&sample.engine, &box, nullptr);
+        QexSkyBox_Update(&sample.engine, &box, 0);
         status = sample.Finish();
     }
     QexSkyBox_Release();

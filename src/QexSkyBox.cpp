@@ -35,8 +35,7 @@ struct Target {
     GLuint texture, framebuffer, depth;
 };
 
-bool s_Created;     // and all programs linked
-void* s_UserValue;  // of the last update; not used
+bool s_Drawable;  // all of it is there
 float *s_SkyVertices, *s_SkyTexCoords;
 GLuint s_SkyBuffer;
 Target s_Reflection, s_Surface;
@@ -243,7 +242,7 @@ void DrawSurface(const QexSkyBox& box) {
     QexMatrix inverse;
     QexMatrix_InverseEx(&inverse, &s_View);
     QEX_GL(glUniform3fv(g_QexWaterProgram.eyePosition, 1, &inverse.m[12]));
-    QEX_GL(glUniform4fv(g_QexWaterProgram.waterColour, 1, &box.waterColour.x));
+    QEX_GL(glUniform4fv(g_QexWaterProgram.waterColour, 1, box.waterColour));
     SetWaves();
     // Without a normal map the water is smooth.
     QEX_GL(glUniform1f(g_QexWaterProgram.waveDistortion, box.waterNormalTexture ? kWaveDistortion : 0));
@@ -269,6 +268,7 @@ extern "C" {
 
 void QexSky_NewVertices(float scale, int32_t inset, int32_t textureSize, float** vertices,
                         float** texCoords) {
+    if (!vertices || !texCoords) return;
     constexpr int count = kFaces * 4;
     const float a = inset ? 4.0f / static_cast<float>(textureSize) : 0, b = 1 - a;
     *vertices = static_cast<float*>(QexMemory_Alloc(kSkyBytes));
@@ -288,11 +288,14 @@ void QexSky_NewVertices(float scale, int32_t inset, int32_t textureSize, float**
 }
 
 int32_t QexSkyBox_Create(QexSkyBox* box) {
-    QexSkyBox_Release();
     if (!box || !box->skyTexture || !box->camera) {
-        QexError(QEX_TAG, "<QexSkyBox_Create> the record, its sky texture or its camera is null");
+        QexError(QEX_TAG, "<QexSkyBox_Create> a sky box without %s",
+                 !box           ? "a record"
+                 : !box->camera ? "a camera"
+                                : "a sky texture");
         return -1;
     }
+    QexSkyBox_Release();
     GLint framebuffer = 0;
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
     s_Plane = {0, 1, 0, box->waterHeight};
@@ -310,7 +313,7 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
     const bool linked = QexSkyBox_CreatePrograms();
     SetCamera(*box->camera);
-    QEX_GL(glClearColor(box->waterColour.x, box->waterColour.y, box->waterColour.z, 1));
+    QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
     const bool complete = AttachTarget(&s_Reflection) && AttachTarget(&s_Surface);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
     if (!complete) return -1;
@@ -318,13 +321,12 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     QexRenderer_SetBackFaceCulling(1);
     QexRenderer_SetZTestFunc(3);
     QexRenderer_SetAlphaBlendMode(1);
-    s_Created = linked;
+    s_Drawable = linked;
     return 0;
 }
 
-void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, void* value) {
-    if (!s_Created || !context || !box || !box->skyTexture || !box->camera) return;
-    s_UserValue = value;
+void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, int32_t) {
+    if (!s_Drawable || !context || !box || !box->skyTexture || !box->camera) return;
     const bool water = box->waterEnabled == 1;
     if (water) {
         DrawReflection(box);
@@ -337,7 +339,8 @@ void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, void* va
 }
 
 void QexSkyBox_Release(void) {
-    s_Created = false;
+    if (!s_SkyVertices) return;
+    s_Drawable = false;
     QexMemory_Free(s_SkyVertices);
     QexMemory_Free(s_SkyTexCoords);
     s_SkyVertices = s_SkyTexCoords = nullptr;
@@ -350,3 +353,7 @@ void QexSkyBox_Release(void) {
 }
 
 }  // extern "C"
+
+#if UINTPTR_MAX == UINT32_MAX
+static_assert(sizeof(QexSkyBox) == 72, "18 words");
+#endif

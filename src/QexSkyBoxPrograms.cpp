@@ -1,6 +1,6 @@
 #include "QexSkyBoxPrograms.h"
 
-#include "Qex.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexSkyBox"
 
@@ -110,7 +110,6 @@ const char* const kWaterDefines[] = {"ENABLE_REFRACTION", "ENABLE_FRESNEL", "ENA
 
 // The shader objects, a vertex and a fragment shader each. The plain water pair is not linked.
 enum { kPlainWater, kSky, kTex2D, kPlaneTex, kWater, kPairs };
-constexpr int kShaders = 2 * kPairs;
 const struct {
     const char *vertex, *fragment;
     uint32_t defines;
@@ -120,7 +119,9 @@ const struct {
                       {kPlaneTexVertexSource, kPlaneTexFragmentSource, 0},
                       {kWaterVertexSource, kWaterFragmentSource, 3}};
 
-GLuint s_Shaders[kShaders];
+struct {
+    GLuint vertex, fragment;
+} s_Shaders[kPairs];
 
 GLint Location(GLuint program, const char* name) {
     GLint location;
@@ -132,66 +133,52 @@ void SetSampler(GLuint program, const char* name, GLint unit) {
     QEX_GL(glUniform1i(Location(program, name), unit));
 }
 
-void CompileShaders() {
-    for (int i = 0; i < kPairs; ++i) {
-        QexShader_CreateFromMemEx(&s_Shaders[2 * i], kSources[i].vertex, GL_VERTEX_SHADER, kWaterDefines,
-                                  kSources[i].defines);
-        QexShader_CreateFromMemEx(&s_Shaders[2 * i + 1], kSources[i].fragment, GL_FRAGMENT_SHADER,
-                                  kWaterDefines, kSources[i].defines);
-    }
-}
-
-// Links a pair; says `message` with the log when that fails.
-bool Link(GLuint* program, int pair, int32_t attributeCount, const char* message) {
-    char log[QEX_SHADER_LOG_SIZE];
-    if (QexShader_CreateProgram(program, s_Shaders[2 * pair], s_Shaders[2 * pair + 1], kAttributes,
-                                attributeCount, log) == 0)
-        return true;
-    QexSystem_Printf(message, log);
-    return false;
-}
-
-bool LinkWater() {
-    if (!Link(&g_QexWaterProgram.program, kWater, 1,
-              "ERROR:< LoadWaterShader> link program failed because %s!\n"))
-        return false;
+void SetUpWater(GLuint program) {
     static const char* const samplers[] = {"NormalTex", "ReflectionTex", "RefractionTex",
                                            "NormalisationCubeMap"};
-    for (GLint unit = 0; unit < 4; ++unit) SetSampler(g_QexWaterProgram.program, samplers[unit], unit);
+    for (GLint unit = 0; unit < 4; ++unit) SetSampler(program, samplers[unit], unit);
+    QexWaterProgram& w = g_QexWaterProgram;
     const struct {
         GLint* location;
         const char* name;
-    } uniforms[] = {{&g_QexWaterProgram.modelViewMatrix, "ModelViewMatrix"},
-                    {&g_QexWaterProgram.mvpMatrix, "MVPMatrix"},
-                    {&g_QexWaterProgram.eyePosition, "EyePosition"},
-                    {&g_QexWaterProgram.bumpTranslation[0], "BumpTranslation0"},
-                    {&g_QexWaterProgram.bumpScale[0], "BumpScale0"},
-                    {&g_QexWaterProgram.bumpTranslation[1], "BumpTranslation1"},
-                    {&g_QexWaterProgram.bumpScale[1], "BumpScale1"},
-                    {&g_QexWaterProgram.waterColour, "WaterColour"},
-                    {&g_QexWaterProgram.waveDistortion, "WaveDistortion"},
-                    {&g_QexWaterProgram.rcpWindowSize, "RcpWindowSize"}};
-    for (const auto& uniform : uniforms)
-        *uniform.location = Location(g_QexWaterProgram.program, uniform.name);
-    return true;
+    } uniforms[] = {{&w.modelViewMatrix, "ModelViewMatrix"}, {&w.mvpMatrix, "MVPMatrix"},
+                    {&w.eyePosition, "EyePosition"},         {&w.bumpTranslation[0], "BumpTranslation0"},
+                    {&w.bumpScale[0], "BumpScale0"},         {&w.bumpTranslation[1], "BumpTranslation1"},
+                    {&w.bumpScale[1], "BumpScale1"},         {&w.waterColour, "WaterColour"},
+                    {&w.waveDistortion, "WaveDistortion"},   {&w.rcpWindowSize, "RcpWindowSize"}};
+    for (const auto& uniform : uniforms) *uniform.location = Location(program, uniform.name);
 }
 
-// Links one program after the other, up to the first that fails.
-bool LinkPrograms() {
-    const char* const message = "ERROR:<LoadShaders> %s\n";
-    if (!LinkWater() || !Link(&g_QexSkyProgram.program, kSky, 1, message)) return false;
-    SetSampler(g_QexSkyProgram.program, "CubeMap", 0);
-    g_QexSkyProgram.mvpMatrix = Location(g_QexSkyProgram.program, "MVPMatrix");
-    g_QexSkyProgram.modelMatrix = Location(g_QexSkyProgram.program, "ModelMatrix");
-    if (!Link(&m_Tex2DShader.program, kTex2D, 3, message)) return false;
-    SetSampler(m_Tex2DShader.program, "Texture", 0);
-    m_Tex2DShader.mvpMatrixLoc = Location(m_Tex2DShader.program, "MVPMatrix");
-    if (!Link(&m_PlaneTexShader.program, kPlaneTex, 1, message)) return false;
-    SetSampler(m_PlaneTexShader.program, "Texture", 0);
-    m_PlaneTexShader.mvpMatrixLoc = Location(m_PlaneTexShader.program, "MVPMatrix");
-    m_PlaneTexShader.rcpWindowSizeLoc = Location(m_PlaneTexShader.program, "RcpWindowSize");
-    return true;
+void SetUpSky(GLuint program) {
+    SetSampler(program, "CubeMap", 0);
+    g_QexSkyProgram.mvpMatrix = Location(program, "MVPMatrix");
+    g_QexSkyProgram.modelMatrix = Location(program, "ModelMatrix");
 }
+
+void SetUpTex2D(GLuint program) {
+    SetSampler(program, "Texture", 0);
+    m_Tex2DShader.mvpMatrixLoc = Location(program, "MVPMatrix");
+}
+
+void SetUpPlaneTex(GLuint program) {
+    SetSampler(program, "Texture", 0);
+    m_PlaneTexShader.mvpMatrixLoc = Location(program, "MVPMatrix");
+    m_PlaneTexShader.rcpWindowSizeLoc = Location(program, "RcpWindowSize");
+}
+
+// Programs in the order in which they are linked.
+const char kWaterError[] = "ERROR:< LoadWaterShader> link program failed because %s!\n";
+const char kError[] = "ERROR:<LoadShaders> %s\n";
+const struct {
+    GLuint* program;
+    int pair;
+    int32_t attributeCount;
+    void (*setUp)(GLuint program);
+    const char* error;
+} kPrograms[] = {{&g_QexWaterProgram.program, kWater, 1, SetUpWater, kWaterError},
+                 {&g_QexSkyProgram.program, kSky, 1, SetUpSky, kError},
+                 {&m_Tex2DShader.program, kTex2D, 3, SetUpTex2D, kError},
+                 {&m_PlaneTexShader.program, kPlaneTex, 1, SetUpPlaneTex, kError}};
 
 }  // namespace
 
@@ -200,26 +187,34 @@ QexWaterProgram g_QexWaterProgram;
 
 extern "C" {
 
-QexTex2DProgram m_Tex2DShader = {0, -1};
-QexPlaneTexProgram m_PlaneTexShader = {0, -1, -1};
+QexTex2DShader m_Tex2DShader;
+QexPlaneTexShader m_PlaneTexShader;
 
 }  // extern "C"
 
 bool QexSkyBox_CreatePrograms() {
-    CompileShaders();
-    return LinkPrograms();
+    for (int i = 0; i < kPairs; ++i) {
+        const auto& source = kSources[i];
+        QexShader_CreateFromMemEx(&s_Shaders[i].vertex, source.vertex, GL_VERTEX_SHADER, kWaterDefines,
+                                  source.defines);
+        QexShader_CreateFromMemEx(&s_Shaders[i].fragment, source.fragment, GL_FRAGMENT_SHADER, kWaterDefines,
+                                  source.defines);
+    }
+    for (const auto& row : kPrograms) {
+        char log[QEX_SHADER_LOG_SIZE];
+        if (QexShader_CreateProgram(row.program, s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
+                                    kAttributes, row.attributeCount, log) != 0) {
+            QexSystem_Printf(row.error, log);
+            return false;
+        }
+        row.setUp(*row.program);
+    }
+    return true;
 }
 
 void QexSkyBox_ReleasePrograms() {
-    uint32_t* const programs[] = {&g_QexWaterProgram.program, &g_QexSkyProgram.program,
-                                  &m_Tex2DShader.program, &m_PlaneTexShader.program};
-    QexRenderState_UseProgram(0);
-    for (uint32_t* program : programs) {
-        if (*program) QEX_GL(glDeleteProgram(*program));
-        *program = 0;
-    }
-    for (GLuint& shader : s_Shaders) {
-        if (shader) QEX_GL(glDeleteShader(shader));
-        shader = 0;
-    }
+    GLuint none = 0;
+    for (const auto& row : kPrograms)
+        QexShader_DeleteProgram(row.program, &s_Shaders[row.pair].vertex, &s_Shaders[row.pair].fragment);
+    QexShader_DeleteProgram(&none, &s_Shaders[kPlainWater].vertex, &s_Shaders[kPlainWater].fragment);
 }
