@@ -30,15 +30,6 @@ static std::array<uint8_t, 4> PaintSky(const pod::Vec3& direction) {
     return colour;
 }
 
-// Normals of waves in several directions, y up in green; repeating.
-static std::array<uint8_t, 4> PaintWaves(float s, float t) {
-    constexpr float kTurn = 6.2831853f;
-    const float a = std::sin(kTurn * (23 * s + 5 * t)), b = std::sin(kTurn * (7 * s - 19 * t));
-    const float c = std::sin(kTurn * (11 * s + 13 * t));
-    return {static_cast<uint8_t>(128 + 18 * a + 12 * c), 255, static_cast<uint8_t>(128 + 18 * b + 12 * c),
-            255};
-}
-
 int main(int argc, char** argv) {
     Sample sample(argc, argv);
     if (!sample.Started()) return 1;
@@ -62,12 +53,7 @@ int main(int argc, char** argv) {
     QexTexture_SetFilter(&sky, QEX_FILTER_LINEAR);
     QexTexture_SetWrapping(&sky, QEX_WRAP_CLAMP);
     constexpr int kWaves = 256;
-    std::vector<uint8_t> waves;
-    for (int i = 0; i < kWaves * kWaves; ++i) {
-        const auto texel =
-            PaintWaves(static_cast<float>(i % kWaves) / kWaves, static_cast<float>(i / kWaves) / kWaves);
-        waves.insert(waves.end(), texel.begin(), texel.end());
-    }
+    std::vector<uint8_t> waves = scenes::Waves(kWaves);
     QexTexture normals;
     QexTexture_CreateFromPixels(&normals, kWaves, kWaves, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_LINEAR,
                                 QEX_WRAP_REPEAT, waves.data());

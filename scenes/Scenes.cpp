@@ -271,6 +271,26 @@ pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint) {
     return image;
 }
 
+std::vector<uint8_t> Waves(uint32_t size) {
+    // Whole waves along s and t, so that they repeat.
+    constexpr struct {
+        float s, t, across, along;
+    } kWaves[] = {{23, 5, 18, 0}, {7, -19, 0, 18}, {11, 13, 12, 12}};
+    std::vector<uint8_t> pixels;
+    for (uint32_t i = 0; i < size * size; ++i) {
+        const float s = static_cast<float>(i % size) / static_cast<float>(size);
+        const float t = static_cast<float>(i / size) / static_cast<float>(size);
+        float x = 128, z = 128;
+        for (const auto& wave : kWaves) {
+            const float slope = std::sin(6.2831853f * (wave.s * s + wave.t * t));
+            x += wave.across * slope;
+            z += wave.along * slope;
+        }
+        pixels.insert(pixels.end(), {static_cast<uint8_t>(x), 255, static_cast<uint8_t>(z), 255});
+    }
+    return pixels;
+}
+
 pod::Scene Grid(uint32_t count) {
     pod::Scene scene;
     scene.meshes.push_back(pod::BuildMesh(Cube()));

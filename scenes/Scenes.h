@@ -37,6 +37,9 @@ pod::Scene Boat();
 using SkyPaint = std::function<std::array<uint8_t, 4>(const pod::Vec3& direction)>;
 pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint);
 
+// Normals of waves, size x size pixels (RGBA) to be repeated: across in red and blue, up in green.
+std::vector<uint8_t> Waves(uint32_t size);
+
 // Two mesh nodes: "floor", 8 across, and "worm", a tube of `bones` bones that stands on it and bends with
 // them over `frames` frames; frame 0 is its bind pose. Its vertices follow two bones each and name them as
 // nodes: it has no batches.

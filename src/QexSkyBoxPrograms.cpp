@@ -47,14 +47,16 @@ void main() {
 }
 )";
 
+// Half floats would put far corners behind the far plane. All corners are as far from the middle, so the
+// length of the direction does not matter, but half floats hold it.
 const char* const kSkyVertexSource = R"(
-attribute mediump vec3 inVertex;
-uniform mediump mat4 MVPMatrix;
+attribute highp vec3 inVertex;
+uniform highp mat4 MVPMatrix;
 uniform mediump mat4 ModelMatrix;
 uniform mediump mat4 ModelViewMatrix;
 varying mediump vec3 EyeDir;
 void main() {
-    EyeDir = -inVertex;
+    EyeDir = -normalize(inVertex);
     gl_Position = MVPMatrix * vec4(inVertex, 1.0);
 }
 )";

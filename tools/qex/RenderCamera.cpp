@@ -71,8 +71,7 @@ void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, floa
         distance = std::max({distance, Along(p, back) + std::fabs(Along(p, right) - cx) * kMargin / tanX,
                              Along(p, back) + std::fabs(Along(p, up) - cy) * kMargin / tanY});
     const float depth = std::max(distance - bounds.low.z, 1e-4f);
-    const float size = std::max(
-        {bounds.high.x - bounds.low.x, bounds.high.y - bounds.low.y, bounds.high.z - bounds.low.z, 1e-4f});
+    const float size = std::max(bounds.LongestEdge(), 1e-4f);
     distance = std::max(distance, bounds.high.z + size * 0.05f);
     const float zNear = std::max((distance - bounds.high.z) * 0.5f, depth * 1e-3f);
     const QexVec3 eye = Combine(right, up, back, cx, cy, distance);

@@ -19,6 +19,7 @@
 #include "ImageFile.h"
 #include "RenderDiagnosis.h"
 #include "RenderFloor.h"
+#include "RenderSky.h"
 #include "RenderTextures.h"
 #include "SceneBounds.h"
 #include "TextureFiles.h"
@@ -45,6 +46,7 @@ class Renderer {
     bool Start();
     bool Load();
     void Frame();
+    float SceneSize() const;
     void PlaceCamera(float turned);
     void Draw(double frame, float turned);
     void Clear(uint32_t colour);
@@ -72,6 +74,7 @@ class Renderer {
     QexCamera camera_ = {};
     SceneShaders shaders_;
     std::unique_ptr<Floor> floor_;
+    std::unique_ptr<Sky> sky_;
     std::vector<QexVec3> points_;  // that the automatic camera frames
     std::vector<TransparentSPODNodeInfo> transparent_;
     double loadTime_ = 0;
@@ -82,6 +85,7 @@ Renderer::~Renderer() {
     EngineOutput quiet;
     shaders_.Release();
     floor_.reset();
+    sky_.reset();
     ReleaseNormalMaps();
     if (modelLoaded_) QexModel_Unload(&model_);
     if (engineStarted_ && options_.effects.depthOfField) QexPostProcessing_Finalize();
@@ -160,11 +164,19 @@ void Renderer::Frame() {
         for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
             CollectPoints(&model_.scene, i, share, &points_);
     }
-    if (!options_.effects.mirror) return;
+    const std::optional<float> mirror =
+        options_.effects.mirror ? options_.effects.mirror : options_.effects.water;
+    if (!mirror) return;
     for (size_t i = 0, seen = points_.size(); i < seen; ++i) {
         const QexVec3 p = points_[i];
-        points_.push_back({p.x, 2 * *options_.effects.mirror - p.y, p.z});
+        points_.push_back({p.x, 2 * *mirror - p.y, p.z});
     }
+}
+
+float Renderer::SceneSize() const {
+    const Bounds bounds = BoundsOf(points_);
+    const float edge = bounds.empty ? 0 : bounds.LongestEdge();
+    return edge > 0 ? edge : 1;
 }
 
 void Renderer::DrawText() {
@@ -199,7 +211,10 @@ void Renderer::Draw(double frame, float turned) {
         return;
     }
     Clear(options_.background);
-    if (options_.effects.stereo)
+    if (sky_)
+        sky_->Draw(&engine_, camera_, options_.effects.water, SceneSize(),
+                   [this](const QexCamera& camera) { DrawScene(camera); });
+    else if (options_.effects.stereo)
         DrawBothEyes();
     else
         DrawScene(camera_);
@@ -328,6 +343,15 @@ int Renderer::Run() {
         EngineOutput quiet;
         floor_ = std::make_unique<Floor>();
         floor_->Create(points_, *options_.effects.floor, options_.effects.mirror.has_value());
+    }
+    const size_t skyPictures = options_.effects.sky.size();
+    if (skyPictures > 1 && skyPictures != 6) return Fail("--sky: expected one picture, or six", 2);
+    if (skyPictures) {
+        EngineOutput quiet;
+        sky_ = std::make_unique<Sky>();
+        const bool loaded = sky_->Load(options_.effects.sky, &problem);
+        quiet.Stop();
+        if (!loaded) return Fail(problem, 1);
     }
     const std::vector<double> frames = Frames();
     const bool numbered = options_.sequence || options_.turn;

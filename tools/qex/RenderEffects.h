@@ -32,7 +32,9 @@ struct EffectOptions {
     uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
     float separation = 0;
     std::optional<DepthOfField> depthOfField;
-    bool fullBlur = false;  // depth of field blurs at full resolution, not at half
+    std::vector<std::string> sky;  // one picture or six, see Sky
+    std::optional<float> water;    // its height
+    bool fullBlur = false;         // depth of field blurs at full resolution, not at half
 };
 
 // The names of the shader modules, ", " between them.

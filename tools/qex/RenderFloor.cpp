@@ -37,8 +37,7 @@ Floor::~Floor() {
 void Floor::Create(const std::vector<QexVec3>& points, float height, bool mirrors) {
     const Bounds bounds = BoundsOf(points);
     if (bounds.empty) return;
-    const float size = kSpread * std::max({bounds.high.x - bounds.low.x, bounds.high.y - bounds.low.y,
-                                           bounds.high.z - bounds.low.z});
+    const float size = kSpread * bounds.LongestEdge();
     pod::MeshArrays plane = scenes::Floor(size);
     for (pod::Vec2& uv : plane.uvs)
         for (float& t : uv) t *= kSquares / 2 / size;

@@ -98,6 +98,10 @@ void CollectPoints(QexPODModel* scene, uint32_t meshNode, size_t limit, std::vec
     }
 }
 
+float Bounds::LongestEdge() const {
+    return std::max({high.x - low.x, high.y - low.y, high.z - low.z});
+}
+
 Bounds BoundsOf(const std::vector<QexVec3>& points) {
     Bounds bounds;
     for (const QexVec3& point : points) bounds.Add(point);

@@ -10,6 +10,7 @@ struct Bounds {
     bool empty = true;
 
     void Add(const QexVec3& point);
+    float LongestEdge() const;
 };
 
 // One vertex's value of an element that the mesh has.

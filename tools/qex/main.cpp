@@ -127,6 +127,11 @@ std::string ParseStereo(const std::string& text, RenderOptions* options) {
     return "";
 }
 
+std::string ParseSky(const std::string& text, RenderOptions* options) {
+    options->effects.sky.push_back(text);
+    return "";
+}
+
 std::string ParseDepthOfField(const std::string& text, RenderOptions* options) {
     DepthOfField dof = {};
     int consumed = 0, samples = 9;
@@ -166,17 +171,18 @@ CLI::Option* AddParsed(CLI::App* app, const std::string& name, const std::string
 }
 
 // The same for an option that may be given several times.
-void AddRepeated(CLI::App* app, const std::string& name, const std::string& help, RenderOptions* options,
-                 std::string (*parse)(const std::string&, RenderOptions*)) {
-    app->add_option_function<std::vector<std::string>>(
-           name,
-           [=](const std::vector<std::string>& texts) {
-               for (const std::string& text : texts) {
-                   const std::string problem = parse(text, options);
-                   if (!problem.empty()) throw CLI::ValidationError(name, problem);
-               }
-           },
-           help)
+CLI::Option* AddRepeated(CLI::App* app, const std::string& name, const std::string& help,
+                         RenderOptions* options, std::string (*parse)(const std::string&, RenderOptions*)) {
+    return app
+        ->add_option_function<std::vector<std::string>>(
+            name,
+            [=](const std::vector<std::string>& texts) {
+                for (const std::string& text : texts) {
+                    const std::string problem = parse(text, options);
+                    if (!problem.empty()) throw CLI::ValidationError(name, problem);
+                }
+            },
+            help)
         ->type_size(1)
         ->expected(1, 1000)
         ->allow_extra_args(false);
@@ -205,8 +211,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     AddParsed(app, "--shader", "module to draw with: " + ShaderNames(), options, ParseShader);
     AddRepeated(app, "--light", "X,Y,Z[,RRGGBB], a point light instead of the scene's; up to 4", options,
                 ParseLight);
-    app->add_flag("--shadow", options->effects.shadow,
-                  "nodes throw shadows on each other (with --shader shadow)");
+    CLI::Option* shadow = app->add_flag("--shadow", options->effects.shadow,
+                                        "nodes throw shadows on each other (with --shader shadow)");
     CLI::Option* mirror = AddParsed(app, "--mirror", "Y, the height of a mirror under the scene", options,
                                     ParseHeight<&EffectOptions::mirror>);
     AddParsed(app, "--floor", "Y, the height of a floor; it takes shadows and mirrors", options,
@@ -225,6 +231,16 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     dof->excludes(mirror)->excludes(mirrorNode)->excludes(stereo);
     app->add_flag("--dof-full", options->effects.fullBlur, "blur at full resolution instead of half")
         ->needs(dof);
+    CLI::Option* sky = AddRepeated(app, "--sky",
+                                   "picture of a cross of 4x3 or 3x4 squares, its middle towards -Z; or six "
+                                   "times a square: towards +X, -X, +Y, -Y, +Z, -Z",
+                                   options, ParseSky);
+    sky->excludes(mirror)->excludes(mirrorNode)->excludes(stereo)->excludes(dof);
+    // The shadow map's end sets the viewport of the screen.
+    AddParsed(app, "--water", "Y, the height of still water, with --sky", options,
+              ParseHeight<&EffectOptions::water>)
+        ->needs(sky)
+        ->excludes(shadow);
     AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
     AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
