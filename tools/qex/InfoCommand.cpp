@@ -30,6 +30,8 @@ bool Describe(const std::string& path, Json* document, std::string* error) {
         return ReadFileBytes(path, SIZE_MAX, &bytes, error) && DescribeTga(bytes, document, error);
     if (Extension(path) == "pod") return DescribeScene(path, document, error);
     *error = std::string("is not ") + kReadable;
+    ReadFileBytes(path, QEX_EMITTER_FILE_SIZE + 1, &bytes, error);
+    if (bytes.size() == QEX_EMITTER_FILE_SIZE) *error += "; if it is an emitter file, qex emitter shows it";
     return false;
 }
 

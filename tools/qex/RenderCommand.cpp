@@ -51,6 +51,9 @@ class Renderer {
     void Draw(double frame, float turned);
     void Clear(uint32_t colour);
     void DrawScene(const QexCamera& camera);
+    void DrawOpaque(const QexCamera& camera);
+    void DrawBlended(const QexCamera& camera);
+    bool LoadSurroundings(std::string* problem);
     void DrawDepth(QexShaderModule* module, QexShaderModule* skinned);
     void DrawBothEyes();
     bool Save(const std::string& path);
@@ -75,8 +78,10 @@ class Renderer {
     SceneShaders shaders_;
     std::unique_ptr<Floor> floor_;
     std::unique_ptr<Sky> sky_;
+    std::unique_ptr<Emitters> emitters_;
     std::vector<QexVec3> points_;  // that the automatic camera frames
     std::vector<TransparentSPODNodeInfo> transparent_;
+    uint32_t transparentCount_ = 0;
     double loadTime_ = 0;
     double drawTime_ = 0;
 };
@@ -86,6 +91,7 @@ Renderer::~Renderer() {
     shaders_.Release();
     floor_.reset();
     sky_.reset();
+    emitters_.reset();
     ReleaseNormalMaps();
     if (modelLoaded_) QexModel_Unload(&model_);
     if (engineStarted_ && options_.effects.depthOfField) QexPostProcessing_Finalize();
@@ -212,8 +218,10 @@ void Renderer::Draw(double frame, float turned) {
     }
     Clear(options_.background);
     if (sky_)
-        sky_->Draw(&engine_, camera_, options_.effects.water, SceneSize(),
-                   [this](const QexCamera& camera) { DrawScene(camera); });
+        sky_->Draw(
+            &engine_, camera_, options_.effects.water, SceneSize(),
+            [this](const QexCamera& camera) { DrawOpaque(camera); },
+            [this](const QexCamera& camera) { DrawBlended(camera); });
     else if (options_.effects.stereo)
         DrawBothEyes();
     else
@@ -259,6 +267,12 @@ void Renderer::DrawBothEyes() {
 }
 
 void Renderer::DrawScene(const QexCamera& camera) {
+    DrawOpaque(camera);
+    DrawBlended(camera);
+}
+
+void Renderer::DrawOpaque(const QexCamera& camera) {
+    transparentCount_ = 0;
     const QexLightSet lights = ChooseLights(&model_, options_.effects, camera);
     QexRenderer_SetZTestFunc(3);
     QexRenderer_SetBackFaceCulling(0);
@@ -274,19 +288,23 @@ void Renderer::DrawScene(const QexCamera& camera) {
         return;
     }
     if (floor) QexModel_RenderWithCamera(floor, &lights, &camera, nullptr, 0);
-    uint32_t count = 0;
     for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
         QexModel_RenderWithCameraEx(&model_, &lights, &camera, nullptr, pass, QEX_RENDER_OPAQUE,
-                                    transparent_.data(), &count);
+                                    transparent_.data(), &transparentCount_);
+}
+
+// Draws what was put off, and the particles.
+void Renderer::DrawBlended(const QexCamera& camera) {
     // The far sides of transparent bodies first, then the near ones.
     QexRenderer_SetZWrite(0);
     for (int32_t culled : {2, 1}) {
         QexRenderer_SetBackFaceCulling(culled);
         for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-            QexModel_RenderAlphaBlendingNodes(transparent_.data(), count, pass);
+            QexModel_RenderAlphaBlendingNodes(transparent_.data(), transparentCount_, pass);
     }
     QexRenderer_SetBackFaceCulling(0);
     QexRenderer_SetZWrite(1);
+    if (emitters_) emitters_->Draw(camera);
 }
 
 bool Renderer::Save(const std::string& path) {
@@ -325,6 +343,23 @@ void Renderer::ReportStats(size_t pictures) const {
     printf("renderer     %s, %s\n", context_->Renderer().c_str(), context_->Version().c_str());
 }
 
+// Floor, sky and emitters. False, and what is wrong, when one of their files cannot be used.
+bool Renderer::LoadSurroundings(std::string* problem) {
+    const EffectOptions& effects = options_.effects;
+    EngineOutput quiet;
+    if (effects.floor) {
+        floor_ = std::make_unique<Floor>();
+        floor_->Create(points_, *effects.floor, effects.mirror.has_value());
+    }
+    if (!effects.sky.empty()) {
+        sky_ = std::make_unique<Sky>();
+        if (!sky_->Load(effects.sky, problem)) return false;
+    }
+    if (effects.emitters.emitters.empty()) return true;
+    emitters_ = std::make_unique<Emitters>();
+    return emitters_->Load(effects.emitters, problem);
+}
+
 int Renderer::Run() {
     if (!Start() || !Load()) return 1;
     if (options_.camera > 0 && !options_.autoCamera &&
@@ -339,20 +374,9 @@ int Renderer::Run() {
     shaders_.Use(&model_, options_.effects.shader);
     transparent_.resize(model_.scene.meshNodeCount + size_t{1});
     Frame();
-    if (options_.effects.floor) {
-        EngineOutput quiet;
-        floor_ = std::make_unique<Floor>();
-        floor_->Create(points_, *options_.effects.floor, options_.effects.mirror.has_value());
-    }
     const size_t skyPictures = options_.effects.sky.size();
     if (skyPictures > 1 && skyPictures != 6) return Fail("--sky: expected one picture, or six", 2);
-    if (skyPictures) {
-        EngineOutput quiet;
-        sky_ = std::make_unique<Sky>();
-        const bool loaded = sky_->Load(options_.effects.sky, &problem);
-        quiet.Stop();
-        if (!loaded) return Fail(problem, 1);
-    }
+    if (!LoadSurroundings(&problem)) return Fail(problem, 1);
     const std::vector<double> frames = Frames();
     const bool numbered = options_.sequence || options_.turn;
     gltapResetCounts();
@@ -360,6 +384,9 @@ int Renderer::Run() {
         const auto start = Clock::now();
         {
             EngineOutput quiet;
+            if (emitters_ && options_.sequence && i > 0)
+                emitters_->Run(static_cast<float>(options_.step) /
+                               static_cast<float>(std::max(model_.scene.framesPerSecond, 1u)));
             Draw(frames[i],
                  options_.turn ? 360.0f * static_cast<float>(i) / static_cast<float>(options_.turn) : 0);
             const std::string reason =

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "Qex.h"
+#include "RenderEmitters.h"
 
 struct NodeChange {
     std::string node;
@@ -34,7 +35,8 @@ struct EffectOptions {
     std::optional<DepthOfField> depthOfField;
     std::vector<std::string> sky;  // one picture or six, see Sky
     std::optional<float> water;    // its height
-    bool fullBlur = false;         // depth of field blurs at full resolution, not at half
+    EmitterScene emitters;
+    bool fullBlur = false;  // depth of field blurs at full resolution, not at half
 };
 
 // The names of the shader modules, ", " between them.

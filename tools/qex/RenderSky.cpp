@@ -70,13 +70,12 @@ bool Arrange(const std::vector<Image>& images, Square squares[6], std::string* p
 }  // namespace
 
 void Sky::CallDrawScene(QexSkyBox* record, const QexMatrix* view, const QexMatrix* projection) {
-    const Box& box = *static_cast<Box*>(record);
-    QexCamera camera = *box.sceneCamera;
+    Box& box = *static_cast<Box*>(record);
     QexMatrix scale;
     QexMatrix_Scale(&scale, box.scale, box.scale, box.scale);
-    QexMatrix_Multiply(&camera.viewMatrix, view, &scale);
-    camera.projectionMatrix = *projection;
-    (*box.draw)(camera);
+    QexMatrix_Multiply(&box.sceneCamera.viewMatrix, view, &scale);
+    box.sceneCamera.projectionMatrix = *projection;
+    (*box.draw)(box.sceneCamera);
 }
 
 Sky::~Sky() {
@@ -121,7 +120,7 @@ bool Sky::Load(const std::vector<std::string>& files, std::string* problem) {
 }
 
 void Sky::Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional<float> waterHeight,
-               float sceneSize, const DrawScene& drawScene) {
+               float sceneSize, const DrawScene& drawOpaque, const DrawScene& drawBlended) {
     // What belongs to the first picture stays, so that the sky does.
     if (!created_) {
         box_.scale = kSceneSize / sceneSize;
@@ -136,8 +135,8 @@ void Sky::Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional
     const float zNear = above > 0 ? std::min(camera.nearPlane, above / 2) : camera.nearPlane;
     QexCamera_Project(&box_.largeCamera, camera.fov, camera.aspect, zNear * box_.scale, box_.size);
     box_.centre = eye;
-    box_.sceneCamera = &camera;
-    box_.draw = &drawScene;
+    box_.sceneCamera = camera;
+    box_.draw = &drawOpaque;
     if (!created_) {
         GLfloat clear[4];
         glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
@@ -152,4 +151,5 @@ void Sky::Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional
         created_ = QexSkyBox_Create(&box_) == 0;
     }
     QexSkyBox_Update(engine, &box_, 0);
+    drawBlended(box_.sceneCamera);
 }

@@ -21,18 +21,19 @@ class Sky {
     // wrong, when they are not that.
     bool Load(const std::vector<std::string>& files, std::string* problem);
 
-    // Draws a scene of about that size within the sky and, with a height, over the water: `drawScene` is
-    // called with the camera, and, for the reflection, with another one of its matrices.
+    // Draws a scene of about that size within the sky and, with a height, over the water. The camera is given
+    // the matrices of the sky's units: `drawOpaque` is called with it before the sky is drawn, and before,
+    // for the reflection, with a mirrored one; `drawBlended` at the end.
     using DrawScene = std::function<void(const QexCamera& camera)>;
     void Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional<float> waterHeight,
-              float sceneSize, const DrawScene& drawScene);
+              float sceneSize, const DrawScene& drawOpaque, const DrawScene& drawBlended);
 
   private:
     // The record with what its callback needs.
     struct Box : QexSkyBox {
         QexCamera largeCamera;  // the camera in the sky's units
-        const QexCamera* sceneCamera;
-        float scale;  // of them to the scene's
+        QexCamera sceneCamera;  // with the matrices of the last drawing
+        float scale;            // of them to the scene's
         const DrawScene* draw;
     };
     static void CallDrawScene(QexSkyBox* record, const QexMatrix* view, const QexMatrix* projection);

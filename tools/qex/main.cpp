@@ -6,6 +6,7 @@
 #include <CLI/CLI.hpp>
 
 #include "ConvertCommand.h"
+#include "EmitterCommand.h"
 #include "InfoCommand.h"
 #include "RenderCommand.h"
 #include "SheetCommand.h"
@@ -241,6 +242,18 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
               ParseHeight<&EffectOptions::water>)
         ->needs(sky)
         ->excludes(shadow);
+    const auto addFiles = [app](const char* name, std::vector<std::string>* files, const char* help) {
+        return app->add_option(name, *files, help)->type_size(1)->expected(1, 1000)->allow_extra_args(false);
+    };
+    EmitterScene& emitters = options->effects.emitters;
+    CLI::Option* emitter =
+        addFiles("--emitter", &emitters.emitters, "particles of an emitter file or a description of one");
+    addFiles("--emitter-texture", &emitters.textures,
+             "picture of a frame of their animations, in order (a soft spot); 1 unit a pixel at scale 1")
+        ->needs(emitter);
+    app->add_option("--emitter-time", emitters.time, "seconds that they have run, 60 updates each (3)")
+        ->check(CLI::Range(0.0, 3600.0))
+        ->needs(emitter);
     AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
     AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
@@ -290,6 +303,22 @@ void SetUpTexture(CLI::App* app, TextureOptions* options) {
         "texture to texture blocks and mipmaps are made anew.");
 }
 
+void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
+    app->add_option("FILE", options->input,
+                    "emitter file, or description as text or JSON (the engine's defaults)");
+    app->add_option("-o,--output", options->output,
+                    "emitter file, or, ending in .txt or .json, description (text on standard output)");
+    app->add_option("--set", options->settings, "FIELD=VALUE, values with commas between them, rows with ';'")
+        ->type_size(1)
+        ->expected(1, 1000)
+        ->allow_extra_args(false);
+    app->add_flag("--json", options->json, "describe as JSON");
+    app->footer(
+        "A description names the fields that differ from the defaults, one a line; what this command shows "
+        "is\n"
+        "one, with all fields and their units. Particles that live in an emitter file are not taken over.");
+}
+
 // The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
 // word or option there is named instead.
 int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, char** argv) {
@@ -299,7 +328,7 @@ int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, cha
     text = text.substr(0, text.find('\n'));
     if (verb.empty() && argc > 1)
         text = (argv[1][0] == '-' ? "unknown option '" : "unknown verb '") + std::string(argv[1]) +
-               "'; expected info, render, convert, texture or sheet";
+               "'; expected info, render, convert, texture, emitter or sheet";
     fprintf(stderr, "qex%s: %s\n", verb.c_str(), text.c_str());
     return 2;
 }
@@ -314,6 +343,7 @@ int main(int argc, char** argv) {
     RenderOptions render;
     ConvertOptions convert;
     TextureOptions texture;
+    EmitterOptions emitter;
     SheetOptions sheet;
     CLI::App* infoApp = app.add_subcommand("info", "what is in a POD, PVR, KTX or TGA file");
     infoApp->add_option("FILE", info.input, "file to look into")->required();
@@ -324,6 +354,8 @@ int main(int argc, char** argv) {
     SetUpConvert(convertApp, &convert);
     CLI::App* textureApp = app.add_subcommand("texture", "make a texture of a picture, or a picture of one");
     SetUpTexture(textureApp, &texture);
+    CLI::App* emitterApp = app.add_subcommand("emitter", "show, edit or write a particle emitter");
+    SetUpEmitter(emitterApp, &emitter);
     CLI::App* sheetApp = app.add_subcommand("sheet", "put several pictures into one");
     SetUpSheet(sheetApp, &sheet);
     try {
@@ -335,6 +367,7 @@ int main(int argc, char** argv) {
     if (infoApp->parsed()) return RunInfo(info);
     if (renderApp->parsed()) return RunRender(render);
     if (textureApp->parsed()) return RunTexture(texture);
+    if (emitterApp->parsed()) return RunEmitter(emitter);
     if (sheetApp->parsed()) return RunSheet(sheet);
     return RunConvert(convert);
 }

@@ -1,0 +1,108 @@
+#include "RenderEmitters.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+
+#include "EmitterDescription.h"
+#include "RenderTextures.h"
+#include "TextureFiles.h"
+#include "TextureWrite.h"
+
+namespace {
+
+constexpr float kUpdatesPerSecond = 60;
+
+Image Spot() {
+    constexpr int kSize = 64;
+    Image image;
+    image.width = image.height = kSize;
+    for (int i = 0; i < kSize * kSize; ++i) {
+        const float x = static_cast<float>(i % kSize) + 0.5f, y = static_cast<float>(i / kSize) + 0.5f;
+        const float inside = std::max(0.0f, 1 - std::hypot(x - kSize / 2, y - kSize / 2) / (kSize / 2));
+        const auto alpha = static_cast<uint8_t>(255 * inside * inside * (3 - 2 * inside));
+        image.pixels.insert(image.pixels.end(), {255, 255, 255, alpha});
+    }
+    return image;
+}
+
+// Those that turn about the axis of sight need a mode that shows it.
+int32_t ModeOf(const QexParticleEmitter& e) {
+    const float turns[] = {e.rotationMin.z,
+                           e.rotationMax.z,
+                           e.angularVelocityMin.z,
+                           e.angularVelocityMax.z,
+                           e.angularAccelerationMin.z,
+                           e.angularAccelerationMax.z};
+    const bool turning =
+        std::any_of(std::begin(turns), std::end(turns), [](float turn) { return turn != 0; });
+    return turning ? QEX_BILLBOARD_YAW : QEX_BILLBOARD_SCREEN;
+}
+
+}  // namespace
+
+Emitters::~Emitters() {
+    for (QexParticleEmitter* emitter : emitters_) QexParticleEmitter_Release(emitter);
+    for (QexTexture* texture : textures_) {
+        QexTexture_Release(texture);
+        QexMemory_Free(texture);
+    }
+}
+
+void Emitters::AddTexture(const Image& image, const std::string& name) {
+    QexTexture* texture = NewPictureTexture(image, name);
+    if (!texture) return;
+    // It may have been resized for the GL; a particle's size is that of the picture.
+    texture->width = image.width;
+    texture->height = static_cast<uint32_t>(image.height);
+    textures_.push_back(texture);
+}
+
+bool Emitters::Load(const EmitterScene& scene, std::string* problem) {
+    for (const std::string& path : scene.textures) {
+        Image image;
+        if (!LoadImage(path, &image, problem)) {
+            *problem = path + ": " + *problem;
+            return false;
+        }
+        AddTexture(FlipRows(image), FileName(path));
+    }
+    if (scene.textures.empty()) AddTexture(Spot(), "spot");
+    for (const std::string& path : scene.emitters) {
+        QexParticleEmitter* emitter = LoadEmitter(path, problem);
+        if (!emitter) {
+            *problem = path + ": " + *problem;
+            return false;
+        }
+        emitters_.push_back(emitter);
+        if (textures_.empty()) continue;
+        size_t next = 0;
+        for (int32_t i = 0; i < emitter->animationCount; ++i)
+            for (int32_t k = 0; k < std::max(emitter->animations[i].frameCount, 1); ++k)
+                emitter->animations[i].frames[k] = textures_[next++ % textures_.size()];
+    }
+    problem->clear();
+    // The engine seeds its numbers by the time of day when it draws the first one.
+    GetRandomNumber();
+    srand48(1);
+    Run(scene.time);
+    return true;
+}
+
+void Emitters::Run(float seconds) {
+    const auto updates = static_cast<int>(std::lround(seconds * kUpdatesPerSecond));
+    for (int i = 0; i < updates; ++i)
+        for (QexParticleEmitter* emitter : emitters_)
+            QexParticleEmitter_Update(emitter, 1 / kUpdatesPerSecond, nullptr);
+}
+
+void Emitters::Draw(const QexCamera& camera) const {
+    if (emitters_.empty()) return;
+    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetAlphaBlendModeSeparate(1, 0);
+    for (QexParticleEmitter* emitter : emitters_) {
+        for (int32_t i = 0; i < emitter->particleCount; ++i)
+            if (QexBillboard* billboard = emitter->particles[i].billboard) billboard->mode = ModeOf(*emitter);
+        QexParticleEmitter_Draw(emitter, &camera);
+    }
+}
