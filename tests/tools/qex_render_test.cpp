@@ -297,6 +297,125 @@ TEST_F(QexRender, DepthOfFieldIsSharpAtItsFocus) {
     EXPECT_TRUE(Near(At(Load("run-0001.png"), 110, 40), red, 4));
 }
 
+TEST_F(QexRender, SkyIsSeenFromInsideAndMirroredInWater) {
+    const char* const names[6] = {"px.png", "nx.png", "py.png", "ny.png", "pz.png", "nz.png"};
+    const auto face = [](int i, int x, int y) {
+        const int quarter = x / 16 + y / 16 * 2;
+        return Rgb{40 * i + 20, 60 * quarter + 20, 255};
+    };
+    std::vector<std::string> six;
+    for (int i = 0; i < 6; ++i) {
+        WritePng(names[i], 32, [&](int x, int y) { return face(i, x, y); });
+        six.insert(six.end(), {"--sky", Path(names[i])});
+    }
+    // Columns and rows of the cells; behind, an upright cross is upside down.
+    const int cells[2][6][2] = {{{2, 1}, {0, 1}, {1, 0}, {1, 2}, {3, 1}, {1, 1}},
+                                {{2, 1}, {0, 1}, {1, 0}, {1, 2}, {1, 3}, {1, 1}}};
+    for (const bool upright : {false, true}) {
+        const int width = upright ? 96 : 128, height = upright ? 128 : 96;
+        std::vector<uint8_t> pixels(size_t(width * height * 4), 255);
+        for (int i = 0; i < 6; ++i)
+            for (int at = 0; at < 32 * 32; ++at) {
+                const bool turned = upright && i == 4;
+                const int x = cells[upright][i][0] * 32 + (turned ? 31 - at % 32 : at % 32);
+                const int y = cells[upright][i][1] * 32 + (turned ? 31 - at / 32 : at / 32);
+                const Rgb colour = face(i, at % 32, at / 32);
+                std::copy(colour.begin(), colour.end(), &pixels[size_t(y * width + x) * 4]);
+            }
+        std::string error;
+        ASSERT_TRUE(
+            SavePng(Path(upright ? "upright.png" : "lying.png"), width, height, pixels.data(), &error));
+    }
+    pod::Scene scene = QuadScene();
+    const auto with = [](std::vector<std::string> arguments, const std::vector<std::string>& more) {
+        arguments.insert(arguments.end(), more.begin(), more.end());
+        return arguments;
+    };
+    Image image = Picture(scene, six);
+    EXPECT_TRUE(Near(At(image, 120, 40), {255, 0, 0}, 1));
+    for (int quarter = 0; quarter < 4; ++quarter)
+        EXPECT_TRUE(Near(At(image, quarter % 2 ? 150 : 50, quarter < 2 ? 20 : 80),
+                         face(5, quarter % 2 * 16, quarter / 2 * 16), 2))
+            << quarter;
+    // The quad from 0 to 1 is seen from -1 to -2 in the water at -0.5, the sky's upper half below.
+    const auto surface = Picture(scene, with(six, {"--water", "-0.5"}));
+    EXPECT_TRUE(Near(At(surface, 120, 40), {255, 0, 0}, 1) && Near(At(surface, 120, 80), {255, 0, 0}, 1));
+    EXPECT_FALSE(Near(At(surface, 120, 58), {255, 0, 0}, 60));
+    EXPECT_TRUE(Near(At(surface, 50, 85), face(5, 0, 0), 4) && Near(At(surface, 160, 85), face(5, 16, 0), 4));
+    EXPECT_TRUE(Near(At(surface, 50, 20), face(5, 0, 0), 2));
+    // Under water there is none, and the sky as before.
+    EXPECT_EQ(Picture(scene, with(six, {"--water", "3"})).pixels, image.pixels);
+    // All faces, whichever way they come; the picture's middle is that way, the first half of its left.
+    const struct {
+        const char* orbit;
+        int face;
+    } looks[] = {{"90,0", 1}, {"-90,0", 0}, {"180,0", 4}, {"0,-89", 2}, {"0,89", 3}};
+    FlattenQuad(&scene);
+    for (const auto& look : looks) {
+        const std::vector<std::string> camera = {"--camera", "auto", "--orbit", look.orbit};
+        image = Picture(scene, with(camera, six));
+        for (int quarter = 0; quarter < 4; ++quarter)
+            EXPECT_TRUE(Near(At(image, quarter % 2 ? 150 : 50, quarter < 2 ? 15 : 85),
+                             face(look.face, quarter % 2 * 16, quarter / 2 * 16), 2))
+                << look.orbit << " " << quarter;
+        for (const char* cross : {"lying.png", "upright.png"})
+            EXPECT_EQ(Picture(scene, with(camera, {"--sky", Path(cross)})).pixels, image.pixels) << cross;
+    }
+    const std::vector<std::string> render = {"render", Path("scene.pod"), "-o", Path("no.png")};
+    ExpectRefused(with(render, {"--water", "0"}), 2, "--sky");
+    ExpectRefused(with(render, {"--sky", "a.png", "--sky", "b.png"}), 2, "expected one picture, or six");
+    ExpectRefused(with(with(render, six), {"--water", "0", "--shadow"}), 2, "--shadow");
+    ExpectRefused(with(render, {"--sky", Path("none.png")}), 1, "none.png");
+    ExpectRefused(with(render, {"--sky", Path("px.png")}), 1,
+                  "32 x 32 pixels are not 4 x 3 or 3 x 4 squares");
+    six.back() = Path("lying.png");
+    ExpectRefused(with(render, six), 1, "128 x 96 pixels are not a square");
+}
+
+// One particle a unit wide and high, 20 pixels, that moves to the right, past the quad.
+TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
+    const std::string description =
+        "emissionRate 1 1\nemitDuration 0\nlifetime -1 -1\nendOpacity 1\nscaleMin 0.015625 0.015625 1\n"
+        "scaleMax 0 0 0\nvelocityMin 1 0 0\nvelocityMax 0 0 0\naccelerationMin 0 0 0\naccelerationMax 0 0 "
+        "0\n";
+    WriteText(Path("near.txt"), description + "position -4 0.5 0.01");
+    WriteText(Path("behind.txt"), description + "position -4 0.5 -0.01");
+    WritePng("halves.png", 64, [](int, int y) { return y < 32 ? Rgb{0, 255, 0} : Rgb{0, 0, 255}; });
+    const auto picture = [this](const std::string& emitter, const std::string& time) {
+        return Picture(QuadScene(), {"--emitter", Path(emitter), "--emitter-texture", Path("halves.png"),
+                                     "--emitter-time", time});
+    };
+    // It is spawned by the first of 60 updates a second.
+    Image image = picture("near.txt", "2");
+    EXPECT_TRUE(Near(At(image, 60, 33), {0, 255, 0}, 2) && Near(At(image, 60, 46), {0, 0, 255}, 2));
+    EXPECT_TRUE(Near(At(image, 52, 40), kBackground, 1) == false && Near(At(image, 47, 40), kBackground, 1));
+    EXPECT_TRUE(Near(At(image, 72, 40), kBackground, 1));
+    EXPECT_TRUE(Near(At(picture("near.txt", "5"), 120, 33), {0, 255, 0}, 2));
+    EXPECT_TRUE(Near(At(picture("behind.txt", "5"), 120, 33), {255, 0, 0}, 2));
+    // A written file is the same as its description, and a white spot stands for the texture.
+    ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("near.emitter")}).status, 0);
+    EXPECT_EQ(picture("near.emitter", "2").pixels, image.pixels);
+    image = Picture(QuadScene(), {"--emitter", Path("near.txt"), "--emitter-time", "2"});
+    EXPECT_TRUE(Near(At(image, 60, 40), {255, 255, 255}, 12) && Near(At(image, 51, 31), kBackground, 2));
+    // Time goes on from picture to picture, 30 frames a second.
+    WriteScene(Path("scene.pod"), MovingScene());
+    Render(Path("scene.pod"), "run.png",
+           {"--frames", "0:60:30", "--emitter", Path("near.txt"), "--emitter-time", "1"});
+    for (int i = 0; i < 3; ++i)
+        EXPECT_TRUE(
+            Near(At(Load("run-000" + std::to_string(i) + ".png"), 40 + 20 * i, 40), {255, 255, 255}, 12));
+    const std::vector<std::string> render = {"render", Path("scene.pod"), "-o", Path("no.png")};
+    WriteText(Path("bad.txt"), "lifetime 1 2\nemitting 2");
+    const auto refused = [&](std::vector<std::string> arguments, int status, const std::string& part) {
+        arguments.insert(arguments.begin(), render.begin(), render.end());
+        ExpectRefused(arguments, status, part);
+    };
+    refused({"--emitter", Path("bad.txt")}, 1,
+            "bad.txt: line 2: emitting: 2 is not a whole number from 0 to 1");
+    refused({"--emitter", Path("near.txt"), "--emitter-texture", Path("none.png")}, 1, "none.png");
+    refused({"--emitter-time", "1"}, 2, "--emitter");
+}
+
 TEST_F(QexRender, RealScenesShow) {
     const std::vector<std::string> scenes = RealFilesIn("scenes", ".pod");
     if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";

@@ -121,9 +121,13 @@ std::vector<Row> Get(const QexParticleEmitter& emitter, const Field& field) {
 std::string Range(const Column& column) {
     const auto text = [](double bound) { return Number(static_cast<float>(bound)); };
     const std::string what = column.kind == kInteger ? "a whole number" : "a number";
-    if (column.low == -kNone) return what;
-    return what + (column.high == kNone ? " from " + text(column.low) + " on"
-                                        : " from " + text(column.low) + " to " + text(column.high));
+    return what + (column.low != -kNone && column.high == kNone
+                       ? " from " + text(column.low) + " on"
+                       : " from " + text(column.low) + " to " + text(column.high));
+}
+
+std::string Decimal(double value) {
+    return std::fabs(value) <= kNone ? Number(static_cast<float>(value)) : Json(value).dump();
 }
 
 // What is wrong with rows of values for a field, or an empty text.
@@ -139,7 +143,7 @@ std::string Fault(const Field& field, const std::vector<Row>& rows) {
             const Column& column = field.columns[c];
             const bool whole = column.kind == kFloat || row[c] == std::floor(row[c]);
             if (!whole || !(row[c] >= column.low && row[c] <= column.high))
-                return Json(row[c]).dump() + " is not " + Range(column);
+                return Decimal(row[c]) + " is not " + Range(column);
         }
     }
     return "";
@@ -351,7 +355,11 @@ QexParticleEmitter* LoadEmitter(const std::string& path, std::string* problem) {
     const bool json = first != std::string::npos && text[first] == '{';
     QexParticleEmitter* emitter = NewEmitter();
     *problem = "out of memory";
-    if (!emitter || (json ? ReadEmitterJson : ReadEmitterText)(text, emitter, problem)) return emitter;
+    if (!emitter) return nullptr;
+    if ((json ? ReadEmitterJson : ReadEmitterText)(text, emitter, problem)) {
+        problem->clear();
+        return emitter;
+    }
     QexParticleEmitter_Release(emitter);
     return nullptr;
 }

@@ -22,7 +22,8 @@ std::string EmitterText(const QexParticleEmitter& emitter);
 std::string EmitterJson(const QexParticleEmitter& emitter);
 
 // Reads an emitter file, or a description over the defaults of QexParticleEmitter_Create, whichever it is. To
-// be released with QexParticleEmitter_Release; null, and one line, when it is neither.
+// be released with QexParticleEmitter_Release; null, and one line, when it is neither. A line beside an
+// emitter says what was left out.
 QexParticleEmitter* LoadEmitter(const std::string& path, std::string* problem);
 
 // An emitter of the defaults, the rate at which it begins the least. Null when memory runs out.
