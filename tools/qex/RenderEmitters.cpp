@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <vector>
 
 #include "EmitterDescription.h"
 #include "RenderTextures.h"
@@ -101,8 +102,18 @@ void Emitters::Draw(const QexCamera& camera) const {
     QexRenderer_SetZTestFunc(3);
     QexRenderer_SetAlphaBlendModeSeparate(1, 0);
     for (QexParticleEmitter* emitter : emitters_) {
-        for (int32_t i = 0; i < emitter->particleCount; ++i)
-            if (QexBillboard* billboard = emitter->particles[i].billboard) billboard->mode = ModeOf(*emitter);
+        const int32_t mode = ModeOf(*emitter);
+        // Billboards that face the screen do not take a scale from the view matrix.
+        const float* axis = camera.viewMatrix.m;
+        const float scale = mode == QEX_BILLBOARD_SCREEN ? std::hypot(axis[0], axis[1], axis[2]) : 1;
+        std::vector<QexVec3> scales;
+        for (int32_t i = 0; i < emitter->particleCount; ++i) {
+            QexParticleEx& particle = emitter->particles[i];
+            if (particle.billboard) particle.billboard->mode = mode;
+            scales.push_back(particle.scale);
+            QexVec3_Scale(&particle.scale, &particle.scale, scale);
+        }
         QexParticleEmitter_Draw(emitter, &camera);
+        for (size_t i = 0; i < scales.size(); ++i) emitter->particles[i].scale = scales[i];
     }
 }
