@@ -1,5 +1,6 @@
 // qex emitter writes the fields where the engine has them, shows what reads back the same, and names what is
 // wrong.
+#include <cfloat>
 #include <cstring>
 
 #include "QexCommandTest.h"
@@ -52,7 +53,7 @@ positionSpread 53 54 55
 velocityMin -0.1 61 62
 velocityMax 63 64 16777217
 accelerationMin 70 71 72
-accelerationMax 73 74 3.4e38
+accelerationMax 73 74 3.4028235e38
 animation 2 0.5 1
 animation 3 0.75 0
 currentRate 2.5
@@ -69,7 +70,7 @@ TEST_F(QexEmitter, FieldsLieWhereTheEngineHasThem) {
         {4, {1.5f, 2, 3, -4, 5, 0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 0.7f, 0.8f, 0}},
         {188, {0.9f, 0.25f, 10, 11, 12, 13, 14, 15, 1.01f}},
         {224, {20, 21, 22, 23, 24, 25, 30, 31, 32, 33, 34, 35, 40, 41, 42, 43, 44, 45}},
-        {296, {50, 51, 52, 53, 54, 55, -0.1f, 61, 62, 63, 64, 16777216, 70, 71, 72, 73, 74, 3.4e38f}},
+        {296, {50, 51, 52, 53, 54, 55, -0.1f, 61, 62, 63, 64, 16777216, 70, 71, 72, 73, 74, FLT_MAX}},
         {412, {0.5f}},
         {464, {0.75f}},
         {45296, {2.5f, 0.125f}}};
@@ -138,7 +139,7 @@ TEST_F(QexEmitter, NonsenseIsNamedWithFieldAndRange) {
         {"{\"position\": [1, \"2\", 3]}", "position: "},
         {"{\"color\": []}", "color: expected 4 values, not 0"},
         {"{\"position\": {}}", "position: "},
-        {"{\"position\": [1, 2, 3]", "is not a JSON object"}};
+        {"{\n\"position\": [1, 2, 3]", "line 2: is not JSON"}};
     for (const auto& [text, problem] : json) {
         WriteText(Path("bad.json"), text);
         ExpectRefused({"emitter", Path("bad.json")}, 1, "bad.json: " + std::string(problem));
@@ -147,7 +148,7 @@ TEST_F(QexEmitter, NonsenseIsNamedWithFieldAndRange) {
     ExpectRefused({"emitter", "--set", "lifetime"}, 2, "expected FIELD=VALUE");
     ExpectRefused({"emitter", "-o", Path("none/out.emitter")}, 2, "cannot be written");
     ExpectRefused({"emitter", Path("none.txt")}, 1, "none.txt");
-    Bytes file = Written("", "empty.txt");
+    Bytes file = Written("# nothing", "default.txt");
     PutWord(&file, 16, 0x7FC00000);  // a lifetime that is no number
     WriteBytes(Path("nan.emitter"), file);
     ExpectRefused({"emitter", Path("nan.emitter")}, 1, "a setting is not a finite number");

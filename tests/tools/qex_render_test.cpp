@@ -392,6 +392,13 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     EXPECT_TRUE(Near(At(image, 72, 40), kBackground, 1));
     EXPECT_TRUE(Near(At(picture("near.txt", "5"), 120, 33), {0, 255, 0}, 2));
     EXPECT_TRUE(Near(At(picture("behind.txt", "5"), 120, 33), {255, 0, 0}, 2));
+    // In a sky, whose units are others, it has the same size.
+    std::vector<std::string> sky = {"--emitter", Path("near.txt"), "--emitter-time", "2"};
+    WritePng("dark.png", 8, [](int, int) { return Rgb{10, 20, 30}; });
+    for (int i = 0; i < 6; ++i) sky.insert(sky.end(), {"--sky", Path("dark.png")});
+    const Image inSky = Picture(QuadScene(), sky);
+    EXPECT_TRUE(Near(At(inSky, 60, 40), {255, 255, 255}, 12) && At(inSky, 54, 40)[0] > 60);
+    EXPECT_TRUE(Near(At(inSky, 47, 40), {10, 20, 30}, 2) && Near(At(inSky, 72, 40), {10, 20, 30}, 2));
     // A written file is the same as its description, and a white spot stands for the texture.
     ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("near.emitter")}).status, 0);
     EXPECT_EQ(picture("near.emitter", "2").pixels, image.pixels);

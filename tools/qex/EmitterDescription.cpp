@@ -6,14 +6,12 @@
 #include <cstring>
 #include <vector>
 
-#include <nlohmann/json.hpp>
-
 #include "EngineOutput.h"
+#include "Info.h"
 #include "TextureFiles.h"
 
 namespace {
 
-using Json = nlohmann::ordered_json;
 using Row = std::vector<double>;
 
 enum Kind { kInteger, kFloat };
@@ -56,26 +54,26 @@ const Field kFields[] = {
     {"color",
      offsetof(QexParticleEmitter, colors),
      {kFromZero, kFromZero, kFromZero, kFromZero},
-     "red, green, blue, alpha of a particle, one of up to 10; for the application",
+     "red, green, blue, alpha of a particle, one of up to 10; drawing takes the texture's",
      sizeof(QexVec4),
      offsetof(QexParticleEmitter, colorCount)},
-    {AT(startOpacity), {kFromZero}, "at the begin of a lifetime"},
-    {AT(endOpacity), {kFromZero}, "at its end"},
-    {AT(scaleMin), Three(kAny), "units a pixel of the texture: across, up, not used"},
-    {AT(scaleMax), Three(kAny), ""},
+    {AT(startOpacity), {kFromZero}, "factor of the texture's alpha at the begin of a lifetime"},
+    {AT(endOpacity), {kFromZero}, "and at its end"},
+    {AT(scaleMin), Three(kAny), "units a pixel of the texture: across, up, and one not used"},
+    {AT(scaleMax), Three(kAny), "units a pixel"},
     {AT(scaleFactor), {kAny}, "multiplies the scale at every update"},
     {AT(rotationMin), Three(kAny), "degrees about x, y and z"},
-    {AT(rotationMax), Three(kAny), ""},
+    {AT(rotationMax), Three(kAny), "degrees"},
     {AT(angularVelocityMin), Three(kAny), "degrees a second"},
-    {AT(angularVelocityMax), Three(kAny), ""},
+    {AT(angularVelocityMax), Three(kAny), "degrees a second"},
     {AT(angularAccelerationMin), Three(kAny), "degrees a second, a second"},
-    {AT(angularAccelerationMax), Three(kAny), ""},
+    {AT(angularAccelerationMax), Three(kAny), "degrees a second, a second"},
     {AT(position), Three(kAny), "of the emitter, units"},
     {AT(positionSpread), Three(kFromZero), "units to either side"},
     {AT(velocityMin), Three(kAny), "units a second"},
-    {AT(velocityMax), Three(kAny), ""},
+    {AT(velocityMax), Three(kAny), "units a second"},
     {AT(accelerationMin), Three(kAny), "units a second, a second"},
-    {AT(accelerationMax), Three(kAny), ""},
+    {AT(accelerationMax), Three(kAny), "units a second, a second"},
     {"animation",
      offsetof(QexParticleEmitter, animations) + offsetof(QexParticleAnimation, frameCount),
      {kFrames, kFromZero, kSwitch},
@@ -90,13 +88,14 @@ char* At(QexParticleEmitter* emitter, const Field& field, size_t row, size_t col
     return reinterpret_cast<char*>(emitter) + field.offset + row * field.rowBytes + 4 * column;
 }
 
-// The shortest decimal that is that float.
+// The shortest decimal that is read as that float.
 std::string Number(float value) {
     std::string shortest;
     for (int digits = 1; digits <= 9; ++digits) {
         char text[32];
         snprintf(text, sizeof text, "%.*g", digits, static_cast<double>(value));
-        if (strtof(text, nullptr) == value && (shortest.empty() || strlen(text) < shortest.size()))
+        if (static_cast<float>(strtod(text, nullptr)) == value &&
+            (shortest.empty() || strlen(text) < shortest.size()))
             shortest = text;
     }
     return shortest;
@@ -106,7 +105,8 @@ std::vector<Row> Get(const QexParticleEmitter& emitter, const Field& field) {
     auto* e = const_cast<QexParticleEmitter*>(&emitter);
     int32_t count = 1;
     if (field.HasRows()) memcpy(&count, reinterpret_cast<const char*>(e) + field.countOffset, sizeof count);
-    std::vector<Row> rows(static_cast<size_t>(count));
+    // Particles take the first row where none is in use.
+    std::vector<Row> rows(static_cast<size_t>(std::max(count, 1)));
     for (size_t r = 0; r < rows.size(); ++r)
         for (size_t c = 0; c < field.columns.size(); ++c) {
             int32_t whole;
@@ -141,8 +141,11 @@ std::string Fault(const Field& field, const std::vector<Row>& rows) {
                    std::to_string(row.size());
         for (size_t c = 0; c < row.size(); ++c) {
             const Column& column = field.columns[c];
-            const bool whole = column.kind == kFloat || row[c] == std::floor(row[c]);
-            if (!whole || !(row[c] >= column.low && row[c] <= column.high))
+            // The decimal of the largest float is a little above it.
+            const bool fits = column.kind == kFloat && std::fabs(row[c]) < 1.0001 * kNone;
+            const double value = fits ? static_cast<float>(row[c]) : row[c];
+            const bool whole = column.kind == kFloat || value == std::floor(value);
+            if (!whole || !(value >= column.low && value <= column.high))
                 return Decimal(row[c]) + " is not " + Range(column);
         }
     }
@@ -176,7 +179,7 @@ class Values {
             const std::string fault = Fault(kFields[i], all);
             return fault.empty() ? "" : name + ": " + fault;
         }
-        return "unknown field '" + name + "'; expected one of " + known;
+        return "unknown field '" + CleanText(name.substr(0, 40)) + "'; expected one of " + known;
     }
 
     void Apply(QexParticleEmitter* emitter) const {
@@ -221,8 +224,9 @@ std::string AddText(const std::string& name, const std::string& text, Values* va
     const bool numbers = ParseRows(text, &rows, &word);
     // The name comes first: a wrong one may have anything behind it.
     const std::string problem = values->Add(name, numbers ? rows : std::vector<Row>{});
-    return numbers || problem.compare(0, 7, "unknown") == 0 ? problem
-                                                            : name + ": '" + word + "' is not a number";
+    return numbers || problem.compare(0, 7, "unknown") == 0
+               ? problem
+               : name + ": '" + CleanText(word.substr(0, 40)) + "' is not a number";
 }
 
 // A number as a row of one value, an array as a row, an array of arrays as rows.
@@ -268,16 +272,24 @@ bool ReadEmitterText(const std::string& text, QexParticleEmitter* emitter, std::
 }
 
 bool ReadEmitterJson(const std::string& text, QexParticleEmitter* emitter, std::string* problem) {
-    const Json document = Json::parse(text, nullptr, false);
-    *problem = "is not a JSON object";
-    if (!document.is_object()) return false;
+    Json document;
+    try {
+        document = Json::parse(text);
+    } catch (const Json::parse_error& error) {
+        const auto lines = std::count(text.begin(), text.begin() + static_cast<long>(error.byte) - 1, '\n');
+        *problem = "line " + std::to_string(lines + 1) + ": is not JSON";
+        return false;
+    } catch (const Json::exception&) {
+        *problem = "has a number that is too large";
+        return false;
+    }
     Values values;
     for (const auto& [name, value] : document.items()) {
         std::vector<Row> rows;
         const bool numbers = JsonRows(value, &rows);
         *problem = values.Add(name, numbers ? rows : std::vector<Row>{});
         if (!numbers && problem->compare(0, 7, "unknown") != 0)
-            *problem = name + ": " + value.dump() + " is no number and no array of numbers";
+            *problem = name + ": is neither a number nor an array of numbers";
         if (!problem->empty()) return false;
     }
     values.Apply(emitter);
@@ -302,7 +314,7 @@ std::string EmitterText(const QexParticleEmitter& emitter) {
             std::string line = field.name;
             line.resize(std::max<size_t>(line.size(), 22), ' ');
             for (const double value : row) line += " " + Number(static_cast<float>(value));
-            if (first && *field.remark) {
+            if (first) {
                 line.resize(std::max<size_t>(line.size(), 40), ' ');
                 line += "  # " + std::string(field.remark);
             }
@@ -345,11 +357,16 @@ QexParticleEmitter* LoadEmitter(const std::string& path, std::string* problem) {
         QexParticleEmitter* emitter = QexParticleEmitter_CreateFromBinFile(path.c_str());
         output.Stop();
         *problem = output.FirstError();
+        for (const Field& field : kFields) {
+            if (!emitter || !problem->empty()) break;
+            *problem = Fault(field, Get(*emitter, field));
+            if (!problem->empty()) *problem = field.name + (": " + *problem);
+        }
         return emitter;
     }
     *problem = "is neither an emitter file, which has " + std::to_string(QEX_EMITTER_FILE_SIZE) +
                " bytes, nor a description of one";
-    if (!IsText(bytes)) return nullptr;
+    if (bytes.empty() || !IsText(bytes)) return nullptr;
     const std::string text(bytes.begin(), bytes.end());
     const size_t first = text.find_first_not_of(" \t\r\n");
     const bool json = first != std::string::npos && text[first] == '{';

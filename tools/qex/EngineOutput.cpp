@@ -8,35 +8,40 @@
 
 namespace {
 
-// One collection at a time; its file descriptors are kept here, where the exit handler finds them.
 struct Capture {
-    FILE* file = nullptr;
-    int savedOut = -1;
-    int savedErr = -1;
-} g_capture;
+    FILE* file;
+    int savedOut, savedErr;
+};
 
+// The collections, one within the other; their file descriptors are kept here, where the exit handler finds
+// them.
+std::vector<Capture> g_captures;
+
+// Ends the innermost one.
 std::string ReadAndRestore() {
-    std::string text;
-    if (!g_capture.file) return text;
+    const Capture capture = g_captures.back();
+    g_captures.pop_back();
     fflush(stdout);
     fflush(stderr);
-    dup2(g_capture.savedOut, STDOUT_FILENO);
-    dup2(g_capture.savedErr, STDERR_FILENO);
-    close(g_capture.savedOut);
-    close(g_capture.savedErr);
-    rewind(g_capture.file);
+    dup2(capture.savedOut, STDOUT_FILENO);
+    dup2(capture.savedErr, STDERR_FILENO);
+    close(capture.savedOut);
+    close(capture.savedErr);
+    rewind(capture.file);
+    std::string text;
     char buffer[4096];
-    for (size_t n; (n = fread(buffer, 1, sizeof buffer, g_capture.file)) > 0;) text.append(buffer, n);
-    fclose(g_capture.file);
-    g_capture = Capture();
+    for (size_t n; (n = fread(buffer, 1, sizeof buffer, capture.file)) > 0;) text.append(buffer, n);
+    fclose(capture.file);
     return text;
 }
 
 // The process ends inside the engine: say why.
 void ShowErrorsAtExit() {
-    std::istringstream lines(ReadAndRestore());
-    for (std::string line; std::getline(lines, line);)
-        if (line.rfind("E/", 0) == 0) fprintf(stderr, "%s\n", line.c_str());
+    while (!g_captures.empty()) {
+        std::istringstream lines(ReadAndRestore());
+        for (std::string line; std::getline(lines, line);)
+            if (line.rfind("E/", 0) == 0) fprintf(stderr, "%s\n", line.c_str());
+    }
 }
 
 // "E/Qex: <Function> text" to "text".
@@ -57,7 +62,7 @@ EngineOutput::EngineOutput() {
     fflush(stderr);
     FILE* file = tmpfile();
     if (!file) return;
-    g_capture = {file, dup(STDOUT_FILENO), dup(STDERR_FILENO)};
+    g_captures.push_back({file, dup(STDOUT_FILENO), dup(STDERR_FILENO)});
     dup2(fileno(file), STDOUT_FILENO);
     dup2(fileno(file), STDERR_FILENO);
     active_ = true;

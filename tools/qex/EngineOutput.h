@@ -1,5 +1,6 @@
 // Keeps the engine's own output out of the command's: while an EngineOutput lives, what is written to
-// standard output and standard error is collected, and its lines can be asked for afterwards.
+// standard output and standard error is collected, and its lines can be asked for afterwards. One may live
+// within another; the inner one keeps its lines to itself.
 //
 // The engine prints progress lines on standard output, and messages on standard error with "I/TAG: " or
 // "E/TAG: " in front. When the process ends meanwhile (a GL error is fatal), the error lines still reach

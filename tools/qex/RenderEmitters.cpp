@@ -3,16 +3,18 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <optional>
 #include <vector>
 
 #include "EmitterDescription.h"
+#include "EngineOutput.h"
 #include "RenderTextures.h"
 #include "TextureFiles.h"
 #include "TextureWrite.h"
 
 namespace {
 
-constexpr float kUpdatesPerSecond = 60;
+constexpr int kUpdatesPerSecond = 60;
 
 Image Spot() {
     constexpr int kSize = 64;
@@ -91,10 +93,14 @@ bool Emitters::Load(const EmitterScene& scene, std::string* problem) {
 }
 
 void Emitters::Run(float seconds) {
-    const auto updates = static_cast<int>(std::lround(seconds * kUpdatesPerSecond));
-    for (int i = 0; i < updates; ++i)
+    time_ += seconds;
+    // The engine writes a line a particle: they are let go of now and then.
+    std::optional<EngineOutput> quiet;
+    for (; updates_ < std::lround(time_ * kUpdatesPerSecond); ++updates_) {
+        if (!quiet || updates_ % kUpdatesPerSecond == 0) quiet.emplace();
         for (QexParticleEmitter* emitter : emitters_)
-            QexParticleEmitter_Update(emitter, 1 / kUpdatesPerSecond, nullptr);
+            QexParticleEmitter_Update(emitter, 1.0f / kUpdatesPerSecond, nullptr);
+    }
 }
 
 void Emitters::Draw(const QexCamera& camera) const {

@@ -34,4 +34,6 @@ class Emitters {
 
     std::vector<QexParticleEmitter*> emitters_;
     std::vector<QexTexture*> textures_;
+    double time_ = 0;  // seconds that they have run
+    long updates_ = 0;
 };
