@@ -1,9 +1,13 @@
-// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx, tga, etc and pvrtc.
+// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx, tga, etc, pvrtc and
+// emitter.
 #include <cstdio>
 #include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <string>
 
 #include "loaders/ImageFiles.h"
+#include "support/Capture.h"
 #include "support/PodScenes.h"
 
 namespace {
@@ -16,6 +20,24 @@ Bytes Level(uint8_t width, uint8_t height, size_t size) {
     level[0] = width;
     level[1] = height;
     return level;
+}
+
+// The settings and counts of an emitter file, as they lie in one.
+Bytes EmitterSettings() {
+    QexParticleEmitter* emitter = QexParticleEmitter_Create();
+    emitter->emissionRate[0] = emitter->currentRate = 3;
+    emitter->colorCount = 2;
+    emitter->animationCount = 2;
+    emitter->animations[1].frameCount = 3;
+    emitter->animations[1].loop = 1;
+    emitter->positionSpread = {1, 2, 3};
+    const MemoryFile file({});
+    QexParticleEmitter_WriteToBinFile(emitter, file.Path());
+    QexParticleEmitter_Release(emitter);
+    std::ifstream stream(file.Path(), std::ios::binary);
+    Bytes bytes((std::istreambuf_iterator<char>(stream)), {});
+    bytes.erase(bytes.begin() + 892, bytes.end() - 12);  // the particles
+    return bytes;
 }
 
 std::vector<Entry> Entries() {
@@ -49,6 +71,7 @@ std::vector<Entry> Entries() {
         {"tga/rgb", TgaFile(3, 2, 24, Noise(18))},
         {"tga/rgba", TgaFile(2, 2, 32, Noise(16))},
         {"tga/grey", TgaFile(2, 2, 8, Noise(4))},
+        {"emitter/settings", EmitterSettings()},
         {"etc/whole", Level(8, 4, 16)},
         {"etc/cut", Level(6, 3, 16)},
         {"etc/small", Level(1, 2, 8)},
