@@ -144,7 +144,10 @@ TEST_F(QexEmitter, NonsenseIsNamedWithFieldAndRange) {
         WriteText(Path("bad.json"), text);
         ExpectRefused({"emitter", Path("bad.json")}, 1, "bad.json: " + std::string(problem));
     }
+    WriteText(Path("bad.json"), "{\"color\": " + std::string(300000, '[') + std::string(300000, ']') + "}");
+    ExpectRefused({"emitter", Path("bad.json")}, 1, "color: is neither a number nor an array of numbers");
     ExpectRefused({"emitter", "--set", "lifetime=1"}, 2, "lifetime: expected 2 values, not 1");
+    ExpectRefused({"emitter", "--set", "a\nb"}, 2, "'a b' is no setting");
     ExpectRefused({"emitter", "--set", "lifetime"}, 2, "expected FIELD=VALUE");
     ExpectRefused({"emitter", "-o", Path("none/out.emitter")}, 2, "cannot be written");
     ExpectRefused({"emitter", Path("none.txt")}, 1, "none.txt");
@@ -155,4 +158,29 @@ TEST_F(QexEmitter, NonsenseIsNamedWithFieldAndRange) {
     file.pop_back();
     WriteBytes(Path("cut.emitter"), file);
     ExpectRefused({"emitter", Path("cut.emitter")}, 1, "neither an emitter file, which has 45304 bytes, nor");
+}
+
+// The engine takes them; they are shown as they are, with a warning where no description may say the same.
+TEST_F(QexEmitter, FilesOfOtherProgramsMayHoldOddValues) {
+    const struct {
+        size_t offset;
+        uint32_t value;
+        const char *warning, *line;
+    } cases[] = {{0, 7, "emitting: 7 is not a whole number from 0 to 1", "emitting               7 "},
+                 {8, 0xBF800000, "emissionRate: -1 is not", "emissionRate           -1 0.8 "},
+                 {416, 2, "animation: 2 is not", "animation              1 0 2 "},
+                 {45292, 3, "3 living particles are left out", "accumulator            0 "},
+                 {184, 0, "", "color                  1 1 1 1 "},
+                 {888, 0, "", "animation              1 0 0 "}};
+    const Bytes file = Written("# nothing", "default.txt");
+    for (const auto& c : cases) {
+        Bytes odd = file;
+        PutWord(&odd, c.offset, c.value);
+        WriteBytes(Path("odd.emitter"), odd);
+        const CommandResult result = Run({"emitter", Path("odd.emitter")});
+        EXPECT_EQ(result.status, 0) << c.offset;
+        EXPECT_TRUE(Contains(result.out, c.line)) << result.out;
+        EXPECT_TRUE(Contains(result.err, c.warning)) << result.err;
+        EXPECT_EQ(CountLines(result.err), *c.warning != 0) << result.err;
+    }
 }

@@ -402,6 +402,9 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     // A written file is the same as its description, and a white spot stands for the texture.
     ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("near.emitter")}).status, 0);
     EXPECT_EQ(picture("near.emitter", "2").pixels, image.pixels);
+    const CommandResult stats = Run(
+        {"render", Path("scene.pod"), "-o", Path("out.png"), "--emitter", Path("near.emitter"), "--stats"});
+    EXPECT_EQ(stats.out.rfind("load ", 0), 0u) << stats.out;
     image = Picture(QuadScene(), {"--emitter", Path("near.txt"), "--emitter-time", "2"});
     EXPECT_TRUE(Near(At(image, 60, 40), {255, 255, 255}, 12) && Near(At(image, 51, 31), kBackground, 2));
     // Time goes on from picture to picture, 30 frames a second.

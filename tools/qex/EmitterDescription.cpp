@@ -229,14 +229,22 @@ std::string AddText(const std::string& name, const std::string& text, Values* va
                : name + ": '" + CleanText(word.substr(0, 40)) + "' is not a number";
 }
 
+// The elements of an array, or the value itself. They are not copied: a file may nest them deeply.
+std::vector<const Json*> Elements(const Json& value) {
+    std::vector<const Json*> elements;
+    if (!value.is_array()) return {&value};
+    for (const Json& element : value) elements.push_back(&element);
+    return elements;
+}
+
 // A number as a row of one value, an array as a row, an array of arrays as rows.
 bool JsonRows(const Json& value, std::vector<Row>* rows) {
     const bool nested = value.is_array() && !value.empty() && value[0].is_array();
-    for (const Json& row : nested ? value : Json::array({value})) {
+    for (const Json* row : nested ? Elements(value) : std::vector<const Json*>{&value}) {
         rows->emplace_back();
-        for (const Json& number : row.is_array() ? row : Json::array({row})) {
-            if (!number.is_number() && !number.is_boolean()) return false;
-            rows->back().push_back(number.is_boolean() ? number.get<bool>() : number.get<double>());
+        for (const Json* number : Elements(*row)) {
+            if (!number->is_number() && !number->is_boolean()) return false;
+            rows->back().push_back(number->is_boolean() ? number->get<bool>() : number->get<double>());
         }
     }
     return true;
@@ -298,7 +306,7 @@ bool ReadEmitterJson(const std::string& text, QexParticleEmitter* emitter, std::
 
 bool SetEmitterField(const std::string& assignment, QexParticleEmitter* emitter, std::string* problem) {
     const size_t equals = assignment.find('=');
-    *problem = "'" + assignment + "' is no setting; expected FIELD=VALUE";
+    *problem = "'" + CleanText(assignment.substr(0, 40)) + "' is no setting; expected FIELD=VALUE";
     if (equals == std::string::npos) return false;
     Values values;
     *problem = AddText(assignment.substr(0, equals), assignment.substr(equals + 1), &values);
