@@ -59,9 +59,11 @@ static void SetSmoke(QexParticleEmitter* e) {
 int main(int argc, char** argv) {
     Sample sample(argc, argv);
     if (!sample.Started()) return 1;
-    SampleTexture drop = SoftSpot(32, {0.6f, 0.8f, 1}), smoke = SoftSpot(32, {0.55f, 0.55f, 0.6f});
-    SampleTexture flames[] = {SoftSpot(32, {1, 0.8f, 0.3f}), SoftSpot(32, {1, 0.45f, 0.1f}),
-                              SoftSpot(32, {0.7f, 0.12f, 0.05f})};
+    SampleTexture drop(32, 32, scenes::Spot(32, {153, 204, 255})),
+        smoke(32, 32, scenes::Spot(32, {140, 140, 153}));
+    SampleTexture flames[] = {{32, 32, scenes::Spot(32, {255, 204, 77})},
+                              {32, 32, scenes::Spot(32, {255, 115, 26})},
+                              {32, 32, scenes::Spot(32, {179, 31, 13})}};
     // Modes 1: over what is there; 2: added to it.
     const struct {
         const char* name;
@@ -73,7 +75,10 @@ int main(int argc, char** argv) {
                  {"fire", SetFire, flames, 3, 2},
                  {"fountain", SetFountain, &drop, 1, 1}};
 
-    srand(1);
+    // The engine seeds its random numbers by the time when it draws the first one; this picture is always the
+    // same.
+    GetRandomNumber();
+    srand48(1);
     sample.Clear(0.1f, 0.12f, 0.16f);
     const QexCamera camera = sample.Camera({0, 1.6f, 5.5f}, {0, 1.1f, 0});
     for (const auto& kind : kinds) {

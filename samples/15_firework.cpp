@@ -43,7 +43,7 @@ static void Fire(QexParticleSet* set, int32_t, int32_t) {
 int main(int argc, char** argv) {
     Sample sample(argc, argv);
     if (!sample.Started()) return 1;
-    SampleTexture spark = SoftSpot(32, {1, 1, 1});
+    SampleTexture spark(32, 32, scenes::Spot(32, {255, 255, 255}));
     // The red of a second texture gives each spark its shape.
     SampleTexture shape(32, 32, [](float s, float t) {
         const float x = std::fabs(s - 0.5f), y = std::fabs(t - 0.5f);

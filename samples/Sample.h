@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include <GLES2/gl2.h>
@@ -95,8 +96,10 @@ class SampleTexture {
                 for (const float channel : {colour.x, colour.y, colour.z, colour.w})
                     pixels_.push_back(static_cast<uint8_t>(255 * std::clamp(channel, 0.0f, 1.0f) + 0.5f));
             }
-        QexTexture_CreateFromPixels(&texture, width, height, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_LINEAR,
-                                    QEX_WRAP_CLAMP, pixels_.data());
+        Create(width, height);
+    }
+    SampleTexture(int width, int height, std::vector<uint8_t> rgba) : pixels_(std::move(rgba)) {
+        Create(width, height);
     }
     ~SampleTexture() { QexTexture_Release(&texture); }
     SampleTexture(const SampleTexture&) = delete;
@@ -105,17 +108,13 @@ class SampleTexture {
     QexTexture texture;
 
   private:
+    void Create(int width, int height) {
+        QexTexture_CreateFromPixels(&texture, width, height, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_LINEAR,
+                                    QEX_WRAP_CLAMP, pixels_.data());
+    }
+
     std::vector<uint8_t> pixels_;
 };
-
-// A round spot, dense in the middle, as smoke, sparks and drops are made of.
-inline SampleTexture SoftSpot(int size, const QexVec3& colour) {
-    return SampleTexture(size, size, [&](float s, float t) {
-        const float distance = 2 * std::hypot(s - 0.5f, t - 0.5f);
-        const float density = std::max(0.0f, 1 - distance);
-        return QexVec4{colour.x, colour.y, colour.z, density * density * (3 - 2 * density)};
-    });
-}
 
 // A model of a scene built in code. An application calls QexModel_LoadContent with a directory and a file
 // instead; from memory, the bytes stay as long as the model.

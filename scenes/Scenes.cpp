@@ -271,6 +271,18 @@ pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint) {
     return image;
 }
 
+std::vector<uint8_t> Spot(uint32_t size, const std::array<uint8_t, 3>& colour) {
+    const float radius = static_cast<float>(size) / 2;
+    std::vector<uint8_t> pixels;
+    for (uint32_t i = 0; i < size * size; ++i) {
+        const float x = static_cast<float>(i % size) + 0.5f, y = static_cast<float>(i / size) + 0.5f;
+        const float inside = std::max(0.0f, 1 - std::hypot(x - radius, y - radius) / radius);
+        pixels.insert(pixels.end(), colour.begin(), colour.end());
+        pixels.push_back(static_cast<uint8_t>(255 * inside * inside * (3 - 2 * inside)));
+    }
+    return pixels;
+}
+
 std::vector<uint8_t> Waves(uint32_t size) {
     // Whole waves along s and t, so that they repeat.
     constexpr struct {

@@ -37,6 +37,10 @@ pod::Scene Boat();
 using SkyPaint = std::function<std::array<uint8_t, 4>(const pod::Vec3& direction)>;
 pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint);
 
+// A round spot of a colour (red, green, blue, 0 to 255), dense in the middle, as smoke, sparks and drops are
+// made of: size x size pixels, RGBA.
+std::vector<uint8_t> Spot(uint32_t size, const std::array<uint8_t, 3>& colour);
+
 // Normals of waves, size x size pixels (RGBA) to be repeated: across in red and blue, up in green.
 std::vector<uint8_t> Waves(uint32_t size);
 

@@ -1,5 +1,5 @@
-/* Where the fields of emitter files lie, and records that applications share with 32-bit ones: on 32-bit targets the
- * records in memory are the same. Only compiled, for such a target; no C library is needed. */
+/* Where the fields of emitter files lie, and records that applications share with 32-bit ones: on 32-bit
+ * targets the records in memory are the same. Only compiled, for such a target; no C library is needed. */
 #include <stddef.h>
 
 #include "Qex.h"

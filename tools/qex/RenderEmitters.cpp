@@ -9,25 +9,14 @@
 #include "EmitterDescription.h"
 #include "EngineOutput.h"
 #include "RenderTextures.h"
+#include "Scenes.h"
 #include "TextureFiles.h"
 #include "TextureWrite.h"
 
 namespace {
 
 constexpr int kUpdatesPerSecond = 60;
-
-Image Spot() {
-    constexpr int kSize = 64;
-    Image image;
-    image.width = image.height = kSize;
-    for (int i = 0; i < kSize * kSize; ++i) {
-        const float x = static_cast<float>(i % kSize) + 0.5f, y = static_cast<float>(i / kSize) + 0.5f;
-        const float inside = std::max(0.0f, 1 - std::hypot(x - kSize / 2, y - kSize / 2) / (kSize / 2));
-        const auto alpha = static_cast<uint8_t>(255 * inside * inside * (3 - 2 * inside));
-        image.pixels.insert(image.pixels.end(), {255, 255, 255, alpha});
-    }
-    return image;
-}
+constexpr int kSpotSize = 64;  // pixels, as the engine's default texture
 
 // Those that turn about the axis of sight need a mode that shows it.
 int32_t ModeOf(const QexParticleEmitter& e) {
@@ -70,7 +59,8 @@ bool Emitters::Load(const EmitterScene& scene, std::string* problem) {
         }
         AddTexture(FlipRows(image), FileName(path));
     }
-    if (scene.textures.empty()) AddTexture(Spot(), "spot");
+    if (scene.textures.empty())
+        AddTexture({kSpotSize, kSpotSize, scenes::Spot(kSpotSize, {255, 255, 255})}, "spot");
     for (const std::string& path : scene.emitters) {
         QexParticleEmitter* emitter = LoadEmitter(path, problem);
         if (!emitter) {
