@@ -40,17 +40,27 @@ AT(QexParticleEmitter, currentRate, 45296);
 AT(QexParticleEmitter, accumulator, 45300);
 
 SIZE(QexParticleAnimation, 52);
+AT(QexParticleAnimation, frames, 0);
 AT(QexParticleAnimation, frameCount, 40);
 AT(QexParticleAnimation, frameDuration, 44);
 AT(QexParticleAnimation, loop, 48);
 
 SIZE(QexParticleEx, 148);
+AT(QexParticleEx, active, 0);
+AT(QexParticleEx, age, 4);
+AT(QexParticleEx, lifetime, 8);
 AT(QexParticleEx, color, 12);
 AT(QexParticleEx, opacity, 28);
+AT(QexParticleEx, startOpacity, 32);
+AT(QexParticleEx, endOpacity, 36);
 AT(QexParticleEx, scale, 40);
 AT(QexParticleEx, scaleFactor, 52);
 AT(QexParticleEx, rotation, 56);
+AT(QexParticleEx, angularVelocity, 68);
+AT(QexParticleEx, angularAcceleration, 80);
 AT(QexParticleEx, position, 92);
+AT(QexParticleEx, velocity, 104);
+AT(QexParticleEx, acceleration, 116);
 AT(QexParticleEx, animation, 128);
 AT(QexParticleEx, frame, 132);
 AT(QexParticleEx, frameAge, 136);
