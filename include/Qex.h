@@ -3423,7 +3423,9 @@ QEX_API void QexRenderTarget_Release(QexRenderTarget* target);
 
 struct QexSkyBox;
 
-/** Draws the application's scene, with culling and depth as set; afterwards the engine draws the sky.
+/** Draws the application's scene, with culling and depth as set; afterwards the engine draws the sky, over
+ * what wrote no depth. Where blending leaves alpha below 1 in the reflection, water that is drawn with
+ * blending on is translucent. Unit 1 may still have the reflection's texture bound.
  *  @param skyBox      the record given to QexSkyBox_Update
  *  @param view        view matrix; in the reflection mirrored in the water, so that front faces turn
  * clockwise and QexRenderer_SetBackFaceCulling(2), set before, hides back faces
@@ -3489,8 +3491,10 @@ QEX_API int32_t QexSkyBox_Create(QexSkyBox* skyBox);
 
 /** Draws a frame: scene, sky and water. Neither clears the screen nor allocates. Sky alone leaves framebuffer
  *  and viewport untouched. Water prints one line on standard output, "T0:..., S0:..., T1:..., S1:...", binds
- *  units 0 to 2, and sets the viewport to the screen's size, depth test to mode 3 and culling to back faces;
- *  the framebuffer stays bound. A camera that sees no water, or is under it, gets none.
+ *  units 0 to 2, and sets the viewport to the screen's size, depth test to mode 3, depth writing on and
+ * culling to back faces; the framebuffer stays bound. A camera that sees no water, or is under it, gets none,
+ * but the reflection is drawn all the same. The scissor test has to be off, as it would cut the textures of
+ * 256 x 256.
  *  @param context  its size is the screen's; null draws nothing
  *  @param skyBox   the record; null, or without camera or sky texture, draws nothing, as before a
  *                  QexSkyBox_Create that gave 0

@@ -21,6 +21,7 @@ int main(int argc, char** argv) {
     const QexVec3 up = {0.15f, 1, 0};
     QexCamera_LookAt(&camera, &camera.eye, &camera.target, &up);
     QexBillboard* billboard = QexBillboard_Create(&arrow.texture);
+    if (!billboard) return 1;
     billboard->scale = {0.9f / 64, 0.9f / 64, 1};
     for (int column = 0; column < 5; ++column)
         for (int row = 0; row < 4; ++row) {

@@ -84,6 +84,7 @@ int main(int argc, char** argv) {
     for (const auto& kind : kinds) {
         const std::string path = sample.Beside(std::string(kind.name) + ".emitter");
         QexParticleEmitter* made = QexParticleEmitter_Create();
+        if (!made) return 1;
         kind.set(made);
         const int32_t written = QexParticleEmitter_WriteToBinFile(made, path.c_str());
         QexParticleEmitter_Release(made);

@@ -103,7 +103,9 @@ QexMatrix ViewProjection() {
 }
 
 void BindTarget(GLuint framebuffer) {
-    QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &s_SavedFramebuffer));
+    // Whatever the application's last frame ended with.
+    QexRenderer_SetZWrite(1);
+    QexRenderer_SetZTestFunc(3);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, framebuffer));
     QEX_GL(glViewport(0, 0, kTargetSize, kTargetSize));
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
@@ -185,9 +187,9 @@ void ClipAtWater(float farPlane) {
     QexMatrix_TransformVec4Raw(QexMatrix_InverseEx(&inverse, &s_View), &clip, &clip);
     const QexVec4 opposite = {Qex_Sign(clip.x), Qex_Sign(clip.y), 1, 1};
     QexMatrix_InverseEx(&inverse, &s_Projection);
-    // The far plane goes through the corner opposite to the clip plane, or beyond it: by the transposed
-    // inverse, which reaches further unless the camera is low or the near plane below 1, and with which the
-    // depths of the reflection have always been made.
+    // The far plane goes through the corner opposite to the clip plane, so that nothing of the view is lost,
+    // or beyond it, which costs depth precision alone: the transposed inverse puts it further away unless the
+    // camera is low or the near plane below 1.
     QexMatrix_TransformVec4(&inverse, &opposite, &corner);
     QexMatrix_TransformVec4Raw(&inverse, &opposite, &transposed);
     const float reach = fmaxf(Dot(corner, clip), Dot(transposed, clip));
@@ -200,6 +202,7 @@ void ClipAtWater(float farPlane) {
 }
 
 void DrawReflection(QexSkyBox* box) {
+    QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &s_SavedFramebuffer));
     BindTarget(s_Reflection.framebuffer);
     SetCamera(*box->camera);
     MirrorView();
@@ -227,9 +230,7 @@ void SetWaves() {
 
 void DrawSurface(const QexSkyBox& box) {
     const QexCamera& camera = *box.camera;
-    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, s_Surface.framebuffer));
-    QEX_GL(glViewport(0, 0, kTargetSize, kTargetSize));
-    QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
+    BindTarget(s_Surface.framebuffer);
     SetCamera(camera);
     QexRenderState_UseProgram(g_QexWaterProgram.program);
     QexTexture_Set(box.waterNormalTexture, 0);

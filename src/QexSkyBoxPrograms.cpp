@@ -107,7 +107,7 @@ void main() {
 )";
 
 const char* const kAttributes[] = {"inVertex", "inNormal", "inTexCoord"};
-// What the water's stages may ask for; they do not yet.
+// For the water's stages, which test none of them.
 const char* const kWaterDefines[] = {"ENABLE_REFRACTION", "ENABLE_FRESNEL", "ENABLE_DISTORTION"};
 
 // The shader objects, a vertex and a fragment shader each. The plain water pair is not linked.
@@ -207,6 +207,8 @@ bool QexSkyBox_CreatePrograms() {
         if (QexShader_CreateProgram(row.program, s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
                                     kAttributes, row.attributeCount, log) != 0) {
             QexSystem_Printf(row.error, log);
+            QEX_GL(glDeleteProgram(*row.program));
+            *row.program = 0;
             return false;
         }
         row.setUp(*row.program);

@@ -287,9 +287,11 @@ TEST_F(SkyTest, WhatIsUnderWaterIsNotReflected) {
         float low, high;
         bool visible;
     } cases[] = {{3, 8, true}, {0, 1.5f, true}, {-6, -0.7f, false}, {-40, -30, false}};
-    for (const float zNear : {1.0f, 0.1f, 5.0f}) {
-        // The nearest one from high above.
-        Look(zNear < 1 ? glm::vec3(1, 80, 20) : glm::vec3(30, 22, 60), {0, 0, 0});
+    // The nearest near plane from high above, the farthest from just above the water.
+    const std::pair<float, glm::vec3> views[] = {
+        {1.0f, {30, 22, 60}}, {0.1f, {1, 80, 20}}, {5.0f, {30, 22, 60}}, {5.0f, {10, 3.5f, 60}}};
+    for (const auto& [zNear, eye] : views) {
+        Look(eye, {0, 0, 0});
         QexCamera_Project(&camera_, 0.9f, float{kWidth} / kHeight, zNear, kSky);
         for (const auto& c : cases) {
             const LoadedModel box(Boxes({{{{0, (c.low + c.high) / 2, 0}, {6, (c.high - c.low) / 2, 6}}}}));
@@ -298,7 +300,8 @@ TEST_F(SkyTest, WhatIsUnderWaterIsNotReflected) {
             EXPECT_TRUE(c.visible ? seen > 100 : seen == 0) << c.low << " " << zNear << ": " << seen;
         }
     }
-    // The same by the numbers, the near plane elsewhere: the formula as it is written down, in doubles.
+    // The same by the numbers, the near plane elsewhere: Lengyel's formula with the transposed inverse, in
+    // doubles.
     s_model = nullptr;
     Look({30, 22, 60}, {0, 5, 0});
     QexCamera_Project(&camera_, 0.9f, float{kWidth} / kHeight, 2, 500);

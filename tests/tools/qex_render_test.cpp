@@ -414,6 +414,18 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     for (int i = 0; i < 3; ++i)
         EXPECT_TRUE(
             Near(At(Load("run-000" + std::to_string(i) + ".png"), 40 + 20 * i, 40), {255, 255, 255}, 12));
+    // Of files of other programs: the first animation is drawn where none is in use, and odd values are said.
+    Bytes odd = ReadBytes(Path("near.emitter"));
+    PutWord(&odd, 0, 7);
+    PutWord(&odd, 888, 0);
+    WriteBytes(Path("odd.emitter"), odd);
+    WriteScene(Path("scene.pod"), QuadScene());
+    EXPECT_TRUE(Contains(Render(Path("scene.pod"), "odd.png",
+                                {"--emitter", Path("odd.emitter"), "--emitter-texture", Path("halves.png"),
+                                 "--emitter-time", "2"})
+                             .err,
+                         "warning: " + Path("odd.emitter") + ": emitting: 7 is not"));
+    EXPECT_TRUE(Near(At(Load("odd.png"), 60, 33), {0, 255, 0}, 2));
     const std::vector<std::string> render = {"render", Path("scene.pod"), "-o", Path("no.png")};
     WriteText(Path("bad.txt"), "lifetime 1 2\nemitting 2");
     const auto refused = [&](std::vector<std::string> arguments, int status, const std::string& part) {

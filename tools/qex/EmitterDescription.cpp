@@ -1,9 +1,11 @@
 #include "EmitterDescription.h"
 
+#include <algorithm>
 #include <cfloat>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
+#include <set>
 #include <vector>
 
 #include "EngineOutput.h"
@@ -165,38 +167,38 @@ void Set(QexParticleEmitter* emitter, const Field& field, const std::vector<Row>
     if (field.HasRows()) memcpy(reinterpret_cast<char*>(emitter) + field.countOffset, &count, sizeof count);
 }
 
+const Field* FindField(const std::string& name) {
+    const auto field = std::find_if(std::begin(kFields), std::end(kFields),
+                                    [&](const Field& candidate) { return name == candidate.name; });
+    return field == std::end(kFields) ? nullptr : field;
+}
+
+std::string UnknownField(const std::string& name) {
+    std::string text = "unknown field '" + CleanText(name.substr(0, 40)) + "'; expected one of ";
+    for (const Field& field : kFields) text += (&field == kFields ? "" : ", ") + std::string(field.name);
+    return text;
+}
+
 // What a description gives, before it is checked and set as a whole.
 class Values {
   public:
     // An error text, empty when all is well.
-    std::string Add(const std::string& name, const std::vector<Row>& rows) {
-        std::string known;
-        for (size_t i = 0; i < std::size(kFields); ++i) {
-            known += (i ? ", " : "") + std::string(kFields[i].name);
-            if (name != kFields[i].name) continue;
-            std::vector<Row>& all = rows_[i];
-            all.insert(all.end(), rows.begin(), rows.end());
-            const std::string fault = Fault(kFields[i], all);
-            return fault.empty() ? "" : name + ": " + fault;
-        }
-        return "unknown field '" + CleanText(name.substr(0, 40)) + "'; expected one of " + known;
+    std::string Add(const Field& field, const std::vector<Row>& rows) {
+        std::vector<Row>& all = rows_[&field - kFields];
+        all.insert(all.end(), rows.begin(), rows.end());
+        const std::string fault = Fault(field, all);
+        return fault.empty() ? "" : field.name + (": " + fault);
     }
 
     void Apply(QexParticleEmitter* emitter) const {
         for (size_t i = 0; i < std::size(kFields); ++i)
             if (!rows_[i].empty()) Set(emitter, kFields[i], rows_[i]);
         // The rate at present is one of the new rate's, unless it is given.
-        const bool rateGiven = !rows_[IndexOf("emissionRate")].empty();
-        if (rateGiven && rows_[IndexOf("currentRate")].empty())
-            emitter->currentRate = emitter->emissionRate[0];
+        if (Given("emissionRate") && !Given("currentRate")) emitter->currentRate = emitter->emissionRate[0];
     }
 
   private:
-    static size_t IndexOf(const char* name) {
-        size_t i = 0;
-        while (strcmp(kFields[i].name, name) != 0) ++i;
-        return i;
-    }
+    bool Given(const char* name) const { return !rows_[FindField(name) - kFields].empty(); }
 
     std::vector<Row> rows_[std::size(kFields)];
 };
@@ -219,14 +221,12 @@ bool ParseRows(const std::string& text, std::vector<Row>* rows, std::string* wor
 }
 
 std::string AddText(const std::string& name, const std::string& text, Values* values) {
+    const Field* field = FindField(name);
+    if (!field) return UnknownField(name);
     std::vector<Row> rows;
     std::string word;
-    const bool numbers = ParseRows(text, &rows, &word);
-    // The name comes first: a wrong one may have anything behind it.
-    const std::string problem = values->Add(name, numbers ? rows : std::vector<Row>{});
-    return numbers || problem.compare(0, 7, "unknown") == 0
-               ? problem
-               : name + ": '" + CleanText(word.substr(0, 40)) + "' is not a number";
+    if (ParseRows(text, &rows, &word)) return values->Add(*field, rows);
+    return name + ": '" + CleanText(word.substr(0, 40)) + "' is not a number";
 }
 
 // The elements of an array, or the value itself. They are not copied: a file may nest them deeply.
@@ -248,6 +248,14 @@ bool JsonRows(const Json& value, std::vector<Row>* rows) {
         }
     }
     return true;
+}
+
+std::string AddJson(const std::string& name, const Json& value, Values* values) {
+    const Field* field = FindField(name);
+    if (!field) return UnknownField(name);
+    std::vector<Row> rows;
+    return JsonRows(value, &rows) ? values->Add(*field, rows)
+                                  : name + ": is neither a number nor an array of numbers";
 }
 
 bool IsText(const std::vector<uint8_t>& bytes) {
@@ -281,8 +289,15 @@ bool ReadEmitterText(const std::string& text, QexParticleEmitter* emitter, std::
 
 bool ReadEmitterJson(const std::string& text, QexParticleEmitter* emitter, std::string* problem) {
     Json document;
+    std::set<std::string> names;
+    std::string twice;
+    const auto watch = [&](int depth, Json::parse_event_t event, const Json& parsed) {
+        const bool name = event == Json::parse_event_t::key && depth == 1;
+        if (name && !names.insert(parsed.get<std::string>()).second) twice = parsed.get<std::string>();
+        return true;
+    };
     try {
-        document = Json::parse(text);
+        document = Json::parse(text, watch);
     } catch (const Json::parse_error& error) {
         const auto lines = std::count(text.begin(), text.begin() + static_cast<long>(error.byte) - 1, '\n');
         *problem = "line " + std::to_string(lines + 1) + ": is not JSON";
@@ -291,13 +306,13 @@ bool ReadEmitterJson(const std::string& text, QexParticleEmitter* emitter, std::
         *problem = "has a number that is too large";
         return false;
     }
+    if (!twice.empty()) {
+        *problem = CleanText(twice.substr(0, 40)) + ": expected once";
+        return false;
+    }
     Values values;
     for (const auto& [name, value] : document.items()) {
-        std::vector<Row> rows;
-        const bool numbers = JsonRows(value, &rows);
-        *problem = values.Add(name, numbers ? rows : std::vector<Row>{});
-        if (!numbers && problem->compare(0, 7, "unknown") != 0)
-            *problem = name + ": is neither a number nor an array of numbers";
+        *problem = AddJson(name, value, &values);
         if (!problem->empty()) return false;
     }
     values.Apply(emitter);
@@ -321,7 +336,10 @@ std::string EmitterText(const QexParticleEmitter& emitter) {
         for (const Row& row : Get(emitter, field)) {
             std::string line = field.name;
             line.resize(std::max<size_t>(line.size(), 22), ' ');
-            for (const double value : row) line += " " + Number(static_cast<float>(value));
+            for (size_t c = 0; c < row.size(); ++c)
+                line +=
+                    " " + (field.columns[c].kind == kInteger ? std::to_string(static_cast<int32_t>(row[c]))
+                                                             : Number(static_cast<float>(row[c])));
             if (first) {
                 line.resize(std::max<size_t>(line.size(), 40), ' ');
                 line += "  # " + std::string(field.remark);

@@ -1,8 +1,9 @@
 // Descriptions of particle emitters that people read and write, as text or JSON, both with the names of
 // QexParticleEmitter's fields.
 //
-// Text has a field a line: its name, its values, and "#" before a remark; "color" and "animation" stand once
-// for each row. JSON is an object of numbers and of arrays of them, "color" and "animation" arrays of rows.
+// Text has a field a line: its name, its values with white space or commas between them, and "#" before a
+// remark; "color" and "animation" stand once for each row, or have ";" between rows. JSON is an object of
+// numbers and of arrays of them, "color" and "animation" arrays of rows.
 #pragma once
 
 #include <string>
@@ -17,7 +18,8 @@ bool ReadEmitterJson(const std::string& text, QexParticleEmitter* emitter, std::
 // Sets one field: "FIELD=VALUE VALUE ...", also with commas; ";" between rows.
 bool SetEmitterField(const std::string& assignment, QexParticleEmitter* emitter, std::string* problem);
 
-// All fields. What is read again gives the same bits; text has each field's unit in a remark.
+// All fields. Where they are in range, what is read again gives the same bits; text has each field's unit in
+// a remark.
 std::string EmitterText(const QexParticleEmitter& emitter);
 std::string EmitterJson(const QexParticleEmitter& emitter);
 

@@ -219,8 +219,7 @@ void Renderer::Draw(double frame, float turned) {
     Clear(options_.background);
     if (sky_)
         sky_->Draw(
-            &engine_, camera_, options_.effects.water, SceneSize(),
-            [this](const QexCamera& camera) { DrawOpaque(camera); },
+            &engine_, camera_, [this](const QexCamera& camera) { DrawOpaque(camera); },
             [this](const QexCamera& camera) { DrawBlended(camera); });
     else if (options_.effects.stereo)
         DrawBothEyes();
@@ -352,12 +351,18 @@ bool Renderer::LoadSurroundings(std::string* problem) {
         floor_->Create(points_, *effects.floor, effects.mirror.has_value());
     }
     if (!effects.sky.empty()) {
+        SetFrame(Frames().front());
+        PlaceCamera(0);
         sky_ = std::make_unique<Sky>();
-        if (!sky_->Load(effects.sky, problem)) return false;
+        if (!sky_->Load(effects.sky, camera_, SceneSize(), effects.water, problem)) return false;
     }
     if (effects.emitters.emitters.empty()) return true;
     emitters_ = std::make_unique<Emitters>();
-    return emitters_->Load(effects.emitters, problem);
+    std::vector<std::string> warnings;
+    if (!emitters_->Load(effects.emitters, &warnings, problem)) return false;
+    quiet.Stop();
+    for (const std::string& line : warnings) fprintf(stderr, "qex render: warning: %s\n", line.c_str());
+    return true;
 }
 
 int Renderer::Run() {
@@ -374,8 +379,6 @@ int Renderer::Run() {
     shaders_.Use(&model_, options_.effects.shader);
     transparent_.resize(model_.scene.meshNodeCount + size_t{1});
     Frame();
-    const size_t skyPictures = options_.effects.sky.size();
-    if (skyPictures > 1 && skyPictures != 6) return Fail("--sky: expected one picture, or six", 2);
     if (!LoadSurroundings(&problem)) return Fail(problem, 1);
     const std::vector<double> frames = Frames();
     const bool numbered = options_.sequence || options_.turn;

@@ -50,7 +50,7 @@ void Emitters::AddTexture(const Image& image, const std::string& name) {
     textures_.push_back(texture);
 }
 
-bool Emitters::Load(const EmitterScene& scene, std::string* problem) {
+bool Emitters::Load(const EmitterScene& scene, std::vector<std::string>* warnings, std::string* problem) {
     for (const std::string& path : scene.textures) {
         Image image;
         if (!LoadImage(path, &image, problem)) {
@@ -67,10 +67,11 @@ bool Emitters::Load(const EmitterScene& scene, std::string* problem) {
             *problem = path + ": " + *problem;
             return false;
         }
+        if (!problem->empty()) warnings->push_back(path + ": " + *problem);
         emitters_.push_back(emitter);
         if (textures_.empty()) continue;
         size_t next = 0;
-        for (int32_t i = 0; i < emitter->animationCount; ++i)
+        for (int32_t i = 0; i < std::max(emitter->animationCount, 1); ++i)
             for (int32_t k = 0; k < std::max(emitter->animations[i].frameCount, 1); ++k)
                 emitter->animations[i].frames[k] = textures_[next++ % textures_.size()];
     }

@@ -21,9 +21,9 @@ class Emitters {
     Emitters& operator=(const Emitters&) = delete;
 
     // Loads all of it, runs it for its time, and draws the same random numbers each time. False, and what is
-    // wrong, when a file cannot be used. Without pictures all frames show a soft spot of 64 x 64 pixels; with
-    // fewer than frames the pictures begin again.
-    bool Load(const EmitterScene& scene, std::string* problem);
+    // wrong, when a file cannot be used; a warning for one that is used in part. Without pictures all frames
+    // show a soft spot of 64 x 64 pixels; with fewer than frames the pictures begin again.
+    bool Load(const EmitterScene& scene, std::vector<std::string>* warnings, std::string* problem);
 
     void Run(float seconds);
     // Blended over what is there, nothing hidden by what is behind.

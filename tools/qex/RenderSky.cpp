@@ -79,13 +79,13 @@ void Sky::CallDrawScene(QexSkyBox* record, const QexMatrix* view, const QexMatri
 }
 
 Sky::~Sky() {
-    if (created_) QexSkyBox_Release();
+    QexSkyBox_Release();
     if (waves_) QexTexture_Release(waves_);
     QexMemory_Free(waves_);
     if (texture_.glName) QexTexture_Release(&texture_);
 }
 
-bool Sky::Load(const std::vector<std::string>& files, std::string* problem) {
+bool Sky::LoadTexture(const std::vector<std::string>& files, std::string* problem) {
     std::vector<Image> images(files.size());
     for (size_t i = 0; i < files.size(); ++i)
         if (!LoadImage(files[i], &images[i], problem)) {
@@ -119,37 +119,46 @@ bool Sky::Load(const std::vector<std::string>& files, std::string* problem) {
     return true;
 }
 
-void Sky::Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional<float> waterHeight,
-               float sceneSize, const DrawScene& drawOpaque, const DrawScene& drawBlended) {
-    // What belongs to the first picture stays, so that the sky does.
-    if (!created_) {
-        box_.scale = kSceneSize / sceneSize;
-        box_.size = kFarDistance * camera.farPlane * box_.scale;
-    }
+bool Sky::Load(const std::vector<std::string>& files, const QexCamera& first, float sceneSize,
+               std::optional<float> waterHeight, std::string* problem) {
+    if (!LoadTexture(files, problem)) return false;
+    waves_ = NewPictureTexture({kWaves, kWaves, scenes::Waves(kWaves)}, "waves");
+    box_.scale = kSceneSize / sceneSize;
+    box_.size = kFarDistance * first.farPlane * box_.scale;
+    GLfloat clear[4];
+    glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
+    std::copy(clear, clear + 4, box_.waterColour);
+    box_.skyTexture = &texture_;
+    box_.waterNormalTexture = waves_;
+    box_.waterEnabled = waterHeight.has_value();
+    box_.waterHeight = -waterHeight.value_or(0) * box_.scale;
+    box_.camera = &box_.largeCamera;
+    box_.drawScene = CallDrawScene;
+    SetCamera(first);
+    *problem = "the GL cannot draw the sky";
+    if (QexSkyBox_Create(&box_) != 0 || !m_PlaneTexShader.program) return false;
+    problem->clear();
+    return true;
+}
+
+void Sky::SetCamera(const QexCamera& camera) {
     QexVec3 eye, target;
     QexVec3_Scale(&eye, &camera.eye, box_.scale);
     QexVec3_Scale(&target, &camera.target, box_.scale);
     QexCamera_LookAt(&box_.largeCamera, &eye, &target, &camera.up);
     // The automatic camera's near plane is for the scene; water may come nearer.
-    const float above = waterHeight ? camera.eye.y - *waterHeight : 0;
-    const float zNear = above > 0 ? std::min(camera.nearPlane, above / 2) : camera.nearPlane;
-    QexCamera_Project(&box_.largeCamera, camera.fov, camera.aspect, zNear * box_.scale, box_.size);
+    const float above = box_.waterEnabled ? eye.y + box_.waterHeight : 0;
+    const float zNear = camera.nearPlane * box_.scale;
+    QexCamera_Project(&box_.largeCamera, camera.fov, camera.aspect,
+                      above > 0 ? std::min(zNear, above / 2) : zNear, box_.size);
     box_.centre = eye;
     box_.sceneCamera = camera;
+}
+
+void Sky::Draw(QexRuntimeContext* engine, const QexCamera& camera, const DrawScene& drawOpaque,
+               const DrawScene& drawBlended) {
+    SetCamera(camera);
     box_.draw = &drawOpaque;
-    if (!created_) {
-        GLfloat clear[4];
-        glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
-        std::copy(clear, clear + 4, box_.waterColour);
-        waves_ = NewPictureTexture({kWaves, kWaves, scenes::Waves(kWaves)}, "waves");
-        box_.skyTexture = &texture_;
-        box_.waterNormalTexture = waves_;
-        box_.waterEnabled = waterHeight.has_value();
-        box_.waterHeight = -waterHeight.value_or(0) * box_.scale;
-        box_.camera = &box_.largeCamera;
-        box_.drawScene = CallDrawScene;
-        created_ = QexSkyBox_Create(&box_) == 0;
-    }
     QexSkyBox_Update(engine, &box_, 0);
     drawBlended(box_.sceneCamera);
 }

@@ -17,16 +17,18 @@ class Sky {
     Sky& operator=(const Sky&) = delete;
 
     // Takes one picture of a cross, 4 x 3 or 3 x 4 squares around the one towards -Z, or six squares, looks
-    // towards +X, -X, +Y, -Y, +Z and -Z; those up and down continue the one towards -Z. False, and what is
-    // wrong, when they are not that.
-    bool Load(const std::vector<std::string>& files, std::string* problem);
+    // towards +X, -X, +Y, -Y, +Z and -Z; those up and down continue the one towards -Z. Makes a sky for a
+    // scene of about that size and a camera like the first one, with water if there is a height. False, and
+    // what is wrong, when the pictures are not that.
+    bool Load(const std::vector<std::string>& files, const QexCamera& first, float sceneSize,
+              std::optional<float> waterHeight, std::string* problem);
 
-    // Draws a scene of about that size within the sky and, with a height, over the water. The camera is given
-    // the matrices of the sky's units: `drawOpaque` is called with it before the sky is drawn, and before,
-    // for the reflection, with a mirrored one; `drawBlended` at the end.
+    // Draws the scene within the sky and over the water. The camera is given the matrices of the sky's units:
+    // `drawOpaque` is called with it before the sky is drawn, and before that, for the reflection, with a
+    // mirrored one; `drawBlended` at the end.
     using DrawScene = std::function<void(const QexCamera& camera)>;
-    void Draw(QexRuntimeContext* engine, const QexCamera& camera, std::optional<float> waterHeight,
-              float sceneSize, const DrawScene& drawOpaque, const DrawScene& drawBlended);
+    void Draw(QexRuntimeContext* engine, const QexCamera& camera, const DrawScene& drawOpaque,
+              const DrawScene& drawBlended);
 
   private:
     // The record with what its callback needs.
@@ -36,10 +38,11 @@ class Sky {
         float scale;            // of them to the scene's
         const DrawScene* draw;
     };
+    bool LoadTexture(const std::vector<std::string>& files, std::string* problem);
+    void SetCamera(const QexCamera& camera);
     static void CallDrawScene(QexSkyBox* record, const QexMatrix* view, const QexMatrix* projection);
 
     QexTexture texture_ = {};
     QexTexture* waves_ = nullptr;
     Box box_ = {};
-    bool created_ = false;
 };

@@ -238,7 +238,7 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
                                    options, ParseSky);
     sky->excludes(mirror)->excludes(mirrorNode)->excludes(stereo)->excludes(dof);
     // The shadow map's end sets the viewport of the screen.
-    AddParsed(app, "--water", "Y, the height of still water, with --sky", options,
+    AddParsed(app, "--water", "Y, the height of still water, with --sky; mirrors what is opaque", options,
               ParseHeight<&EffectOptions::water>)
         ->needs(sky)
         ->excludes(shadow);
@@ -306,13 +306,14 @@ void SetUpTexture(CLI::App* app, TextureOptions* options) {
 void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
     app->add_option("FILE", options->input,
                     "emitter file, or description as text or JSON (the engine's defaults)");
-    app->add_option("-o,--output", options->output,
-                    "emitter file, or, ending in .txt or .json, description (text on standard output)");
+    CLI::Option* output =
+        app->add_option("-o,--output", options->output,
+                        "emitter file, or, ending in .txt or .json, description (text on standard output)");
     app->add_option("--set", options->settings, "FIELD=VALUE, values with commas between them, rows with ';'")
         ->type_size(1)
         ->expected(1, 1000)
         ->allow_extra_args(false);
-    app->add_flag("--json", options->json, "describe as JSON");
+    app->add_flag("--json", options->json, "show as JSON")->excludes(output);
     app->footer(
         "A description names the fields that differ from the defaults, one a line; what this command shows "
         "is\n"
@@ -358,6 +359,10 @@ int main(int argc, char** argv) {
     SetUpEmitter(emitterApp, &emitter);
     CLI::App* sheetApp = app.add_subcommand("sheet", "put several pictures into one");
     SetUpSheet(sheetApp, &sheet);
+    renderApp->parse_complete_callback([&render] {
+        const size_t count = render.effects.sky.size();
+        if (count > 1 && count != 6) throw CLI::ValidationError("--sky", "expected one picture, or six");
+    });
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
