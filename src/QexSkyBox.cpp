@@ -30,22 +30,16 @@ constexpr int8_t kCube[kFaces * 4][3] = {
     {-1, 1, 1},  {1, 1, 1},  {-1, 1, -1},  {1, 1, -1},  {-1, -1, -1}, {1, -1, -1}, {-1, -1, 1}, {1, -1, 1}};
 constexpr uint32_t kSkyBytes = sizeof kCube / sizeof kCube[0] * 3 * sizeof(float);
 
-// A texture to draw into.
-struct Target {
-    GLuint texture, framebuffer, depth;
-};
-
 bool s_Drawable;  // all of it is there
 float *s_SkyVertices, *s_SkyTexCoords;
 GLuint s_SkyBuffer;
-Target s_Reflection, s_Surface;
+QexRenderTarget s_Reflection, s_Surface;
 QexTexture s_Normalisation;
 
 QexVec4 s_Plane;
 QexMatrix s_View, s_Projection;
 GLint s_SavedFramebuffer;
 float s_WaterVertices[kMaxWaterVertices * 3];
-int32_t s_WaterVertexCount;
 
 void SetMatrix(GLint location, const QexMatrix& matrix) {
     QEX_GL(glUniformMatrix4fv(location, 1, GL_FALSE, matrix.m));
@@ -53,40 +47,18 @@ void SetMatrix(GLint location, const QexMatrix& matrix) {
 
 // ---- Set-up ----
 
-void CreateTexture(GLuint* texture) {
-    QEX_GL(glGenTextures(1, texture));
-    QexRenderState_Bind(GL_TEXTURE_2D, *texture);
-    QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, kTargetSize, kTargetSize, 0, GL_RGBA, GL_UNSIGNED_BYTE,
-                        nullptr));
-    QEX_GL(glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_LINEAR));
-    QEX_GL(glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MAG_FILTER, GL_LINEAR));
-    QEX_GL(glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE));
-    QEX_GL(glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE));
-}
-
-bool AttachTarget(Target* target) {
-    QEX_GL(glGenFramebuffers(1, &target->framebuffer));
-    QEX_GL(glGenRenderbuffers(1, &target->depth));
-    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer));
-    QexRenderer_SetBackFaceCulling(1);
-    QEX_GL(glEnable(GL_DEPTH_TEST));
-    QEX_GL(glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, target->texture, 0));
-    QEX_GL(glClear(GL_COLOR_BUFFER_BIT));
-    QEX_GL(glBindRenderbuffer(GL_RENDERBUFFER, target->depth));
-    QEX_GL(glRenderbufferStorage(GL_RENDERBUFFER, GL_DEPTH_COMPONENT16, kTargetSize, kTargetSize));
-    QEX_GL(glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_DEPTH_ATTACHMENT, GL_RENDERBUFFER, target->depth));
+// False, with a line, when the GL cannot draw into it.
+bool CreateTarget(QexRenderTarget* target) {
     GLenum status;
+    QexRenderTarget_Create(target, kTargetSize, kTargetSize, 0);
+    QexTexture_SetFilter(&target->colorTexture, QEX_FILTER_LINEAR);
+    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer));
+    QEX_GL(glClear(GL_COLOR_BUFFER_BIT));
     QEX_GL(status = glCheckFramebufferStatus(GL_FRAMEBUFFER));
+    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(target->savedFramebuffer)));
     if (status == GL_FRAMEBUFFER_COMPLETE) return true;
     QexSystem_Printf("ERROR: Frame buffer did not set up correctly\n");
     return false;
-}
-
-void DeleteTarget(Target* target) {
-    if (target->texture) QEX_GL(glDeleteTextures(1, &target->texture));
-    if (target->framebuffer) QEX_GL(glDeleteFramebuffers(1, &target->framebuffer));
-    if (target->depth) QEX_GL(glDeleteRenderbuffers(1, &target->depth));
-    *target = {0, 0, 0};
 }
 
 void SetCamera(const QexCamera& camera) {
@@ -153,13 +125,13 @@ void DrawWaterPlane(const QexCamera& camera) {
     QexMatrix inverse = ViewProjection();
     for (float& element : inverse.m) element *= camera.farPlane;
     QexMatrix_InverseEx(&inverse, &inverse);
-    s_WaterVertexCount = QexMath_CalculateInfinitePlane(s_WaterVertices, 3 * sizeof(float), &s_Plane,
-                                                        &inverse, &camera.eye, camera.farPlane);
+    const int32_t count = QexMath_CalculateInfinitePlane(s_WaterVertices, 3 * sizeof(float), &s_Plane,
+                                                         &inverse, &camera.eye, camera.farPlane);
     QEX_GL(glDisable(GL_CULL_FACE));
     QEX_GL(glEnableVertexAttribArray(0));
-    if (s_WaterVertexCount) {
+    if (count) {
         QEX_GL(glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, 3 * sizeof(float), s_WaterVertices));
-        QEX_GL(glDrawArrays(GL_TRIANGLE_FAN, 0, s_WaterVertexCount));
+        QEX_GL(glDrawArrays(GL_TRIANGLE_FAN, 0, count));
     }
     QEX_GL(glDisableVertexAttribArray(0));
     QEX_GL(glEnable(GL_CULL_FACE));
@@ -235,7 +207,7 @@ void DrawSurface(const QexSkyBox& box) {
     QexRenderState_UseProgram(g_QexWaterProgram.program);
     QexTexture_Set(box.waterNormalTexture, 0);
     QexRenderState_ActiveTexture(GL_TEXTURE1);
-    QexRenderState_Bind(GL_TEXTURE_2D, s_Reflection.texture);
+    QexRenderState_Bind(GL_TEXTURE_2D, s_Reflection.colorTexture.glName);
     QexRenderState_ActiveTexture(GL_TEXTURE2);
     QexRenderState_Bind(GL_TEXTURE_CUBE_MAP, s_Normalisation.glName);
     SetMatrix(g_QexWaterProgram.modelViewMatrix, s_View);
@@ -255,7 +227,7 @@ void DrawOnScreen(const QexRuntimeContext* context, const QexSkyBox& box) {
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &s_SavedFramebuffer));
     QexRenderState_UseProgram(m_PlaneTexShader.program);
     QexRenderState_ActiveTexture(GL_TEXTURE0);
-    QexRenderState_Bind(GL_TEXTURE_2D, s_Surface.texture);
+    QexRenderState_Bind(GL_TEXTURE_2D, s_Surface.colorTexture.glName);
     SetMatrix(m_PlaneTexShader.mvpMatrixLoc, ViewProjection());
     QEX_GL(glUniform2f(m_PlaneTexShader.rcpWindowSizeLoc, 1.0f / static_cast<float>(context->width),
                        1.0f / static_cast<float>(context->height)));
@@ -297,8 +269,6 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
         return -1;
     }
     QexSkyBox_Release();
-    GLint framebuffer = 0;
-    QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
     s_Plane = {0, 1, 0, box->waterHeight};
     QexSky_NewVertices(box->size * 0.5f, 1, box->skyTexture->width, &s_SkyVertices, &s_SkyTexCoords);
     if (!s_SkyVertices ||
@@ -306,8 +276,6 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
         QexSkyBox_Release();
         return -1;
     }
-    CreateTexture(&s_Reflection.texture);
-    CreateTexture(&s_Surface.texture);
     QEX_GL(glGenBuffers(1, &s_SkyBuffer));
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, s_SkyBuffer));
     QEX_GL(glBufferData(GL_ARRAY_BUFFER, kSkyBytes, s_SkyVertices, GL_STATIC_DRAW));
@@ -315,9 +283,7 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     const bool linked = QexSkyBox_CreatePrograms();
     SetCamera(*box->camera);
     QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
-    const bool complete = AttachTarget(&s_Reflection) && AttachTarget(&s_Surface);
-    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
-    if (!complete) return -1;
+    if (!CreateTarget(&s_Reflection) || !CreateTarget(&s_Surface)) return -1;
     QexRenderer_SetZWrite(1);
     QexRenderer_SetBackFaceCulling(1);
     QexRenderer_SetZTestFunc(3);
@@ -345,8 +311,9 @@ void QexSkyBox_Release(void) {
     QexMemory_Free(s_SkyVertices);
     QexMemory_Free(s_SkyTexCoords);
     s_SkyVertices = s_SkyTexCoords = nullptr;
-    DeleteTarget(&s_Reflection);
-    DeleteTarget(&s_Surface);
+    QexRenderTarget_Release(&s_Reflection);
+    QexRenderTarget_Release(&s_Surface);
+    QEX_GL_CHECK();
     if (s_Normalisation.glName) QexTexture_Release(&s_Normalisation);
     QexSkyBox_ReleasePrograms();
     if (s_SkyBuffer) QEX_GL(glDeleteBuffers(1, &s_SkyBuffer));

@@ -125,9 +125,6 @@ bool Sky::Load(const std::vector<std::string>& files, const QexCamera& first, fl
     waves_ = NewPictureTexture({kWaves, kWaves, scenes::Waves(kWaves)}, "waves");
     box_.scale = kSceneSize / sceneSize;
     box_.size = kFarDistance * first.farPlane * box_.scale;
-    GLfloat clear[4];
-    glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
-    std::copy(clear, clear + 4, box_.waterColour);
     box_.skyTexture = &texture_;
     box_.waterNormalTexture = waves_;
     box_.waterEnabled = waterHeight.has_value();
