@@ -1193,6 +1193,9 @@ typedef struct QexPODNode {
     QexShaderModule* shader;  /* draws the node; null: never drawn */
     uint8_t blendFlags;       /* QEX_NODE_OPAQUE */
     int32_t blendOrder;       /* for the application, see QexModel_SetAlphaBlendingNodesWithOrder */
+    /* Frames that have keys of their own, of position, rotation, scale and matrix; later frames hold the last
+       key. 0: all frames have. */
+    uint32_t keyFrames[4];
 } QexPODNode;
 
 /** The run-time part of a scene: current frame and world matrices. */
@@ -1465,7 +1468,8 @@ QEX_API void QexBoneBatches_Release(QexBoneBatches* batches);
 
 /** Moves every node whose animation is enabled to a frame (nodes of a speed other than 1 move a part of the
  *  way), wrapped into the animation.
- *  @param frame  in frames, fraction included, >= 0; what lies below 0 counts as 0 */
+ *  @param frame  in frames, fraction included; below 0 the loop is counted backwards from its end; what is no
+ *                finite number counts as 0 */
 QEX_API void QexPODModel_SetFrame(QexPODModel* scene, float frame);
 
 /** Sets one node's frame, wrapped by the frame count when it lies beyond the last.
@@ -1489,14 +1493,14 @@ QEX_API int32_t QexPODModel_SetNodeAnimationTime(QexPODModel* scene, uint32_t in
 QEX_API int32_t QexPODModel_SetNodeAnimationTimeByName(QexPODModel* scene, const char* name, float time);
 
 /** Sets the frame of every bone of a skinned mesh node (the nodes in its batches' bone lists). A node whose
- *  mesh is not skinned is left as it is.
- *  @return 0, or -12. */
+ *  mesh is not skinned, or that draws no mesh, is left as it is.
+ *  @return 0, or -12 for an index out of range. */
 QEX_API int32_t QexPODModel_SetMeshNodeBoneAnimationFrame(QexPODModel* scene, uint32_t index, float frame);
 
 /** The same for a node given directly. @return 0, or -9 when scene or node is null. */
 QEX_API int32_t QexPODModel_SetMeshNodeBoneAnimationFrameA(QexPODModel* scene, QexPODNode* node, float frame);
 
-/** The same by name. @return 0, -11, or -12 for a node that draws no mesh. */
+/** The same by name. @return 0, or -11 when no node has that name. */
 QEX_API int32_t QexPODModel_SetMeshNodeBoneAnimationFrameByName(QexPODModel* scene, const char* name,
                                                                 float frame);
 
@@ -3042,14 +3046,13 @@ QEX_API int32_t QexModel_SetNodeAnimationFrameByName(QexModel* model, const char
 QEX_API int32_t QexModel_SetNodeAnimationFrameR(QexModel* model, uint32_t nodeIndex, float frame);
 
 /** Sets the frame of every bone of a skinned mesh node; see QexPODModel_SetMeshNodeBoneAnimationFrame.
- *  @return 0 (also for a mesh without bones), or -12 for an index that is no mesh node's. */
+ *  @return 0 (also for a node without mesh or bones), or -12 for an index out of range. */
 QEX_API int32_t QexModel_SetMeshNodeBoneAnimationFrame(QexModel* model, uint32_t nodeIndex, float frame);
 
 /** QexModel_SetMeshNodeBoneAnimationFrame by name. @return as that, or -11 when no node has that name. */
 QEX_API int32_t QexModel_SetMeshNodeBoneAnimationFrameByName(QexModel* model, const char* name, float frame);
 
-/** QexModel_SetMeshNodeBoneAnimationFrame on a node and all below it. @return the last node's result, so -12
- *  when that one is no mesh node. */
+/** QexModel_SetMeshNodeBoneAnimationFrame on a node and all below it. @return the last node's result. */
 QEX_API int32_t QexModel_SetMeshNodeBoneAnimationFrameR(QexModel* model, uint32_t nodeIndex, float frame);
 
 /** Lets the shader modules draw a node, or not.

@@ -628,7 +628,7 @@ bool ReadVersion(Reader& reader, uint32_t length) {
 
 bool ReadBlocks(Reader& reader) {
     uint32_t id, length;
-    while (reader.Remaining() >= 8 && QexSourceStream_ReadMarker(reader.stream, &id, &length)) {
+    while (QexSourceStream_ReadMarker(reader.stream, &id, &length)) {
         bool read;
         if (id == kVersionBlock) {
             read = ReadVersion(reader, length);

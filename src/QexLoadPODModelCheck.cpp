@@ -11,10 +11,22 @@
 
 namespace {
 
+// Indices that may name what the scene does not have: they count as none. What they lead to is left out of
+// the picture; the rest of the scene is as good as ever.
+enum Reference {
+    kMaterialOfNode,
+    kTextureOfMaterial,
+    kTargetOfCamera,
+    kTargetOfLight,
+    kBoneOfBatch,
+    kReferences
+};
+
 struct Check {
     QexPODModel* scene;
     const char* kind;  // the record being checked
     uint32_t index;
+    uint32_t* dangling;  // how many indices of each Reference name nothing
 };
 
 bool Fail(const Check& at, const char* format, ...) QEX_PRINTF(2, 3);
@@ -31,6 +43,29 @@ bool Fail(const Check& at, const char* format, ...) {
 // An index that may be -1 for none.
 bool InRange(int32_t index, uint32_t count) {
     return index == -1 || static_cast<uint32_t>(index) < count;
+}
+
+// Makes an index that names nothing -1, and counts it.
+void Settle(const Check& at, Reference reference, int32_t* index, uint32_t count) {
+    if (InRange(*index, count)) return;
+    *index = -1;
+    ++at.dangling[reference];
+}
+
+void ReportDangling(const uint32_t* dangling) {
+    static const char* const lines[kReferences] = {
+        "%u node(s) name a material that is not there and are drawn without one",
+        "%u texture(s) that materials name are not there",
+        "%u camera(s) have a target that is not there",
+        "%u light(s) have a target that is not there",
+        "%u bone(s) of batches are not there; what follows them moves with its mesh",
+    };
+    for (int i = 0; i < kReferences; ++i) {
+        if (!dangling[i]) continue;
+        char text[128];
+        snprintf(text, sizeof text, lines[i], dangling[i]);
+        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %s", text);
+    }
 }
 
 // ---- Meshes ----
@@ -159,11 +194,8 @@ bool CheckBatch(const Check& at, int32_t batch) {
         batch + 1 < b.batchCount ? static_cast<uint32_t>(b.offsets[batch + 1]) : mesh.faceCount;
     if (bones < 0 || bones > b.maxBones)
         return Fail(at, "batch %d has %d bones of %d", batch, bones, b.maxBones);
-    for (int32_t i = 0; i < bones; ++i) {
-        const int32_t node = b.boneTable[int64_t{batch} * b.maxBones + i];
-        if (node < 0 || static_cast<uint32_t>(node) >= at.scene->nodeCount)
-            return Fail(at, "batch %d uses node %d of %u as a bone", batch, node, at.scene->nodeCount);
-    }
+    for (int32_t i = 0; i < bones; ++i)
+        Settle(at, kBoneOfBatch, &b.boneTable[int64_t{batch} * b.maxBones + i], at.scene->nodeCount);
     if (first > end || end > mesh.faceCount || (batch == 0 && first != 0))
         return Fail(at, "batch %d covers faces %u to %u of %u", batch, first, end, mesh.faceCount);
     const uint32_t size = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
@@ -246,39 +278,54 @@ bool CheckSkin(const Check& at, const uint32_t* extents) {
 struct Channel {
     const char* name;
     uint32_t bit;
-    uint32_t keyFloats;
+    uint32_t keyFloats;  // that are read of a key
+    uint32_t stride;     // floats from key to key
     uint32_t** index;
     float** keys;
     uint32_t shared;
 };
 
-// Keys for every frame, or the node stands still at its first.
-void CheckKeys(const Check& at, const Channel& channel, uint32_t indexCount, uint32_t floats) {
+// How many frames have keys of their own, of a channel that has one key at least; later frames hold the last.
+// Key indices that lead beyond the keys become the last key's.
+uint32_t CountKeyFrames(const Channel& channel, uint32_t indexCount, uint32_t floats, uint32_t frames,
+                        const char** fault) {
+    // The last key may be cut short behind what is read of it.
+    const uint32_t keys = (floats - channel.keyFloats) / channel.stride + 1;
+    uint32_t* index = *channel.index;
+    if (!index) {
+        if (keys < frames) *fault = "fewer keys than frames";
+        return keys < frames ? keys : frames;
+    }
+    if (indexCount < frames) *fault = "fewer key indices than frames";
+    const uint32_t indexed = indexCount < frames ? indexCount : frames;
+    for (uint32_t i = 0; i < indexed; ++i) {
+        if (uint64_t{index[i]} + channel.keyFloats <= floats) continue;
+        index[i] = (keys - 1) * channel.stride;
+        *fault = "key indices beyond its keys";
+    }
+    return indexed;
+}
+
+void CheckKeys(const Check& at, uint32_t number, const Channel& channel, uint32_t indexCount,
+               uint32_t floats) {
     QexPODNode& node = at.scene->nodes[at.index];
     const uint32_t frames = at.scene->frameCount ? at.scene->frameCount : 1;
     const char* fault = nullptr;
+    const bool animated = node.animationFlags & channel.bit;
     if (!*channel.keys) return;
     if (floats < channel.keyFloats) {
         fault = "not even one key";
         if (!(node.ownershipFlags & channel.shared)) QexMemory_Free(*channel.keys);
         node.ownershipFlags &= ~channel.shared;
         *channel.keys = nullptr;
-    } else if (!(node.animationFlags & channel.bit)) {
-        return;
-    } else if (!*channel.index) {
-        if (floats / channel.keyFloats < frames) fault = "fewer keys than frames";
-    } else if (indexCount < frames) {
-        fault = "fewer key indices than frames";
-    } else {
-        for (uint32_t i = 0; i < frames && !fault; ++i)
-            if (uint64_t{(*channel.index)[i]} + channel.keyFloats > floats)
-                fault = "a key index beyond its keys";
+        node.animationFlags &= ~channel.bit;
+    } else if (animated) {
+        const uint32_t keyed = CountKeyFrames(channel, indexCount, floats, frames, &fault);
+        if (keyed < frames) node.keyFrames[number] = keyed;
     }
-    if (!fault) return;
-    node.animationFlags &= ~channel.bit;
-    if (frames > 1)
-        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> node %u: %s has %s; it stands still", at.index,
-               channel.name, fault);
+    if (fault && frames > 1)
+        QexLog(QEX_TAG, "<QexPODModel_ReadFromSourceStream> node %u: %s has %s; %s", at.index, channel.name,
+               fault, *channel.keys ? "it holds the last key" : "it stands still");
 }
 
 // Walks up the parents, which must end at a root.
@@ -300,42 +347,34 @@ bool CheckNode(const Check& at, const uint32_t* extents) {
         return Fail(at, "it draws mesh %d of %u", node.objectIndex, at.scene->meshCount);
     // A node without the block, in a scene without materials.
     if (!at.scene->materialCount && !node.materialIndex) node.materialIndex = -1;
-    if (!InRange(node.materialIndex, at.scene->materialCount))
-        return Fail(at, "it uses material %d of %u", node.materialIndex, at.scene->materialCount);
+    if (at.index < at.scene->meshNodeCount)
+        Settle(at, kMaterialOfNode, &node.materialIndex, at.scene->materialCount);
+    else if (!InRange(node.materialIndex, at.scene->materialCount))
+        node.materialIndex = -1;  // lights, cameras and plain nodes draw nothing
     const Channel channels[] = {
-        {"position", QEX_NODE_POSITION_ANIMATED, 3, &node.positionIndex, &node.position,
+        {"position", QEX_NODE_POSITION_ANIMATED, 3, 3, &node.positionIndex, &node.position,
          QEX_NODE_SHARED_POSITION},
-        {"rotation", QEX_NODE_ROTATION_ANIMATED, 4, &node.rotationIndex, &node.rotation, 0},
-        // Only the first three of a scale key's seven floats are read; some exporters cut the last key short.
-        {"scale", QEX_NODE_SCALE_ANIMATED, 3, &node.scaleIndex, &node.scale, QEX_NODE_SHARED_SCALE},
-        {"matrix", QEX_NODE_MATRIX_ANIMATED, 16, &node.matrixIndex, &node.matrix, QEX_NODE_SHARED_MATRIX},
+        {"rotation", QEX_NODE_ROTATION_ANIMATED, 4, 4, &node.rotationIndex, &node.rotation, 0},
+        // Some exporters cut the last key behind its first three floats, which are all that is read.
+        {"scale", QEX_NODE_SCALE_ANIMATED, 3, 7, &node.scaleIndex, &node.scale, QEX_NODE_SHARED_SCALE},
+        {"matrix", QEX_NODE_MATRIX_ANIMATED, 16, 16, &node.matrixIndex, &node.matrix, QEX_NODE_SHARED_MATRIX},
     };
-    for (uint32_t i = 0; i < 4; ++i) {
-        Channel channel = channels[i];
-        // Without an index, scale keys lie seven floats apart.
-        const uint32_t frames = at.scene->frameCount ? at.scene->frameCount : 1;
-        uint32_t floats = extents[kExtentPosition + i];
-        if (i == 2 && !*channel.index && (node.animationFlags & channel.bit) && floats >= 3)
-            floats = uint64_t{frames - 1} * 7 + 3 <= floats ? 3 * frames : 3;
-        CheckKeys(at, channel, extents[kExtentPositionIndex + i], floats);
-    }
+    for (uint32_t i = 0; i < 4; ++i)
+        CheckKeys(at, i, channels[i], extents[kExtentPositionIndex + i], extents[kExtentPosition + i]);
     return CheckParents(at);
 }
 
 // ---- The rest ----
 
-bool CheckMaterial(const Check& at) {
-    const QexPODMaterial& material = at.scene->materials[at.index];
-    for (const int32_t* index = &material.diffuseTexture; index <= &material.refractionTexture; ++index)
-        if (!InRange(*index, at.scene->textureCount))
-            return Fail(at, "it uses texture %d of %u", *index, at.scene->textureCount);
-    return true;
+void CheckMaterial(const Check& at) {
+    QexPODMaterial& material = at.scene->materials[at.index];
+    for (int32_t* index = &material.diffuseTexture; index <= &material.refractionTexture; ++index)
+        Settle(at, kTextureOfMaterial, index, at.scene->textureCount);
 }
 
-bool CheckCamera(const Check& at, const uint32_t* extents) {
+void CheckCamera(const Check& at, const uint32_t* extents) {
     QexPODCamera& camera = at.scene->cameras[at.index];
-    if (!InRange(camera.targetIndex, at.scene->nodeCount))
-        return Fail(at, "its target is node %d of %u", camera.targetIndex, at.scene->nodeCount);
+    Settle(at, kTargetOfCamera, &camera.targetIndex, at.scene->nodeCount);
     if (camera.animatedFov && extents[kExtentFov] < (at.scene->frameCount ? at.scene->frameCount : 1)) {
         QexLog(QEX_TAG,
                "<QexPODModel_ReadFromSourceStream> camera %u: fewer fields of view than frames; it keeps one",
@@ -343,7 +382,6 @@ bool CheckCamera(const Check& at, const uint32_t* extents) {
         QexMemory_Free(camera.animatedFov);
         camera.animatedFov = nullptr;
     }
-    return true;
 }
 
 bool CheckCounts(QexPODModel* scene) {
@@ -385,7 +423,8 @@ void QexPODMesh_ReadInfluences(const QexPODMesh* mesh, uint32_t vertex, float bo
 
 bool QexLoadPODModel_Check(QexPODModel* scene, QexPODExtents* const extents[kPODKinds]) {
     if (!CheckCounts(scene)) return false;
-    Check at = {scene, "mesh", 0};
+    uint32_t dangling[kReferences] = {};
+    Check at = {scene, "mesh", 0, dangling};
     for (at.index = 0; at.index < scene->meshCount; ++at.index) {
         const uint32_t* lengths = extents[kPODMesh][at.index];
         if (!CheckElements(at, lengths) || !CheckFaces(at, lengths) || !CheckSkin(at, lengths)) return false;
@@ -394,15 +433,12 @@ bool QexLoadPODModel_Check(QexPODModel* scene, QexPODExtents* const extents[kPOD
     for (at.index = 0; at.index < scene->nodeCount; ++at.index)
         if (!CheckNode(at, extents[kPODNode][at.index])) return false;
     at.kind = "material";
-    for (at.index = 0; at.index < scene->materialCount; ++at.index)
-        if (!CheckMaterial(at)) return false;
+    for (at.index = 0; at.index < scene->materialCount; ++at.index) CheckMaterial(at);
     at.kind = "camera";
     for (at.index = 0; at.index < scene->cameraCount; ++at.index)
-        if (!CheckCamera(at, extents[kPODCamera][at.index])) return false;
-    at.kind = "light";
-    for (at.index = 0; at.index < scene->lightCount; ++at.index)
-        if (!InRange(scene->lights[at.index].targetIndex, scene->nodeCount))
-            return Fail(at, "its target is node %d of %u", scene->lights[at.index].targetIndex,
-                        scene->nodeCount);
+        CheckCamera(at, extents[kPODCamera][at.index]);
+    for (uint32_t i = 0; i < scene->lightCount; ++i)
+        Settle(at, kTargetOfLight, &scene->lights[i].targetIndex, scene->nodeCount);
+    ReportDangling(dangling);
     return true;
 }

@@ -249,7 +249,8 @@ void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
     const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, meshNodeIndex);
     QexMatrix world;
     if (mesh->skinned && mesh->boneBatches.batchCount > 0 && mesh->boneBatches.bonesPerBatch[0] > 0) {
-        QexPODModel_GetBoneWorldMatrix(scene, &world, node, &scene->nodes[mesh->boneBatches.boneTable[0]]);
+        QexPODNode* bone = QexPODAnimation_BoneNode(scene, node, mesh->boneBatches.boneTable[0]);
+        QexPODModel_GetBoneWorldMatrix(scene, &world, node, bone);
     } else {
         QexPODModel_GetWorldMatrix(scene, &world, node);
         if (modelMatrix) QexMatrix_Multiply(&world, modelMatrix, &world);

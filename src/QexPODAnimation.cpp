@@ -38,6 +38,14 @@ float WrapNodeFrame(const QexPODModel* scene, float frame) {
     return frame > last ? fmodf(frame, static_cast<float>(scene->frameCount)) : frame;
 }
 
+// A frame within the loop of `last` frames, whose end is its start.
+float WrapLoop(float frame, float last) {
+    if (frame >= last) return fmodf(frame, last);
+    if (frame >= 0) return frame;
+    const float rest = fmodf(frame, last);
+    return rest < 0 ? rest + last : 0;
+}
+
 // The two frames around a node's current one; beyond the last key there is only the last.
 struct Frames {
     uint32_t a;
@@ -50,8 +58,15 @@ Frames FindFrames(const QexPODModel* scene, const QexPODNode* node) {
     return {a, a < last ? a + 1 : last};
 }
 
-// Where a frame's key starts in its channel's data, in floats.
-uint64_t KeyOffset(const uint32_t* index, uint32_t frame, uint32_t keyFloats) {
+// The channels of a node, as QexPODNode::keyFrames counts them.
+enum Channel { kPosition, kRotation, kScale, kMatrix };
+
+// Where a frame's key starts in its channel's data, in floats. Frames beyond the channel's keys hold the
+// last.
+uint64_t KeyOffset(const QexPODNode* node, Channel channel, const uint32_t* index, uint32_t frame,
+                   uint32_t keyFloats) {
+    const uint32_t keyed = node->keyFrames[channel];
+    if (keyed && frame >= keyed) frame = keyed - 1;
     return index ? index[frame] : uint64_t{frame} * keyFloats;
 }
 
@@ -64,22 +79,24 @@ T LoadKey(const float* data, uint64_t offset) {
 }
 
 // Position or scale between two frames.
-inline QexVec3 InterpolateVec3(const QexPODNode* node, const Frames& frames, const float* data,
-                               const uint32_t* index, uint32_t keyFloats, uint32_t animatedBit) {
+inline QexVec3 InterpolateVec3(const QexPODNode* node, Channel channel, const Frames& frames,
+                               const float* data, const uint32_t* index, uint32_t keyFloats,
+                               uint32_t animatedBit) {
     if (!(node->animationFlags & animatedBit)) return LoadKey<QexVec3>(data, 0);
-    const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(index, frames.a, keyFloats));
-    const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(index, frames.b, keyFloats));
+    const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(node, channel, index, frames.a, keyFloats));
+    const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(node, channel, index, frames.b, keyFloats));
     QexVec3 result;
     QexVec3_Lerp(&result, &a, &b, node->frameFraction);
     return result;
 }
 
 inline QexVec3 Position(const QexPODNode* node, const Frames& frames) {
-    return InterpolateVec3(node, frames, node->position, node->positionIndex, 3, QEX_NODE_POSITION_ANIMATED);
+    return InterpolateVec3(node, kPosition, frames, node->position, node->positionIndex, 3,
+                           QEX_NODE_POSITION_ANIMATED);
 }
 
 inline QexVec3 Scale(const QexPODNode* node, const Frames& frames) {
-    return InterpolateVec3(node, frames, node->scale, node->scaleIndex, 7, QEX_NODE_SCALE_ANIMATED);
+    return InterpolateVec3(node, kScale, frames, node->scale, node->scaleIndex, 7, QEX_NODE_SCALE_ANIMATED);
 }
 
 void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames) {
@@ -89,10 +106,11 @@ void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames
     }
     QexQuaternion q = LoadKey<QexQuaternion>(node->rotation, 0);
     if (node->animationFlags & QEX_NODE_ROTATION_ANIMATED) {
+        const uint32_t* index = node->rotationIndex;
         const QexQuaternion a =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.a, 4));
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node, kRotation, index, frames.a, 4));
         const QexQuaternion b =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, frames.b, 4));
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node, kRotation, index, frames.b, 4));
         QexQuaternion_Slerp(&q, &a, &b, node->frameFraction);
     }
     QexQuaternion_ToRotationMatrix(out, &q);
@@ -239,9 +257,9 @@ void QexPODModel_SetFrame(QexPODModel* scene, float frame) {
     impl->frameInteger = 0;
     if (scene->frameCount < 2) return;
     const float last = static_cast<float>(LastFrame(scene));
-    const float target = frame > 0 && frame < 4294967040.0f ? frame : 0;
+    const float target = frame > -4294967040.0f && frame < 4294967040.0f ? frame : 0;
     // Whole turns are taken off while the frame lies beyond the last; the last itself stays.
-    float wrapped = target;
+    float wrapped = target < 0 ? WrapLoop(target, last) : target;
     if (target > last) {
         wrapped = fmodf(target, last);
         if (wrapped == 0) wrapped = last;
@@ -253,9 +271,8 @@ void QexPODModel_SetFrame(QexPODModel* scene, float frame) {
         const float current = NodeKey(node);
         const float goal = current < target ? target : target + last;
         // A node of full speed lands on the frame itself, free of the rounding of the sum.
-        float next = node->speed == 1 ? target : current + (goal - current) * node->speed;
-        if (next >= last) next = fmodf(next, last);
-        SetNodeFrame(node, next);
+        const float next = node->speed == 1 ? target : current + (goal - current) * node->speed;
+        SetNodeFrame(node, WrapLoop(next, last));
     }
 }
 
@@ -293,13 +310,16 @@ int32_t QexPODModel_SetNodeAnimationTimeByName(QexPODModel* scene, const char* n
 }
 
 int32_t QexPODModel_SetMeshNodeBoneAnimationFrame(QexPODModel* scene, uint32_t index, float frame) {
-    if (index >= scene->meshNodeCount) return kIndexOutOfRange;
+    if (index >= scene->nodeCount) return kIndexOutOfRange;
     return QexPODModel_SetMeshNodeBoneAnimationFrameA(scene, &scene->nodes[index], frame);
 }
 
 int32_t QexPODModel_SetMeshNodeBoneAnimationFrameA(QexPODModel* scene, QexPODNode* node, float frame) {
     if (!scene || !node) return kNullArgument;
-    if (static_cast<uint32_t>(node->objectIndex) >= scene->meshCount) return kIndexOutOfRange;
+    // Lights, cameras and plain nodes have no mesh, and so no bones.
+    const bool inScene = node >= scene->nodes && node < scene->nodes + scene->nodeCount;
+    if (inScene && node >= scene->nodes + scene->meshNodeCount) return 0;
+    if (static_cast<uint32_t>(node->objectIndex) >= scene->meshCount) return 0;
     const QexPODMesh& mesh = scene->meshes[node->objectIndex];
     const QexBoneBatches& batches = mesh.boneBatches;
     if (!mesh.skinned) return 0;
@@ -394,8 +414,9 @@ void QexPODModel_GetTransformationMatrix(const QexPODModel* scene, QexMatrix* ou
     QexMatrix_Identity(out);
     if (!node->matrix) return;
     const bool animated = node->animationFlags & QEX_NODE_MATRIX_ANIMATED;
+    const uint32_t frame = FindFrames(scene, node).a;
     *out = LoadKey<QexMatrix>(node->matrix,
-                              animated ? KeyOffset(node->matrixIndex, FindFrames(scene, node).a, 16) : 0);
+                              animated ? KeyOffset(node, kMatrix, node->matrixIndex, frame, 16) : 0);
 }
 
 void QexPODModel_GetWorldMatrixNoCache(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {

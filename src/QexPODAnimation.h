@@ -11,3 +11,9 @@ const QexMatrix* QexPODAnimation_WorldMatrix(QexPODModel* scene, QexPODNode* nod
 // for the mesh node that asked last, so that batches, passes and eyes share it.
 const QexMatrix* QexPODAnimation_BoneMatrix(QexPODModel* scene, const QexPODNode* meshNode,
                                             QexPODNode* boneNode);
+
+// The node of an entry of a bone table. An entry of -1, a bone that the scene does not have, stands for the
+// mesh node itself: what follows it moves as the mesh would without bones.
+inline QexPODNode* QexPODAnimation_BoneNode(QexPODModel* scene, QexPODNode* meshNode, int32_t bone) {
+    return bone < 0 ? meshNode : &scene->nodes[bone];
+}

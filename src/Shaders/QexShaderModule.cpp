@@ -228,7 +228,8 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
                                  : mesh->faceCount;
         QEX_GL(glUniform1i(bones.boneCountLocation, mesh->attributes[QEX_ELEMENT_BONE_INDEX].componentCount));
         for (int32_t j = 0; j < count; ++j) {
-            const QexMatrix* matrix = QexPODAnimation_BoneMatrix(scene, node, &scene->nodes[bone[j]]);
+            const QexMatrix* matrix =
+                QexPODAnimation_BoneMatrix(scene, node, QexPODAnimation_BoneNode(scene, node, bone[j]));
             if (bones.modelMatrix)
                 QexMatrix_Multiply(&matrices[j], bones.modelMatrix, matrix);
             else

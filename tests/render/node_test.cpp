@@ -98,8 +98,10 @@ TEST_F(NodeTest, SubtreesAreWalkedDepthFirst) {
     EXPECT_EQ(hide(4, 1), "ABDF");
     EXPECT_EQ(hide(0, 0), "F");  // G, the last, was hidden
     EXPECT_EQ(hide(~0u, 0), "F");
-    // The lamp, the last below the skinned node, draws no mesh.
-    EXPECT_EQ(QexModel_SetMeshNodeBoneAnimationFrameR(&skinned.model, everything::kSkinned, 2), -12);
+    // The lamp, the last below the skinned node, draws no mesh, which is no mistake.
+    EXPECT_EQ(QexModel_SetMeshNodeBoneAnimationFrameR(&skinned.model, everything::kSkinned, 2), 0);
+    EXPECT_EQ(QexModel_SetMeshNodeBoneAnimationFrame(&skinned.model, everything::kKnee, 3), 0);
+    EXPECT_EQ(QexModel_SetMeshNodeBoneAnimationFrame(&skinned.model, 99, 3), -12);
     EXPECT_EQ(skinned.Node(everything::kKnee).frame, 2u);
     EXPECT_EQ(QexModel_SetNodeAnimationFrameR(&skinned.model, everything::kHip, 2.5f), 0);
     EXPECT_EQ(skinned.Node(everything::kKnee).frameFraction, 0.5f);

@@ -143,6 +143,11 @@ TEST_F(SkinningTest, EachBatchSendsItsBonesAndDrawsItsTriangles) {
     const glm::vec4 farthest = skeleton.Skinning(1) * glm::vec4(83, 58, 0, 1);
     const QexVec3& corner = model.model.nodeBoxes[0].corners[7];
     EXPECT_LT(glm::distance(glm::vec3(corner.x, corner.y, corner.z), glm::vec3(farthest)), 1e-3f);
+    // What follows a bone that the scene does not have goes with the mesh node.
+    model.model.scene.meshes[0].boneBatches.boneTable[1] = -1;
+    const GLCalls calls([&] { model.Draw(); });
+    const float* second = static_cast<const float*>(calls.Of({"glUniformMatrix4fv"}).at(1)->data) + 16;
+    EXPECT_TRUE(SameMatrix(second, glm::translate(glm::mat4(1), skeleton.mesh)));
     model.Node().stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
     EXPECT_EQ(GLCalls([&] { model.Draw(); }).Size(), 0u);
 }

@@ -149,8 +149,8 @@ class SceneWalk {
         for (int32_t batch = 0; batch < b.batchCount; ++batch)
             for (int32_t i = 0; i < b.bonesPerBatch[batch]; ++i) {
                 QexMatrix m;
-                QexPODModel_GetBoneWorldMatrix(scene_, &m, node,
-                                               &scene_->nodes[b.boneTable[batch * b.maxBones + i]]);
+                const int32_t bone = b.boneTable[batch * b.maxBones + i];
+                QexPODModel_GetBoneWorldMatrix(scene_, &m, node, bone < 0 ? node : &scene_->nodes[bone]);
                 Add(m.m, 16);
             }
         for (uint32_t i = 0; i < 3 * mesh.faceCount; ++i) {

@@ -94,8 +94,9 @@ TEST_F(PodAnimation, SetFrameWrapsAndSpeedsDiffer) {
         uint32_t sceneInteger;
         float sceneFraction;
         uint32_t nodeInteger;
-    } cases[] = {{25, 5, 0, 5},  {3.25f, 3, 0.25f, 3}, {9.5f, 9, 0.5f, 9}, {10, 10, 0, 0},
-                 {20, 10, 0, 0}, {10.5f, 0, 0.5f, 0},  {-3, 0, 0, 0},      {0, 0, 0, 0}};
+    } cases[] = {{25, 5, 0, 5},       {3.25f, 3, 0.25f, 3}, {9.5f, 9, 0.5f, 9}, {10, 10, 0, 0},
+                 {20, 10, 0, 0},      {10.5f, 0, 0.5f, 0},  {-3, 7, 0, 7},      {-13, 7, 0, 7},
+                 {-0.5f, 9, 0.5f, 9}, {-10, 0, 0, 0},       {0, 0, 0, 0}};
     for (const auto& c : cases) {
         QexPODModel_SetFrame(scene_, c.frame);
         EXPECT_EQ(scene_->runtime->frameInteger, c.sceneInteger) << c.frame;

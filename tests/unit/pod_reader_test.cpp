@@ -244,6 +244,15 @@ TEST(PodReader, VersionByteOrderAndOptions) {
         EXPECT_EQ(loaded.scene.runtime != nullptr, !c.error);
         EXPECT_NE(loaded.Error().find(c.error ? c.error : ""), std::string::npos) << loaded.log;
     }
+    // A marker cut after its identifier ends the file, with a line; less is no marker.
+    for (size_t stray = 1; stray < 8; ++stray) {
+        std::vector<uint8_t> file = empty.bytes;
+        file.resize(file.size() + stray, 7);
+        const LoadedPod loaded(file);
+        EXPECT_EQ(loaded.result, 0);
+        EXPECT_EQ(loaded.log.find("<QexSourceStream_ReadMarker> read marker fail") != std::string::npos,
+                  stray >= 4);
+    }
     EXPECT_EQ(LoadedPod(swapped.bytes).out, "  - POD endianness mismatch!\n");
     EXPECT_EQ(LoadedPod(empty.bytes).out, "  - POD version string AB.POD.2.0\n");
 }

@@ -38,7 +38,7 @@ void CollectSkinned(QexPODModel* scene, uint32_t meshNode, uint32_t step, std::v
         const int32_t* bones = batches.boneTable + static_cast<ptrdiff_t>(b) * batches.maxBones;
         for (int32_t i = 0; i < batches.bonesPerBatch[b]; ++i)
             QexPODModel_GetBoneWorldMatrix(scene, &matrices[static_cast<size_t>(i)], node,
-                                           &scene->nodes[bones[i]]);
+                                           bones[i] < 0 ? node : &scene->nodes[bones[i]]);
         const uint32_t end =
             b + 1 < batches.batchCount ? static_cast<uint32_t>(batches.offsets[b + 1]) : mesh.faceCount;
         for (uint32_t i = static_cast<uint32_t>(batches.offsets[b]) * 3; i < end * 3; i += step) {
