@@ -3269,11 +3269,16 @@ QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
  * Text
  *
  * One built-in font of 8 x 16 pixel glyphs, one per process. A persistent text is built up with AddString and
- * ReplaceString and drawn every frame by QexFont_Draw; temporary strings and numbers are drawn at once. x
- * counts from the left edge of the surface, y downwards: a glyph covers the heights H + 16 - y to H + 32 - y
- * above the lower edge of a surface H pixels high, so at y = 32 it touches the upper edge. Characters outside
- * 32 to 127 are drawn as an empty box. Each 64 glyphs are one draw. Needs a current GL context, except where
- * a function says not.
+ * ReplaceString and drawn every frame by QexFont_Draw; temporary strings and numbers are drawn at once.
+ *
+ * (x, y) places a text's upper left corner, x from the left edge of the surface, y downwards, but y is
+ * counted from 32 pixels above the surface: y = 32 is its upper edge, and a first line that is to stand 8
+ * pixels below the edge has y = 40. Below y = 32 it is cut off, at y = 16 and less it cannot be seen.
+ *
+ * Strings are UTF-8. The characters 32 to 127 and 160 to 255 (Latin-1) have glyphs, others are drawn as an
+ * empty box; a line feed starts a new line below the first. Lines are 16 pixels high, characters 8 wide,
+ * times the scale. Up to 64 glyphs are one draw, fewer where characters below and above 127 mix. Needs a
+ * current GL context, except where a function says not.
  * ====================================================================================================== */
 
 /** The font sheet: RGBA8888, 256 x 48, first row first; 32 columns and 3 rows of cells 8 x 16 with the
@@ -3284,10 +3289,12 @@ QEX_API extern const uint8_t fontdata[49152];
  *  @return 0 (also when it exists already), or -1 when the shaders or memory cannot be had. */
 QEX_API int32_t QexFont_Create(int32_t width, int32_t height);
 
-/** Creates the font's program and texture; QexFont_Create calls it. @return 0, or -1. */
+/** Creates the font's program and texture, in place of those that there are; QexFont_Create calls it.
+ *  @return 0, or -1, with the GL's reason in the log, when the program cannot be built. */
 QEX_API int32_t QexFont_CreateShader(void);
 
-/** Deletes the font's program and shaders. @param ignored  not read */
+/** Deletes the font's program and shaders. Until QexFont_CreateShader makes them again, text and textures on
+ *  the screen are not drawn, which the log says once. @param ignored  not read */
 QEX_API void QexFont_ReleaseShader(int32_t ignored);
 
 /** Releases the font. @return the log call's result. */
@@ -3298,7 +3305,7 @@ QEX_API int32_t QexFont_Release(void);
  *  @param context     the engine's context; its height is read
  *  @param x, y        pixels
  *  @param r, g, b, a  0 to 255
- *  @return the string's length; 0, with a line in the log, before the font is created. */
+ *  @return the string's length in bytes; 0, with a line in the log, before the font is created. */
 QEX_API int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                                   int32_t r, int32_t g, int32_t b, int32_t a);
 
@@ -3307,11 +3314,22 @@ QEX_API int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, i
 QEX_API int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32_t y,
                                       const char* string, int32_t r, int32_t g, int32_t b, int32_t a);
 
+/** Sets the size of the texts that are given from now on; those that there are keep theirs. QexFont_Create
+ * sets it to 1. No GL context needed.
+ *  @param scale  pixels of the screen for a pixel of the glyphs, above 0, at most 1000; whole numbers look
+ * best
+ *  @return 0; -1, and no change, for a scale out of range. */
+QEX_API int32_t QexFont_SetScale(float scale);
+
+/** Measures a string as it would be drawn now: its longest line and all its lines. No GL context needed.
+ *  @param width, height  out, pixels; either may be null */
+QEX_API void QexFont_MeasureString(const char* string, float* width, float* height);
+
 /** Empties the persistent text. No GL context needed. */
 QEX_API void QexFont_ClearString(void);
 
 /** Draws the persistent text from the engine's own memory: no GL buffer may be bound. Leaves blending on
- * (source alpha over), the depth function at less or equal. */
+ *  (source alpha over), the depth function at less or equal, texture unit 3 active. */
 QEX_API void QexFont_Draw(void);
 
 /** Draws a string at once. The longest so far decides how much memory is kept for it. Leaves the state that

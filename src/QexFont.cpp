@@ -1,9 +1,11 @@
+// Text: strings are laid out as quads of glyphs, kept or drawn at once.
 #include "QexFont.h"
 
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 
+#include "QexFontLatin.h"
 #include "QexGL.h"
 #include "QexMemory.h"
 #include "QexShader.h"
@@ -19,9 +21,12 @@ constexpr int32_t kSheetHeight = 48;
 constexpr uint32_t kSheetColumns = 32;
 constexpr uint32_t kFirstCharacter = 32;
 constexpr uint32_t kLastCharacter = 127;
+constexpr uint32_t kFirstLatin = 160;
+constexpr uint32_t kLastLatin = 255;
 constexpr uint32_t kInitialCapacity = 80;
 constexpr uint32_t kTemporaryCapacity = 16;
 constexpr uint32_t kStripGlyphs = 64;  // that byte indices reach
+constexpr float kMaxScale = 1000;
 
 const char* const kVertexSource = R"(#version 100
 attribute highp vec4 a_v4Position;
@@ -60,15 +65,21 @@ struct Glyphs {
     float (*positions)[4][3];
     float (*texCoords)[4][2];
     Colour (*colours)[4];
+    uint8_t* sheets;  // which sheet each is on
     uint8_t* indices;
     uint32_t capacity;
     uint32_t count;
 };
 
+// The sheets: the font's own and, made when the first text asks for it, that of Latin-1.
+enum Sheet : uint8_t { kPlainSheet, kLatinSheet, kSheets };
+
 bool s_Created;
+bool s_ToldNoProgram;
+float s_Scale = 1;
 Glyphs s_Text;
 Glyphs s_Temporary;
-QexTexture s_Texture;
+QexTexture s_Sheets[kSheets];
 QexFontProgram s_Program;
 QexMatrix s_Projection;
 
@@ -80,12 +91,16 @@ uint32_t FirstStrip(uint32_t glyphs) {
     return glyphs < kStripGlyphs ? glyphs : kStripGlyphs;
 }
 
-// Makes room for that many glyphs; false when memory runs out.
+// Makes room for that many glyphs, and some more: texts are often added piece by piece. False when memory
+// runs out.
 bool Reserve(Glyphs* glyphs, uint32_t count) {
     if (count <= glyphs->capacity) return true;
+    const uint32_t grown = glyphs->capacity + glyphs->capacity / 2;
+    if (count < grown) count = grown;
     if (!QexMemory_Resize(glyphs->positions, uint64_t{count} * sizeof *glyphs->positions) ||
         !QexMemory_Resize(glyphs->texCoords, uint64_t{count} * sizeof *glyphs->texCoords) ||
         !QexMemory_Resize(glyphs->colours, uint64_t{count} * sizeof *glyphs->colours) ||
+        !QexMemory_Resize(glyphs->sheets, count) ||
         !QexMemory_Resize(glyphs->indices, IndexCount(FirstStrip(count))))
         return false;
     glyphs->capacity = count;
@@ -96,6 +111,7 @@ void FreeGlyphs(Glyphs* glyphs) {
     QexMemory_Free(glyphs->positions);
     QexMemory_Free(glyphs->texCoords);
     QexMemory_Free(glyphs->colours);
+    QexMemory_Free(glyphs->sheets);
     QexMemory_Free(glyphs->indices);
     *glyphs = {};
 }
@@ -114,32 +130,84 @@ void BuildIndices(Glyphs* glyphs) {
     }
 }
 
+// Takes the next character of UTF-8 text. A byte that starts none stands for itself, as a character that no
+// sheet has.
+uint32_t NextCharacter(const char** text) {
+    const uint8_t* bytes = reinterpret_cast<const uint8_t*>(*text);
+    const uint32_t follow = bytes[0] >= 0xF0 ? 3 : bytes[0] >= 0xE0 ? 2 : bytes[0] >= 0xC0 ? 1 : 0;
+    uint32_t character = follow ? bytes[0] & (0x3Fu >> follow) : bytes[0];
+    for (uint32_t i = 1; i <= follow; ++i) {
+        if ((bytes[i] & 0xC0) != 0x80) {
+            *text += 1;
+            return bytes[0] < kFirstLatin ? bytes[0] : UINT32_MAX;
+        }
+        character = character << 6 | (bytes[i] & 0x3Fu);
+    }
+    *text += follow + 1;
+    return character >= 0x80 && !follow ? UINT32_MAX : character;
+}
+
+uint32_t CountGlyphs(const char* string) {
+    uint32_t count = 0;
+    while (*string)
+        if (NextCharacter(&string) != '\n') ++count;
+    return count;
+}
+
+// Where a character's glyph lies, in cells of its sheet.
+struct Cell {
+    Sheet sheet;
+    int32_t column, row;
+};
+Cell FindCell(uint32_t character) {
+    const bool latin = character >= kFirstLatin && character <= kLastLatin;
+    const bool plain = character >= kFirstCharacter && character <= kLastCharacter;
+    const uint32_t cell =
+        latin ? character - kFirstLatin : (plain ? character : kLastCharacter) - kFirstCharacter;
+    return {latin ? kLatinSheet : kPlainSheet, static_cast<int32_t>(cell % kSheetColumns),
+            static_cast<int32_t>(cell / kSheetColumns)};
+}
+
 // Vertex i of a quad lies right for odd i and up for i > 1.
-void WriteGlyph(Glyphs* glyphs, uint32_t slot, float left, float bottom, uint8_t character,
+void WriteGlyph(Glyphs* glyphs, uint32_t slot, float left, float bottom, const Cell& cell,
                 const Colour& colour) {
-    const uint32_t known =
-        character >= kFirstCharacter && character <= kLastCharacter ? character : kLastCharacter;
-    const uint32_t cell = known - kFirstCharacter;
-    const int32_t s = static_cast<int32_t>(cell % kSheetColumns) * kGlyphWidth;
-    const int32_t t = static_cast<int32_t>(cell / kSheetColumns) * kGlyphHeight;
+    // Enlarged, the filter would reach into the next cells.
+    const float inset = s_Scale > 1 ? 0.5f - 0.5f / s_Scale : 0;
+    const float s[2] = {static_cast<float>(cell.column * kGlyphWidth) + inset,
+                        static_cast<float>((cell.column + 1) * kGlyphWidth) - inset};
+    const float t[2] = {static_cast<float>((cell.row + 1) * kGlyphHeight) - inset,
+                        static_cast<float>(cell.row * kGlyphHeight) + inset};
+    glyphs->sheets[slot] = cell.sheet;
     for (int i = 0; i < 4; ++i) {
         const int32_t right = i & 1, up = i >> 1;
         float* position = glyphs->positions[slot][i];
-        position[0] = left + static_cast<float>(right * kGlyphWidth);
-        position[1] = bottom + static_cast<float>(up * kGlyphHeight);
+        position[0] = left + static_cast<float>(right * kGlyphWidth) * s_Scale;
+        position[1] = bottom + static_cast<float>(up * kGlyphHeight) * s_Scale;
         position[2] = 0;
-        glyphs->texCoords[slot][i][0] = static_cast<float>(s + right * kGlyphWidth) / kSheetWidth;
-        glyphs->texCoords[slot][i][1] = static_cast<float>(t + (1 - up) * kGlyphHeight) / kSheetHeight;
+        glyphs->texCoords[slot][i][0] = s[right] / kSheetWidth;
+        glyphs->texCoords[slot][i][1] = t[up] / kSheetHeight;
         glyphs->colours[slot][i] = colour;
     }
 }
 
+// A text's upper edge is two lines above its y, whatever its scale.
 void WriteString(Glyphs* glyphs, uint32_t slot, const QexRuntimeContext* context, int32_t x, int32_t y,
                  const char* string, const Colour& colour) {
-    const float bottom = static_cast<float>(context->height) + kGlyphHeight - static_cast<float>(y);
-    for (uint32_t i = 0; slot + i < glyphs->count; ++i)
-        WriteGlyph(glyphs, slot + i, static_cast<float>(x) + static_cast<float>(i) * kGlyphWidth, bottom,
-                   static_cast<uint8_t>(string[i]), colour);
+    const float lineHeight = kGlyphHeight * s_Scale, advance = kGlyphWidth * s_Scale;
+    float bottom =
+        static_cast<float>(context->height) + 2 * kGlyphHeight - static_cast<float>(y) - lineHeight;
+    float column = 0;
+    while (*string) {
+        const uint32_t character = NextCharacter(&string);
+        if (character == '\n') {
+            bottom -= lineHeight;
+            column = 0;
+            continue;
+        }
+        WriteGlyph(glyphs, slot++, static_cast<float>(x) + column * advance, bottom, FindCell(character),
+                   colour);
+        ++column;
+    }
 }
 
 Colour FromBytes(int32_t r, int32_t g, int32_t b, int32_t a) {
@@ -156,32 +224,64 @@ void SetState() {
     QexRenderState_UseProgram(s_Program.program);
 }
 
-void BindTextures() {
-    QexTexture_Set(&s_Texture, kDiffuseUnit);
-    QexTexture_SetFilter(&s_Texture, QEX_FILTER_LINEAR);
+void BindSheet(Sheet sheet) {
+    QexTexture_Set(&s_Sheets[sheet], kDiffuseUnit);
+    QexTexture_SetFilter(&s_Sheets[sheet], QEX_FILTER_LINEAR);
+}
+
+void CreateSheet(Sheet sheet, const uint8_t* pixels) {
+    QexTexture* texture = &s_Sheets[sheet];
+    // The pixels are only read; the record has no pointer to constant ones.
+    QexTexture_CreateFromPixels(texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
+                                QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, const_cast<uint8_t*>(pixels));
+    texture->pixels = nullptr;
+    QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE));
+    QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE));
+}
+
+void CreateLatinSheet() {
+    QexScratch<uint8_t> pixels(kSheetWidth * kSheetHeight * 4);
+    if (!pixels) return QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+    QexFontLatin_Paint(pixels.Get());
+    CreateSheet(kLatinSheet, pixels.Get());
+}
+
+void ReleaseSheets() {
+    for (QexTexture& sheet : s_Sheets)
+        if (sheet.glName) QexTexture_Release(&sheet);
+}
+
+// Glyphs from `first` on that one draw can show: on one sheet, and no more than the strip joins.
+uint32_t RunLength(const Glyphs& glyphs, uint32_t first) {
+    uint32_t run = 1;
+    while (run < kStripGlyphs && first + run < glyphs.count &&
+           glyphs.sheets[first + run] == glyphs.sheets[first])
+        ++run;
+    return run;
+}
+
+// The sheet of the first glyph; the others are made now, if they are needed and not there.
+void BindTextures(const Glyphs& glyphs) {
+    if (memchr(glyphs.sheets, kLatinSheet, glyphs.count) && !s_Sheets[kLatinSheet].glName) CreateLatinSheet();
+    BindSheet(static_cast<Sheet>(glyphs.sheets[0]));
     QexTexture_Set(nullptr, kAlphaUnit);
 }
 
+// Draws what BindTextures was called for.
 void DrawGlyphs(const Glyphs& glyphs) {
     const int32_t arrays[] = {s_Program.position, s_Program.colour, s_Program.texCoord};
+    uint8_t bound = glyphs.sheets[0];
     for (const int32_t array : arrays) QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(array)));
-    for (uint32_t first = 0; first < glyphs.count; first += kStripGlyphs) {
+    for (uint32_t first = 0, run; first < glyphs.count; first += run) {
+        run = RunLength(glyphs, first);
+        if (bound != glyphs.sheets[first]) BindSheet(static_cast<Sheet>(bound = glyphs.sheets[first]));
         PointAt(s_Program.position, 3, glyphs.positions + first);
         PointAt(s_Program.colour, 4, glyphs.colours + first);
         PointAt(s_Program.texCoord, 2, glyphs.texCoords + first);
-        QEX_GL(glDrawElements(GL_TRIANGLE_STRIP,
-                              static_cast<GLsizei>(IndexCount(FirstStrip(glyphs.count - first))),
-                              GL_UNSIGNED_BYTE, glyphs.indices));
+        QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, static_cast<GLsizei>(IndexCount(run)), GL_UNSIGNED_BYTE,
+                              glyphs.indices));
     }
     for (const int32_t array : arrays) QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(array)));
-}
-
-void CreateTexture() {
-    // The sheet is only read; the record has no pointer to constant pixels.
-    QexTexture_CreateFromPixels(&s_Texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
-                                QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, const_cast<uint8_t*>(fontdata));
-    QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE));
-    QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE));
 }
 
 // Logs that the font is missing; true when it is there.
@@ -191,6 +291,20 @@ bool CheckCreated(const char* function) {
 }
 
 }  // namespace
+
+bool QexFont_IsCreated() {
+    return s_Created;
+}
+
+bool QexFont_CanDraw(const char* function) {
+    if (s_Program.program) return true;
+    if (!s_ToldNoProgram)
+        QexError(QEX_TAG,
+                 "<%s> the font's program was released: nothing is drawn before QexFont_CreateShader",
+                 function);
+    s_ToldNoProgram = true;
+    return false;
+}
 
 const QexFontProgram* QexFont_GetProgram() {
     return &s_Program;
@@ -204,18 +318,16 @@ int32_t QexFont_Create(int32_t width, int32_t height) {
         return 0;
     }
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(width), 0, static_cast<float>(height), 0, 1);
-    if (QexFont_CreateShader() != 0) {
-        QexFont_ReleaseShader(1);
-        return -1;
-    }
+    if (QexFont_CreateShader() != 0) return -1;
     if (!Reserve(&s_Text, kInitialCapacity) || !Reserve(&s_Temporary, kTemporaryCapacity)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         FreeGlyphs(&s_Text);
         FreeGlyphs(&s_Temporary);
-        QexTexture_Release(&s_Texture);
+        ReleaseSheets();
         QexFont_ReleaseShader(1);
         return -1;
     }
+    s_Scale = 1;
     s_Created = true;
     QexLog(QEX_TAG, "<QexFont_Create> Font initialize ok");
     return 0;
@@ -223,9 +335,12 @@ int32_t QexFont_Create(int32_t width, int32_t height) {
 
 int32_t QexFont_CreateShader(void) {
     QexFontProgram& p = s_Program;
-    if (QexShader_Create(&p.vertexShader, kVertexSource, GL_VERTEX_SHADER) != 0) return -1;
-    if (QexShader_Create(&p.fragmentShader, kFragmentSource, GL_FRAGMENT_SHADER) != 0) return -1;
-    QexShader_CreateProgram(&p.program, p.vertexShader, p.fragmentShader, nullptr, 0, nullptr);
+    if (p.program) QexFont_ReleaseShader(1);
+    ReleaseSheets();
+    if (!QexShader_BuildProgram("QexFont_CreateShader", &p.program, &p.vertexShader, &p.fragmentShader,
+                                kVertexSource, kFragmentSource, nullptr, 0))
+        return -1;
+    s_ToldNoProgram = false;
     QEX_GL(p.position = glGetAttribLocation(p.program, "a_v4Position"));
     QEX_GL(p.colour = glGetAttribLocation(p.program, "a_v4FontColor"));
     QEX_GL(p.texCoord = glGetAttribLocation(p.program, "a_v2TexCoord"));
@@ -235,7 +350,7 @@ int32_t QexFont_CreateShader(void) {
     QEX_GL(glUniform1i(p.textureLocation, kDiffuseUnit));
     QEX_GL(p.alphaLocation = glGetUniformLocation(p.program, "u_s2dAlpha"));
     QEX_GL(glUniform1i(p.alphaLocation, kAlphaUnit));
-    CreateTexture();
+    CreateSheet(kPlainSheet, fontdata);
     return 0;
 }
 
@@ -244,21 +359,22 @@ void QexFont_ReleaseShader(int32_t) {
 }
 
 int32_t QexFont_Release(void) {
-    if (!s_Created) return QexLog(QEX_TAG, "<QexFont_Release> Already released!");
-    QexFont_ClearString();
+    const bool created = s_Created;
+    // A program that was made without a font goes as well.
+    if (created) QexFont_ClearString();
     FreeGlyphs(&s_Temporary);
-    QexTexture_Release(&s_Texture);
-    QexFont_ReleaseShader(1);
+    ReleaseSheets();
+    if (created || s_Program.program) QexFont_ReleaseShader(1);
     s_Created = false;
+    if (!created) return QexLog(QEX_TAG, "<QexFont_Release> Already released!");
     return QexLog(QEX_TAG, "<QexFont_Release> Font released!");
 }
 
 int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                           int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_AddString")) return 0;
-    const uint32_t length = static_cast<uint32_t>(strlen(string));
     const uint32_t slot = s_Text.count;
-    const uint32_t count = slot + length;
+    const uint32_t count = slot + CountGlyphs(string);
     if (!Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         exit(1);
@@ -266,22 +382,41 @@ int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y
     s_Text.count = count;
     BuildIndices(&s_Text);
     WriteString(&s_Text, slot, context, x, y, string, FromBytes(r, g, b, a));
-    return static_cast<int32_t>(length);
+    return static_cast<int32_t>(strlen(string));
 }
 
 int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                               int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_ReplaceString")) return 0;
-    const uint32_t length = static_cast<uint32_t>(strlen(string));
+    const int32_t length = static_cast<int32_t>(strlen(string));
+    const uint32_t count = CountGlyphs(string);
     s_Text.count = 0;
-    if (!Reserve(&s_Text, length)) {
+    if (!Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return static_cast<int32_t>(length);
+        return length;
     }
-    s_Text.count = length;
+    s_Text.count = count;
     BuildIndices(&s_Text);
     WriteString(&s_Text, 0, context, x, y, string, FromBytes(r, g, b, a));
-    return static_cast<int32_t>(length);
+    return length;
+}
+
+int32_t QexFont_SetScale(float scale) {
+    if (!(scale > 0 && scale <= kMaxScale)) return -1;
+    s_Scale = scale;
+    return 0;
+}
+
+void QexFont_MeasureString(const char* string, float* width, float* height) {
+    uint32_t columns = 0, widest = 0, lines = 1;
+    while (*string) {
+        const bool ends = NextCharacter(&string) == '\n';
+        columns = ends ? 0 : columns + 1;
+        lines += ends;
+        widest = columns > widest ? columns : widest;
+    }
+    if (width) *width = static_cast<float>(widest) * kGlyphWidth * s_Scale;
+    if (height) *height = static_cast<float>(lines) * kGlyphHeight * s_Scale;
 }
 
 void QexFont_ClearString(void) {
@@ -290,9 +425,9 @@ void QexFont_ClearString(void) {
 }
 
 void QexFont_Draw(void) {
-    if (!CheckCreated("QexFont_Draw") || !s_Text.count) return;
+    if (!CheckCreated("QexFont_Draw") || !s_Text.count || !QexFont_CanDraw("QexFont_Draw")) return;
     SetState();
-    BindTextures();
+    BindTextures(s_Text);
     glDepthFunc(GL_ALWAYS);
     DrawGlyphs(s_Text);
     glDepthFunc(GL_LEQUAL);
@@ -301,8 +436,8 @@ void QexFont_Draw(void) {
 void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                             uint32_t colour) {
     if (!CheckCreated("QexFont_DrawTempString")) return;
-    s_Temporary.count = static_cast<uint32_t>(strlen(string));
-    if (!s_Temporary.count) return;
+    s_Temporary.count = CountGlyphs(string);
+    if (!s_Temporary.count || !QexFont_CanDraw("QexFont_DrawTempString")) return;
     if (!Reserve(&s_Temporary, s_Temporary.count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return;
@@ -313,7 +448,7 @@ void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t
     glDepthFunc(GL_ALWAYS);
     SetState();
     QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
-    BindTextures();
+    BindTextures(s_Temporary);
     DrawGlyphs(s_Temporary);
     glDepthFunc(GL_LEQUAL);
 }

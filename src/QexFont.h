@@ -18,3 +18,10 @@ struct QexFontProgram {
 };
 
 const QexFontProgram* QexFont_GetProgram();
+
+// Whether there is a font: between QexFont_Create and QexFont_Release.
+bool QexFont_IsCreated();
+
+// Whether the font's program is there, which an application may have released by itself. An error line in the
+// function's name, once, when it is not.
+bool QexFont_CanDraw(const char* function);

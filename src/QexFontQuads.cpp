@@ -51,9 +51,9 @@ void WriteQuad(const QexRuntimeContext* context, const QexTexture* texture, cons
     }
 }
 
-// Creates the font where there is none yet; false, with a line, when that fails.
+// Creates the font where there is none yet; false, with a line, when that fails or its program is gone.
 bool NeedFont(const QexRuntimeContext* context, const char* function, int32_t* result) {
-    if (QexFont_GetProgram()->program) return true;
+    if (QexFont_IsCreated()) return QexFont_CanDraw(function);
     QexLog(QEX_TAG, "<%s> Call texture draw before font created!", function);
     if (QexFont_Create(context->width, context->height) == 0) return true;
     *result = QexLog(QEX_TAG, "<%s> Try to initialize font failed", function);

@@ -1,9 +1,10 @@
 #include <GLES2/gl2.h>
+#include <unistd.h>
 
 #include <climits>
 #include <cmath>
 
-#include "RenderFixture.h"
+#include "Scenes.h"
 #include "support/Capture.h"
 
 namespace {
@@ -137,7 +138,86 @@ TEST_F(FontTest, NumbersAndUnknownCharacters) {
                                 Temporary(4, 60, std::to_string(number))));
     Picture expected = background_;
     Stamp(&expected, 4, 60, "a\x7F\x7F\x7F\x7F", {255, 255, 255, 255});
-    EXPECT_TRUE(SamePicture(Temporary(4, 60, "a\x01\n\x80\xFF"), expected, 1));
+    EXPECT_TRUE(SamePicture(Temporary(4, 60, "a\x01\x80\xFF\u20AC"), expected, 1));
+}
+
+TEST_F(FontTest, LinesScaleAndLatin) {
+    Picture expected = background_;
+    Stamp(&expected, 4, 40, "ab", {255, 255, 255, 255});
+    Stamp(&expected, 4, 72, "c", {255, 255, 255, 255});
+    EXPECT_TRUE(SamePicture(Temporary(4, 40, "ab\n\nc"), expected, 1));
+    // Twice as large, the upper left corner where it was.
+    const Picture small = Temporary(0, 32, "L");
+    EXPECT_EQ(QexFont_SetScale(2), 0);
+    const Picture large = Temporary(0, 32, "L\nL");
+    float width = 0, height = 0;
+    QexFont_MeasureString("ab\n\u00E4bc\n", &width, &height);
+    EXPECT_EQ(width, 48);
+    EXPECT_EQ(height, 96);
+    for (const float scale : {0.0f, -1.0f, NAN, INFINITY}) EXPECT_EQ(QexFont_SetScale(scale), -1);
+    for (int line = 0; line < 2; ++line)
+        for (int y = 0; y < 16; ++y)
+            for (int x = 0; x < 8; ++x)  // what the filter leaves of the middle of a pixel
+                EXPECT_EQ(large.Pixel(2 * x, 2 * y + 32 * line)[0] > 137, small.Pixel(x, y)[0] == 255)
+                    << x << " " << y;
+    QexFont_SetScale(1);
+    // A letter with a mark is the letter, and the mark above it; the sheet of these is made once.
+    const std::string before = LiveObjects();
+    const Picture plain = Temporary(4, 60, "A e u"), marked = Temporary(4, 60, "\u00C4 \u00E9 \u00FC");
+    const std::string after = LiveObjects();
+    EXPECT_NE(before, after);
+    EXPECT_FALSE(SamePicture(plain, marked));
+    for (int y = 33; y < 44; ++y)
+        for (int x = 0; x < 60; ++x) EXPECT_EQ(plain.Pixel(x, y), marked.Pixel(x, y)) << x << " " << y;
+    EXPECT_EQ(IndexCounts([&] { Temporary(4, 60, "a\u00C4\u00C4b"); }), "4 10 4 ");
+    EXPECT_EQ(LiveObjects(), after);
+}
+
+// Text that is added piece by piece does not move everything for each piece.
+TEST_F(FontTest, GrowsWithSlack) {
+    if (!kAllocationsAreCounted) GTEST_SKIP() << "allocations are not counted here";
+    const Allocations made = CountAllocations([&] {
+        for (int i = 0; i < 2000; ++i) Add(0, 40, "ten glyphs");
+    });
+    EXPECT_LT(made.made, 100);
+}
+
+TEST_F(FontTest, ProgramsComeAndGoWithoutTheFont) {
+    ScopedTexture red({255, 0, 0, 255});
+    const auto live = [] {
+        return gltapLiveObjects(GLTAP_TEXTURE, nullptr, 0) +
+               100 * gltapLiveObjects(GLTAP_PROGRAM, nullptr, 0) +
+               10000 * gltapLiveObjects(GLTAP_SHADER, nullptr, 0);
+    };
+    const size_t before = live();
+    const auto draw = [&] {
+        return Drawn([&] { QexTexture_Draw(&runtime_, &red, 10, 10, nullptr, 8, 8, ~0u); });
+    };
+    const Picture whole = draw();
+    ASSERT_EQ(whole.Pixel(12, 12), (Rgba{255, 0, 0, 255}));
+    for (int round = 0; round < 3; ++round) {
+        QexFont_ReleaseShader(1);
+        Capture log(STDERR_FILENO);
+        Add(0, 40, "text");
+        EXPECT_TRUE(SamePicture(Drawn(QexFont_Draw), background_));
+        EXPECT_TRUE(SamePicture(draw(), background_));
+        const std::string text = log.Text();
+        EXPECT_EQ(text,
+                  "E/Qex: <QexFont_Draw> the font's program was released: nothing is drawn before "
+                  "QexFont_CreateShader\n");
+        EXPECT_EQ(QexFont_CreateShader(), 0);
+        EXPECT_EQ(live(), before);
+        EXPECT_TRUE(SamePicture(draw(), whole));
+    }
+    // A program alone is no font.
+    for (int round = 0; round < 3; ++round) {
+        QexFont_Release();
+        QexFont_CreateShader();
+    }
+    Capture log(STDERR_FILENO);
+    EXPECT_TRUE(SamePicture(draw(), whole));
+    EXPECT_NE(log.Text().find("<QexTexture_Draw> Call texture draw before font created!"), std::string::npos);
+    EXPECT_EQ(live(), before);
 }
 
 }  // namespace
