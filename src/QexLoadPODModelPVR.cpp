@@ -187,8 +187,10 @@ void ChooseLevels(PVR* pvr) {
         QexSystem_Printf("WARNING:<%s> no mipmaps of %u x %u pixels here.\n", kFunction, pvr->width,
                          pvr->height);
     }
+    // Of a chain that ends early the GL can make the rest from pixels only.
+    const bool partial = pvr->mipmaps && pvr->uploaded < QexTextureLoad_ChainLength(pvr->width, pvr->height);
     if (pvr->type.storage == Storage::kETC1)
-        pvr->decodesETC = !QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES);
+        pvr->decodesETC = partial || !QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES);
 }
 
 // False when memory runs out.
@@ -202,12 +204,8 @@ bool UploadLevel(const PVR& pvr, GLenum target, GLint level, uint32_t width, uin
                                       static_cast<GLsizei>(LevelSize(type, width, height)), data));
         return true;
     }
-    QexScratch<uint8_t> decoded;
-    if (type.storage == Storage::kPVRTC) {
-        if (!decoded.Alloc(uint64_t{width} * height * 4)) return false;
-        QexDecompressPVRTC(data, type.bits == 2, w, h, decoded.Get());
-        data = decoded.Get();
-    }
+    if (type.storage == Storage::kPVRTC)
+        return QexTextureLoad_UploadDecodedPVRTC(target, level, width, height, type.bits == 2, data);
     QEX_GL(glTexImage2D(target, level, static_cast<GLint>(type.format), w, h, 0, type.format, type.dataType,
                         data));
     return true;
@@ -244,9 +242,8 @@ Upload UploadSurfaces(const PVR& pvr, uint32_t from, uint32_t end) {
 // Uploads everything that was chosen. Levels that the filter asks for and the file lacks are made from the
 // first one, before those of the file that follow it.
 Upload UploadAll(const PVR& pvr, GLenum target) {
-    const bool compressed = pvr.type.storage == Storage::kETC1 && !pvr.decodesETC;
     const uint32_t first = pvr.firstLevel, end = first + pvr.uploaded;
-    if (!pvr.mipmaps || compressed || pvr.uploaded >= QexTextureLoad_ChainLength(pvr.width, pvr.height))
+    if (!pvr.mipmaps || pvr.uploaded >= QexTextureLoad_ChainLength(pvr.width, pvr.height))
         return UploadSurfaces(pvr, first, end);
     const Upload result = UploadSurfaces(pvr, first, first + 1);
     if (result != Upload::kDone) return result;

@@ -73,6 +73,16 @@ bool QexTextureLoad_UploadDecodedETC(uint32_t target, int32_t level, uint32_t wi
     return true;
 }
 
+bool QexTextureLoad_UploadDecodedPVRTC(uint32_t target, int32_t level, uint32_t width, uint32_t height,
+                                       bool twoBits, const uint8_t* data) {
+    const GLsizei w = static_cast<GLsizei>(width), h = static_cast<GLsizei>(height);
+    QexScratch<uint8_t> decoded;
+    if (!decoded.Alloc(uint64_t{width} * height * 4)) return false;
+    QexDecompressPVRTC(data, twoBits, w, h, decoded.Get());
+    QEX_GL(glTexImage2D(target, level, GL_RGBA, w, h, 0, GL_RGBA, GL_UNSIGNED_BYTE, decoded.Get()));
+    return true;
+}
+
 bool QexTexture_IsCompressedFormat(uint32_t internalFormat) {
     GLint count = 0;
     QEX_GL(glGetIntegerv(GL_NUM_COMPRESSED_TEXTURE_FORMATS, &count));

@@ -54,6 +54,11 @@ void QexTextureLoad_SetWrap(uint32_t target, uint32_t width, uint32_t height);
 bool QexTextureLoad_UploadDecodedETC(uint32_t target, int32_t level, uint32_t width, uint32_t height,
                                      const uint8_t* data);
 
+// Decodes a level of PVRTC, whose sizes are powers of two, to RGBA and uploads it. False when memory runs
+// out.
+bool QexTextureLoad_UploadDecodedPVRTC(uint32_t target, int32_t level, uint32_t width, uint32_t height,
+                                       bool twoBits, const uint8_t* data);
+
 // Loads a KTX image; what QexTexture_LoadKTXFromMem and its siblings do.
 int32_t QexTextureLoad_KTX(QexTexture* texture, const QexTextureBytes& image);
 bool QexTextureLoad_IsKTX(const QexTextureBytes& image);

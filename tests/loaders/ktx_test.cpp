@@ -70,8 +70,12 @@ TEST_F(KtxLoader, LevelsAndFacesAreFoundInOrder) {
     Ktx narrow;  // the shorter side stays 1
     narrow.height = 1;
     narrow.levels = {{Noise(16)}, {Noise(8)}, {Noise(4)}};
-    for (const Ktx& ktx : {SoundKtx(), CubeKtx(), Etc1Ktx(), narrow}) {
+    Ktx compressed = Etc1Ktx();
+    compressed.width = 4;
+    compressed.levels = {{Noise(8, 1)}, {Noise(8, 2)}, {Noise(8, 3)}};
+    for (const Ktx& ktx : {SoundKtx(), CubeKtx(), compressed, narrow}) {
         const Outcome outcome = TryFile(ktx.File());
+        ASSERT_EQ(outcome.result, 0) << outcome.out;
         ASSERT_EQ(outcome.uploads.size(), ktx.levels.size() * ktx.faces);
         for (size_t i = 0; i < outcome.uploads.size(); ++i) {
             const size_t level = i / ktx.faces, face = i % ktx.faces;
@@ -120,12 +124,11 @@ TEST_F(KtxLoader, RefusesWithItsCode) {
         int32_t result;
         const char* line;
     } cases[] = {
-        {kFormat, GL_LUMINANCE, -4, ""},
-        {kFormat, GL_RGB, -4, ""},  // the base format says RGBA
-        {kType, GL_UNSIGNED_SHORT_5_6_5, -4, ""},
-        {kType, GL_FLOAT, -4, ""},
-        {kBase, GL_RGB, -4, ""},
-        {kFaces, 0, -1, "0 faces instead of 1 or 6."},
+        {kFormat, GL_LUMINANCE, -4, "pixels of format 0x1909 and type 0x1401"},
+        {kFormat, GL_RGB, -4, "pixels of format 0x1907"},  // the base format says RGBA
+        {kType, GL_UNSIGNED_SHORT_5_6_5, -4, "and type 0x8363"},
+        {kType, GL_FLOAT, -4, "and type 0x1406"},
+        {kBase, GL_RGB, -4, "kept as 0x1907"},
         {kFaces, 7, -1, "7 faces instead of 1 or 6."},
         {kFaces, 6, -1, "the file is cut short in level 0."},
         {kWidth, 0, -1, "0 x 4 pixels are not possible here"},
@@ -150,9 +153,80 @@ TEST_F(KtxLoader, RefusesWithItsCode) {
     Bytes unknown = Etc1Ktx().File();
     PutWord(&unknown, kInternal, 0x12345);
     ExpectRefused(unknown, TryFile, -1, "the GL does not take the compressed format 0x12345.");
-    Ktx shorter = Etc1Ktx();
-    shorter.levels[1][0].resize(4);
-    ExpectRefused(shorter.File(), TryFile, -1, "level 1 of 4 bytes is not of its size.");
+    Ktx odd = Etc1Ktx();
+    odd.internal = 0x8C00;
+    odd.width = 12;
+    ExpectRefused(odd.File(), TryFile, -1, "PVRTC of a size that is no power of two.");
+}
+
+// The filter that a texture starts with asks for all levels; a texture without them is black.
+TEST_F(KtxLoader, CompressedChainsAreNeverBlack) {
+    const auto minFilter = [](const Outcome& o) {
+        return o.calls->Parameter(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER);
+    };
+    Ktx ktx = Etc1Ktx();  // 8 x 4, so four levels are a whole chain
+    ktx.levels.resize(1);
+    const Outcome one = TryFile(ktx.File());
+    ASSERT_EQ(one.uploads.size(), 1u);
+    EXPECT_EQ(one.uploads[0].format, kEtc1);
+    EXPECT_EQ(minFilter(one), GLenum(GL_LINEAR));
+    // A chain that ends early is decoded, so that the GL can make the rest.
+    ktx.levels = {{Noise(16, 1)}, {Noise(8, 2)}};
+    for (const size_t damaged : {2u, 1u}) {
+        if (damaged == 1) ktx.levels.push_back({Noise(4)});  // a third level of a wrong size
+        const Outcome two = TryFile(ktx.File());
+        EXPECT_EQ(two.result, 0);
+        ASSERT_EQ(two.uploads.size(), 2u);
+        EXPECT_EQ(two.uploads[0].format, GLenum(GL_RGB));
+        EXPECT_EQ(two.calls->Calls("glGenerateMipmap").size(), 1u);
+        EXPECT_EQ(two.out.find("level 2 of 4 bytes is not of its size") != std::string::npos, damaged == 1);
+    }
+    Ktx whole = Etc1Ktx();
+    whole.width = 4;
+    whole.levels = {{Noise(8, 1)}, {Noise(8, 2)}, {Noise(8, 3)}};
+    const Outcome complete = TryFile(whole.File());
+    EXPECT_EQ(complete.uploads.at(2).format, kEtc1);
+    EXPECT_EQ(minFilter(complete), 0u);
+}
+
+TEST_F(KtxLoader, PvrtcIsDecodedAndNoFacesAreOne) {
+    Ktx ktx;
+    ktx.type = ktx.format = 0;
+    ktx.width = ktx.height = 16;
+    ktx.faces = 0;
+    for (const uint32_t internal : {0x8C00u, 0x8C01u, 0x8C02u, 0x8C03u}) {
+        const bool twoBits = internal & 1;
+        ktx.internal = internal;
+        ktx.levels = {{Noise(twoBits ? 64 : 128, 5)}};
+        const Outcome outcome = TryFile(ktx.File());
+        ASSERT_EQ(outcome.uploads.size(), 1u) << outcome.out;
+        Bytes expected(16 * 16 * 4);
+        QexDecompressPVRTC(ktx.levels[0][0].data(), twoBits, 16, 16, expected.data());
+        EXPECT_EQ(outcome.uploads[0].data, expected);
+        EXPECT_EQ(outcome.texture.format, QEX_TEXFMT_RGBA8888);
+        EXPECT_EQ(outcome.texture.flags, 0u);
+        EXPECT_EQ(outcome.calls->Calls("glGenerateMipmap").size(), 1u);
+    }
+}
+
+// RGB of 4 x 4: from 2 x 2 on the rows of the file are padded, but the sizes of the levels do not count it.
+TEST_F(KtxLoader, LevelsThatLieWrongLeaveTheOthers) {
+    Ktx ktx;
+    ktx.format = ktx.base = ktx.internal = GL_RGB;
+    ktx.width = ktx.height = 8;
+    ktx.levels = {{Noise(192)}, {Noise(48)}, {Noise(16)}, {Noise(4)}};
+    Bytes file = ktx.File();
+    const size_t third = 64 + 4 + 192 + 4 + 48;
+    ASSERT_EQ(GetWord(file, third), 16u);
+    PutWord(&file, third, 12);
+    PutWord(&file, third + 4 + 12, 0x00FF00FF);  // pixels, where the next size would be
+    const Outcome outcome = TryFile(file);
+    EXPECT_EQ(outcome.result, 0) << outcome.out;
+    ASSERT_EQ(outcome.uploads.size(), 2u);
+    EXPECT_EQ(outcome.uploads[1].data, ktx.levels[1][0]);
+    EXPECT_EQ(outcome.calls->Calls("glGenerateMipmap").size(), 1u);
+    EXPECT_NE(outcome.out.find("level 3 of 16711935 bytes is not of its size"), std::string::npos)
+        << outcome.out;
 }
 
 TEST_F(KtxLoader, NoCutAndNoWordIsTrusted) {
