@@ -83,10 +83,11 @@ struct Work {
     bool Alloc(uint32_t vertices, uint32_t triangles, int32_t maxBones) {
         const uint64_t corners = uint64_t{triangles} * 3;
         CBatch_SetSize(&set, maxBones);
-        if (!set.bones || !list.Alloc(1) || !batchOf.Alloc(triangles) || !indices.Alloc(corners) ||
-            !copies.Alloc(corners) || !firstCopy.Alloc(vertices))
+        if (!list.Alloc(1)) return false;
+        list[0].count = 0;  // before the next step that can fail: the end frees as many batches
+        if (!set.bones || !batchOf.Alloc(triangles) || !indices.Alloc(corners) || !copies.Alloc(corners) ||
+            !firstCopy.Alloc(vertices))
             return false;
-        list[0].count = 0;
         for (uint32_t i = 0; i < vertices; ++i) firstCopy[i] = kNone;
         return true;
     }

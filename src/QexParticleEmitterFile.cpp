@@ -4,6 +4,7 @@
 
 #include "QexDiagnostics.h"
 #include "QexMemory.h"
+#include "QexResFile.h"
 
 #define QEX_MODULE "src/QexParticle"
 
@@ -139,7 +140,7 @@ int32_t QexParticleEmitter_WriteToBinFile(const QexParticleEmitter* emitter, con
 
 QexParticleEmitter* QexParticleEmitter_CreateFromBinFile(const char* path) {
     if (!path) return nullptr;
-    FILE* file = fopen(path, "rb");
+    FILE* file = QexResFile_OpenForReading(path);
     if (!file) return nullptr;
     QexParticleEmitter* emitter = Read(path, file);
     fclose(file);

@@ -1,4 +1,8 @@
-#include <cstdio>
+// Files read whole into memory, or memory that looks like one.
+#include "QexResFile.h"
+
+#include <sys/stat.h>
+
 #include <cstring>
 
 #include "QexDiagnostics.h"
@@ -35,9 +39,15 @@ void ClearData(QexResFile* record) {
 
 }  // namespace
 
+FILE* QexResFile_OpenForReading(const char* path) {
+    struct stat status;
+    if (!path || (stat(path, &status) == 0 && S_ISFIFO(status.st_mode))) return nullptr;
+    return fopen(path, "rb");
+}
+
 int32_t QexResFile_Create(QexResFile* record, const char* path) {
     // Opened first, since the path may be the record's own.
-    FILE* const file = path ? fopen(path, "rb") : nullptr;
+    FILE* const file = QexResFile_OpenForReading(path);
     QexResFile_SetReadPath(record, path);
     ClearData(record);
     if (!file) {
@@ -101,7 +111,7 @@ void QexResFile_Release(QexResFile* record) {
 }
 
 int32_t QexResFile_Exists(const char* path) {
-    FILE* const file = path ? fopen(path, "rb") : nullptr;
+    FILE* const file = QexResFile_OpenForReading(path);
     if (!file) return 0;
     fclose(file);
     return 1;

@@ -5,6 +5,7 @@
 
 #include "QexGL.h"
 #include "QexMemory.h"
+#include "QexResFile.h"
 
 #define QEX_MODULE "src/QexTexture"
 
@@ -146,7 +147,7 @@ int32_t QexTexture_CreateTGAFromMemSized(QexTexture* texture, int32_t ignored, u
 
 int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint32_t stage, uint32_t filter,
                                      uint32_t wrap, const char* path) {
-    FILE* file = fopen(path, "rb");
+    FILE* file = QexResFile_OpenForReading(path);
     if (!file) return -1;
     QexScratch<uint8_t> data;
     uint64_t size = 0;

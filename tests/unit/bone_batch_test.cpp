@@ -156,6 +156,19 @@ TEST(BoneBatch, SmallMeshesByHand) {
     }
 }
 
+// Eight gigabytes for the vertices are not to be had.
+TEST(BoneBatch, RunningOutOfMemoryIsSaid) {
+    QexBoneBatches batches;
+    void* block = nullptr;
+    uint32_t count = 0;
+    Capture out(STDOUT_FILENO);
+    EXPECT_EQ(QexBoneBatches_Create(&batches, &count, &block, nullptr, 0x7FFFFFFF, nullptr, 32, 0,
+                                    QEX_POD_FLOAT, 16, QEX_POD_FLOAT, 0, 16, 4),
+              -1);
+    EXPECT_EQ(block, nullptr);
+    EXPECT_NE(out.Text().find("Error: Out of memory at src/QexBoneBatches:"), std::string::npos);
+}
+
 // In the end: 513 sets without one in another are one batch too many.
 TEST(BoneBatch, AnyMeshKeepsItsTriangles) {
     std::mt19937 random(7);

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <cstring>
 #include <string>
@@ -43,6 +44,8 @@ TEST(ResFile, WhatCannotBeReadWholeStaysClosed) {
     int pipeEnds[2];
     ASSERT_EQ(pipe(pipeEnds), 0);
     const std::string pipePath = "/dev/fd/" + std::to_string(pipeEnds[0]);
+    const std::string fifo = testing::TempDir() + "resfile_test." + std::to_string(getpid());
+    ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
     const struct {
         const char* path;
         int32_t result;
@@ -51,7 +54,9 @@ TEST(ResFile, WhatCannotBeReadWholeStaysClosed) {
         {"/nonexistent", -1, "E/Qex: <QexResFile_Create> opening file '/nonexistent' failed\n"},
         {nullptr, -1, "E/Qex: <QexResFile_Create> opening file '' failed\n"},
         {"/", 0, ""},
-        {pipePath.c_str(), 0, ""},
+        {pipePath.c_str(), -1, "E/Qex: <QexResFile_Create> opening file '" + pipePath + "' failed\n"},
+        // Without a writer, to open it for reading would wait for ever.
+        {fifo.c_str(), -1, "E/Qex: <QexResFile_Create> opening file '" + fifo + "' failed\n"},
     };
     for (const auto& c : cases) {
         QexResFile record;
@@ -64,6 +69,8 @@ TEST(ResFile, WhatCannotBeReadWholeStaysClosed) {
         QexResFile_Release(&record);
     }
     EXPECT_EQ(QexResFile_Exists("/nonexistent"), 0);
+    EXPECT_EQ(QexResFile_Exists(fifo.c_str()), 0);
+    remove(fifo.c_str());
     close(pipeEnds[0]);
     close(pipeEnds[1]);
 }
