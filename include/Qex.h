@@ -2566,6 +2566,8 @@ struct QexModel {
     QexBindTextureHook bindTextureHook; /* the three hooks: optional, set between */
     QexLoadTextureHook loadTextureHook; /* QexModel_Create and loading */
     QexMeshNodeLoadedHook meshNodeLoadedHook;
+    uint32_t
+        sharedGeneration; /* the engine's: which set of shared shaders its nodes were given, 0 for none */
 };
 
 /** Light types of QexLight. */
@@ -2677,7 +2679,10 @@ QEX_API int32_t QexModel_CreateDefaultShader(void);
 QEX_API void QexModel_ReleaseShader(int32_t force);
 
 /** Sets the size of the shadow target that is made with the next shared set; 512 x 512 at first. No GL
- * context needed. */
+ *  context needed.
+ *  @param width   pixels, 1 and more; what the GL cannot draw into is cut, with a line in the log, when the
+ *                 target is made
+ *  @param height  likewise. A size below 1 is refused with a line and changes nothing */
 QEX_API void QexModel_SetShadowMapSize(int32_t width, int32_t height);
 
 /** Frees everything that the model holds. A second call does nothing. */
@@ -3392,8 +3397,9 @@ typedef struct QexRenderTarget {
 
 /** Creates a target of that many pixels; whatever the record held is forgotten, not released. The framebuffer
  * that is bound stays bound; unit 0 becomes active and keeps the new texture bound. A GL error is fatal.
+ *  @param width, height  1 to the GL's limit (the lesser of GL_MAX_TEXTURE_SIZE and GL_MAX_RENDERBUFFER_SIZE)
  *  @param ignored  not read
- *  @return 0 */
+ *  @return 0, or -1, with a line in the log and the record zeroed, for a size that the GL cannot draw into */
 QEX_API int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t height,
                                        int32_t ignored);
 
@@ -3836,8 +3842,8 @@ QEX_API extern const char* pFragmentShaderPP;
 
 /** Creates the quad, the targets and the programs for a screen. What an earlier call made is released first.
  *  @param context  its size is the screen's
- *  @return 0; -9 for null; -1, with a line in the log, for a size below 1; -1 when a program cannot be made.
- *  Nothing is left then. */
+ *  @return 0; -9 for null; -1, with a line in the log, for a size below 1 or above what the GL draws into, or
+ *  when the copy program cannot be made. Nothing is left then. */
 QEX_API int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context);
 
 /** Releases what QexPostProcessing_Initialize made; without it, nothing. @return 0. */
@@ -3979,7 +3985,8 @@ struct QexRuntimeContext {
  *  @param context     filled
  *  @param configSize  QEX_ENGINE_CONFIG_SIZE or sizeof(QexEngineConfig)
  *  @param config      read; its window-system words and size are written back
- *  @return 0; -1, with nothing changed, for another size or a null context or configuration. */
+ *  @return 0; -1, with nothing changed, for another size, a null context or configuration, or, with a line in
+ *  the log, where no GL context is current. */
 QEX_API int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config);
 
 /** Initialises the engine on a surface that the application draws: memory pool, clock, render state, built-in

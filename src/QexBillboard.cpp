@@ -40,21 +40,30 @@ void main() {
 const char* const kAttributes[] = {"inVertex", "inTexCoord"};
 
 bool CreateProgram() {
-    if (!QexShader_BuildProgram(&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader,
-                                kVertexSource, kFragmentSource, kAttributes, 2)) {
+    if (!QexShader_BuildProgram("QexBillboard_Create", &g_BillboardShaderProgramID, &g_BillboardVShader,
+                                &g_BillboardFShader, kVertexSource, kFragmentSource, kAttributes, 2)) {
         QexError(QEX_TAG, "<QexBillboard_Create> the billboards' program cannot be built");
         return false;
     }
     const GLuint program = g_BillboardShaderProgramID;
-    QEX_GL(g_BillboardInPosLoc = glGetAttribLocation(program, "inVertex"));
-    QEX_GL(g_BillboardUVLoc = glGetAttribLocation(program, "inTexCoord"));
-    QEX_GL(g_BillboardMvpMatrixLoc = glGetUniformLocation(program, "mvpMatrix"));
-    QEX_GL(g_BillboardOpacityLoc = glGetUniformLocation(program, "opacity"));
-    QEX_GL(g_BillboardAlphaThresholdLoc = glGetUniformLocation(program, "alphaThreshold"));
-    QEX_GL(g_BillboardTextureLoc = glGetUniformLocation(program, "sTexture"));
+    g_BillboardInPosLoc = glGetAttribLocation(program, "inVertex");
+    g_BillboardUVLoc = glGetAttribLocation(program, "inTexCoord");
+    g_BillboardMvpMatrixLoc = glGetUniformLocation(program, "mvpMatrix");
+    g_BillboardOpacityLoc = glGetUniformLocation(program, "opacity");
+    g_BillboardAlphaThresholdLoc = glGetUniformLocation(program, "alphaThreshold");
+    g_BillboardTextureLoc = glGetUniformLocation(program, "sTexture");
     QexVec3_Set(&g_VecUp, 0, 1, 0);
     QexVec3_Set(&g_VecNormal, 0, 0, 1);
     return true;
+}
+
+// As all of drawing a billboard, without error checks.
+void DeleteProgram() {
+    QexRenderState_UseProgram(0);
+    if (g_BillboardShaderProgramID) glDeleteProgram(g_BillboardShaderProgramID);
+    if (g_BillboardVShader) glDeleteShader(g_BillboardVShader);
+    if (g_BillboardFShader) glDeleteShader(g_BillboardFShader);
+    g_BillboardShaderProgramID = g_BillboardVShader = g_BillboardFShader = 0;
 }
 
 // The angle of that cosine in degrees, with 3.14 for pi as ever: a quarter turn comes to 90.05 degrees. 0
@@ -72,8 +81,10 @@ void RotateTowardsEye(QexMatrix* out, const QexBillboard& b, const QexVec3& eye)
     QexVec3_Normalize(&towards, &towards);
     QexVec3_Normalize(&level, &level);
     QexVec3_CrossProduct(&side, &g_VecNormal, &level);
+    // An eye straight above or below is to neither side.
+    const bool aside = level.x != 0 || level.z != 0;
     QexMatrix yaw, roll;
-    QexMatrix_RotateY(&yaw, AngleOf(QexVec3_DotProduct(&g_VecNormal, &level), side.y < 0));
+    QexMatrix_RotateY(&yaw, aside ? AngleOf(QexVec3_DotProduct(&g_VecNormal, &level), side.y < 0) : 0);
     QexMatrix_Multiply(out, &yaw, QexMatrixRotateZ(&roll, b.rotation.z));
     if (b.mode != QEX_BILLBOARD_CAMERA) return;
     QexMatrix pitch;
@@ -193,8 +204,7 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
 void QexBillboard_Release(QexBillboard* billboard) {
     if (!billboard) return;
     QexMemory_Free(billboard);
-    if (--g_BillboardCount == 0)
-        QexShader_DeleteProgram(&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader);
+    if (--g_BillboardCount == 0) DeleteProgram();
 }
 
 }  // extern "C"

@@ -3,6 +3,7 @@
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 
 #include "Platform/AndroidLog.h"
 
@@ -33,9 +34,11 @@ int32_t QexSystem_Printf(const char* format, ...) {
     return 1;
 }
 
-void QexDiagnostics_FatalGLError(uint32_t error, const char* module, int line) {
+void QexDiagnostics_FatalGLError(uint32_t error, const char* module, const char* file, int line) {
+    const char* const slash = strrchr(file, '/');
     __android_log_print(ANDROID_LOG_ERROR, "QexEngine", "glGetError() = %i (0x%.8x) at %s:%i\n",
                         static_cast<int>(error), error, module, line);
+    __android_log_print(ANDROID_LOG_ERROR, "QexEngine", "in %s, line %i", slash ? slash + 1 : file, line);
     exit(-1);
 }
 

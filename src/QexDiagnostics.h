@@ -10,8 +10,9 @@
 
 #include "Qex.h"
 
-// Logs the GL error with its place and ends the process with exit status 255.
-[[noreturn]] void QexDiagnostics_FatalGLError(uint32_t error, const char* module, int line);
+// Logs the GL error with its place, in a second line the source file, as a module may have several, and ends
+// the process with exit status 255.
+[[noreturn]] void QexDiagnostics_FatalGLError(uint32_t error, const char* module, const char* file, int line);
 
 // Prints the out-of-memory line. The caller decides how to go on.
 void QexDiagnostics_OutOfMemory(const char* module, int line);

@@ -9,11 +9,11 @@
 #include "QexDiagnostics.h"
 
 #if QEX_GL_CHECKS
-#define QEX_GL_CHECK()                                                   \
-    do {                                                                 \
-        const GLenum qexError = glGetError();                            \
-        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                \
-            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __LINE__); \
+#define QEX_GL_CHECK()                                                             \
+    do {                                                                           \
+        const GLenum qexError = glGetError();                                      \
+        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                          \
+            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __FILE__, __LINE__); \
     } while (0)
 #else
 #define QEX_GL_CHECK() ((void)QEX_MODULE)
@@ -24,6 +24,11 @@
         call;           \
         QEX_GL_CHECK(); \
     } while (0)
+
+// A surface size as the GL takes it: what an application gave below 0 counts as 0.
+inline GLsizei QexGL_Size(int32_t pixels) {
+    return pixels > 0 ? pixels : 0;
+}
 
 // Texture units, the same in every module.
 enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };

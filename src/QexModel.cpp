@@ -63,6 +63,7 @@ bool Complete(QexModel* model) {
         model->meshNodeLoadedHook(model, &scene.meshes[scene.nodes[i].objectIndex], i);
     const QexModelSharedShaders* shared = QexModel_GetSharedShaders();
     QexModel_SetShaderProgramForAllNode(model, shared->texture, shared->skinning);
+    model->sharedGeneration = QexModel_GetSharedGeneration();
     return true;
 }
 
@@ -178,8 +179,9 @@ void QexModel_Unload(QexModel* model) {
     const bool loaded = model->scene.runtime != nullptr;
     Discard(model);
     if (!loaded || model->flags & QEX_MODEL_NO_SHADERS) return;
-    QexModel_ReleaseShader(0);
+    if (!QexModel_IsOutdated(model)) QexModel_ReleaseShader(0);
     model->flags |= QEX_MODEL_NO_SHADERS;
+    model->sharedGeneration = 0;
 }
 
 QexTexture* QexModel_ReplaceTextureByIdx(QexModel* model, QexTexture* texture, uint32_t index) {

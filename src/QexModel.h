@@ -19,6 +19,13 @@ struct QexModelSharedShaders {
 
 const QexModelSharedShaders* QexModel_GetSharedShaders();
 
+// Which shared set this is, counted from 1. A model that was loaded with an earlier one, as before the engine
+// was ended and started again, holds no share of this one, and its nodes' modules are gone.
+uint32_t QexModel_GetSharedGeneration();
+inline bool QexModel_IsOutdated(const QexModel* model) {
+    return model->sharedGeneration && model->sharedGeneration != QexModel_GetSharedGeneration();
+}
+
 // Frees an array of casters and their node lists, as shadow and reflection records own one.
 inline void QexModel_FreeCasters(QexShadowCaster* casters, uint32_t count) {
     for (uint32_t i = 0; i < count; ++i) QexMemory_Free(casters[i].nodeIndices);

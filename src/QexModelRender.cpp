@@ -1,11 +1,15 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "QexDiagnostics.h"
 #include "QexModel.h"
 #include "QexPODAnimation.h"
 #include "QexPODModel.h"
 
 namespace {
+
+// Of an outdated model that was said to be one.
+constexpr uint32_t kToldGeneration = UINT32_MAX;
 
 void SetEye(const QexCamera* camera) {
     g_VecEyePos = camera->eye;
@@ -22,11 +26,23 @@ bool InPass(const QexModel* model, uint32_t node, uint32_t pass) {
     return QexPODModel_MeshOf(&model->scene, node)->passID == pass;
 }
 
+// Whether the modules that the model's nodes were given went with an earlier start of the engine; a line the
+// first time.
+bool IsGone(QexModel* model) {
+    if (!QexModel_IsOutdated(model)) return false;
+    if (model->sharedGeneration != kToldGeneration)
+        QexError(QEX_TAG,
+                 "<QexModel_Render> a model from before the engine was ended is not drawn; load it again");
+    model->sharedGeneration = kToldGeneration;
+    return true;
+}
+
 // Draws a mesh node through its module, if it has one.
 void DrawNode(QexModel* model, uint32_t node, const QexLightSet* lights, const QexMatrix* modelMatrix,
               const QexMatrix* view, const QexMatrix* projection, const QexShadowInfo* shadow = nullptr) {
     QexShaderModule* module = model->scene.nodes[node].shader;
-    if (module) module->render(module, model, node, lights, modelMatrix, view, projection, shadow);
+    if (module && !IsGone(model))
+        module->render(module, model, node, lights, modelMatrix, view, projection, shadow);
 }
 
 bool ModeAllows(const QexPODNode& node, uint32_t mode) {

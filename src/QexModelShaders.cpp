@@ -2,6 +2,7 @@
 
 #include "QexGL.h"
 #include "QexModel.h"
+#include "QexRenderTarget.h"
 #include "QexShader.h"
 
 #define QEX_MODULE "src/QexModel"
@@ -76,6 +77,7 @@ int32_t s_ShadowHeight = kDefaultShadowSize;
 ShadowShaders s_SkinShadowShaders;
 ShadowShaders s_ModelShadowShaders;
 int32_t s_ReferenceCount;
+uint32_t s_Generation = 1;  // counts the shared sets that there were, from 1
 
 int32_t Location(GLuint program, const char* name) {
     int32_t location;
@@ -86,19 +88,23 @@ int32_t Location(GLuint program, const char* name) {
 // Compiles and links a shadow program and puts its alpha texture on its unit.
 void CreateShadowProgram(uint32_t* program, ShadowShaders* shaders, const char* vertexSource,
                          const char* const* attributes, int32_t attributeCount) {
-    char log[QEX_SHADER_LOG_SIZE];
     QexShader_Create(&shaders->vertex, vertexSource, GL_VERTEX_SHADER);
     QexShader_Create(&shaders->fragment, kShadowFragmentSource, GL_FRAGMENT_SHADER);
     if (QexShader_CreateProgram(program, shaders->vertex, shaders->fragment, attributes, attributeCount,
-                                log) != 0)
-        QexError(QEX_TAG, "<QexModel_CreateDefaultShader> shadow program: %s", log);
+                                nullptr) != 0)
+        QexShader_LogFailure("QexModel_CreateDefaultShader", shaders->vertex, shaders->fragment, *program);
     QEX_GL(glUniform1i(Location(*program, "alphaTexture"), kAlphaUnit));
 }
 
 void CreateShadowTarget() {
     GLint framebuffer = 0;
-    s_Shared.shadowWidth = s_ShadowWidth;
-    s_Shared.shadowHeight = s_ShadowHeight;
+    const int32_t most = QexRenderTarget_MaxSize();
+    s_Shared.shadowWidth = s_ShadowWidth < most ? s_ShadowWidth : most;
+    s_Shared.shadowHeight = s_ShadowHeight < most ? s_ShadowHeight : most;
+    if (s_ShadowWidth > most || s_ShadowHeight > most)
+        QexError(QEX_TAG,
+                 "<QexModel_SetShadowMapSize> %d x %d pixels are cut to %d each, which this GL takes",
+                 s_ShadowWidth, s_ShadowHeight, most);
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
     QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
     QEX_GL(glGenTextures(1, &s_Shared.shadowTexture));
@@ -133,6 +139,10 @@ void DeleteShadowTarget() {
 
 const QexModelSharedShaders* QexModel_GetSharedShaders() {
     return &s_Shared;
+}
+
+uint32_t QexModel_GetSharedGeneration() {
+    return s_Generation;
 }
 
 extern "C" {
@@ -170,9 +180,15 @@ void QexModel_ReleaseShader(int32_t force) {
     QexSkinningTextureShader_Release(&s_Shared.skinning);
     QexSimpleShader_Release(&s_Shared.simple);
     s_ReferenceCount = 0;
+    ++s_Generation;
 }
 
 void QexModel_SetShadowMapSize(int32_t width, int32_t height) {
+    if (width < 1 || height < 1) {
+        QexError(QEX_TAG, "<QexModel_SetShadowMapSize> %d x %d pixels; it stays %d x %d", width, height,
+                 s_ShadowWidth, s_ShadowHeight);
+        return;
+    }
     s_ShadowWidth = width;
     s_ShadowHeight = height;
 }

@@ -20,7 +20,9 @@ const QexShaderModuleType kStaticCaster = {
     {},
     {},
     false,
-    0};
+    0,
+    0,
+    true};
 const QexShaderModuleType kSkinnedCaster = {QEX_MODULE,
                                             nullptr,
                                             nullptr,
@@ -32,7 +34,9 @@ const QexShaderModuleType kSkinnedCaster = {QEX_MODULE,
                                             {},
                                             {},
                                             false,
-                                            0};
+                                            0,
+                                            0,
+                                            true};
 
 // The axis-aligned box of a box seen through a matrix.
 QexAABB TransformedBox(const QexMatrix* matrix, const QexBoundingBox* box) {
@@ -190,7 +194,7 @@ void QexModel_RenderShadow(const QexRuntimeContext* context, const QexMatrix* mo
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
     QexModel_RenderFromShadowCamera(modelMatrix, info);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
-    QEX_GL(glViewport(0, 0, context->width, context->height));
+    QEX_GL(glViewport(0, 0, QexGL_Size(context->width), QexGL_Size(context->height)));
     QEX_GL(glEnable(GL_SCISSOR_TEST));
 }
 
@@ -207,8 +211,8 @@ void QexModel_RenderFromShadowCamera(const QexMatrix* modelMatrix, const QexShad
                 DrawStatic(caster.model, node, modelMatrix, &info->lightViewProj);
         }
     }
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
-    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
+    glBindBuffer(GL_ARRAY_BUFFER, 0);
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
 }
 
 void QexModel_DrawShadowMesh(QexModel* model, uint32_t nodeIndex) {

@@ -65,15 +65,15 @@ const struct {
                  {&s_Program.mvpMatrix, "MVPMatrix"}};
 
 bool CreateProgram() {
-    if (!QexShader_BuildProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader,
-                                kVertexSource, kFragmentSource, nullptr, 0)) {
+    if (!QexShader_BuildProgram("QexParticleSet_Create", &s_Program.program, &s_Program.vertexShader,
+                                &s_Program.fragmentShader, kVertexSource, kFragmentSource, nullptr, 0)) {
         QexError(QEX_TAG, "<QexParticleSet_Create> the particle sets' program cannot be built");
         return false;
     }
     for (const auto& attribute : kAttributes)
-        QEX_GL(*attribute.location = glGetAttribLocation(s_Program.program, attribute.name));
+        *attribute.location = glGetAttribLocation(s_Program.program, attribute.name);
     for (const auto& uniform : kUniforms)
-        QEX_GL(*uniform.location = glGetUniformLocation(s_Program.program, uniform.name));
+        *uniform.location = glGetUniformLocation(s_Program.program, uniform.name);
     return true;
 }
 

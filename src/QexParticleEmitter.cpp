@@ -143,8 +143,7 @@ QexParticleEmitter* QexParticleEmitter_Create(void) {
 void QexParticleEmitter_Update(QexParticleEmitter* emitter, float elapsed, void*) {
     if (!emitter) return;
     Advance(emitter, elapsed);
-    if (!emitter->emitting) return;
-    Emit(emitter);
+    if (emitter->emitting) Emit(emitter);
     CountDown(emitter, elapsed);
 }
 

@@ -2,6 +2,7 @@
 // third, and a mix of the three on the screen. The modules are Shaders/QexBlurShader, QexDOFShader and the
 // two depth modules; the copy program, which shows a target as it is, is made here.
 #include "QexGL.h"
+#include "QexRenderTarget.h"
 #include "QexShader.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
@@ -123,10 +124,7 @@ void main() {
 int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context) {
     if (!context) return kNullArgument;
     const int32_t width = context->width, height = context->height;
-    if (width < 1 || height < 1) {
-        QexError(QEX_TAG, "<QexPostProcessing_Initialize> a screen of %d x %d pixels", width, height);
-        return kFailed;
-    }
+    if (!QexRenderTarget_CheckSize("QexPostProcessing_Initialize", width, height)) return kFailed;
     QexPostProcessing_Finalize();
     QexPP_CreateQuad(context);
     for (int i = 0; i < QEX_POST_PROCESSING_TARGETS; ++i) {
@@ -172,8 +170,8 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     QexMatrix projection;
     QexMatrix_Orthographic(&projection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
     QexPP_ReleaseShader();
-    if (!QexShader_BuildProgram(&m_iProgNamePP, &s_VertexShader, &s_FragmentShader, pVertexShaderPP,
-                                pFragmentShaderPP, nullptr, 0))
+    if (!QexShader_BuildProgram("QexPP_CreateShader", &m_iProgNamePP, &s_VertexShader, &s_FragmentShader,
+                                pVertexShaderPP, pFragmentShaderPP, nullptr, 0))
         return kFailed;
     GLint location;
     QEX_GL(s_Position = glGetAttribLocation(m_iProgNamePP, "a_v4Position"));

@@ -100,8 +100,8 @@ void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet
                                               projection);
     QexRenderer_SetBackFaceCulling(2);
     DrawReflected(reflection, lights, camera);
-    if (reflection->useStencil) QEX_GL(glDisable(GL_STENCIL_TEST));
-    QEX_GL(glClear(GL_DEPTH_BUFFER_BIT));
+    if (reflection->useStencil) glDisable(GL_STENCIL_TEST);
+    glClear(GL_DEPTH_BUFFER_BIT);
     QexRenderer_SetBackFaceCulling(1);
     if (!plane) return;
     QexModel_RenderNodeWithViewProjection(reflection->model, reflection->planeNode, lights, nullptr, view,
@@ -112,11 +112,11 @@ void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet
 void QexModel_RenderReflectionPlaneStencil(QexModel* model, uint32_t planeNode, const QexLightSet* lights,
                                            const QexMatrix* modelMatrix, const QexMatrix* view,
                                            const QexMatrix* projection) {
-    QEX_GL(glEnable(GL_STENCIL_TEST));
-    QEX_GL(glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE));
-    QEX_GL(glDisable(GL_DEPTH_TEST));
-    QEX_GL(glStencilFunc(GL_ALWAYS, 1, 1));
-    QEX_GL(glStencilOp(GL_KEEP, GL_KEEP, GL_REPLACE));
+    glEnable(GL_STENCIL_TEST);
+    glColorMask(GL_FALSE, GL_FALSE, GL_FALSE, GL_FALSE);
+    glDisable(GL_DEPTH_TEST);
+    glStencilFunc(GL_ALWAYS, 1, 1);
+    glStencilOp(GL_KEEP, GL_KEEP, GL_REPLACE);
     if (planeNode < model->scene.meshNodeCount) {
         QexPODNode& node = model->scene.nodes[planeNode];
         QexShaderModule* const own = node.shader;
@@ -124,10 +124,10 @@ void QexModel_RenderReflectionPlaneStencil(QexModel* model, uint32_t planeNode, 
         QexModel_RenderNodeWithViewProjection(model, planeNode, lights, modelMatrix, view, projection);
         node.shader = own;
     }
-    QEX_GL(glColorMask(GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE));
-    QEX_GL(glEnable(GL_DEPTH_TEST));
-    QEX_GL(glStencilFunc(GL_EQUAL, 1, 1));
-    QEX_GL(glStencilOp(GL_KEEP, GL_KEEP, GL_KEEP));
+    glColorMask(GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE);
+    glEnable(GL_DEPTH_TEST);
+    glStencilFunc(GL_EQUAL, 1, 1);
+    glStencilOp(GL_KEEP, GL_KEEP, GL_KEEP);
 }
 
 }  // extern "C"

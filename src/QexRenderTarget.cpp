@@ -1,7 +1,7 @@
 #include <cstring>
 
-#include "Qex.h"
 #include "QexGL.h"
+#include "QexRenderTarget.h"
 
 #define QEX_MODULE "src/QexRenderTarget"
 
@@ -26,15 +26,31 @@ void CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {
 }
 
 void SetViewport(const int32_t* viewport) {
-    QEX_GL(glViewport(viewport[0], viewport[1], viewport[2], viewport[3]));
+    glViewport(viewport[0], viewport[1], viewport[2], viewport[3]);
 }
 
 }  // namespace
+
+int32_t QexRenderTarget_MaxSize() {
+    GLint texture = 0, renderbuffer = 0;
+    glGetIntegerv(GL_MAX_TEXTURE_SIZE, &texture);
+    glGetIntegerv(GL_MAX_RENDERBUFFER_SIZE, &renderbuffer);
+    const GLint least = texture < renderbuffer ? texture : renderbuffer;
+    return least > 0 ? least : INT32_MAX;
+}
+
+bool QexRenderTarget_CheckSize(const char* function, int32_t width, int32_t height) {
+    const int32_t most = QexRenderTarget_MaxSize();
+    if (width >= 1 && height >= 1 && width <= most && height <= most) return true;
+    QexError(QEX_TAG, "<%s> %d x %d pixels; this GL takes 1 to %d each", function, width, height, most);
+    return false;
+}
 
 extern "C" {
 
 int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t height, int32_t) {
     memset(target, 0, sizeof *target);
+    if (!QexRenderTarget_CheckSize("QexRenderTarget_Create", width, height)) return -1;
     target->created = 1;
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &target->savedFramebuffer));
     QEX_GL(glGenFramebuffers(1, &target->framebuffer));
@@ -60,7 +76,7 @@ int32_t QexRenderTarget_CreateFromTexture(QexRenderTarget*, QexTexture*) {
 int32_t QexRenderTarget_BeginScene(QexRenderTarget* target) {
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &target->savedFramebuffer));
     glGetIntegerv(GL_VIEWPORT, target->savedViewport);
-    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer));
+    glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer);
     SetViewport(target->viewport);
     return 0;
 }
@@ -71,9 +87,10 @@ void QexRenderTarget_EndScene(QexRenderTarget* target) {
 }
 
 int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context, QexRenderTarget* target) {
-    const int32_t screen[] = {0, 0, context ? context->width : 0, context ? context->height : 0};
+    const int32_t screen[] = {0, 0, context ? QexGL_Size(context->width) : 0,
+                              context ? QexGL_Size(context->height) : 0};
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target ? target->framebuffer : 0));
-    SetViewport(target ? target->viewport : screen);
+    QEX_GL(SetViewport(target ? target->viewport : screen));
     return 0;
 }
 

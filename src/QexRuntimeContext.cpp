@@ -1,3 +1,6 @@
+// Start and end of the engine.
+#include <GLES2/gl2.h>
+
 #include <cstring>
 
 #include "QexDiagnostics.h"
@@ -35,16 +38,27 @@ void SetPool(QexRuntimeContext* context, const QexEngineConfig& config) {
     context->poolSize = config.memorySize > skipped ? config.memorySize - skipped : 0;
 }
 
+// Whether a GL answers. Without a current context it names no version and knows no limits. An error line in
+// the function's name when there is none.
+bool HasContext(const char* function) {
+    GLint limit = 0;
+    if (glGetString(GL_VERSION)) return true;
+    glGetIntegerv(GL_MAX_TEXTURE_SIZE, &limit);
+    if (limit > 0) return true;
+    QexError(QEX_TAG, "<%s> no GL context is current on this thread", function);
+    return false;
+}
+
 }  // namespace
 
 extern "C" {
 
 int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config) {
-    if (!IsConfigSize(configSize) || !context || !config) return -1;
+    if (!IsConfigSize(configSize) || !context || !config || !HasContext("QexEngine_Init")) return -1;
     CopyWindowWords(context, *config);
     QexInitEGL(context);
     CopyWindowWords(config, *context);
-    QexEngine_InitForOwnerDraw(context, configSize, config);
+    if (QexEngine_InitForOwnerDraw(context, configSize, config) != 0) return -1;
     s_Initialized = 1;
     QexLog(QEX_TAG, "<QexEngine_Init> Engine initialization success.");
     return 0;
@@ -52,6 +66,7 @@ int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, QexEngin
 
 int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config) {
     if (!IsConfigSize(configSize) || !context || !config) return -1;
+    if (!HasContext("QexEngine_InitForOwnerDraw")) return -1;
     memset(context, 0, sizeof *context);
     SetPool(context, *config);
     CopyWindowWords(context, *config);

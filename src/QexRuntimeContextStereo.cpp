@@ -11,13 +11,13 @@ GLint Shift(const QexRuntimeContext* context) {
 }
 
 GLsizei HalfWidth(const QexRuntimeContext* context) {
-    return static_cast<GLsizei>(static_cast<uint32_t>(context->width) >> 1);
+    return QexGL_Size(context->width) >> 1;
 }
 
 void BeginAnaglyphEye(const QexRuntimeContext* context, GLint x, GLboolean red, GLboolean green,
                       GLboolean blue) {
     QEX_GL(glColorMask(red, green, blue, GL_TRUE));
-    QEX_GL(glViewport(x, 0, context->width, context->height));
+    QEX_GL(glViewport(x, 0, QexGL_Size(context->width), QexGL_Size(context->height)));
 }
 
 }  // namespace
@@ -45,7 +45,9 @@ void QexRenderer_PrepareLeft(const QexRuntimeContext* context) {
         case QEX_STEREO_RED_CYAN:
             BeginAnaglyphEye(context, -Shift(context), GL_TRUE, GL_FALSE, GL_FALSE);
             break;
-        case QEX_STEREO_SIDE_BY_SIDE: QEX_GL(glViewport(0, 0, HalfWidth(context), context->height)); break;
+        case QEX_STEREO_SIDE_BY_SIDE:
+            QEX_GL(glViewport(0, 0, HalfWidth(context), QexGL_Size(context->height)));
+            break;
         default: break;
     }
 }
@@ -55,14 +57,14 @@ void QexRenderer_PrepareRight(const QexRuntimeContext* context) {
     if (mode < QEX_STEREO_RED_BLUE || mode > QEX_STEREO_SIDE_BY_SIDE) return;
     QEX_GL(glClear(GL_DEPTH_BUFFER_BIT));
     if (mode == QEX_STEREO_SIDE_BY_SIDE)
-        QEX_GL(glViewport(HalfWidth(context), 0, HalfWidth(context), context->height));
+        QEX_GL(glViewport(HalfWidth(context), 0, HalfWidth(context), QexGL_Size(context->height)));
     else
         BeginAnaglyphEye(context, Shift(context), GL_FALSE, mode == QEX_STEREO_RED_CYAN, GL_TRUE);
 }
 
 void QexRenderer_FinishStereo3D(const QexRuntimeContext* context) {
     QEX_GL(glColorMask(GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE));
-    QEX_GL(glViewport(0, 0, context->width, context->height));
+    QEX_GL(glViewport(0, 0, QexGL_Size(context->width), QexGL_Size(context->height)));
 }
 
 }  // extern "C"

@@ -1,4 +1,5 @@
 #include "QexGL.h"
+#include "QexShader.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
 
@@ -83,13 +84,13 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
     record->type = type;
     const bool lit = type == QEX_PROGRAM_TEXTURE_LIGHT;
     if (!lit && type != QEX_PROGRAM_TEXTURE_COLOUR) return -1;
-    char log[QEX_SHADER_LOG_SIZE];
     DeleteShaders();
     QexShader_Create(&s_VertexShader, lit ? kLightVertexSource : kColourVertexSource, GL_VERTEX_SHADER);
     QexShader_Create(&s_FragmentShader, lit ? kLightFragmentSource : kColourFragmentSource,
                      GL_FRAGMENT_SHADER);
-    QexShader_CreateProgram(&record->program, s_VertexShader, s_FragmentShader,
-                            lit ? kLightAttributes : kColourAttributes, lit ? 3 : 4, log);
+    if (QexShader_CreateProgram(&record->program, s_VertexShader, s_FragmentShader,
+                                lit ? kLightAttributes : kColourAttributes, lit ? 3 : 4, nullptr) != 0)
+        QexShader_LogFailure("QexShaderProgram_Create", s_VertexShader, s_FragmentShader, record->program);
     record->mvpMatrixLoc = Location(record, "MVPMatrix");
     if (lit) {
         record->lightDirectionLoc = Location(record, "LightDirection");

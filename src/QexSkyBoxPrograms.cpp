@@ -207,6 +207,8 @@ bool QexSkyBox_CreatePrograms() {
         if (QexShader_CreateProgram(row.program, s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
                                     kAttributes, row.attributeCount, log) != 0) {
             QexSystem_Printf(row.error, log);
+            QexShader_LogFailure("QexSkyBox_Create", s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
+                                 0);
             QEX_GL(glDeleteProgram(*row.program));
             *row.program = 0;
             return false;

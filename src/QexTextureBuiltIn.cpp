@@ -3,6 +3,7 @@
 
 #include "QexGL.h"
 #include "QexMemory.h"
+#include "QexTexture.h"
 
 #define QEX_MODULE "src/QexTexture"
 
@@ -112,6 +113,11 @@ int32_t QexTexture_ReleaseDefault(void) {
 }
 
 int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t size) {
+    if (size < 1 ||
+        !QexTexture_IsPossibleSize(static_cast<uint32_t>(size), static_cast<uint32_t>(size), true)) {
+        QexSystem_Printf("ERROR:<GenerateNormalisationCubeMap> a cube map of %d pixels a side\n", size);
+        return -1;
+    }
     glGenTextures(1, &texture->glName);
     QexRenderState_Bind(GL_TEXTURE_CUBE_MAP, texture->glName);
     texture->width = size;

@@ -4,8 +4,16 @@
 
 #include "../QexPODAnimation.h"
 #include "../QexPODModel.h"
+#include "../QexShader.h"
 
 #define QEX_MODULE (type->path)
+
+// The meshes of the pass from the light are set up without checks.
+#define QEX_GL_UNLESS_CASTER(call)           \
+    do {                                     \
+        call;                                \
+        if (!type->isCaster) QEX_GL_CHECK(); \
+    } while (0)
 
 namespace {
 
@@ -23,6 +31,12 @@ constexpr QexPODMaterial kNoMaterial = MakeWhite();
 
 QexTexture* TextureOf(QexTexture** textures, const QexPODNode* node) {
     return node->materialIndex < 0 || !textures ? nullptr : textures[node->materialIndex];
+}
+
+// Whether the application's hook has bound a texture for the node.
+bool HookBinds(const QexShaderDraw& draw) {
+    QexModel* model = draw.model;
+    return model->bindTextureHook && model->bindTextureHook(model, draw.nodeIndex);
 }
 
 uint32_t MeshIndexOf(const QexModel* model, uint32_t nodeIndex) {
@@ -68,7 +82,6 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
 }
 
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
-    char log[QEX_SHADER_LOG_SIZE];
     const char* names[kMaxShaderAttributes];
     int32_t attributeCount = 0;
     while (type->attributes[attributeCount].name) {
@@ -78,15 +91,14 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
     QexShader_Create(&module->vertexShader, type->vertexSource, GL_VERTEX_SHADER);
     QexShader_Create(&module->fragmentShader, type->fragmentSource, GL_FRAGMENT_SHADER);
     if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names,
-                                attributeCount, log) != 0)
-        QexError(QEX_TAG, "<%s> link failed: %s", type->path, log);
+                                attributeCount, nullptr) != 0)
+        QexShader_LogFailure(type->path, module->vertexShader, module->fragmentShader, module->program);
     for (uint32_t i = 0; type->uniforms[i]; ++i) {
         if (!*type->uniforms[i]) continue;
-        QEX_GL(module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]));
+        module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]);
     }
     for (const QexShaderSampler* sampler = type->samplers; sampler->name; ++sampler) {
-        GLint location;
-        QEX_GL(location = glGetUniformLocation(module->program, sampler->name));
+        const GLint location = glGetUniformLocation(module->program, sampler->name);
         QEX_GL(glUniform1i(location, sampler->unit));
     }
     return 0;
@@ -152,14 +164,13 @@ void QexShaderModule_BindMaterial(const QexShaderDraw& draw) {
 }
 
 void QexShaderModule_BindMaterialKeepPass(const QexShaderDraw& draw) {
-    QexModel* model = draw.model;
-    QexTexture_Set(TextureOf(model->alphaTextures, draw.node), kAlphaUnit);
-    if (model->bindTextureHook && model->bindTextureHook(model, draw.nodeIndex)) return;
-    QexTexture_Set(TextureOf(model->textures, draw.node), kDiffuseUnit);
+    QexTexture_Set(TextureOf(draw.model->alphaTextures, draw.node), kAlphaUnit);
+    if (!HookBinds(draw)) QexTexture_Set(TextureOf(draw.model->textures, draw.node), kDiffuseUnit);
 }
 
-void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw) {
+void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw, QexBindHook hook) {
     QexTexture_Set(nullptr, kAlphaUnit);
+    if (hook == QexBindHook::kAsk && HookBinds(draw)) return;
     if (draw.node->materialIndex >= 0)
         QexTexture_Set(TextureOf(draw.model->textures, draw.node), kDiffuseUnit);
 }
@@ -168,11 +179,11 @@ void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw) {
 
 void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
     const QexPODMesh& mesh = model->scene.meshes[meshIndex];
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[meshIndex]));
-    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[meshIndex]));
+    QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[meshIndex]));
+    QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[meshIndex]));
     for (GLuint i = 0; type->attributes[i].name; ++i) {
         if (mesh.attributes[type->attributes[i].element].componentCount)
-            QEX_GL(glEnableVertexAttribArray(i));
+            QEX_GL_UNLESS_CASTER(glEnableVertexAttribArray(i));
         else
             QEX_GL(glVertexAttrib4f(i, 0, 0, 0, 1));
     }
@@ -189,8 +200,8 @@ void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* mo
     for (GLuint i = 0; type->attributes[i].name; ++i)
         if (mesh.attributes[type->attributes[i].element].componentCount)
             QEX_GL(glDisableVertexAttribArray(i));
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
-    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
+    QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ARRAY_BUFFER, 0));
+    QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
 }
 
 int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex) {

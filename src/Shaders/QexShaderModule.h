@@ -39,6 +39,7 @@ struct QexShaderModuleType {
     bool hasThreshold;
     uint32_t thresholdSlot;
     float secondDefault = 0;  // of the slot behind the threshold, in modules that have a parameter there
+    bool isCaster = false;    // draws what throws shadows, in the pass from the light
 };
 
 // Lifetime. Alloc gives a cleared record, or null with a line in the log; Create sets it up, too.
@@ -88,9 +89,10 @@ void QexShaderModule_BindMaterial(const QexShaderDraw& draw);
 // The same for modules that take a node's pass as it is.
 void QexShaderModule_BindMaterialKeepPass(const QexShaderDraw& draw);
 
-// For modules that read alpha from the diffuse texture: no alpha texture, no hook; without a material the
-// diffuse unit stays as it is.
-void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw);
+// For modules that read alpha from the diffuse texture: no alpha texture; without a material the diffuse unit
+// stays as it is. The model's hook is asked by some of them only.
+enum class QexBindHook { kAsk, kIgnore };
+void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw, QexBindHook hook);
 
 // Binds the mesh's buffers and feeds the module's attributes; End undoes both.
 void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);

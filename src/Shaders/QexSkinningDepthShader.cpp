@@ -15,7 +15,8 @@ void main() {
 const char* const kFragmentSource = QEX_GLSL_FRAGMENT_PRECISION QEX_GLSL_ALPHA R"(
 varying float fDepth;
 void main() {
-    gl_FragColor = vec4(fDepth, fDepth, fDepth, surfaceAlpha());
+    lowp float alpha = opacity * texture2D(alphaTexture, fTexCoord).r;
+    gl_FragColor = vec4(fDepth, fDepth, fDepth, alpha <= alphaThreshold ? 0.0 : 1.0);
 }
 )";
 

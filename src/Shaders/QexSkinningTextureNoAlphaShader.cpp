@@ -38,7 +38,7 @@ void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* m
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexSkinningTextureShader_SetUniforms(draw, view, projection);
-    QexShaderModule_BindDiffuseOnly(draw);
+    QexShaderModule_BindDiffuseOnly(draw, QexBindHook::kIgnore);
     QexSkinningTextureShader_DrawMesh(module, model, nodeIndex, modelMatrix);
 }
 

@@ -41,7 +41,7 @@ void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, ui
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexTextureShader_SetUniforms(draw, modelMatrix, view, projection);
-    QexShaderModule_BindDiffuseOnly(draw);
+    QexShaderModule_BindDiffuseOnly(draw, QexBindHook::kAsk);
     QexTextureNoAlphaShader_DrawMesh(module, model, nodeIndex);
 }
 

@@ -32,7 +32,7 @@ void QexUVDisplacementNoAlphaShader_Render(QexShaderModule* module, QexModel* mo
     QexShaderDraw draw;
     if (!QexShaderModule_Begin(&draw, &kType, module, model, nodeIndex)) return;
     QexUVDisplacementShader_SetUniforms(draw, modelMatrix, view, projection);
-    QexShaderModule_BindDiffuseOnly(draw);
+    QexShaderModule_BindDiffuseOnly(draw, QexBindHook::kAsk);
     QexUVDisplacementNoAlphaShader_DrawMesh(module, model, nodeIndex);
 }
 

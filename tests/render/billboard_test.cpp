@@ -50,8 +50,10 @@ TEST_F(BillboardTest, ModesTurnAsDescribed) {
     QexBillboard* billboard = QexBillboard_Create(&texture);
     *billboard = {&texture, 64, 32, 1, {0.5f, 2, 7}, {20, -50, 70}, {3, -4, 5}, 1, 1};
     // About the billboard: in front, to the sides, behind, above and below.
-    const QexVec3 offsets[] = {{0, 0, 9}, {0, 10, 10}, {8, 0, 0},   {-8, 0, 0}, {5, -6, 7},
-                               {5, 6, 7}, {-5, 6, -7}, {-1, -9, 2}, {3, 1, -8}};
+    const QexVec3 offsets[] = {
+        {0, 0, 9},   {0, 10, 10}, {8, 0, 0},  {-8, 0, 0}, {5, -6, 7}, {5, 6, 7},
+        {-5, 6, -7}, {-1, -9, 2}, {3, 1, -8}, {0, 9, 0},  {0, -9, 0}};  // from above and below there is no
+                                                                        // yaw
     for (const QexVec3& offset : offsets) {
         QexCamera camera;
         QexCamera_Create(&camera, 0);

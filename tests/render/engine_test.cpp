@@ -1,6 +1,6 @@
 #include <cstring>
 
-#include "RenderFixture.h"
+#include "Scenes.h"
 #include "support/Capture.h"
 
 namespace {
@@ -76,6 +76,45 @@ TEST_F(EngineTest, ContextTakesTheConfigurationAndRoundsThePool) {
         QexEngine_Shutdown(&runtime);
         QexEngine_Shutdown(&runtime);
     }
+}
+
+TEST(Engine, NeedsAContext) {
+    QexRuntimeContext runtime = {};
+    QexEngineConfig config = SurfaceConfig();
+    Capture log(STDERR_FILENO);
+    EXPECT_EQ(QexEngine_Init(&runtime, sizeof config, &config), -1);
+    EXPECT_EQ(QexEngine_InitForOwnerDraw(&runtime, sizeof config, &config), -1);
+    EXPECT_EQ(log.Text(),
+              "E/Qex: <QexEngine_Init> no GL context is current on this thread\n"
+              "E/Qex: <QexEngine_InitForOwnerDraw> no GL context is current on this thread\n");
+    EXPECT_EQ(Flags(), "00");
+}
+
+// A model that outlives the engine takes nothing from the next start, and is not drawn with modules that are
+// gone.
+TEST_F(EngineTest, ModelsOfAnEarlierStart) {
+    QexRuntimeContext runtime = {};
+    QexEngineConfig config = SurfaceConfig();
+    Capture log(STDERR_FILENO);
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    auto old = std::make_unique<LoadedModel>(SceneOf(pod::BuildMesh(Rectangle(0, 0, 8, 8))));
+    QexEngine_Shutdown(&runtime);
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    LoadedModel fresh(SceneOf(pod::BuildMesh(Rectangle(20, 0, 30, 8))));
+    const std::string before = LiveObjects();
+    Clear();
+    old->Draw();
+    old->Draw();
+    old.reset();
+    fresh.Draw();
+    EXPECT_EQ(Read().Pixel(4, kHeight - 4), (Rgba{0, 0, 0, 0}));
+    EXPECT_EQ(Read().Pixel(25, kHeight - 4), (Rgba{255, 255, 255, 255}));
+    QexModel_Unload(&fresh.model);
+    QexEngine_Shutdown(&runtime);
+    EXPECT_EQ(LiveObjects(), "");
+    const std::string text = log.Text(), line = "a model from before the engine was ended is not drawn";
+    EXPECT_NE(text.find(line), std::string::npos);
+    EXPECT_EQ(text.find(line), text.rfind(line)) << "once";
 }
 
 }  // namespace

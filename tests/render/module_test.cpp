@@ -79,10 +79,11 @@ TEST_F(ModuleTest, HookMaterialAndMissingTextures) {
         QexTexture* diffuse;
         Rgba expected;
     } cases[] = {
-        {texture, nullptr, 0, 0, &blue, isBlue},  {texture, nullptr, 0, 0, nullptr, white},
-        {texture, nullptr, 0, -1, &blue, white},  {texture, BindHook, 1, 0, &blue, isGreen},
-        {texture, BindHook, 0, 0, &blue, isBlue}, {texture, BindHook, 1, -1, &blue, isGreen},
-        {noAlpha, BindHook, 1, 0, &blue, isBlue}, {noAlpha, nullptr, 0, -1, &blue, asBefore},
+        {texture, nullptr, 0, 0, &blue, isBlue},    {texture, nullptr, 0, 0, nullptr, white},
+        {texture, nullptr, 0, -1, &blue, white},    {texture, BindHook, 1, 0, &blue, isGreen},
+        {texture, BindHook, 0, 0, &blue, isBlue},   {texture, BindHook, 1, -1, &blue, isGreen},
+        {noAlpha, BindHook, 1, 0, &blue, isGreen},  {noAlpha, BindHook, 0, 0, &blue, isBlue},
+        {noAlpha, nullptr, 0, -1, &blue, asBefore},
     };
     g_hookTexture = &green;
     for (const auto& c : cases) {

@@ -118,6 +118,22 @@ TEST(EmitterFile, EveryFieldKeepsItsPlace) {
     EXPECT_EQ(emitter->particles[299].billboard, nullptr);
 }
 
+// Whether or not it emits.
+TEST(Emitter, TheDurationCountsDown) {
+    for (const int32_t emitting : {0, 1}) {
+        const EmitterPointer emitter = NewEmitter();
+        emitter->emitting = emitting;
+        emitter->emissionRate[0] = emitter->emissionRate[1] = emitter->currentRate = 0;
+        emitter->emitDuration = 1;
+        QexParticleEmitter_Update(emitter.get(), 0.75f, nullptr);
+        EXPECT_EQ(emitter->emitDuration, 0.25f);
+        EXPECT_EQ(emitter->emitting, emitting);
+        QexParticleEmitter_Update(emitter.get(), 0.75f, nullptr);
+        EXPECT_EQ(emitter->emitDuration, -0.5f);
+        EXPECT_EQ(emitter->emitting, 0);
+    }
+}
+
 TEST(EmitterFile, BrokenFilesAreRefused) {
     EXPECT_EQ(QexParticleEmitter_WriteToBinFile(nullptr, "x"), -2);
     const EmitterPointer emitter = NewEmitter();
