@@ -433,12 +433,12 @@ QEX_API float Qex_Sign(float a);
  *  @return the root; 0 when a <= 0. */
 QEX_API float Qex_Sqrt(float a);
 
-/** Arc tangent by a short series, to about 2e-4.
+/** Arc tangent by a short series, to 1.4e-5.
  *  @param t  tangent, >= 0
  *  @return the angle in radians, 0 to pi/2. */
 QEX_API float Qex_ArcTan(float t);
 
-/** Angle of the point (x, y) by a short series, to about 2e-5.
+/** Angle of the point (x, y) by a short series, to 1.3e-6.
  *  @return the angle in radians: 0 to 2 pi when x is not 0; for x = 0, pi/2, -pi/2 or 0 by the sign of y.
  *          Points on the negative X axis (x < 0, y = 0) give 0. */
 QEX_API float Qex_ArcTan2(float x, float y);
@@ -2034,7 +2034,7 @@ QEX_API void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t wid
  * number of nodes and models. Texture units: 0 diffuse, 1 normal map, 2 shadow map, 3 alpha texture. Alpha is
  * opacity (material's times g_fQexGlobalAlpha) times the alpha source, and 0 when that is not above the
  * module's threshold; a node without a material is opaque. A mesh without one of the attributes that a module
- * reads supplies zeros for it. Needs a current GL context, except for the threshold functions.
+ * reads supplies (0, 0, 0, 1) for it. Needs a current GL context, except for the threshold functions.
  * ====================================================================================================== */
 
 /** Draws one node.
@@ -2075,7 +2075,8 @@ struct QexShaderModule {
 /** Creates the unlit texture module, threshold 0.5. @return the module, owned by the caller; null when memory
  *  runs out. */
 QEX_API QexShaderModule* QexTextureShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexTextureShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexTextureShader_Release(QexShaderModule** module);
@@ -2098,7 +2099,8 @@ QEX_API void QexTextureShader_Render(QexShaderModule* module, QexModel* model, u
 /** Creates the unlit module without alpha texture, threshold 0.5. @return as QexTextureShader_CreateProgram.
  */
 QEX_API QexShaderModule* QexTextureNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexTextureNoAlphaShader_Release(QexShaderModule** module);
@@ -2124,7 +2126,8 @@ QEX_API void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* m
 
 /** Creates the unlit skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningTextureShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningTextureShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningTextureShader_Release(QexShaderModule** module);
@@ -2147,7 +2150,8 @@ QEX_API void QexSkinningTextureShader_Render(QexShaderModule* module, QexModel* 
 
 /** Creates the flat white module. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSimpleShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSimpleShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSimpleShader_Release(QexShaderModule** module);
@@ -2166,7 +2170,8 @@ QEX_API void QexSimpleShader_Render(QexShaderModule* module, QexModel* model, ui
 /** Creates the unlit module with shifted texture coordinates, threshold 0.5, shift (0, 0). @return as
  * QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexUVDisplacementShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexUVDisplacementShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexUVDisplacementShader_Release(QexShaderModule** module);
@@ -2193,7 +2198,8 @@ QEX_API void QexUVDisplacementShader_Render(QexShaderModule* module, QexModel* m
 /** Creates the unlit module with shifted texture coordinates and without alpha texture, threshold 0.5, shift
  * (0, 0). @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexUVDisplacementNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexUVDisplacementNoAlphaShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexUVDisplacementNoAlphaShader_Release(QexShaderModule** module);
@@ -2224,7 +2230,8 @@ QEX_API void QexUVDisplacementNoAlphaShader_Render(QexShaderModule* module, QexM
 
 /** Creates the module lit per vertex, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexGouraudShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShader_Release(QexShaderModule** module);
@@ -2248,7 +2255,8 @@ QEX_API void QexGouraudShader_Render(QexShaderModule* module, QexModel* model, u
 
 /** Creates the lit module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudSpecularShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexGouraudSpecularShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudSpecularShader_Release(QexShaderModule** module);
@@ -2272,7 +2280,8 @@ QEX_API void QexGouraudSpecularShader_Render(QexShaderModule* module, QexModel* 
 
 /** Creates the normal-mapped module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudNormalMapShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudNormalMapShader_Release(QexShaderModule** module);
@@ -2297,7 +2306,8 @@ QEX_API void QexGouraudNormalMapShader_Render(QexShaderModule* module, QexModel*
 
 /** Creates the shadow-receiving module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudShadowShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexGouraudShadowShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShadowShader_Release(QexShaderModule** module);
@@ -2315,12 +2325,14 @@ QEX_API void QexGouraudShadowShader_Render(QexShaderModule* module, QexModel* mo
 
 /* QexGouraudShadowExtShader (QEX_SHADER_GOURAUD_SHADOW_EXT): as QexGouraudShadowShader, with shadows that
  * lighten with the distance between what casts and what receives them: intensity + depth difference * fade,
- * from 0 to 1. Slots: as QexGouraudShadowShader, with shadowFade behind shadowIntensity; threshold, fade. */
+ * from 0 to 1. Slots: as QexGouraudShadowShader to shadowIntensity (14), then the location of shadowFade
+ * (15), the threshold (16) and the fade (17). */
 
 /** Creates the module that receives fading shadows, threshold 0.5, fade 1. @return as
  * QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudShadowExtShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexGouraudShadowExtShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShadowExtShader_Release(QexShaderModule** module);
@@ -2348,7 +2360,8 @@ QEX_API void QexGouraudShadowExtShader_Render(QexShaderModule* module, QexModel*
 /** Creates the unlit skinned module without alpha texture, threshold 0.5. @return as
  * QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningTextureNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningTextureNoAlphaShader_Release(QexShaderModule** module);
@@ -2371,7 +2384,8 @@ QEX_API void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, Qex
 
 /** Creates the lit skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningGouraudShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningGouraudShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudShader_Release(QexShaderModule** module);
@@ -2394,7 +2408,8 @@ QEX_API void QexSkinningGouraudShader_Render(QexShaderModule* module, QexModel* 
 
 /** Creates the skinned module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningGouraudSpecularShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningGouraudSpecularShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudSpecularShader_Release(QexShaderModule** module);
@@ -2417,7 +2432,8 @@ QEX_API void QexSkinningGouraudSpecularShader_Render(QexShaderModule* module, Qe
 
 /** Creates the normal-mapped skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningGouraudNormalMapShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudNormalMapShader_Release(QexShaderModule** module);
@@ -2440,7 +2456,8 @@ QEX_API void QexSkinningGouraudNormalMapShader_Render(QexShaderModule* module, Q
 
 /** Creates the depth module; near and far are not set yet. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexDepthShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexDepthShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexDepthShader_Release(QexShaderModule** module);
@@ -2461,7 +2478,8 @@ QEX_API void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uin
 /** Creates the skinned depth module, threshold 0.5; near and far are not set yet. @return as
  * QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexSkinningDepthShader_CreateProgram(void);
-/** Compiles and links into a module's record; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
+ */
 QEX_API int32_t QexSkinningDepthShader_SetupProgram(QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningDepthShader_Release(QexShaderModule** module);
@@ -2779,7 +2797,10 @@ QEX_API void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLight
                                                  uint32_t* count);
 
 /** Sorts the list by distance (with the C library's qsort, which may allocate for long lists) and draws the
- * entries of the pass, farthest first. Entries of several models and cameras may share a list. */
+ *  entries of the pass, farthest first. Entries of several models and cameras may share a list. The distance
+ * is that from the eye to the node's own place in its scene: a model matrix that moves the model does not
+ * count, so transparent instances of one model, told apart by their matrices alone, are to be drawn list by
+ * list. */
 QEX_API void QexModel_RenderAlphaBlendingNodes(TransparentSPODNodeInfo* list, uint32_t count, uint32_t pass);
 
 /** qsort comparison of two list entries, nearest first. No GL context needed. @return -1, 0 or 1. */
@@ -2836,8 +2857,9 @@ QEX_API void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNo
 /** QexModel_UpdateMeshNodeBoundingBox for every mesh node. No GL context needed. */
 QEX_API void QexModel_UpdateModelBoundingBox(QexModel* model, const QexMatrix* modelMatrix);
 
-/** Reads the scene's first lights, at most QEX_MAX_LIGHTS; one that is neither point nor directional leaves
- * its entry as it was. No GL context needed. @param set  out */
+/** Reads the scene's first lights, at most QEX_MAX_LIGHTS. A light that is neither point nor directional, a
+ * spot light for one, is counted but leaves its entry as it was: zero the set first, and the entry is a black
+ * point light. No GL context needed. @param set  out */
 QEX_API void QexModel_GetLight(QexModel* model, QexLightSet* set);
 
 /** Reads a scene camera at the current frame. No GL context needed.
@@ -2882,8 +2904,8 @@ QEX_API QexShadowInfo* QexModel_InitShadowInfo(const QexCamera* camera, const Qe
 QEX_API void QexModel_ReleaseShadowInfo(QexShadowInfo* info);
 
 /** Draws the casters into the shadow map. Leaves the framebuffer as it was; the viewport covers the context's
- * surface, the scissor test is on, depth is written and tested with less or equal, back faces are culled, the
- * clear colour is white.
+ *  surface, the scissor test is on (an application that does not use it switches it off again), depth is
+ * written and tested with less or equal, back faces are culled, the clear colour is white.
  *  @param context      its width and height are read
  *  @param modelMatrix  in front of the world matrices of casters that follow no bones, or null
  *  @param info         null does nothing */
@@ -3352,8 +3374,8 @@ QEX_API void QexFont_DrawNum(const QexRuntimeContext* context, int32_t x, int32_
  *
  * Images in pixels, drawn with the font's program: (x, y) is the upper left corner, y counts down from the
  * upper edge of the surface that the font was created for. Blending, depth test and culling are left as the
- * application set them; the arrays are the engine's own memory, so no buffer may be bound to GL_ARRAY_BUFFER
- * or GL_ELEMENT_ARRAY_BUFFER. Where there is no font yet, one is created.
+ * application set them, texture unit 3 is active; the arrays are the engine's own memory, so no buffer may be
+ * bound to GL_ARRAY_BUFFER or GL_ELEMENT_ARRAY_BUFFER. Where there is no font yet, one is created.
  * ====================================================================================================== */
 
 /** A rectangle of texels; top and bottom count down from the image's upper edge, right and bottom belong to
@@ -3643,7 +3665,8 @@ typedef struct QexParticleSet {
 
 /** Creates a set. Needs a current GL context. The point size is kept in the program that all sets share, so
  *  that the set created last decides it for all.
- *  @param set           out, cleared first; null is refused
+ *  @param set           out, cleared first, so that a set which is to be made anew is released before; null
+ * is refused
  *  @param texture       see QexParticleSet
  *  @param alphaTexture  see QexParticleSet
  *  @param count         particles; their entries are 0 until the application fills them

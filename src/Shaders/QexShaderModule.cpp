@@ -56,6 +56,13 @@ void DrawRange(const QexShaderModuleType* type, bool indexed, GLenum mode, uint3
         QEX_GL(glDrawArrays(mode, static_cast<GLint>(first), static_cast<GLsizei>(count)));
 }
 
+void DeleteObjects(const QexShaderModuleType* type, const QexShaderModule* module) {
+    QexRenderState_UseProgram(0);
+    QEX_GL(glDeleteProgram(module->program));
+    QEX_GL(glDeleteShader(module->vertexShader));
+    QEX_GL(glDeleteShader(module->fragmentShader));
+}
+
 }  // namespace
 
 // ---- Lifetime ----
@@ -82,6 +89,7 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
 }
 
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
+    if (module->program) DeleteObjects(type, module);
     const char* names[kMaxShaderAttributes];
     int32_t attributeCount = 0;
     while (type->attributes[attributeCount].name) {
@@ -107,10 +115,7 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
 void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {
     QexShaderModule* m = *module;
     if (!m) return;
-    QexRenderState_UseProgram(0);
-    QEX_GL(glDeleteProgram(m->program));
-    QEX_GL(glDeleteShader(m->vertexShader));
-    QEX_GL(glDeleteShader(m->fragmentShader));
+    DeleteObjects(type, m);
     QexMemory_Free(m);
     *module = nullptr;
 }

@@ -472,6 +472,16 @@ TEST_F(LitTest, DepthAndShiftedTextures) {
             module->render(module, &model.model, 0, nullptr, nullptr, &g_sMatIdentity, &matrix, nullptr);
             EXPECT_TRUE(Near(Read().Pixel(50, 60), {grey, grey, grey, 255}, 1)) << z;
         }
+        // What the threshold cuts off is clear, the rest is opaque, whatever its opacity.
+        for (const auto& [opacity, alpha] : {std::pair{0.8f, 255}, {0.4f, skinned ? 0 : 255}}) {
+            glm::mat4 projection = flat;
+            for (int c = 0; c < 4; ++c) projection[c][2] = 0;
+            const QexMatrix matrix = ToQex(projection);
+            model.Material().opacity = opacity;
+            Clear(1, 1, 1, 0.25f);
+            module->render(module, &model.model, 0, nullptr, nullptr, &g_sMatIdentity, &matrix, nullptr);
+            EXPECT_EQ(Read().Pixel(50, 60)[3], alpha) << opacity;
+        }
         (skinned ? QexSkinningDepthShader_Release : QexDepthShader_Release)(&module);
     }
     const uint8_t texels[] = {255, 0, 0, 255, 0, 255, 0, 100};
@@ -491,9 +501,13 @@ TEST_F(LitTest, DepthAndShiftedTextures) {
         {QexUVDisplacementNoAlphaShader_CreateProgram(), QexUVDisplacementNoAlphaShader_SetDisplacement,
          QexUVDisplacementNoAlphaShader_GetDisplacement, QexUVDisplacementNoAlphaShader_Release, 0}};
     float u, v;
+    static int hooked;
+    model.model.bindTextureHook = [](QexModel*, uint32_t) { return ++hooked, 0; };
     for (auto row : rows) {
         row.set(row.module, 0.5f, 0.25f);
+        hooked = 0;
         model.DrawNode(row.module);
+        EXPECT_EQ(hooked, 1);
         EXPECT_EQ(Read().Pixel(20, 40), (Rgba{0, 255, 0, row.alpha}));
         EXPECT_EQ(Read().Pixel(100, 40), (Rgba{255, 0, 0, 255}));
         row.get(row.module, &u, &v);

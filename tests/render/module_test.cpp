@@ -67,6 +67,16 @@ int32_t BindHook(QexModel*, uint32_t) {
     return g_hookResult;
 }
 
+// Set up again, a module holds the new objects alone.
+TEST_F(ModuleTest, SetUpTwiceLeavesNothing) {
+    const auto live = [] {
+        return gltapLiveObjects(GLTAP_PROGRAM, nullptr, 0) + gltapLiveObjects(GLTAP_SHADER, nullptr, 0);
+    };
+    const size_t before = live();
+    EXPECT_EQ(QexTextureShader_SetupProgram(texture), 0);
+    EXPECT_EQ(live(), before);
+}
+
 TEST_F(ModuleTest, HookMaterialAndMissingTextures) {
     const Rgba white = {255, 255, 255, 255}, isBlue = {0, 0, 255, 255}, isGreen = {0, 255, 0, 255};
     const Rgba asBefore = {9, 9, 9, 255};
