@@ -3,6 +3,9 @@
 #include <cstdio>
 #include <memory>
 
+#include <CLI/CLI.hpp>
+
+#include "CommandLine.h"
 #include "EmitterDescription.h"
 #include "EngineOutput.h"
 #include "TextureFiles.h"
@@ -27,6 +30,20 @@ bool WriteEmitter(const QexParticleEmitter* emitter, const std::string& path) {
 }
 
 }  // namespace
+
+void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
+    app->add_option("FILE", options->input,
+                    "emitter file, or description as text or JSON (the engine's defaults)");
+    CLI::Option* output =
+        app->add_option("-o,--output", options->output,
+                        "emitter file, or, ending in .txt or .json, description (text on standard output)");
+    AddTexts(app, "--set", &options->settings, "FIELD=VALUE, values with commas between them, rows with ';'");
+    app->add_flag("--json", options->json, "show as JSON")->excludes(output);
+    app->footer(
+        "A description names the fields that differ from the defaults, one a line; what this command shows "
+        "is\n"
+        "one, with all fields and their units. Particles that live in an emitter file are not taken over.");
+}
 
 int RunEmitter(const EmitterOptions& options) {
     std::string problem;

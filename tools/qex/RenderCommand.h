@@ -7,6 +7,10 @@
 #include "RenderCamera.h"
 #include "RenderEffects.h"
 
+namespace CLI {
+class App;
+}
+
 struct RenderOptions {
     std::string input;
     std::string output;
@@ -25,6 +29,8 @@ struct RenderOptions {
     bool stats = false;
     bool quiet = false;
 };
+
+void SetUpRender(CLI::App* app, RenderOptions* options);
 
 // Returns the exit status: 0, 1 when the scene cannot be drawn, 2 for an output that cannot be written.
 int RunRender(const RenderOptions& options);

@@ -4,6 +4,8 @@
 #include <cstdio>
 #include <cstring>
 
+#include <CLI/CLI.hpp>
+
 #include "ImageFile.h"
 
 namespace {
@@ -22,6 +24,13 @@ void Paste(const Image& image, size_t left, size_t top, size_t width, std::vecto
 }
 
 }  // namespace
+
+void SetUpSheet(CLI::App* app, SheetOptions* options) {
+    app->add_option("PICTURES", options->inputs, "pictures, row by row")->required();
+    app->add_option("-o,--output", options->output, "PNG file")->required();
+    app->add_option("--columns", options->columns, "pictures in a row (4)")->check(CLI::Range(1, 1000));
+    app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(CLI::Range(0, 1000));
+}
 
 int RunSheet(const SheetOptions& options) {
     std::vector<Image> images(options.inputs.size());

@@ -4,10 +4,13 @@
 #include <cstdio>
 #include <cstring>
 
+#include <CLI/CLI.hpp>
+
 #include "ImageFile.h"
 #include "PodWriter.h"
 #include "TextureContainer.h"
 #include "TextureFiles.h"
+#include "TextureFormats.h"
 #include "TextureWrite.h"
 
 namespace {
@@ -169,6 +172,26 @@ Failure Convert(const TextureOptions& options) {
 }
 
 }  // namespace
+
+void SetUpTexture(CLI::App* app, TextureOptions* options) {
+    app->add_option("IN", options->input, "PNG, JPEG, TGA, ... picture, or PVR or KTX texture");
+    app->add_option("-o,--output", options->output, "PNG picture, or PVR or KTX texture, by its extension")
+        ->required();
+    app->add_option("--format", options->format, FormatNames() + " (rgba8888 with alpha, rgb888 without)");
+    app->add_flag("--mipmaps", options->mipmaps, "write the whole mipmap chain");
+    app->add_flag("--flip", options->flip, "turn the rows over; else the first is the picture's top");
+    app->add_option("--faces", options->faces, "instead of IN: squares +X -X +Y -Y +Z -Z of a cube map")
+        ->expected(1, 100);
+    app->add_option("--level", options->level, "mipmap level of the texture IN (0)")
+        ->check(CLI::Range(0, 31));
+    app->add_option("--face", options->face, "face of the cube map IN (PNG: 0; PVR and KTX: all)")
+        ->check(CLI::Range(0, 5));
+    app->footer(
+        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88\n"
+        "and a8; those in etc1 are black until QexTexture_SetFilter is called, unless they have --mipmaps.\n"
+        "PVRTC is read, not written. In a picture luminance is grey, and alpha 8 is white with alpha. From\n"
+        "texture to texture blocks and mipmaps are made anew.");
+}
 
 int RunTexture(const TextureOptions& options) {
     const Failure failure = Convert(options);
