@@ -1,5 +1,8 @@
 // What the qex command says to a wrong command line: one line that names what is expected, and status 2.
+#include <sys/resource.h>
 #include <sys/stat.h>
+
+#include <csignal>
 
 #include "ImageFile.h"
 #include "QexCommandTest.h"
@@ -89,6 +92,85 @@ TEST_F(QexCli, FilesThatCannotBeReadAreOneLineAndStatus1) {
         if (c.scene) ExpectRefused({"render", Path(c.name), "-o", Path("a.png")}, 1, c.part);
     }
     EXPECT_FALSE(std::filesystem::exists(Path("a.png")));
+}
+
+// A limit on the size of files stands for a full disk: writing fails in the middle.
+TEST_F(QexCli, WhatIsNotWrittenWholeIsSaidAndLeavesWhatWasThere) {
+    std::string error;
+    Bytes noise(4 * 64 * 64);
+    for (size_t i = 0; i < noise.size(); ++i) noise[i] = static_cast<uint8_t>(i * i % 251);
+    const std::string png = Path("a.png"), pod = Path("a.pod"), obj = Path("a.obj"), old = Path("old");
+    ASSERT_TRUE(SavePng(png, 64, 64, noise.data(), &error)) << error;
+    WriteScene(pod, QuadScene());
+    WriteText(obj, "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    const std::vector<std::vector<std::string>> verbs = {
+        {"sheet", png}, {"texture", png}, {"convert", obj, "-q"}, {"emitter"}, {"render", pod}};
+    const char* const extensions[] = {".png", ".pvr", ".pod", ".emitter", ".png"};
+    for (size_t i = 0; i < verbs.size(); ++i) {
+        const std::string output = old + extensions[i];
+        const auto to = [&](const std::string& path) {
+            std::vector<std::string> arguments = verbs[i];
+            arguments.insert(arguments.end(), {"-o", path});
+            return arguments;
+        };
+        if (verbs[i][0] != "texture") ExpectRefused(to("/dev/full"), 2, "No space left on device");
+        if (verbs[i][0] == "render") continue;  // its drawing needs files
+        WriteText(output, "old");
+        const rlimit limit = {200, RLIM_INFINITY}, none = {RLIM_INFINITY, RLIM_INFINITY};
+        signal(SIGXFSZ, SIG_IGN);
+        setrlimit(RLIMIT_FSIZE, &limit);
+        ExpectRefused(to(output), 2, output + ": cannot be written");
+        setrlimit(RLIMIT_FSIZE, &none);
+        EXPECT_EQ(ReadText(output), "old");
+    }
+    // Nothing half written lies about.
+    for (const auto& entry : std::filesystem::directory_iterator(folder_))
+        EXPECT_EQ(entry.path().filename().string().find(".qex"), std::string::npos) << entry.path();
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"info", pod}, {"emitter"}, {"--help"}, {"render", pod, "-o", "-"}}) {
+        const CommandResult result = Run(arguments, "/dev/null", "/dev/full");
+        EXPECT_EQ(result.status, 2) << arguments[0];
+        EXPECT_TRUE(Contains(result.err, "No space left on device")) << result.err;
+    }
+}
+
+TEST_F(QexCli, AnOutputIsNoneOfTheInputs) {
+    std::string error;
+    const Bytes red = {255, 0, 0, 255};
+    const std::string png = Path("a.png"), pod = Path("a.pod"), pvr = Path("a.pvr"), text = Path("a.txt");
+    ASSERT_TRUE(SavePng(png, 1, 1, red.data(), &error)) << error;
+    pod::Scene scene = QuadScene();
+    TextureQuad(&scene, "a.pvr");
+    WriteScene(pod, scene);
+    WriteBytes(pvr, UniformPvr(pod::kPvrRgba8888, 4, red));
+    WriteText(text, "lifetime 1 2\n");
+    std::filesystem::create_symlink("a.pod", Path("link.png"));
+    std::filesystem::create_hard_link(png, Path("hard.png"));
+    std::filesystem::create_symlink("a.pvr", Path("texture.png"));
+    const std::vector<std::string> cases[] = {
+        {"render", pod, "-o", Path("link.png")},
+        {"render", pod, "-o", Path("texture.png")},
+        {"render", pod, "--sky", png, "-o", png},
+        {"sheet", png, "-o", Path("hard.png")},
+        {"texture", pvr, "-o", Path("./a.pvr")},
+        {"texture", png, "-o", png, "--flip"},
+        {"emitter", text, "--set", "rotationMin=1,1,1", "-o", text},
+        {"convert", pod, "-o", Path("link.png")},
+    };
+    for (const auto& arguments : cases) ExpectRefused(arguments, 2, "is the input");
+    EXPECT_EQ(ReadBytes(pod), pod::WritePod(scene));
+    EXPECT_EQ(ReadText(text), "lifetime 1 2\n");
+    // A link that is no input stays one, and what it leads to keeps its mode.
+    WriteText(Path("target.png"), "old");
+    chmod(Path("target.png").c_str(), 0640);
+    std::filesystem::create_symlink("target.png", Path("out.png"));
+    EXPECT_EQ(Run({"sheet", png, "-o", Path("out.png")}).err, "");
+    EXPECT_TRUE(std::filesystem::is_symlink(Path("out.png")));
+    Image image;
+    EXPECT_TRUE(LoadImage(Path("target.png"), &image, &error)) << error;
+    struct stat status = {};
+    stat(Path("target.png").c_str(), &status);
+    EXPECT_EQ(status.st_mode & 0777, 0640u);
 }
 
 TEST_F(QexCli, SheetPutsPicturesSideBySide) {

@@ -6,7 +6,8 @@ find_path(ETC1_INCLUDE_DIR ETC1/etc1.h PATH_SUFFIXES android REQUIRED)
 find_library(ETC1_LIBRARY ETC1 PATH_SUFFIXES android REQUIRED)
 find_path(STB_INCLUDE_DIR stb/stb_image.h REQUIRED)
 
-add_library(qex_command STATIC ${CMAKE_CURRENT_LIST_DIR}/CommandLine.cpp)
+add_library(qex_command STATIC ${CMAKE_CURRENT_LIST_DIR}/CommandLine.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/OutputFile.cpp)
 target_include_directories(qex_command PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_link_libraries(qex_command PUBLIC CLI11::CLI11 PRIVATE qex_warnings)
 

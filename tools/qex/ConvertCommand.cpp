@@ -15,6 +15,7 @@
 #include "ConvertLog.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
+#include "OutputFile.h"
 #include "PodWriter.h"
 
 namespace fs = std::filesystem;
@@ -86,10 +87,8 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!fs::is_directory(OutputDirectory(options), ec)) {
         return BadArgument(options.output, "cannot be written; its folder does not exist");
     }
-    if (fs::equivalent(options.input, options.output, ec)) {
-        return BadArgument(options.output, "is the input; another name is expected");
-    }
-    return kDone;
+    const std::string problem = WhyNotOutput(options.output, {options.input});
+    return problem.empty() ? kDone : BadArgument(options.output, problem);
 }
 
 const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
@@ -166,10 +165,11 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         log.Error(error);
         return status;
     }
-    if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
-    if (!pod::WriteFile(options.output, pod::WritePod(scene))) {
-        return BadArgument(options.output, "cannot be written");
+    if (!textures.WriteError().empty()) {
+        std::fprintf(stderr, "qex convert: %s\n", textures.WriteError().c_str());
+        return kBadArgument;
     }
+    if (!WriteOutput(options.output, pod::WritePod(scene), &error)) return BadArgument(options.output, error);
     if (!options.quiet) PrintSummary(options, scene, textures, log);
     return kDone;
 }

@@ -5,6 +5,7 @@
 #include <filesystem>
 #include <iterator>
 
+#include "OutputFile.h"
 #include "PodWriter.h"
 #include "TextureWrite.h"
 
@@ -149,11 +150,12 @@ int TextureSet::WriteTexture(const std::string& path, Image image, TextureUse us
 
 bool TextureSet::Write(const std::string& name, const Image& image) {
     const std::string path = (fs::path(outputDirectory_) / name).string();
-    if (pod::WriteFile(path, EncodePvr(image, format_))) {
+    std::string problem;
+    if (WriteOutput(path, EncodePvr(image, format_), &problem)) {
         ++filesWritten_;
         return true;
     }
-    writeError_ = path;
+    writeError_ = path + ": " + problem;
     return false;
 }
 

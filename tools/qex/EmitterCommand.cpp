@@ -8,6 +8,7 @@
 #include "CommandLine.h"
 #include "EmitterDescription.h"
 #include "EngineOutput.h"
+#include "OutputFile.h"
 #include "TextureFiles.h"
 
 namespace {
@@ -17,16 +18,15 @@ int Fail(const std::string& text, int status) {
     return status;
 }
 
-bool WriteText(const std::string& path, const std::string& text) {
-    FILE* file = fopen(path.c_str(), "w");
-    if (!file) return false;
-    const bool written = fwrite(text.data(), 1, text.size(), file) == text.size();
-    return fclose(file) == 0 && written;
-}
-
-bool WriteEmitter(const QexParticleEmitter* emitter, const std::string& path) {
+// The engine writes emitters to files alone.
+bool EncodeEmitter(const QexParticleEmitter* emitter, std::vector<uint8_t>* bytes) {
     EngineOutput quiet;
-    return QexParticleEmitter_WriteToBinFile(emitter, path.c_str()) == 0;
+    std::string ignored;
+    const std::string path = NewTemporaryFile();
+    const bool read = QexParticleEmitter_WriteToBinFile(emitter, path.c_str()) == 0 &&
+                      ReadFileBytes(path, SIZE_MAX, bytes, &ignored);
+    remove(path.c_str());
+    return read;
 }
 
 }  // namespace
@@ -46,7 +46,8 @@ void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
 }
 
 int RunEmitter(const EmitterOptions& options) {
-    std::string problem;
+    std::string problem = WhyNotOutput(options.output, {options.input});
+    if (!problem.empty()) return Fail(options.output + ": " + problem, 2);
     QexParticleEmitter* loaded = options.input.empty() ? NewEmitter() : LoadEmitter(options.input, &problem);
     if (!loaded) return Fail(options.input + ": " + problem, 1);
     const std::unique_ptr<QexParticleEmitter, void (*)(QexParticleEmitter*)> emitter(
@@ -62,7 +63,10 @@ int RunEmitter(const EmitterOptions& options) {
         fputs(text.c_str(), stdout);
         return 0;
     }
+    std::vector<uint8_t> bytes(text.begin(), text.end());
     const bool description = extension == "json" || extension == "txt";
-    if (description ? WriteText(options.output, text) : WriteEmitter(loaded, options.output)) return 0;
-    return Fail(options.output + ": cannot be written", 2);
+    if (!description && !EncodeEmitter(loaded, &bytes))
+        return Fail(options.output + ": cannot be written: no room for a temporary file", 2);
+    if (WriteOutput(options.output, bytes, &problem)) return 0;
+    return Fail(options.output + ": " + problem, 2);
 }

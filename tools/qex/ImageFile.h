@@ -1,4 +1,5 @@
-// Pictures in and out for the qex command: PNG, JPEG, TGA, BMP, PSD, GIF and PNM are read, PNG is written.
+// Pictures in and out for the qex command: PNG, JPEG, TGA, BMP, PSD, GIF and PNM are read, PNG, JPEG,
+// BMP and TGA are written.
 #pragma once
 
 #include <cstddef>
@@ -24,8 +25,14 @@ bool LoadImage(const uint8_t* data, size_t size, Image* image, std::string* erro
 // Looks at every pixel and sets `hasAlpha`.
 void UpdateHasAlpha(Image* image);
 
-// `pixels` is top-down RGBA without padding.
+// Writes a picture of the type that the extension names. `pixels` is top-down RGBA without padding. False,
+// with the reason, when it does not get there whole.
+bool SavePicture(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error);
 bool SavePng(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error);
+
+// What is wrong with the name of a picture that is to be written, or nothing. Standard output and devices are
+// PNG.
+std::string WhyNoPictureName(const std::string& path);
 
 // Both keep the value range linear (no gamma) and filter each channel by itself.
 Image ResizeImage(const Image& image, int width, int height);

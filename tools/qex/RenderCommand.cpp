@@ -17,6 +17,7 @@
 #include "gltap.h"
 #include "Headless.h"
 #include "ImageFile.h"
+#include "OutputFile.h"
 #include "RenderDiagnosis.h"
 #include "RenderFloor.h"
 #include "RenderSky.h"
@@ -56,6 +57,8 @@ class Renderer {
     bool LoadSurroundings(std::string* problem);
     void DrawDepth(QexShaderModule* module, QexShaderModule* skinned);
     void DrawBothEyes();
+    std::string WrongOutput() const;
+    std::string OutputPath(size_t index) const;
     bool Save(const std::string& path);
     void SetFrame(double frame);
     void DrawText();
@@ -310,7 +313,7 @@ bool Renderer::Save(const std::string& path) {
     std::vector<uint8_t> pixels = context_->ReadPixels();
     for (size_t i = 3; i < pixels.size(); i += 4) pixels[i] = 255;
     std::string error;
-    if (SavePng(path, options_.width, options_.height, pixels.data(), &error)) return true;
+    if (SavePicture(path, options_.width, options_.height, pixels.data(), &error)) return true;
     Fail(path + ": " + error, 2);
     return false;
 }
@@ -365,8 +368,36 @@ bool Renderer::LoadSurroundings(std::string* problem) {
     return true;
 }
 
+// What is wrong with the names of the pictures to write; empty when nothing is.
+std::string Renderer::WrongOutput() const {
+    const std::string problem = WhyNoPictureName(options_.output);
+    if (!problem.empty()) return options_.output + ": " + problem;
+    const EffectOptions& effects = options_.effects;
+    std::vector<std::string> inputs = {options_.input};
+    for (const auto* more : {&effects.sky, &effects.emitters.emitters, &effects.emitters.textures})
+        inputs.insert(inputs.end(), more->begin(), more->end());
+    for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
+        if (model_.scene.textures[i].name)
+            inputs.push_back(FindTexture(Directory(options_.input) + model_.scene.textures[i].name).path);
+    for (size_t i = 0, count = Frames().size(); i < count; ++i) {
+        const std::string path = OutputPath(i), overwrites = WhyNotOutput(path, inputs);
+        if (!overwrites.empty()) return path + ": " + overwrites;
+    }
+    return "";
+}
+
+// The name of a picture by its number in the sequence.
+std::string Renderer::OutputPath(size_t index) const {
+    if (!options_.sequence && !options_.turn) return options_.output;
+    char number[32];
+    snprintf(number, sizeof number, "-%04zu", index);
+    return WithoutExtension(options_.output) + number + "." + Extension(options_.output);
+}
+
 int Renderer::Run() {
     if (!Start() || !Load()) return 1;
+    const std::string wrong = WrongOutput();
+    if (!wrong.empty()) return Fail(wrong, 2);
     if (options_.camera > 0 && !options_.autoCamera &&
         static_cast<uint32_t>(options_.camera) >= model_.scene.cameraCount)
         return Fail(options_.input + ": no camera " + std::to_string(options_.camera) + ", the scene has " +
@@ -381,7 +412,6 @@ int Renderer::Run() {
     Frame();
     if (!LoadSurroundings(&problem)) return Fail(problem, 1);
     const std::vector<double> frames = Frames();
-    const bool numbered = options_.sequence || options_.turn;
     gltapResetCounts();
     for (size_t i = 0; i < frames.size(); ++i) {
         const auto start = Clock::now();
@@ -399,12 +429,7 @@ int Renderer::Run() {
             if (!reason.empty()) fprintf(stderr, "qex render: warning: %s\n", reason.c_str());
         }
         drawTime_ += Milliseconds(start);
-        char number[32] = "";
-        if (numbered) snprintf(number, sizeof number, "-%04zu", i);
-        const std::string path =
-            numbered ? WithoutExtension(options_.output) + number + "." + Extension(options_.output)
-                     : options_.output;
-        if (!Save(path)) return 2;
+        if (!Save(OutputPath(i))) return 2;
         PrintPicked(&engine_, &model_, camera_, options_.effects.picks);
         ReportProgress(i + 1, frames.size());
     }

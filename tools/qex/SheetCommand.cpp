@@ -7,6 +7,7 @@
 #include <CLI/CLI.hpp>
 
 #include "ImageFile.h"
+#include "OutputFile.h"
 
 namespace {
 
@@ -34,7 +35,9 @@ void SetUpSheet(CLI::App* app, SheetOptions* options) {
 
 int RunSheet(const SheetOptions& options) {
     std::vector<Image> images(options.inputs.size());
-    std::string error;
+    std::string error = WhyNoPictureName(options.output);
+    if (error.empty()) error = WhyNotOutput(options.output, options.inputs);
+    if (!error.empty()) return Fail(options.output + ": " + error, 2);
     size_t cellWidth = 0, cellHeight = 0;
     for (size_t i = 0; i < images.size(); ++i) {
         if (!LoadImage(options.inputs[i], &images[i], &error))
@@ -51,7 +54,7 @@ int RunSheet(const SheetOptions& options) {
     for (size_t i = 0; i < images.size(); ++i)
         Paste(images[i], gap + i % columns * (cellWidth + gap), gap + i / columns * (cellHeight + gap), width,
               &sheet);
-    if (SavePng(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error))
+    if (SavePicture(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error))
         return 0;
     return Fail(options.output + ": " + error, 2);
 }

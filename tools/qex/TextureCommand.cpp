@@ -7,7 +7,7 @@
 #include <CLI/CLI.hpp>
 
 #include "ImageFile.h"
-#include "PodWriter.h"
+#include "OutputFile.h"
 #include "TextureContainer.h"
 #include "TextureFiles.h"
 #include "TextureFormats.h"
@@ -126,8 +126,9 @@ std::string Misuse(const TextureOptions& options) {
 Failure WriteTexture(const TextureOptions& options, const PixelFormat& format,
                      const std::vector<Image>& faces, const std::string& path) {
     const auto encode = Extension(path) == "ktx" ? EncodeKtxFile : EncodePvrFile;
-    if (pod::WriteFile(path, encode(faces, format, options.mipmaps, options.flip))) return {};
-    return {2, path + ": cannot be written"};
+    std::string problem;
+    if (WriteOutput(path, encode(faces, format, options.mipmaps, options.flip), &problem)) return {};
+    return {2, path + ": " + problem};
 }
 
 Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& faces) {
@@ -157,8 +158,15 @@ Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& f
 }
 
 Failure Convert(const TextureOptions& options) {
-    const std::string misuse = Misuse(options);
+    std::string misuse = Misuse(options);
     if (!misuse.empty()) return {2, misuse};
+    std::vector<std::string> inputs = options.faces;
+    inputs.push_back(options.input);
+    for (const std::string& output : {options.output, AlphaPath(options.output)}) {
+        misuse = WhyNotOutput(output, inputs);
+        if (!misuse.empty()) return {2, output + ": " + misuse};
+        if (options.format != "etc1") break;
+    }
     std::vector<Image> images;
     const Failure failure = LoadAll(options, &images);
     if (failure.status) return failure;

@@ -7,6 +7,7 @@
 #include "ConvertCommand.h"
 #include "EmitterCommand.h"
 #include "InfoCommand.h"
+#include "OutputFile.h"
 #include "RenderCommand.h"
 #include "SheetCommand.h"
 #include "TextureCommand.h"
@@ -43,9 +44,7 @@ int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, cha
     return 2;
 }
 
-}  // namespace
-
-int main(int argc, char** argv) {
+int RunVerb(int argc, char** argv) {
     CLI::App app("Qex: looks into, draws and converts 3D scenes for OpenGL ES 2.0");
     app.require_subcommand(1);
     app.set_version_flag("--version", "qex " QEX_VERSION);
@@ -80,4 +79,14 @@ int main(int argc, char** argv) {
     if (emitterApp->parsed()) return RunEmitter(emitter);
     if (sheetApp->parsed()) return RunSheet(sheet);
     return RunConvert(convert);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    const int status = RunVerb(argc, argv);
+    std::string problem;
+    if (FinishStandardOutput(&problem)) return status;
+    fprintf(stderr, "qex: %s\n", problem.c_str());
+    return status ? status : 2;
 }
