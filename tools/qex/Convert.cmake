@@ -1,5 +1,6 @@
 # The pictures, the textures and the converter of the qex command, as static libraries.
 find_package(assimp REQUIRED)
+find_package(CLI11 REQUIRED)
 find_package(nlohmann_json REQUIRED)
 find_path(ETC1_INCLUDE_DIR ETC1/etc1.h PATH_SUFFIXES android REQUIRED)
 find_library(ETC1_LIBRARY ETC1 PATH_SUFFIXES android REQUIRED)
@@ -37,4 +38,4 @@ add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_link_libraries(qex_convert PUBLIC qex_texture assimp::assimp PRIVATE
-    nlohmann_json::nlohmann_json qex_engine qex_warnings)
+    CLI11::CLI11 nlohmann_json::nlohmann_json qex_engine qex_warnings)
