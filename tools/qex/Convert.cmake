@@ -19,6 +19,7 @@ add_library(qex_texture STATIC
     ${CMAKE_CURRENT_LIST_DIR}/TextureFiles.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureFormats.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureKtx.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureOverrides.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TexturePvr.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureWrite.cpp)
 target_include_directories(qex_texture PUBLIC ${CMAKE_CURRENT_LIST_DIR})

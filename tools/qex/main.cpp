@@ -256,6 +256,7 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
         ->needs(emitter);
     AddRepeated(app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", options, ParseNode);
     AddRepeated(app, "--pick", "X,Y, prints the nodes whose boxes are there", options, ParsePick);
+    SetUpTextureChoices(app, &options->textures);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
     app->add_flag("-q,--quiet", options->quiet, "no progress bar");
 }
