@@ -24,6 +24,7 @@ add_library(qex_texture STATIC
     ${CMAKE_CURRENT_LIST_DIR}/TextureFiles.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureFormats.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureKtx.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/TextureOverrides.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TexturePvr.cpp
     ${CMAKE_CURRENT_LIST_DIR}/TextureWrite.cpp)
 target_include_directories(qex_texture PUBLIC ${CMAKE_CURRENT_LIST_DIR})
@@ -43,4 +44,4 @@ add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_link_libraries(qex_convert PUBLIC qex_texture assimp::assimp PRIVATE
-    nlohmann_json::nlohmann_json qex_engine qex_warnings)
+    CLI11::CLI11 nlohmann_json::nlohmann_json qex_engine qex_warnings)

@@ -6,6 +6,7 @@
 #include <Qex.h>
 #include <algorithm>
 #include <assimp/Importer.hpp>
+#include <CLI/CLI.hpp>
 #include <cmath>
 #include <exception>
 #include <filesystem>
@@ -175,6 +176,22 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
 }
 
 }  // namespace
+
+void SetUpConvert(CLI::App* app, ConvertOptions* options) {
+    app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
+    app->add_option("-o,--output", options->output,
+                    "POD scene, needed unless clips are listed; its textures are written beside it");
+    app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
+        ->check(CLI::Range(1.0, 1000.0));
+    app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
+    app->add_flag("--list-clips", options->listClips,
+                  "print index, name, seconds and channels of the animations; convert nothing");
+    app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")
+        ->check(CLI::Range(1, 16));
+    app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
+        ->check(CLI::IsMember({"etc1", "rgba8888", "rgb888"}));
+    app->add_flag("-q,--quiet", options->quiet, "no summary");
+}
 
 int RunConvert(const ConvertOptions& options) {
     TextureFormat format;

@@ -3,6 +3,10 @@
 
 #include <string>
 
+namespace CLI {
+class App;
+}
+
 struct ConvertOptions {
     std::string input;
     std::string output;
@@ -13,6 +17,9 @@ struct ConvertOptions {
     bool listClips = false;              // print the animations and convert nothing
     bool quiet = false;                  // no summary; warnings and errors still show
 };
+
+// Gives the verb its options.
+void SetUpConvert(CLI::App* app, ConvertOptions* options);
 
 // Returns the exit status: 0, 1 when the input cannot be read or holds nothing to draw, 2 for a bad
 // argument or an output that cannot be written. Errors are one line on standard error.

@@ -7,6 +7,7 @@
 
 #include "OutputFile.h"
 #include "PodWriter.h"
+#include "TextureFiles.h"
 #include "TextureWrite.h"
 
 namespace fs = std::filesystem;
@@ -16,37 +17,9 @@ namespace {
 constexpr int kMaxSide = 4096;
 constexpr size_t kMaxStem = 64;
 
-std::string Lower(std::string text) {
-    for (char& c : text) {
-        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-    }
-    return text;
-}
-
-// The entry of `directory` called `name`, whatever its case; an exact match goes first.
-fs::path FindEntry(const fs::path& directory, const std::string& name) {
-    std::error_code ec;
-    if (fs::exists(directory / name, ec)) return directory / name;
-    const std::string wanted = Lower(name);
-    for (const auto& entry : fs::directory_iterator(directory, ec)) {
-        if (Lower(entry.path().filename().string()) == wanted) return entry.path();
-    }
-    return {};
-}
-
-fs::path FindBelow(fs::path directory, const fs::path& relative) {
-    for (const fs::path& part : relative) {
-        if (part.empty() || part == ".") continue;
-        directory = part == ".." ? directory / ".." : FindEntry(directory, part.string());
-        if (directory.empty()) return {};
-    }
-    std::error_code ec;
-    return fs::is_regular_file(directory, ec) ? directory : fs::path();
-}
-
 // Scenes name their pictures with either slash, and now and then as URLs.
 std::string CleanPath(std::string path) {
-    std::replace(path.begin(), path.end(), '\\', '/');
+    path = SlashedPath(path);
     if (path.rfind("file://", 0) == 0) path.erase(0, 7);
     return path;
 }
@@ -202,12 +175,12 @@ std::string TextureSet::Find(const std::string& path) const {
     std::error_code ec;
     if (clean.is_absolute() && fs::is_regular_file(clean, ec)) return clean.string();
     if (clean.is_relative()) {
-        const fs::path found = FindBelow(inputDirectory_, clean);
-        if (!found.empty()) return found.string();
+        const std::string found = FindFile(inputDirectory_, clean.string());
+        if (!found.empty()) return found;
     }
     for (const char* folder : {"", "textures", "texture", "images", "maps"}) {
-        const fs::path found = FindBelow(inputDirectory_, fs::path(folder) / clean.filename());
-        if (!found.empty()) return found.string();
+        const std::string found = FindFile(inputDirectory_, (fs::path(folder) / clean.filename()).string());
+        if (!found.empty()) return found;
     }
     return {};
 }

@@ -3,6 +3,8 @@
 #include <cstdint>
 #include <cstdio>
 
+#include <CLI/CLI.hpp>
+
 #include "Info.h"
 #include "RenderDiagnosis.h"
 #include "TextureFiles.h"
@@ -52,6 +54,11 @@ bool DescribeContainer(const std::string& path, Json* document, std::string* err
     if (IsPvr(bytes)) return DescribePvr(bytes, document, error);
     *error = "is neither a PVR texture with the header of 52 or 44 bytes nor a KTX 1.1 texture";
     return false;
+}
+
+void SetUpInfo(CLI::App* app, InfoOptions* options) {
+    app->add_option("FILE", options->input, "file to look into")->required();
+    app->add_flag("--json", options->json, "as JSON, and nothing else on standard output");
 }
 
 int RunInfo(const InfoOptions& options) {

@@ -7,6 +7,7 @@
 #include <set>
 
 #include "Info.h"
+#include "InfoExporter.h"
 #include "SceneBounds.h"
 #include "TextureFiles.h"
 
@@ -17,7 +18,6 @@ constexpr size_t kBoundsPoints = 4u << 20;
 constexpr size_t kAnimationPoints = 1u << 20;
 constexpr uint32_t kMostFrames = 200;  // looked at for the bounds of an animation
 constexpr double kDegrees = 180 / 3.14159265358979;
-constexpr uint32_t kOptionsBlock = 1002, kHistoryBlock = 1003, kSceneBlock = 1001;
 
 const char* const kDataTypes[] = {"unset",
                                   "float",
@@ -53,24 +53,11 @@ Json BoundsJson(const Bounds& bounds) {
             {"high", {bounds.high.x, bounds.high.y, bounds.high.z}}};
 }
 
-// Text blocks that exporters put before the scene.
 void DescribeExporter(const std::string& path, Json* document) {
-    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
-    std::error_code error;
-    const uint64_t size = std::filesystem::file_size(path, error);
-    std::vector<uint8_t> marker(8);
-    while (file && !error && fread(marker.data(), 1, 8, file.get()) == 8) {
-        const uint32_t id = ReadLE32(marker, 0), length = ReadLE32(marker, 4);
-        if (id == kSceneBlock || length > size) return;
-        if (id != kOptionsBlock && id != kHistoryBlock) {
-            if (fseek(file.get(), static_cast<long>(length), SEEK_CUR) != 0) return;
-            continue;
-        }
-        std::string text(length, '\0');
-        if (fread(&text[0], 1, length, file.get()) != length) return;
-        text = CleanText(text.substr(0, text.find('\0')));
-        (*document)[id == kHistoryBlock ? "exporter" : "exportOptions"] = text;
-    }
+    const ExporterText text = ReadExporterText(path);
+    if (text.history) (*document)["exporter"] = CleanText(*text.history);
+    if (text.options) (*document)["exportOptions"] = CleanText(*text.options);
+    if (text.FlipsTextureV()) (*document)["flipTextureV"] = *text.FlipsTextureV();
 }
 
 // ---- Nodes ----
@@ -217,8 +204,7 @@ Json DescribeMaterial(const QexPODModel& scene, uint32_t index) {
 Json DescribeTexture(const std::string& directory, const char* name, uint32_t index) {
     Json entry = {{"index", index}, {"name", TextOrNull(name)}, {"found", false}};
     if (!name) return entry;
-    const std::string path = directory + name;
-    const TextureFile file = FindTexture(path);
+    const TextureFile file = FindTexture(directory, name);
     std::string error;
     if (file.kind != TextureFile::kMissing) {
         entry["found"] = true;
@@ -235,8 +221,8 @@ Json DescribeTexture(const std::string& directory, const char* name, uint32_t in
         // The engine reads no such pictures; qex render decodes them.
         entry["picture"] = true;
     }
-    const std::string alphaName = AlphaPath(path);
-    const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(alphaName);
+    const std::string alphaName = AlphaPath(name);
+    const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(directory, alphaName);
     if (alpha.kind == TextureFile::kContainer) entry["alphaFile"] = CleanText(alpha.path);
     return entry;
 }

@@ -60,6 +60,9 @@ void PrintOverview(const Json& d) {
     const Json& counts = d["counts"];
     if (d.contains("exporter")) Line("exporter", Words(d["exporter"]));
     if (d.contains("exportOptions")) Line("export options", Words(d["exportOptions"]));
+    if (d.contains("flipTextureV"))
+        Line("textures", d["flipTextureV"].get<bool>() ? "V runs down the pictures (bFlipTextureV=1)"
+                                                       : "V runs up the pictures (bFlipTextureV=0)");
     Line("holds", Plural(counts["nodes"], "node") + " (" + Plural(counts["meshNodes"], "mesh node") + "), " +
                       Words(counts["meshes"]) + (counts["meshes"] == 1 ? " mesh, " : " meshes, ") +
                       Plural(counts["materials"], "material") + ", " + Plural(counts["textures"], "texture") +

@@ -245,6 +245,7 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     const Adder add(app, options);
     add("--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:", ParseNode, kMostRepeats);
     add("--pick", "X,Y, prints the nodes whose boxes are there", ParsePick, kMostRepeats);
+    SetUpTextureChoices(app, &options->textures);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
     app->add_flag("-q,--quiet", options->quiet, "no progress bar");
 }

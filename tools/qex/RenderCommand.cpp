@@ -127,13 +127,13 @@ bool Renderer::Load() {
     const auto start = Clock::now();
     EngineOutput output;
     QexModel_Create(&model_);
-    SetTextureHook(&model_);
+    SetTextureHook(&model_, options_.input, options_.textures);
     const int32_t result = QexModel_LoadContent(&model_, directory.c_str(), FileName(options_.input).c_str());
     modelLoaded_ = true;
     std::vector<std::string> warnings;
-    if (result == 0) warnings = CompleteTextures(&model_, directory);
+    if (result == 0) warnings = CompleteTextures(&model_);
     if (result == 0 && options_.effects.shader == "normalmap")
-        for (const std::string& line : LoadNormalMaps(&model_, directory)) warnings.push_back(line);
+        for (const std::string& line : LoadNormalMaps(&model_)) warnings.push_back(line);
     output.Stop();
     loadTime_ = Milliseconds(start);
     for (const std::string& line : output.Messages("stands still")) warnings.push_back(line);
@@ -378,7 +378,7 @@ std::string Renderer::WrongOutput() const {
         inputs.insert(inputs.end(), more->begin(), more->end());
     for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
         if (model_.scene.textures[i].name)
-            inputs.push_back(FindTexture(Directory(options_.input) + model_.scene.textures[i].name).path);
+            inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);
     for (size_t i = 0, count = Frames().size(); i < count; ++i) {
         const std::string path = OutputPath(i), overwrites = WhyNotOutput(path, inputs);
         if (!overwrites.empty()) return path + ": " + overwrites;
@@ -403,7 +403,8 @@ int Renderer::Run() {
         return Fail(options_.input + ": no camera " + std::to_string(options_.camera) + ", the scene has " +
                         std::to_string(model_.scene.cameraCount),
                     2);
-    std::string problem = ChangeNodes(&model_, options_.effects.nodes);
+    std::string problem = CheckTextureChoices(&model_);
+    if (problem.empty()) problem = ChangeNodes(&model_, options_.effects.nodes);
     if (!options_.effects.mirrorNode.empty() && problem.empty())
         FindNode(model_, options_.effects.mirrorNode, &problem);
     if (!problem.empty()) return Fail(options_.input + ": " + problem, 2);

@@ -6,6 +6,7 @@
 
 #include "RenderCamera.h"
 #include "RenderEffects.h"
+#include "RenderTextures.h"
 
 namespace CLI {
 class App;
@@ -26,6 +27,7 @@ struct RenderOptions {
     uint32_t background = 0x404858;  // RRGGBB
     std::string text;
     EffectOptions effects;
+    TextureChoices textures;
     bool stats = false;
     bool quiet = false;
 };

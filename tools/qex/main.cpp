@@ -14,22 +14,6 @@
 
 namespace {
 
-void SetUpConvert(CLI::App* app, ConvertOptions* options) {
-    app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
-    app->add_option("-o,--output", options->output,
-                    "POD scene, needed unless clips are listed; its textures are written beside it");
-    app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
-        ->check(CLI::Range(1.0, 1000.0));
-    app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
-    app->add_flag("--list-clips", options->listClips,
-                  "print index, name, seconds and channels of the animations; convert nothing");
-    app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")
-        ->check(CLI::Range(1, 16));
-    app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
-        ->check(CLI::IsMember({"etc1", "rgba8888", "rgb888"}));
-    app->add_flag("-q,--quiet", options->quiet, "no summary");
-}
-
 // The first line of what CLI11 has to say. It asks for a verb first, whatever stands in its place: an unknown
 // word or option there is named instead.
 int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, char** argv) {
@@ -55,8 +39,7 @@ int RunVerb(int argc, char** argv) {
     EmitterOptions emitter;
     SheetOptions sheet;
     CLI::App* infoApp = app.add_subcommand("info", "what is in a POD, PVR, KTX or TGA file");
-    infoApp->add_option("FILE", info.input, "file to look into")->required();
-    infoApp->add_flag("--json", info.json, "as JSON, and nothing else on standard output");
+    SetUpInfo(infoApp, &info);
     CLI::App* renderApp = app.add_subcommand("render", "draw a POD scene to PNG");
     SetUpRender(renderApp, &render);
     CLI::App* convertApp = app.add_subcommand("convert", "make a POD scene from another format");
