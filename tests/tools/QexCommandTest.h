@@ -108,6 +108,7 @@ inline void RemoveQuad(pod::Scene* scene) {
 inline void TextureQuad(pod::Scene* scene, const std::string& texture) {
     scene->textures = {texture};
     scene->materials[0].diffuseTexture = 0;
+    scene->materials[0].diffuse = {1, 1, 1};
 }
 
 inline void WriteScene(const std::string& path, const pod::Scene& scene) {

@@ -137,6 +137,28 @@ Image ResizeImage(const Image& image, int width, int height) {
     return out;
 }
 
+std::vector<uint8_t> ShrinkPixels(const std::vector<uint8_t>& pixels, int width, int height, int scale) {
+    const size_t w = static_cast<size_t>(width), h = static_cast<size_t>(height),
+                 n = static_cast<size_t>(scale);
+    std::vector<uint8_t> out(w * h * 4);
+    for (size_t i = 0; i < out.size(); ++i) {
+        const size_t x = i / 4 % w * n, y = i / 4 / w * n;
+        size_t sum = n * n / 2;
+        for (size_t k = 0; k < n * n; ++k) sum += pixels[((y + k / n) * w * n + x + k % n) * 4 + i % 4];
+        out[i] = static_cast<uint8_t>(sum / (n * n));
+    }
+    return out;
+}
+
+void BlendWhite(const std::vector<uint8_t>& cover, int coverWidth, std::vector<uint8_t>* pixels, int width) {
+    const size_t w = static_cast<size_t>(width);
+    for (size_t i = 0; i < pixels->size(); ++i) {
+        const size_t x = i / 4 % w, y = i / 4 / w;
+        const int white = i % 4 == 3 ? 0 : cover[(y * static_cast<size_t>(coverWidth) + x) * 4];
+        (*pixels)[i] = static_cast<uint8_t>((*pixels)[i] + (255 - (*pixels)[i]) * white / 255);
+    }
+}
+
 Image HalveImage(const Image& image) {
     Image out;
     out.width = std::max(image.width / 2, 1);

@@ -36,4 +36,8 @@ std::string WhyNoPictureName(const std::string& path);
 
 // Both keep the value range linear (no gamma) and filter each channel by itself.
 Image ResizeImage(const Image& image, int width, int height);
+// The mean of each scale x scale pixels, of RGBA that are `scale` times as wide and high.
+std::vector<uint8_t> ShrinkPixels(const std::vector<uint8_t>& pixels, int width, int height, int scale);
+// Lays white over RGBA pixels, as much of it as the red of others, the upper left part of wider ones.
+void BlendWhite(const std::vector<uint8_t>& cover, int coverWidth, std::vector<uint8_t>* pixels, int width);
 Image HalveImage(const Image& image);  // 2 x 2 box, for mipmaps; a side of 1 stays 1

@@ -102,6 +102,23 @@ std::string WhyNotOutput(const std::string& output, const std::vector<std::strin
     return "";
 }
 
+std::string NumberedOutput(const std::string& path, size_t number) {
+    std::string digits = std::to_string(number);
+    const auto pad = [&digits](size_t width) {
+        digits.insert(0, width > digits.size() ? width - digits.size() : 0, '0');
+    };
+    for (size_t at = path.find('%'); at != std::string::npos; at = path.find('%', at + 1)) {
+        const size_t end = path.find_first_not_of("0123456789", at + 1);
+        if (end == std::string::npos || path[end] != 'd' || end > at + 3) continue;
+        // Spaces, which a width without a 0 asks for, have no place in a name.
+        if (end > at + 1) pad(std::stoul(path.substr(at + 1, end - at - 1)));
+        return path.substr(0, at) + digits + path.substr(end + 1);
+    }
+    pad(4);
+    const fs::path name = path;
+    return (name.parent_path() / name.stem()).string() + "-" + digits + name.extension().string();
+}
+
 bool FinishStandardOutput(std::string* problem) {
     errno = 0;
     const bool written = fflush(stdout) == 0 && !ferror(stdout);

@@ -15,6 +15,10 @@ bool WriteOutput(const std::string& path, const std::vector<uint8_t>& bytes, std
 // to go behind the output's name. Empty when it is none of them.
 std::string WhyNotOutput(const std::string& output, const std::vector<std::string>& inputs);
 
+// The name of one of several outputs: its number, from 0 on, in place of %d or the like (%04d), else behind
+// "-" before the extension, in four digits.
+std::string NumberedOutput(const std::string& path, size_t number);
+
 // Ends standard output. False, with the reason, when something of what was printed did not get there.
 bool FinishStandardOutput(std::string* problem);
 

@@ -7,6 +7,7 @@
 
 #include "CommandLine.h"
 #include "RenderCommand.h"
+#include "RenderShading.h"
 
 namespace {
 
@@ -164,6 +165,8 @@ class Adder {
 void AddPicture(CLI::App* app, RenderOptions* options) {
     const Adder add(app, options);
     add("--size", "WxH in pixels (800x600)", ParseSize);
+    app->add_option("--antialias", options->antialias, "samples of a pixel at least: 1, 2 or 4 (4)")
+        ->check(CLI::IsMember({1, 2, 4}));
     app->add_option("--frame", options->frame, "animation frame (0)")->check(CLI::Range(0.0, 1e6));
     add("--frames", "FIRST:LAST:STEP, a numbered picture each", ParseFrames);
     add("--camera", "scene camera N, or auto to frame the whole scene (0 if there is one)", ParseCamera);

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 
 #include "RenderCamera.h"
@@ -17,11 +18,12 @@ struct RenderOptions {
     std::string output;
     int width = 800;
     int height = 600;
+    int antialias = 4;  // samples of a pixel: 1, 2 or 4
     double frame = 0;
     bool sequence = false;  // several frames, numbered
     double first = 0, last = 0, step = 1;
-    int turn = 0;    // pictures of one turn around the scene, 0 for none
-    int camera = 0;  // scene camera; with autoCamera or without cameras the scene is framed
+    int turn = 0;               // pictures of one turn around the scene, 0 for none
+    std::optional<int> camera;  // the first; with autoCamera or without cameras the scene is framed
     bool autoCamera = false;
     OrbitView view;
     uint32_t background = 0x404858;  // RRGGBB
