@@ -4,6 +4,8 @@
 
 #include <csignal>
 
+#include <nlohmann/json.hpp>
+
 #include "ImageFile.h"
 #include "QexCommandTest.h"
 
@@ -20,11 +22,16 @@ TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
         {{}, "subcommand"},
         {{"paint", pod}, "'paint'; expected info, render"},
         {{"--bogus"}, "unknown option '--bogus'; expected info, render"},
+        {{"rendr", pod}, "did you mean render?"},
         {{"info", "--yaml", pod}, "--yaml"},
+        {{"render", pod, "--outptu", png}, "unknown option '--outptu'; did you mean --output?"},
+        {{"render", pod, "-o", png, "--fraems=1:2"}, "did you mean --frames?"},
+        {{"render", pod, "-o", png, "--up", "w"}, "'w' is no axis; expected x, y, z, -x, -y or -z"},
+        {{"convert", "-", "-o", Path("b.pod")}, "side by side"},
         {{"render", pod}, "--output"},
         {{"render", pod, "-o", png, "--size", "0x0"}, "expected WIDTHxHEIGHT"},
         {{"render", pod, "-o", png, "--size", "abc"}, "expected WIDTHxHEIGHT"},
-        {{"render", pod, "-o", png, "--frame", "abc"}, "abc"},
+        {{"render", pod, "-o", png, "--frame", "abc"}, "'abc' is no number from 0 to 1000000"},
         {{"render", pod, "-o", png, "--frames", "5:1:1"}, "FIRST <= LAST"},
         {{"render", pod, "-o", png, "--frames", "0:5:0"}, "STEP > 0"},
         {{"render", pod, "-o", png, "--frames", "nan:nan:nan"}, "FIRST:LAST:STEP"},
@@ -113,7 +120,7 @@ TEST_F(QexCli, WhatIsNotWrittenWholeIsSaidAndLeavesWhatWasThere) {
             arguments.insert(arguments.end(), {"-o", path});
             return arguments;
         };
-        if (verbs[i][0] != "texture") ExpectRefused(to("/dev/full"), 2, "No space left on device");
+        ExpectRefused(to("/dev/full"), 2, "No space left on device");
         if (verbs[i][0] == "render") continue;  // its drawing needs files
         WriteText(output, "old");
         const rlimit limit = {200, RLIM_INFINITY}, none = {RLIM_INFINITY, RLIM_INFINITY};
@@ -196,6 +203,71 @@ TEST_F(QexCli, SheetPutsPicturesSideBySide) {
     EXPECT_EQ(sheet.width * 10 + sheet.height, 42);
     ExpectRefused({"sheet", left, Path("gone.png"), "-o", out}, 1, "gone.png");
     ExpectRefused({"sheet", left, "-o", Path("none/out.png")}, 2, "none/out.png");
+}
+
+TEST_F(QexCli, StandardStreamsStandForFiles) {
+    std::string error;
+    const Bytes pixels = {255, 0, 0, 255, 0, 0, 255, 255};
+    const std::string png = Path("a.png"), pod = Path("a.pod");
+    ASSERT_TRUE(SavePng(png, 2, 1, pixels.data(), &error)) << error;
+    WriteScene(pod, QuadScene());
+    for (const std::vector<std::string>& verb :
+         {std::vector<std::string>{"texture", "-", "-o", "-"}, {"sheet", "-", "-o", "-", "--gap", "0"}}) {
+        WriteText(Path("piped.png"), Run(verb, png).out);
+        Image image;
+        ASSERT_TRUE(LoadImage(Path("piped.png"), &image, &error)) << verb[0] << error;
+        EXPECT_EQ(image.pixels, pixels) << verb[0];
+    }
+    WriteText(Path("a.emitter"), Run({"emitter", "-o", "-"}).out);
+    EXPECT_EQ(Run({"emitter", "-"}, Path("a.emitter")).out, Run({"emitter"}).out);
+    // Several files: those that can be read are shown.
+    const CommandResult several = Run({"info", "--json", "-", png, pod}, pod);
+    EXPECT_EQ(several.status, 1);
+    EXPECT_EQ(CountLines(several.err), 1) << several.err;
+    const nlohmann::json shown = nlohmann::json::parse(several.out);
+    ASSERT_EQ(shown.size(), 2u);
+    EXPECT_EQ(shown[0]["file"], "standard input");
+    EXPECT_EQ(shown[0]["nodes"], shown[1]["nodes"]);
+    EXPECT_EQ(Run({"info", "--quiet", pod, pod}).out, "");
+    EXPECT_TRUE(Contains(Run({"render", pod, "-o", png, "--verbose"}).err, "I/")) << "the engine's log";
+}
+
+// Every option that --help shows is in the manual page and is completed.
+TEST_F(QexCli, ManualAndCompletionHoldAllOptions) {
+    WriteText(Path("completion"), Run({"completion", "bash"}).out);
+    const auto complete = [&](const std::string& words) {
+        const std::string script = "source " + Path("completion") + "; COMP_WORDS=(qex " + words +
+                                   "); COMP_CWORD=$((${#COMP_WORDS[@]} - 1)); _qex; echo \"${COMPREPLY[*]}\"";
+        const std::string command = "bash -c '" + script + "' > " + Path("reply") + " 2>&1";
+        EXPECT_EQ(system(command.c_str()), 0);
+        return ReadText(Path("reply"));
+    };
+    EXPECT_EQ(complete("ren"), "render\n");
+    EXPECT_EQ(complete("render --shader tex"), "texture texture-noalpha\n");
+    EXPECT_EQ(complete("convert --texture-f"), "--texture-format\n");
+    for (const char* verb : {"info", "render", "convert", "texture", "emitter", "sheet"}) {
+        const std::string help = Run({verb, "--help"}).out, page = Run({"man", verb}).out;
+        EXPECT_TRUE(Contains(help, "Exit status: 0")) << help;
+        const std::string options = " " + complete(std::string(verb) + " -");
+        size_t count = 0;
+        for (size_t at = help.find("--"); at != std::string::npos; at = help.find("--", at + 2)) {
+            const std::string option = help.substr(at, help.find_first_of(" ,\n=", at) - at);
+            if (help[at - 1] != ',' && help.substr(at - 3, 3) != "\n  ") continue;  // not in a description
+            std::string escaped;
+            for (const char c : option) escaped += c == '-' ? "\\-" : std::string(1, c);
+            EXPECT_TRUE(Contains(page, "\\fB" + escaped + "\\fR")) << verb << option;
+            EXPECT_TRUE(Contains(options, " " + option)) << verb << option << options;
+            ++count;
+        }
+        EXPECT_GE(count, 4u) << help;
+        // Where there is a formatter, it has nothing to say against the page.
+        WriteText(Path("page"), page);
+        const std::string groff = "command -v groff > /dev/null && groff -man -Tutf8 -ww " + Path("page") +
+                                  " 2>&1 > /dev/null | cat > " + Path("said");
+        if (system(groff.c_str()) == 0) {
+            EXPECT_EQ(ReadText(Path("said")), "");
+        }
+    }
 }
 
 TEST_F(QexCli, HelpAndVersionGoToStandardOutput) {

@@ -8,10 +8,27 @@
 namespace CLI {
 class App;
 class Option;
+class Validator;
 }  // namespace CLI
+
+// How much the command says.
+struct Talk {
+    bool quiet = false;    // nothing but warnings and errors
+    bool verbose = false;  // also what the engine and the importer log
+};
+Talk& GetTalk();
+
+// The long names of an app's options, each with its dashes.
+std::vector<std::string> OptionNames(const CLI::App& app);
+
+// "; did you mean NAME?" where one of the names is much like the word, else nothing.
+std::string Suggestion(const std::string& word, const std::vector<std::string>& names);
 
 // Numbers with `separator` between them; none when a part of the text is no finite number.
 std::vector<double> ParseNumbers(const std::string& text, char separator = ',');
+
+// A check for options that take a number.
+CLI::Validator NumberFrom(double least, double most);
 
 // Reads RRGGBB in hexadecimal.
 bool ParseHexColour(const std::string& text, unsigned* colour);

@@ -80,6 +80,9 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
         return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
     }
+    if (options.input == "-" || options.output == "-") {
+        return BadArgument("-", "no file; a scene and its textures lie side by side in a folder");
+    }
     if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
         return BadArgument(options.output.empty() ? "--output" : options.output,

@@ -48,12 +48,13 @@ void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
 int RunEmitter(const EmitterOptions& options) {
     std::string problem = WhyNotOutput(options.output, {options.input});
     if (!problem.empty()) return Fail(options.output + ": " + problem, 2);
-    QexParticleEmitter* loaded = options.input.empty() ? NewEmitter() : LoadEmitter(options.input, &problem);
-    if (!loaded) return Fail(options.input + ": " + problem, 1);
+    const InputFile input(options.input);
+    QexParticleEmitter* loaded = options.input.empty() ? NewEmitter() : LoadEmitter(input.Path(), &problem);
+    if (!loaded) return Fail(input.Name() + ": " + problem, 1);
     const std::unique_ptr<QexParticleEmitter, void (*)(QexParticleEmitter*)> emitter(
         loaded, QexParticleEmitter_Release);
     if (!problem.empty())
-        fprintf(stderr, "qex emitter: warning: %s: %s\n", options.input.c_str(), problem.c_str());
+        fprintf(stderr, "qex emitter: warning: %s: %s\n", input.Name().c_str(), problem.c_str());
     for (const std::string& setting : options.settings)
         if (!SetEmitterField(setting, loaded, &problem)) return Fail("--set: " + problem, 2);
     const std::string extension = Extension(options.output);

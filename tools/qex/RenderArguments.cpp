@@ -1,5 +1,7 @@
 // The command line of qex render.
-#include <map>
+#include <algorithm>
+#include <cctype>
+#include <iterator>
 #include <optional>
 #include <string>
 
@@ -62,6 +64,16 @@ std::string ParseOrbit(const std::string& text, RenderOptions* options) {
     if (good) options->view.yaw = static_cast<float>(n[0]);
     if (good && n.size() == 2) options->view.pitch = static_cast<float>(pitch);
     return Problem(good, text, "is no direction; expected YAW[,PITCH] in degrees, PITCH from -89 to 89");
+}
+
+std::string ParseUp(const std::string& text, RenderOptions* options) {
+    // In the order of UpAxis.
+    const char* const axes[] = {"x", "y", "z", "-x", "-y", "-z"};
+    std::string lower = text;
+    for (char& c : lower) c = static_cast<char>(tolower(static_cast<unsigned char>(c)));
+    const auto found = std::find(std::begin(axes), std::end(axes), lower);
+    options->view.up = static_cast<UpAxis>(found - std::begin(axes));
+    return Problem(found != std::end(axes), text, "is no axis; expected x, y, z, -x, -y or -z");
 }
 
 std::string ParseColour(const std::string& text, RenderOptions* options) {
@@ -167,19 +179,13 @@ void AddPicture(CLI::App* app, RenderOptions* options) {
     add("--size", "WxH in pixels (800x600)", ParseSize);
     app->add_option("--antialias", options->antialias, "samples of a pixel at least: 1, 2 or 4 (4)")
         ->check(CLI::IsMember({1, 2, 4}));
-    app->add_option("--frame", options->frame, "animation frame (0)")->check(CLI::Range(0.0, 1e6));
+    app->add_option("--frame", options->frame, "animation frame (0)")->check(NumberFrom(0.0, 1e6));
     add("--frames", "FIRST:LAST:STEP, a numbered picture each", ParseFrames);
     add("--camera", "scene camera N, or auto to frame the whole scene (0 if there is one)", ParseCamera);
     add("--orbit", "YAW[,PITCH] of the automatic camera in degrees (30,15)", ParseOrbit);
-    app->add_option("--up", options->view.up, "the scene's vertical axis: x, y, z, -x, -y or -z (y)")
-        ->transform(CLI::CheckedTransformer(std::map<std::string, UpAxis>{{"x", UpAxis::kX},
-                                                                          {"y", UpAxis::kY},
-                                                                          {"z", UpAxis::kZ},
-                                                                          {"-x", UpAxis::kMinusX},
-                                                                          {"-y", UpAxis::kMinusY},
-                                                                          {"-z", UpAxis::kMinusZ}}));
+    add("--up", "the scene's vertical axis (y)", ParseUp)->type_name("{x,y,z,-x,-y,-z}");
     app->add_option("--turn", options->turn, "N pictures of one turn around the scene")
-        ->check(CLI::Range(1, 10000));
+        ->check(NumberFrom(1, 10000));
     add("--background", "RRGGBB (404858)", ParseColour);
     app->add_option("--text", options->text, "line of text on the picture");
 }
@@ -187,10 +193,13 @@ void AddPicture(CLI::App* app, RenderOptions* options) {
 void AddEffects(CLI::App* app, RenderOptions* options) {
     const Adder add(app, options);
     EffectOptions& effects = options->effects;
-    add("--shader", "module to draw with: " + ShaderNames(), ParseShader);
+    std::string choices = ShaderNames();
+    choices.erase(std::remove(choices.begin(), choices.end(), ' '), choices.end());
+    add("--shader", "module to draw with (lit where there are normals)", ParseShader)
+        ->type_name("{" + choices + "}");
     add("--light", "X,Y,Z[,RRGGBB], a point light instead of the scene's; up to 4", ParseLight, kMostRepeats);
     CLI::Option* shadow =
-        app->add_flag("--shadow", effects.shadow, "nodes throw shadows on each other (with --shader shadow)");
+        app->add_flag("--shadow", effects.shadow, "nodes throw shadows on each other and on the floor");
     CLI::Option* mirror =
         AddHeight(app, "--mirror", &effects.mirror, "Y, the height of a mirror under the scene");
     AddHeight(app, "--floor", &effects.floor, "Y, the height of a floor; it takes shadows and mirrors");
@@ -233,15 +242,18 @@ void AddEmitters(CLI::App* app, EmitterScene* emitters) {
              "picture of a frame of their animations, in order (a soft spot); 1 unit a pixel at scale 1")
         ->needs(emitter);
     app->add_option("--emitter-time", emitters->time, "seconds that they have run, 60 updates each (3)")
-        ->check(CLI::Range(0.0, 3600.0))
+        ->check(NumberFrom(0.0, 3600.0))
         ->needs(emitter);
 }
 
 }  // namespace
 
 void SetUpRender(CLI::App* app, RenderOptions* options) {
-    app->add_option("FILE", options->input, "POD scene")->required();
-    app->add_option("-o,--output", options->output, "PNG file; a sequence numbers it")->required();
+    app->add_option("FILE", options->input, "POD scene, or - for standard input")->required();
+    app->add_option("-o,--output", options->output,
+                    "PNG, JPEG, BMP or TGA file, by its extension; a sequence numbers it: NAME-0000, or "
+                    "where %04d stands")
+        ->required();
     AddPicture(app, options);
     AddEffects(app, options);
     AddEmitters(app, &options->effects.emitters);
@@ -250,5 +262,5 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     add("--pick", "X,Y, prints the nodes whose boxes are there", ParsePick, kMostRepeats);
     SetUpTextureChoices(app, &options->textures);
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
-    app->add_flag("-q,--quiet", options->quiet, "no progress bar");
+    app->add_flag("-q,--quiet", options->quiet, "no progress bar: nothing but warnings and errors");
 }
