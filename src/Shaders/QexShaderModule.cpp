@@ -15,7 +15,7 @@ constexpr QexPODMaterial MakeWhite() {
     QexPODMaterial material = {};
     material.opacity = 1;
     for (int i = 0; i < 3; ++i) {
-        material.ambient[i] = 0.25f;
+        material.ambient[i] = 0.3f;
         material.diffuse[i] = 1;
     }
     return material;

@@ -4,7 +4,7 @@ namespace {
 
 // Of the default look: what of a surface's colour shows where no light falls, and what the light from the
 // camera adds where it falls straight. Together they are the whole colour.
-constexpr float kAmbient = 0.25f, kCameraLight = 1 - kAmbient;
+constexpr float kAmbient = 0.3f, kCameraLight = 1 - kAmbient;
 
 using Create = QexShaderModule* (*)(void);
 using ReleaseModule = void (*)(QexShaderModule**);
