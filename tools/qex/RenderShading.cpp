@@ -2,9 +2,9 @@
 
 namespace {
 
-// Of the default look: what of a surface's colour shows where no light falls, and what the light from the
-// camera adds where it falls straight. Together they are the whole colour.
-constexpr float kAmbient = 0.3f, kCameraLight = 1 - kAmbient;
+// Of the default look: what of a surface's colour shows where no light falls, and what a white light adds
+// where it falls straight. Together they are the whole colour.
+constexpr float kAmbient = 0.3f, kDirect = 1 - kAmbient;
 
 using Create = QexShaderModule* (*)(void);
 using ReleaseModule = void (*)(QexShaderModule**);
@@ -137,13 +137,15 @@ QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const Qe
     for (const QexLight& light : options.lights)
         if (set.count < QEX_MAX_LIGHTS) set.lights[set.count++] = light;
     if (!set.count) QexModel_GetLight(model, &set);
-    if (set.count && (Shines(set) || !options.lights.empty())) return set;
-    const float colour = options.shader.empty() ? kCameraLight : 1;
-    QexVec3 d;
-    QexVec3_Subtract(&d, &camera.target, &camera.eye);
-    set.count = 2;
-    set.lights[0] = {QEX_LIGHT_DIRECTIONAL, {d.x, d.y, d.z}, {colour, colour, colour, 1}};
-    // The sides of open surfaces that their normals point away from are lit like the others.
-    set.lights[1] = {QEX_LIGHT_DIRECTIONAL, {-d.x, -d.y, -d.z}, {colour, colour, colour, 1}};
+    if (!set.count || (options.lights.empty() && !Shines(set))) {
+        QexVec3 d;
+        QexVec3_Subtract(&d, &camera.target, &camera.eye);
+        set.count = 2;
+        set.lights[0] = {QEX_LIGHT_DIRECTIONAL, {d.x, d.y, d.z}, {1, 1, 1, 1}};
+        // The sides of open surfaces that their normals point away from are lit like the others.
+        set.lights[1] = {QEX_LIGHT_DIRECTIONAL, {-d.x, -d.y, -d.z}, {1, 1, 1, 1}};
+    }
+    for (uint32_t i = 0; options.shader.empty() && i < set.count; ++i)
+        for (int c = 0; c < 3; ++c) set.lights[i].colour[c] *= kDirect;
     return set;
 }

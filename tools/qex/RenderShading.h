@@ -53,5 +53,6 @@ class ShaderOverride {
     std::vector<QexShaderModule*> own_;
 };
 
-// The lights of the options, else the scene's own, else one that shines from the camera.
+// The lights of the options, else the scene's own, else one that shines from the camera; dimmed in the
+// default look, which has ambient light.
 QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera);
