@@ -25,26 +25,27 @@ bool ReadWholeFile(const std::string& path, std::vector<uint8_t>* bytes) {
     return std::ferror(file.get()) == 0;
 }
 
-// The writers of the picture types; 0 when they fail.
-using Encode = int (*)(stbi_write_func* write, void* to, int width, int height, const uint8_t* pixels);
+// The writers of the picture types, of 3 or 4 channels; 0 when they fail.
+using Encode = int (*)(stbi_write_func* write, void* to, int width, int height, int channels,
+                       const void* pixels);
 
-constexpr int kJpegQuality = 92;
+int EncodePng(stbi_write_func* write, void* to, int width, int height, int channels, const void* pixels) {
+    return stbi_write_png_to_func(write, to, width, height, channels, pixels, width * channels);
+}
+
+int EncodeJpeg(stbi_write_func* write, void* to, int width, int height, int channels, const void* pixels) {
+    constexpr int kQuality = 92;
+    return stbi_write_jpg_to_func(write, to, width, height, channels, pixels, kQuality);
+}
 
 const struct {
     const char* extension;
     Encode encode;
-} kWriters[] = {
-    {".png", [](stbi_write_func* write, void* to, int w, int h,
-                const uint8_t* p) { return stbi_write_png_to_func(write, to, w, h, 4, p, w * 4); }},
-    {".jpg", [](stbi_write_func* write, void* to, int w, int h,
-                const uint8_t* p) { return stbi_write_jpg_to_func(write, to, w, h, 4, p, kJpegQuality); }},
-    {".jpeg", [](stbi_write_func* write, void* to, int w, int h,
-                 const uint8_t* p) { return stbi_write_jpg_to_func(write, to, w, h, 4, p, kJpegQuality); }},
-    {".bmp", [](stbi_write_func* write, void* to, int w, int h,
-                const uint8_t* p) { return stbi_write_bmp_to_func(write, to, w, h, 4, p); }},
-    {".tga", [](stbi_write_func* write, void* to, int w, int h,
-                const uint8_t* p) { return stbi_write_tga_to_func(write, to, w, h, 4, p); }},
-};
+} kWriters[] = {{".png", EncodePng},
+                {".jpg", EncodeJpeg},
+                {".jpeg", EncodeJpeg},
+                {".bmp", stbi_write_bmp_to_func},
+                {".tga", stbi_write_tga_to_func}};
 
 // Null for other extensions. Streams have none.
 Encode FindEncode(const std::string& path) {
@@ -54,7 +55,7 @@ Encode FindEncode(const std::string& path) {
     for (const auto& writer : kWriters)
         if (extension == writer.extension) return writer.encode;
     const bool stream = path == "-" || std::filesystem::is_other(path, error);
-    return extension.empty() && stream ? kWriters[0].encode : nullptr;
+    return extension.empty() && stream ? EncodePng : nullptr;
 }
 
 void Append(void* to, void* data, int size) {
@@ -65,8 +66,14 @@ void Append(void* to, void* data, int size) {
 
 bool Save(const std::string& path, Encode encode, int width, int height, const uint8_t* pixels,
           std::string* error) {
-    std::vector<uint8_t> bytes;
-    if (encode(Append, &bytes, width, height, pixels)) return WriteOutput(path, bytes, error);
+    const size_t size = static_cast<size_t>(width) * static_cast<size_t>(height) * 4;
+    std::vector<uint8_t> bytes, rgb;
+    bool opaque = true;
+    for (size_t i = 3; i < size && opaque; i += 4) opaque = pixels[i] == 255;
+    for (size_t i = 0; i < size && opaque; ++i)
+        if (i % 4 < 3) rgb.push_back(pixels[i]);
+    if (encode(Append, &bytes, width, height, opaque ? 3 : 4, opaque ? rgb.data() : pixels))
+        return WriteOutput(path, bytes, error);
     *error = "cannot be written: no memory for the picture";
     return false;
 }
@@ -111,7 +118,7 @@ void UpdateHasAlpha(Image* image) {
 }
 
 bool SavePng(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error) {
-    return Save(path, kWriters[0].encode, width, height, pixels, error);
+    return Save(path, EncodePng, width, height, pixels, error);
 }
 
 bool SavePicture(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error) {
