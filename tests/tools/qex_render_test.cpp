@@ -234,7 +234,9 @@ TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
                 {"first", {}},
                 {"short", {"--frames", "0:0:1"}},
                 {"turn", {"--turn", "3", "--orbit", "30,15"}},
-                {"orbit", {"--orbit", "150,15"}}};
+                {"orbit", {"--orbit", "150,15"}},
+                {"side", {"--camera", "auto", "--up", "-X"}},
+                {"lower", {"--camera", "auto", "--up=-x"}}};
     for (const auto& run : runs) Render(Path("scene.pod"), std::string(run.name) + ".png", run.arguments);
     const auto file = [&](const char* name) { return ReadBytes(Path(name)); };
     EXPECT_GT(Count(Load("one.png"), {255, 255, 255}), 50u);  // the letters
@@ -243,6 +245,8 @@ TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
     EXPECT_EQ(file("one.png"), file("run-0002.png"));
     EXPECT_EQ(file("first.png"), file("short-0000.png"));
     EXPECT_EQ(file("orbit.png"), file("turn-0001.png"));
+    EXPECT_EQ(file("side.png"), file("lower.png"));
+    EXPECT_NE(file("side.png"), file("turn-0000.png"));
     EXPECT_NE(file("turn-0000.png"), file("turn-0001.png"));
 }
 

@@ -107,13 +107,13 @@ bool Renderer::Load() {
     return false;
 }
 
-std::vector<double> Renderer::Frames() const {
-    std::vector<double> frames;
-    if (!options_.sequence)
-        return std::vector<double>(static_cast<size_t>(std::max(options_.turn, 1)), options_.frame);
-    const double count = std::floor((options_.last - options_.first) / options_.step + 1e-9) + 1;
-    for (double i = 0; i < count; ++i) frames.push_back(options_.first + i * options_.step);
-    return frames;
+size_t Renderer::PictureCount() const {
+    if (!options_.sequence) return static_cast<size_t>(std::max(options_.turn, 1));
+    return static_cast<size_t>((options_.last - options_.first) / options_.step + 1e-9) + 1;
+}
+
+double Renderer::FrameAt(size_t picture) const {
+    return options_.sequence ? options_.first + static_cast<double>(picture) * options_.step : options_.frame;
 }
 
 bool Renderer::Save(const std::string& path, const std::vector<uint8_t>& pixels) const {
@@ -132,7 +132,7 @@ bool Renderer::LoadSurroundings(std::string* problem) {
         floor_->Create(points_, *effects.floor, effects.mirror.has_value());
     }
     if (!effects.sky.empty()) {
-        SetFrame(Frames().front());
+        SetFrame(FrameAt(0));
         PlaceCamera(0);
         sky_ = std::make_unique<Sky>();
         if (!sky_->Load(effects.sky, camera_, SceneSize(), effects.water, problem)) return false;
@@ -159,7 +159,7 @@ std::string Renderer::WrongOutput() const {
     for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
         if (model_.scene.textures[i].name)
             inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);
-    for (size_t i = 0, count = Frames().size(); i < count; ++i) {
+    for (size_t i = 0, count = PictureCount(); i < count; ++i) {
         const std::string path = OutputPath(i), overwrites = WhyNotOutput(path, inputs);
         if (!overwrites.empty()) return path + ": " + overwrites;
     }
@@ -185,7 +185,7 @@ std::string Renderer::CheckOptions() {
 
 void Renderer::WarnOfFrames() const {
     const uint32_t count = model_.scene.frameCount;
-    const double last = Frames().back();
+    const double last = FrameAt(PictureCount() - 1);
     const char* asked = options_.sequence ? "--frames" : "--frame";
     if (count < 2 && (options_.sequence || last > 0))
         Warn(std::string(asked) + ": the scene has no animation; every frame is the same");
@@ -198,7 +198,7 @@ void Renderer::WarnOfFrames() const {
 // middle and at the end.
 void Renderer::ChooseCamera() {
     if (options_.camera || UsesAutoCamera() || !model_.scene.cameraCount) return;
-    const size_t count = Frames().size();
+    const size_t count = PictureCount();
     std::string reason;
     const auto blank = [&](size_t index) {
         EngineOutput quiet;
@@ -236,7 +236,7 @@ int Renderer::Run() {
 }
 
 int Renderer::DrawAll() {
-    const size_t count = Frames().size();
+    const size_t count = PictureCount();
     size_t blank = 0;
     gltapResetCounts();
     for (size_t i = 0; i < count; ++i) {

@@ -29,7 +29,8 @@ class Renderer {
     std::string WrongOutput() const;
     std::string OutputPath(size_t index) const;
     std::string CheckOptions();
-    std::vector<double> Frames() const;
+    size_t PictureCount() const;
+    double FrameAt(size_t picture) const;
     void WarnOfFrames() const;
     bool LoadSurroundings(std::string* problem);
     void ChooseCamera();

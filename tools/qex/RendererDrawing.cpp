@@ -26,11 +26,10 @@ void Renderer::SetFrame(double frame) {
 
 // Collects what the automatic camera has to show, over all frames, with its mirror image.
 void Renderer::Frame() {
-    std::vector<double> frames = Frames();
-    frames.erase(std::unique(frames.begin(), frames.end()), frames.end());
-    const size_t share = std::max<size_t>(1000, kFramingPoints / frames.size());
-    for (double frame : frames) {
-        SetFrame(frame);
+    const size_t count = options_.sequence ? PictureCount() : 1;
+    const size_t share = std::max<size_t>(1000, kFramingPoints / count);
+    for (size_t picture = 0; picture < count; ++picture) {
+        SetFrame(FrameAt(picture));
         for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
             CollectPoints(&model_.scene, i, share, &points_);
     }
@@ -86,7 +85,7 @@ void Renderer::Draw(double frame, float turned) {
 
 void Renderer::DrawNumber(size_t index) {
     const double turns = options_.turn ? static_cast<double>(index) / options_.turn : 0;
-    Draw(Frames()[index], static_cast<float>(360 * turns));
+    Draw(FrameAt(index), static_cast<float>(360 * turns));
 }
 
 void Renderer::Clear(uint32_t colour) {
