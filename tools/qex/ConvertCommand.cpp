@@ -14,9 +14,11 @@
 #include "ConvertAnimation.h"
 #include "ConvertGltf.h"
 #include "ConvertLog.h"
+#include "ConvertProcess.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
 #include "PodWriter.h"
+#include "TextureOverrides.h"
 
 namespace fs = std::filesystem;
 
@@ -28,17 +30,18 @@ constexpr double kMaxFps = 1000;
 struct FileType {
     const char* extension;
     bool textureReplacesColour;
+    bool linearColours;
     CameraQuirks cameras;
 };
 
 constexpr FileType kFileTypes[] = {
-    {".dae", true, {}},
-    {".zae", true, {}},
-    {".fbx", true, {}},
-    {".3ds", true, {false, false, true}},
-    {".ase", true, {false, true, false}},
-    {".gltf", false, {true, false, false}},
-    {".glb", false, {true, false, false}},
+    {".dae", true, false, {}},
+    {".zae", true, false, {}},
+    {".fbx", true, false, {}},
+    {".3ds", true, false, {false, false, true}},
+    {".ase", true, false, {false, true, false}},
+    {".gltf", false, true, {true, false, false}},
+    {".glb", false, true, {true, false, false}},
 };
 
 SceneSettings SettingsFor(const ConvertOptions& options) {
@@ -51,7 +54,7 @@ SceneSettings SettingsFor(const ConvertOptions& options) {
     }
     for (const FileType& type : kFileTypes) {
         if (extension != type.extension) continue;
-        settings.textureReplacesColour = type.textureReplacesColour;
+        settings.materials = {type.textureReplacesColour, type.linearColours, {}};
         settings.cameras = type.cameras;
     }
     return settings;
@@ -100,12 +103,19 @@ const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
                                                         aiProcess_CalcTangentSpace | aiProcess_SortByPType |
                                                         aiProcess_FindDegenerates | aiProcess_GenUVCoords |
                                                         aiProcess_TransformUVCoords);
-    // Its joining of vertices does not look at the bones that they follow.
+    // Its joining of vertices does not look at their colours and the bones that they follow.
     if (!scene || std::any_of(scene->mMeshes, scene->mMeshes + scene->mNumMeshes,
-                              [](const aiMesh* mesh) { return mesh->HasBones(); })) {
+                              [](const aiMesh* mesh) { return mesh->HasBones() || mesh->mColors[0]; })) {
         return scene;
     }
     return importer->ApplyPostProcessing(aiProcess_JoinIdenticalVertices | aiProcess_ImproveCacheLocality);
+}
+
+std::vector<std::string> MaterialNames(const aiScene& scene) {
+    std::vector<std::string> names;
+    for (unsigned i = 0; i < scene.mNumMaterials; ++i)
+        names.push_back(scene.mMaterials[i]->GetName().C_Str());
+    return names;
 }
 
 void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,
@@ -145,6 +155,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
     if (!source || !source->mRootNode) {
         std::string reason = importer.GetErrorString();
         reason.resize(std::min(reason.size(), reason.find('\n')));
+        if (reason.find("bad_alloc") != std::string::npos) throw std::bad_alloc();
         log.Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason +
                   ")");
         return kBadInput;
@@ -152,6 +163,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
 
     if (options.listClips) {
         ListClips(*source);
+        if (!source->mNumAnimations) log.Error("has no animations");
         return kDone;
     }
     SceneSettings settings = SettingsFor(options);
@@ -160,6 +172,9 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         if (clip < 0) return BadArgument("--clip", error);
         settings.clip = clip;
     }
+    settings.materials.overrides = SplitOverrides(options.textures);
+    error = UnknownMaterial(settings.materials.overrides, MaterialNames(*source));
+    if (!error.empty()) return BadArgument("--texture", error);
     TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
     pod::Scene scene;
     const ExitStatus status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
@@ -190,6 +205,13 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
         ->check(CLI::Range(1, 16));
     app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
         ->check(CLI::IsMember({"etc1", "rgba8888", "rgb888"}));
+    app->add_option("--texture", options->textures, kOverrideHelp)
+        ->type_size(1)
+        ->expected(1, 1000)
+        ->allow_extra_args(false)
+        ->check(CheckOverride);
+    app->add_option("--memory", options->memory, "megabytes of memory that it may take (4096)")
+        ->check(CLI::Range(64, 1 << 24));
     app->add_flag("-q,--quiet", options->quiet, "no summary");
 }
 
@@ -197,10 +219,14 @@ int RunConvert(const ConvertOptions& options) {
     TextureFormat format;
     const int argumentStatus = CheckArguments(options, &format);
     if (argumentStatus != kDone) return argumentStatus;
-    try {
-        return ConvertFile(options, format);
-    } catch (const std::exception& failure) {  // out of memory, or a folder that vanishes while it is read
-        ConvertLog(options.input).Error(std::string("cannot be converted (") + failure.what() + ")");
+    return RunInProcess(options.input, options.memory, [&]() -> int {
+        try {
+            return ConvertFile(options, format);
+        } catch (const std::bad_alloc&) {
+            ConvertLog(options.input).Error(NeedsMoreMemory(options.memory));
+        } catch (const std::exception& failure) {  // such as a folder that vanishes while it is read
+            ConvertLog(options.input).Error(std::string("cannot be converted (") + failure.what() + ")");
+        }
         return kBadInput;
-    }
+    });
 }
