@@ -14,6 +14,7 @@
 #include "ConvertAnimation.h"
 #include "ConvertGltf.h"
 #include "ConvertLog.h"
+#include "ConvertPlacement.h"
 #include "ConvertProcess.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
@@ -71,8 +72,9 @@ std::string OutputDirectory(const ConvertOptions& options) {
 }
 
 // kDone, or the status to end with after a message.
-int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
+int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placement* placement) {
     std::error_code ec;
+    std::string error;
     if (!ParseTextureFormat(options.textureFormat, format)) {
         return BadArgument(options.textureFormat, "no texture format; etc1, rgba8888 or rgb888 is expected");
     }
@@ -81,6 +83,10 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     }
     if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
         return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
+    }
+    if (!ParsePlacement(options.up, options.scale, placement, &error)) {
+        std::fprintf(stderr, "qex convert: %s\n", error.c_str());
+        return kBadArgument;
     }
     if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
@@ -138,7 +144,7 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
 }
 
-int ConvertFile(const ConvertOptions& options, TextureFormat format) {
+int ConvertFile(const ConvertOptions& options, TextureFormat format, const Placement& placement) {
     ConvertLog log(options.input);
     std::error_code ec;
     if (!fs::is_regular_file(options.input, ec)) {
@@ -183,6 +189,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         return status;
     }
     if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
+    if (!PlaceScene(placement, &scene)) log.Warn("has no size that could be made to fit");
     if (!pod::WriteFile(options.output, pod::WritePod(scene))) {
         return BadArgument(options.output, "cannot be written");
     }
@@ -210,6 +217,9 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
         ->expected(1, 1000)
         ->allow_extra_args(false)
         ->check(CheckOverride);
+    app->add_option("--up", options->up, "the file's vertical axis: x, y, z, -x, -y or -z (y)");
+    app->add_option("--scale", options->scale,
+                    "a factor, or fit:SIZE for the length of the longest edge (1)");
     app->add_option("--memory", options->memory, "megabytes of memory that it may take (4096)")
         ->check(CLI::Range(64, 1 << 24));
     app->add_flag("-q,--quiet", options->quiet, "no summary");
@@ -217,11 +227,12 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
 
 int RunConvert(const ConvertOptions& options) {
     TextureFormat format;
-    const int argumentStatus = CheckArguments(options, &format);
+    Placement placement;
+    const int argumentStatus = CheckArguments(options, &format, &placement);
     if (argumentStatus != kDone) return argumentStatus;
     return RunInProcess(options.input, options.memory, [&]() -> int {
         try {
-            return ConvertFile(options, format);
+            return ConvertFile(options, format, placement);
         } catch (const std::bad_alloc&) {
             ConvertLog(options.input).Error(NeedsMoreMemory(options.memory));
         } catch (const std::exception& failure) {  // such as a folder that vanishes while it is read
