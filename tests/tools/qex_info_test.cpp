@@ -112,12 +112,15 @@ TEST_F(QexInfo, TellsWhatASceneHolds) {
     ExpectHolds(d["materials"][1], R"({"name":"glass \"thin\"","opacity":0.75,"diffuse":[1.0,1.0,1.0]})");
     ExpectHolds(d["textures"][0], R"({"content":{"pixelType":"RGB 565"}})");
     EXPECT_EQ(d["textures"][0]["alphaFile"], Path("wood_a.pvr"));
+    EXPECT_EQ(d["translucent"].size(), 2u);
     ExpectHolds(d["cameras"][0], R"({"near":1.0,"far":100.0,"target":4})");
     EXPECT_NEAR(d["cameras"][0]["fovDegrees"].get<double>(), 60, 1e-4);
     const std::string text = ExpectTextAgrees(Path("scene.pod"), d);
     for (const char* part :
          {"made by hand", "  0 first: mesh 0, material 0, animated position\n    1 second: mesh 1",
-          "2 lamp: light", "4 frames, 25 a second", "32-bit indices", "glass \"thin\"", "60 degrees"})
+          "2 lamp: light", "4 frames, 25 a second", "32-bit indices", "glass \"thin\"", "60 degrees",
+          "\nTranslucent\n  0 paint: opacity 1, alpha from ",
+          "\n  1 glass \"thin\": opacity 0.75; drawn after"})
         EXPECT_TRUE(Contains(text, part)) << part << "\n" << text;
 }
 
@@ -130,6 +133,8 @@ TEST_F(QexInfo, NamesEveryProblem) {
     WriteBytes(Path("r555.pvr"), UniformPvr(pod::kPvrRgb555, 8, {1, 2}));
     WriteBytes(Path("cut.pvr"), cut);
     WriteText(Path("junk.pvr"), "junk");
+    WriteText(Path("photo.png"), "a picture");
+    WriteBytes(Path("sound.pvr"), UniformPvr(pod::kPvrRgba8888, 8, {1, 2, 3, 4}));
     const struct {
         std::function<void(pod::Scene*)> change;
         const char* part;
@@ -186,6 +191,18 @@ TEST_F(QexInfo, NamesEveryProblem) {
         {[](auto* s) { s->cameras.clear(); }, "it has no camera"},
         {[](auto* s) { s->cameras[0].nearPlane = 0; }, "camera 0 has its near plane at 0"},
         {RemoveQuad, "it has no mesh nodes"},
+        {[](auto* s) { s->materials[0].effectFile = "water.pfx"; },
+         "material 0 (paint) has an effect of its own, water.pfx: it is not read"},
+        {[](auto* s) { s->textures = {"sound.pvr"}; }, "texture 0 (sound.pvr) belongs to no material"},
+        {[](auto* s) { TextureQuad(s, "Photo.PNG"); }, "texture 0 (Photo.PNG) is there as a picture only"},
+        {[](auto* s) {
+             PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}});
+             s->nodes[2] = s->nodes[1] = s->nodes[0];
+             s->meshNodeCount = 3;
+             s->cameras.clear();
+             s->frameCount = 12;
+         },
+         "node 0: position has fewer keys than frames; it stands still (and 2 more like this)"},
     };
     for (const auto& c : cases) {
         pod::Scene scene = QuadScene();

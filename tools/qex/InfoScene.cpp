@@ -200,6 +200,21 @@ Json DescribeMaterial(const QexPODModel& scene, uint32_t index) {
     return entry;
 }
 
+// Materials that let through what is behind them: by their opacity, or the alpha of their texture.
+Json DescribeTranslucency(const QexPODModel& scene, const Json& textures) {
+    Json list = Json::array();
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const QexPODMaterial& m = scene.materials[i];
+        const bool alpha =
+            m.diffuseTexture >= 0 && textures[static_cast<size_t>(m.diffuseTexture)].contains("alphaFile");
+        if (m.opacity >= 1 && !alpha) continue;
+        Json entry = {{"index", i}, {"name", TextOrNull(m.name)}, {"opacity", m.opacity}};
+        if (alpha) entry["alphaFile"] = textures[static_cast<size_t>(m.diffuseTexture)]["alphaFile"];
+        list.push_back(std::move(entry));
+    }
+    return list;
+}
+
 // Which file stands for the texture, and whether it can be read.
 Json DescribeTexture(const std::string& directory, const char* name, uint32_t index) {
     Json entry = {{"index", index}, {"name", TextOrNull(name)}, {"found", false}};
@@ -313,6 +328,7 @@ void DescribeContent(const std::string& path, QexPODModel* scene, Json* document
     (*document)["textures"] = List(scene->textureCount, [&](uint32_t i) {
         return DescribeTexture(directory, scene->textures[i].name, i);
     });
+    (*document)["translucent"] = DescribeTranslucency(*scene, (*document)["textures"]);
     (*document)["lights"] = DescribeLights(*scene);
     (*document)["cameras"] = DescribeCameras(*scene);
 }

@@ -129,6 +129,16 @@ void PrintMaterials(const Json& materials) {
     }
 }
 
+void PrintTranslucent(const Json& materials) {
+    Heading("Translucent", materials);
+    for (const Json& material : materials) {
+        std::string text = "opacity " + Words(material["opacity"]);
+        if (material.contains("alphaFile")) text += ", alpha from " + Words(material["alphaFile"]);
+        printf("  %s: %s; drawn after the opaque ones, over what is behind\n", Named(material).c_str(),
+               text.c_str());
+    }
+}
+
 // What a PVR or KTX file that stands for a texture is.
 std::string ContainerText(const Json& content) {
     std::string text = Words(content["format"]);
@@ -199,6 +209,7 @@ void PrintInfo(const Json& document) {
         PrintNodes(document["nodes"]);
         PrintMeshes(document["meshes"]);
         PrintMaterials(document["materials"]);
+        PrintTranslucent(document["translucent"]);
         PrintTextures(document["textures"]);
         PrintLightsAndCameras(document);
     } else {
