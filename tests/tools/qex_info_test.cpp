@@ -133,7 +133,8 @@ TEST_F(QexInfo, NamesEveryProblem) {
     WriteBytes(Path("r555.pvr"), UniformPvr(pod::kPvrRgb555, 8, {1, 2}));
     WriteBytes(Path("cut.pvr"), cut);
     WriteText(Path("junk.pvr"), "junk");
-    WriteText(Path("photo.png"), "a picture");
+    WriteText(Path("broken.png"), "no picture");
+    WriteBytes(Path("photo.tga"), TgaFile(1, 1, 32, {1, 2, 3, 128}));
     WriteBytes(Path("sound.pvr"), UniformPvr(pod::kPvrRgba8888, 8, {1, 2, 3, 4}));
     const struct {
         std::function<void(pod::Scene*)> change;
@@ -195,6 +196,7 @@ TEST_F(QexInfo, NamesEveryProblem) {
          "material 0 (paint) has an effect of its own, water.pfx: it is not read"},
         {[](auto* s) { s->textures = {"sound.pvr"}; }, "texture 0 (sound.pvr) belongs to no material"},
         {[](auto* s) { TextureQuad(s, "Photo.PNG"); }, "texture 0 (Photo.PNG) is there as a picture only"},
+        {[](auto* s) { TextureQuad(s, "broken.png"); }, "broken.png: is no PNG, JPEG, TGA"},
         {[](auto* s) {
              PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}});
              s->nodes[2] = s->nodes[1] = s->nodes[0];

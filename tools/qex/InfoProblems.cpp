@@ -59,6 +59,9 @@ void CheckTextures(Finder* finder) {
         else if (!texture["found"].get<bool>())
             finder->Add(label + " is missing: no .pvr, .ktx or picture of that name beside the scene" +
                         (diffuse[i] ? "" : " (no material draws its colour)"));
+        else if (texture.contains("picture") && !texture["picture"]["loads"].get<bool>())
+            finder->Add(label + ", file " + texture["file"].get<std::string>() + ": " +
+                        texture["picture"]["problem"].get<std::string>());
         else if (texture.contains("picture"))
             finder->Add(label +
                         " is there as a picture only: qex render decodes it, the engine alone does not; " +

@@ -6,6 +6,7 @@
 #include <memory>
 #include <set>
 
+#include "ImageFile.h"
 #include "Info.h"
 #include "InfoExporter.h"
 #include "SceneBounds.h"
@@ -205,12 +206,13 @@ Json DescribeTranslucency(const QexPODModel& scene, const Json& textures) {
     Json list = Json::array();
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const QexPODMaterial& m = scene.materials[i];
-        const bool alpha =
-            m.diffuseTexture >= 0 && textures[static_cast<size_t>(m.diffuseTexture)].contains("alphaFile");
-        if (m.opacity >= 1 && !alpha) continue;
         Json entry = {{"index", i}, {"name", TextOrNull(m.name)}, {"opacity", m.opacity}};
-        if (alpha) entry["alphaFile"] = textures[static_cast<size_t>(m.diffuseTexture)]["alphaFile"];
-        list.push_back(std::move(entry));
+        const Json texture = m.diffuseTexture < 0 ? Json() : textures[static_cast<size_t>(m.diffuseTexture)];
+        if (texture.contains("alphaFile"))
+            entry["alphaFile"] = texture["alphaFile"];
+        else if (texture.contains("picture") && texture["picture"].value("alpha", false))
+            entry["alphaFile"] = texture["file"];
+        if (m.opacity < 1 || entry.contains("alphaFile")) list.push_back(std::move(entry));
     }
     return list;
 }
@@ -234,7 +236,14 @@ Json DescribeTexture(const std::string& directory, const char* name, uint32_t in
         }
     } else if (file.kind == TextureFile::kPicture) {
         // The engine reads no such pictures; qex render decodes them.
-        entry["picture"] = true;
+        Image image;
+        const bool read = LoadImage(file.path, &image, &error);
+        entry["picture"] = {{"loads", read}};
+        if (read)
+            entry["picture"].update(
+                {{"width", image.width}, {"height", image.height}, {"alpha", image.hasAlpha}});
+        else
+            entry["picture"]["problem"] = error;
     }
     const std::string alphaName = AlphaPath(name);
     const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(directory, alphaName);

@@ -148,6 +148,12 @@ std::string ContainerText(const Json& content) {
     return text + (content["loads"].get<bool>() ? "" : ", refused");
 }
 
+std::string PictureText(const Json& picture) {
+    if (!picture["loads"].get<bool>()) return "a picture, damaged";
+    return "a picture, " + Words(picture["width"]) + " x " + Words(picture["height"]) +
+           ": qex render decodes it, the engine alone does not";
+}
+
 void PrintTextures(const Json& textures) {
     Heading("Textures", textures);
     for (const Json& texture : textures) {
@@ -157,8 +163,7 @@ void PrintTextures(const Json& textures) {
         } else {
             text += Words(texture["file"]);
             if (texture.contains("content")) text += " (" + ContainerText(texture["content"]) + ")";
-            if (texture.contains("picture"))
-                text += " (a picture: qex render decodes it, the engine alone does not)";
+            if (texture.contains("picture")) text += " (" + PictureText(texture["picture"]) + ")";
         }
         if (texture.contains("alphaFile")) text += ", alpha from " + Words(texture["alphaFile"]);
         printf("  %s\n", text.c_str());
