@@ -129,9 +129,12 @@ TEST_F(ConvertMaterial, VerticesKeepTheirColoursInATexture) {
     WriteTga("pic.tga", 1, 1, {{9, 9, 9, 255}});
     ConvertSquare(R"("pbrMetallicRoughness":{"baseColorTexture":{"index":0}})", colours);
     EXPECT_TRUE(Contains(said_, "vertex colours of 1 mesh part with textures are not drawn")) << said_;
-    // Where colours are not linear they are kept, and stand in the place of the material's.
-    WriteText(Path("c.obj"), "v 0 0 0 1 0.5 0\nv 1 0 0 1 0.5 0\nv 0 1 0 1 0.5 0\nf 1 2 3\n");
-    Convert(Path("c.obj"));
+    // Where colours are not linear they are kept, and stand in the place of the material's, unless all are
+    // black.
+    for (const std::string colour : {" 1 0.5 0\n", " 0 0 0\n"}) {
+        WriteText(Path("c.obj"), "v 0 0 0" + colour + "v 1 0 0" + colour + "v 0 1 0" + colour + "f 1 2 3\n");
+        EXPECT_EQ(Convert(Path("c.obj")).textureCount, colour[1] == '1' ? 1u : 0u);
+    }
     EXPECT_EQ(Sample("colours.pvr", 0.5f, 0.5f), (std::array<int, 3>{255, 128, 0}));
 }
 
@@ -139,11 +142,7 @@ TEST_F(ConvertMaterial, TexturesOfOnesChoice) {
     WriteText(Path("q.obj"), "mtllib m.mtl\nusemtl m\nv 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
     WriteText(Path("m.mtl"), "newmtl m\nmap_Kd gone.tga\n");
     WriteTga("mine.tga", 1, 1, {{10, 20, 30, 255}});
-    ConvertOptions options;
-    options.input = Path("q.obj");
-    options.output = Path("out.pod");
-    options.textureFormat = "rgba8888";
-    options.quiet = true;
+    ConvertOptions options = Options(Path("q.obj"));
     options.textures = {"m=" + Path("mine.tga")};
     EXPECT_EQ(Run(options), 0);
     EXPECT_EQ(said_, "");
@@ -195,10 +194,7 @@ TEST_F(ConvertTest, MemoryIsLimited) {
     std::string obj;
     for (int i = 0; i < 2000000; ++i) obj += "v 0 1 0\n";
     WriteText(Path("big.obj"), obj + "v 1 0 0\nv 0 0 1\nf -1 -2 -3\n");
-    ConvertOptions options;
-    options.input = Path("big.obj");
-    options.output = Path("out.pod");
-    options.quiet = true;
+    ConvertOptions options = Options(Path("big.obj"));
     options.memory = 64;
     EXPECT_EQ(Run(options), 1);
     EXPECT_TRUE(Contains(said_, "big.obj: needs more than 64 MB of memory; --memory allows more")) << said_;
@@ -207,10 +203,17 @@ TEST_F(ConvertTest, MemoryIsLimited) {
     EXPECT_EQ(Run(options), 0) << said_;
 }
 
+TEST_F(ConvertTest, MotionWithoutAMeshIsAWarning) {
+    WriteText(Path("m.bvh"),
+              "HIERARCHY\nROOT a\n{\nOFFSET 0 0 0\nCHANNELS 0\nEnd Site\n{\nOFFSET 0 1 0\n}\n}\n"
+              "MOTION\nFrames: 1\nFrame Time: 0.1\n\n");
+    Convert(Path("m.bvh"));
+    EXPECT_TRUE(Contains(said_, "the file has no meshes; pointed bodies")) << said_;
+}
+
 TEST_F(ConvertTest, SaysThatThereAreNoClips) {
     WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
-    ConvertOptions options;
-    options.input = Path("q.obj");
+    ConvertOptions options = Options(Path("q.obj"));
     options.listClips = true;
     EXPECT_EQ(Run(options), 0);
     EXPECT_EQ(said_, "qex convert: " + Path("q.obj") + ": has no animations\n");

@@ -211,12 +211,9 @@ TEST_F(ConvertNodes, StandUprightInAnySize) {
         Convert(file);
         const auto before = std::move(pod_);
         for (const auto& row : rows) {
-            ConvertOptions options;
-            options.input = file;
-            options.output = Path("out.pod");
+            ConvertOptions options = Options(file);
             options.up = row.up;
             options.scale = row.scale;
-            options.quiet = true;
             ASSERT_EQ(Run(options), 0) << said_;
             QexPODModel &was = before->scene, &is = Read();
             const auto moved = [&](const QexVec3& p, float factor) -> QexVec3 {
@@ -251,11 +248,8 @@ TEST_F(ConvertNodes, StandUprightInAnySize) {
                 ExpectNear({is.cameras[i].nearPlane, is.cameras[i].farPlane},
                            {was.cameras[i].nearPlane * row.factor, was.cameras[i].farPlane * row.factor});
         }
-        ConvertOptions options;
-        options.input = file;
-        options.output = Path("out.pod");
+        ConvertOptions options = Options(file);
         options.scale = "FIT:7.5";
-        options.quiet = true;
         ASSERT_EQ(Run(options), 0) << said_;
         EXPECT_NEAR(BoundsOf(PointsAt(&Read(), file == bison ? 1 : 0)).LongestEdge(), 7.5f, 1e-3f);
     }
@@ -290,8 +284,7 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
         {Path("points.obj"), out, "etc1", 30, 1, "holds no triangles"},
     };
     for (const auto& row : rows) {
-        ConvertOptions options;
-        options.input = row.input;
+        ConvertOptions options = Options(row.input);
         options.output = row.output;
         options.textureFormat = row.format;
         options.fps = row.fps;
@@ -305,9 +298,7 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
                                    {"y", "1x", "'1x' is no scale"},
                                    {"y", "fit:-1", "'fit:-1' is no scale"}};
     for (const auto& row : placements) {
-        ConvertOptions options;
-        options.input = good;
-        options.output = out;
+        ConvertOptions options = Options(good);
         options.up = row[0];
         options.scale = row[1];
         EXPECT_EQ(Run(options), 2);

@@ -39,11 +39,15 @@ float EncodeSrgb(float linear) {
     return linear <= 0.0031308f ? 12.92f * linear : 1.055f * std::pow(linear, 1 / 2.4f) - 0.055f;
 }
 
-bool HasColours(const aiMesh& mesh) {
+bool HasColours(const aiMesh& mesh, bool blackIsMeant) {
     const aiColor4D* colours = mesh.mColors[0];
-    return colours && std::any_of(colours, colours + mesh.mNumVertices, [](const aiColor4D& c) {
-               return c.r < 1 || c.g < 1 || c.b < 1 || c.a < 1;
-           });
+    if (!colours) return false;
+    const aiColor4D* end = colours + mesh.mNumVertices;
+    const bool anyLight =
+        std::any_of(colours, end, [](const aiColor4D& c) { return c.r > 0 || c.g > 0 || c.b > 0; });
+    const bool anyDark = std::any_of(
+        colours, end, [](const aiColor4D& c) { return c.r < 1 || c.g < 1 || c.b < 1 || c.a < 1; });
+    return anyDark && (anyLight || blackIsMeant);
 }
 
 void ColourAtlas::Add(unsigned mesh, const aiMesh& source, const ColourRules& rules) {

@@ -15,8 +15,9 @@ using Texel = std::array<uint8_t, 4>;
 // The colour space that the engine's materials and textures are in, from linear light.
 float EncodeSrgb(float linear);
 
-// Whether the vertices have colours other than white.
-bool HasColours(const aiMesh& mesh);
+// Whether the vertices have colours that show: not all white, nor, unless black is surely meant, all black,
+// which some importers leave where a file has none.
+bool HasColours(const aiMesh& mesh, bool blackIsMeant);
 
 struct ColourRules {
     bool linear = false;                 // the file's colours are to be encoded

@@ -140,8 +140,8 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
     if (batches) std::printf("bone batches %d, ", batches);
     if (batches && scene.frameCount) std::printf("bind pose at frame 0, animation from frame 1, ");
-    std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
-                textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
+    std::printf("textures %zu in %d files beside it, warnings %d\n", textures.Names().size(),
+                textures.FilesWritten(), log.Warnings());
 }
 
 int ConvertFile(const ConvertOptions& options, TextureFormat format, const Placement& placement) {
@@ -211,7 +211,7 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
     app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")
         ->check(CLI::Range(1, 16));
     app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
-        ->check(CLI::IsMember({"etc1", "rgba8888", "rgb888"}));
+        ->transform(CLI::IsMember({"etc1", "rgba8888", "rgb888"}, CLI::ignore_case));
     app->add_option("--texture", options->textures, kOverrideHelp)
         ->type_size(1)
         ->expected(1, 1000)

@@ -26,6 +26,9 @@ void WarnAboutWhatIsLost(const aiScene& source, const SceneSettings& settings, C
         if (!IsTriangles(mesh)) loose += mesh.mNumFaces;
         morphed += mesh.mNumAnimMeshes > 0;
     }
+    // The importer's own, for files of motion or cameras alone.
+    if (source.mNumMaterials == 1 && source.mMaterials[0]->GetName() == aiString("SkeletonMaterial"))
+        log->Warn("the file has no meshes; pointed bodies show where its nodes are");
     if (loose) log->Warn(Plural(loose, "point, line or degenerate triangle") + " dropped");
     if (morphed) log->Warn(Plural(morphed, "mesh part") + " with morph targets converted without them");
     if (source.mNumAnimations > 1 && !settings.clip) {
@@ -81,7 +84,7 @@ void CollectColours(const aiScene& source, bool linear, MaterialSet* materials, 
         const aiMesh& mesh = *source.mMeshes[i];
         if (!IsTriangles(mesh)) continue;
         const MaterialResult& material = materials->Convert(mesh.mMaterialIndex);
-        if (!HasColours(mesh)) continue;
+        if (!HasColours(mesh, linear)) continue;
         ColourRules rules{linear, material.alphaCounts, {1, 1, 1}};
         if (linear) rules.tint = material.material.diffuse;
         lost += material.textured;
