@@ -7,7 +7,6 @@
 #include "Headless.h"
 #include "QexCommandTest.h"
 #include "support/PodScenes.h"
-#include "support/WalkScene.h"
 
 using Json = nlohmann::json;
 
@@ -298,31 +297,18 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
     }
 }
 
-// Each file in this process, from a block of its exact size; every 40th as the command sees it, too.
-TEST_F(QexInfo, LargestRealSceneDamaged) {
-    const std::vector<std::string> scenes = RealFilesIn("scenes", ".pod");
-    if (scenes.empty()) GTEST_SKIP() << "QEX_REAL_FILES names no folder with scenes/*.pod";
-    const Bytes whole = ReadBytes(scenes[0]);
-    size_t number = 0;
-    const auto tryOne = [&](const Bytes& file, const std::string& what) {
-        LoadedPod loaded(file);
-        if (loaded.scene.runtime)
-            EXPECT_EQ(SceneWalk(&loaded.scene).fault, nullptr) << what;
-        else
-            EXPECT_NE(loaded.Error(), "") << what << " fails without a word";
-        if (number++ % 40) return;
-        WriteBytes(Path("damaged.pod"), file);
-        const CommandResult result = Run({"info", Path("damaged.pod")});
-        EXPECT_EQ(result.status, loaded.result ? 1 : 0) << what << "\n" << result.err;
-        EXPECT_EQ(CountLines(result.err), result.status) << what << "\n" << result.err;
-        EXPECT_EQ(result.out.empty(), result.status == 1) << what;
-    };
-    for (size_t length = 0; length < whole.size(); length += 997)
-        tryOne(Bytes(whole.begin(), whole.begin() + static_cast<long>(length)),
-               "cut at " + std::to_string(length));
-    for (size_t at = 0; at < 4096 && at + 4 <= whole.size(); at += 4) {
+TEST_F(QexInfo, DamagedScenesAreShownOrRefusedInOneLine) {
+    const Bytes whole = pod::WritePod(FullScene());
+    size_t refused = 0, shown = 0;
+    for (size_t at = 0; at + 4 <= whole.size(); at += 28) {
         Bytes file = whole;
         PutWord(&file, at, 0xFFFFFFFF);
-        tryOne(file, "word at " + std::to_string(at));
+        WriteBytes(Path("damaged.pod"), file);
+        const CommandResult result = Run({"info", Path("damaged.pod")});
+        EXPECT_EQ(CountLines(result.err), result.status) << "word at " << at << "\n" << result.err;
+        EXPECT_EQ(result.out.empty(), result.status == 1) << "word at " << at;
+        ++(result.status ? refused : shown);
     }
+    EXPECT_GT(refused, 5u);
+    EXPECT_GT(shown, 5u);
 }
