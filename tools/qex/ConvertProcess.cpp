@@ -1,10 +1,14 @@
 #include "ConvertProcess.h"
 
+#ifdef __linux__
+#include <sys/prctl.h>
+#endif
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <cerrno>
+#include <csignal>
 #include <cstdio>
 #include <cstring>
 
@@ -29,6 +33,9 @@ void Limit(int what, rlim_t most) {
 [[noreturn]] void RunChild(int errors, int megabytes, const std::function<int()>& work) {
     dup2(errors, STDERR_FILENO);
     close(errors);
+#ifdef __linux__
+    prctl(PR_SET_PDEATHSIG, SIGKILL);  // it shall not outlive a command that is stopped
+#endif
     Limit(RLIMIT_CORE, 0);
     if (!kSanitized) Limit(RLIMIT_AS, static_cast<rlim_t>(megabytes) << 20);
     const int status = work();
