@@ -244,6 +244,9 @@ TEST_F(ConvertNodes, StandUprightInAnySize) {
                     }
                 }
             }
+            for (uint32_t i = 0; i < was.lightCount; ++i)
+                EXPECT_NEAR(is.lights[i].quadraticAttenuation * row.factor * row.factor,
+                            was.lights[i].quadraticAttenuation, 1e-5f);
             for (uint32_t i = 0; i < was.cameraCount; ++i)
                 ExpectNear({is.cameras[i].nearPlane, is.cameras[i].farPlane},
                            {was.cameras[i].nearPlane * row.factor, was.cameras[i].farPlane * row.factor});
