@@ -1,4 +1,4 @@
-# The pictures, the textures and the converter of the qex command, as static libraries.
+# What the verbs share, the pictures, the textures and the converter of the qex command, as static libraries.
 find_package(assimp REQUIRED)
 find_package(CLI11 REQUIRED)
 find_package(nlohmann_json REQUIRED)
@@ -6,12 +6,17 @@ find_path(ETC1_INCLUDE_DIR ETC1/etc1.h PATH_SUFFIXES android REQUIRED)
 find_library(ETC1_LIBRARY ETC1 PATH_SUFFIXES android REQUIRED)
 find_path(STB_INCLUDE_DIR stb/stb_image.h REQUIRED)
 
+add_library(qex_command STATIC ${CMAKE_CURRENT_LIST_DIR}/CommandLine.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/OutputFile.cpp)
+target_include_directories(qex_command PUBLIC ${CMAKE_CURRENT_LIST_DIR})
+target_link_libraries(qex_command PUBLIC CLI11::CLI11 PRIVATE qex_warnings)
+
 add_library(qex_image STATIC ${CMAKE_CURRENT_LIST_DIR}/ImageFile.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ImageFileStb.cpp)
 set_source_files_properties(${CMAKE_CURRENT_LIST_DIR}/ImageFileStb.cpp PROPERTIES COMPILE_OPTIONS -w)
 target_include_directories(qex_image PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_include_directories(qex_image SYSTEM PRIVATE ${STB_INCLUDE_DIR})
-target_link_libraries(qex_image PRIVATE qex_warnings)
+target_link_libraries(qex_image PUBLIC qex_command PRIVATE qex_warnings)
 
 add_library(qex_texture STATIC
     ${CMAKE_CURRENT_LIST_DIR}/TextureCommand.cpp

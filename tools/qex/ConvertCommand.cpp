@@ -18,6 +18,7 @@
 #include "ConvertProcess.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
+#include "OutputFile.h"
 #include "PodWriter.h"
 #include "TextureOverrides.h"
 
@@ -84,6 +85,9 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placeme
     if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
         return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
     }
+    if (options.input == "-" || options.output == "-") {
+        return BadArgument("-", "no file; a scene and its textures lie side by side in a folder");
+    }
     if (!ParsePlacement(options.up, options.scale, placement, &error)) {
         std::fprintf(stderr, "qex convert: %s\n", error.c_str());
         return kBadArgument;
@@ -96,10 +100,10 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placeme
     if (!fs::is_directory(OutputDirectory(options), ec)) {
         return BadArgument(options.output, "cannot be written; its folder does not exist");
     }
-    if (fs::equivalent(options.input, options.output, ec)) {
-        return BadArgument(options.output, "is the input; another name is expected");
-    }
-    return kDone;
+    std::vector<std::string> inputs = {options.input};
+    for (const auto& [material, file] : SplitOverrides(options.textures)) inputs.push_back(file);
+    const std::string problem = WhyNotOutput(options.output, inputs);
+    return problem.empty() ? kDone : BadArgument(options.output, problem);
 }
 
 const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
@@ -188,11 +192,12 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format, const Place
         log.Error(error);
         return status;
     }
-    if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
-    if (!PlaceScene(placement, &scene)) log.Warn("has no size that could be made to fit");
-    if (!pod::WriteFile(options.output, pod::WritePod(scene))) {
-        return BadArgument(options.output, "cannot be written");
+    if (!textures.WriteError().empty()) {
+        std::fprintf(stderr, "qex convert: %s\n", textures.WriteError().c_str());
+        return kBadArgument;
     }
+    if (!PlaceScene(placement, &scene)) log.Warn("has no size that could be made to fit");
+    if (!WriteOutput(options.output, pod::WritePod(scene), &error)) return BadArgument(options.output, error);
     if (!options.quiet) PrintSummary(options, scene, textures, log);
     return kDone;
 }
@@ -212,11 +217,7 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
         ->check(CLI::Range(1, 16));
     app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
         ->transform(CLI::IsMember({"etc1", "rgba8888", "rgb888"}, CLI::ignore_case));
-    app->add_option("--texture", options->textures, kOverrideHelp)
-        ->type_size(1)
-        ->expected(1, 1000)
-        ->allow_extra_args(false)
-        ->check(CheckOverride);
+    AddTextureOption(app, &options->textures);
     app->add_option("--up", options->up, "the file's vertical axis: x, y, z, -x, -y or -z (y)");
     app->add_option("--scale", options->scale,
                     "a factor, or fit:SIZE for the length of the longest edge (1)");

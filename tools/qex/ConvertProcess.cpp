@@ -12,7 +12,9 @@
 #include <cstdio>
 #include <cstring>
 
+#include "CommandLine.h"
 #include "ConvertLog.h"
+#include "OutputFile.h"
 
 namespace {
 
@@ -38,8 +40,13 @@ void Limit(int what, rlim_t most) {
 #endif
     Limit(RLIMIT_CORE, 0);
     if (!kSanitized) Limit(RLIMIT_AS, static_cast<rlim_t>(megabytes) << 20);
-    const int status = work();
-    fflush(nullptr);
+    int status = work();
+    std::string problem;
+    if (!FinishStandardOutput(&problem)) {
+        fprintf(stderr, "%s%s\n", kOurs, problem.c_str());
+        status = status ? status : kBadArgument;
+    }
+    fflush(stderr);
     _exit(status);
 }
 
@@ -65,7 +72,7 @@ class Messages {
   private:
     void Take(const std::string& line) {
         const bool ours = line.compare(0, strlen(kOurs), kOurs) == 0;
-        if (ours || kSanitized) fprintf(stderr, "%s\n", line.c_str());
+        if (ours || kSanitized || GetTalk().verbose) fprintf(stderr, "%s\n", line.c_str());
         passed_ |= ours;
         if (!ours && !line.empty()) reason_ = line;
     }

@@ -6,6 +6,7 @@
 #include <filesystem>
 #include <iterator>
 
+#include "OutputFile.h"
 #include "PodWriter.h"
 #include "TextureFiles.h"
 #include "TextureWrite.h"
@@ -132,11 +133,12 @@ int TextureSet::WriteTexture(const std::string& path, const Image& image, bool w
 
 bool TextureSet::Write(const std::string& name, const Image& image, const Coding& coding) {
     const std::string path = (fs::path(outputDirectory_) / name).string();
-    if (pod::WriteFile(path, EncodePvr(image, coding.format, coding.mipmaps))) {
+    std::string problem;
+    if (WriteOutput(path, EncodePvr(image, coding.format, coding.mipmaps), &problem)) {
         ++filesWritten_;
         return true;
     }
-    writeError_ = path;
+    writeError_ = path + ": " + problem;
     return false;
 }
 

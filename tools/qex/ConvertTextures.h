@@ -48,7 +48,7 @@ class TextureSet {
     const std::vector<std::string>& Names() const { return names_; }
     int FilesWritten() const { return filesWritten_; }
 
-    // Set when a file could not be written, which ends the conversion.
+    // The file that could not be written, and why, which ends the conversion.
     const std::string& WriteError() const { return writeError_; }
 
   private:

@@ -139,12 +139,12 @@ int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
 }
 
 // A texture of one texel for a material that has none.
-QexTexture* ColourTexture(const QexPODMaterial& material) {
+QexTexture* ColourTexture(const QexPODMaterial& material, bool white) {
     QexTexture* texture = NewTexture();
     if (!texture) return nullptr;
     uint8_t texel[4] = {0, 0, 0, 255};
     for (int i = 0; i < 3; ++i) {
-        const float c = material.diffuse[i];
+        const float c = white ? 1 : material.diffuse[i];
         texel[i] = static_cast<uint8_t>((c > 0 ? c < 1 ? c : 1.0f : 0.0f) * 255.0f + 0.5f);
     }
     QexTexture_CreateFromPixels(texture, 1, 1, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_REPEAT,
@@ -229,11 +229,7 @@ QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
 }
 
 void SetUpTextureChoices(CLI::App* app, TextureChoices* choices) {
-    app->add_option("--texture", choices->overrides, kOverrideHelp)
-        ->type_size(1)
-        ->expected(1, 1000)
-        ->allow_extra_args(false)
-        ->check(CheckOverride);
+    AddTextureOption(app, &choices->overrides);
     app->add_option(
            "--flip-textures", choices->flipped,
            "whether V runs down the pictures beside the scene: yes or no (as its export options say, "
@@ -260,7 +256,7 @@ std::string CheckTextureChoices(const QexModel* model) {
     return UnknownMaterial(g_lookup.overrides, names);
 }
 
-std::vector<std::string> CompleteTextures(QexModel* model) {
+std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<bool>& lit) {
     QexPODModel& scene = model->scene;
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const std::string given = Chosen(model, i), file = FileOf(model, i);
@@ -271,7 +267,7 @@ std::vector<std::string> CompleteTextures(QexModel* model) {
             QexMemory_Free(QexModel_ReplaceTextureByIdx(model, nullptr, i));
             texture = nullptr;
         }
-        if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i]), i);
+        if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i], lit[i]), i);
         FindAlpha(model, i, file);
         // A KTX file sets no filter, and GL's own wants a whole chain of mipmaps.
         if (texture && Extension(file) == "ktx") QexTexture_SetFilter(model->textures[i], QEX_FILTER_LINEAR);

@@ -33,9 +33,10 @@ std::string CheckTextureChoices(const QexModel* model);
 QexTexture* NewPictureTexture(const Image& image, const std::string& name);
 
 // After loading: the textures that are chosen, for materials without a texture one of their diffuse colour,
+// white for those that are `lit`, as light brings the colour,
 // for KTX textures a filter that needs no mipmaps; nodes with an alpha texture leave the opaque pass. Returns
 // a line for each texture that is missing or could not be read.
-std::vector<std::string> CompleteTextures(QexModel* model);
+std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<bool>& lit);
 
 // Loads the materials' bump textures and has them bound for the normal-mapped modules. Returns what is wrong
 // with them, one line each.
