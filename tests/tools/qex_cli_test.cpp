@@ -133,8 +133,11 @@ TEST_F(QexCli, WhatIsNotWrittenWholeIsSaidAndLeavesWhatWasThere) {
     // Nothing half written lies about.
     for (const auto& entry : std::filesystem::directory_iterator(folder_))
         EXPECT_EQ(entry.path().filename().string().find(".qex"), std::string::npos) << entry.path();
-    for (const std::vector<std::string>& arguments :
-         {std::vector<std::string>{"info", pod}, {"emitter"}, {"--help"}, {"render", pod, "-o", "-"}}) {
+    for (const std::vector<std::string>& arguments : {std::vector<std::string>{"info", pod},
+                                                      {"convert", obj, "-o", Path("o.pod")},
+                                                      {"emitter"},
+                                                      {"--help"},
+                                                      {"render", pod, "-o", "-"}}) {
         const CommandResult result = Run(arguments, "/dev/null", "/dev/full");
         EXPECT_EQ(result.status, 2) << arguments[0];
         EXPECT_TRUE(Contains(result.err, "No space left on device")) << result.err;

@@ -34,14 +34,19 @@ target_link_libraries(qex_texture PUBLIC qex_podwriter qex_image PRIVATE ${ETC1_
 add_library(qex_convert STATIC
     ${CMAKE_CURRENT_LIST_DIR}/ConvertAnimation.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertBatches.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertColours.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertCommand.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertGltf.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMaterials.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertMeshes.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertNodes.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertPlacement.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertProcess.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertScene.cpp
     ${CMAKE_CURRENT_LIST_DIR}/ConvertSkin.cpp
-    ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp)
+    ${CMAKE_CURRENT_LIST_DIR}/ConvertTextures.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/EngineOutput.cpp
+    ${CMAKE_CURRENT_LIST_DIR}/SceneBounds.cpp)
 target_include_directories(qex_convert PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 target_link_libraries(qex_convert PUBLIC qex_texture assimp::assimp PRIVATE
     CLI11::CLI11 nlohmann_json::nlohmann_json qex_engine qex_warnings)

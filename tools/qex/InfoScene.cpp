@@ -6,6 +6,7 @@
 #include <memory>
 #include <set>
 
+#include "ImageFile.h"
 #include "Info.h"
 #include "InfoExporter.h"
 #include "SceneBounds.h"
@@ -200,6 +201,22 @@ Json DescribeMaterial(const QexPODModel& scene, uint32_t index) {
     return entry;
 }
 
+// Materials that let through what is behind them: by their opacity, or the alpha of their texture.
+Json DescribeTranslucency(const QexPODModel& scene, const Json& textures) {
+    Json list = Json::array();
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const QexPODMaterial& m = scene.materials[i];
+        Json entry = {{"index", i}, {"name", TextOrNull(m.name)}, {"opacity", m.opacity}};
+        const Json texture = m.diffuseTexture < 0 ? Json() : textures[static_cast<size_t>(m.diffuseTexture)];
+        if (texture.contains("alphaFile"))
+            entry["alphaFile"] = texture["alphaFile"];
+        else if (texture.contains("picture") && texture["picture"].value("alpha", false))
+            entry["alphaFile"] = texture["file"];
+        if (m.opacity < 1 || entry.contains("alphaFile")) list.push_back(std::move(entry));
+    }
+    return list;
+}
+
 // Which file stands for the texture, and whether it can be read.
 Json DescribeTexture(const std::string& directory, const char* name, uint32_t index) {
     Json entry = {{"index", index}, {"name", TextOrNull(name)}, {"found", false}};
@@ -219,7 +236,14 @@ Json DescribeTexture(const std::string& directory, const char* name, uint32_t in
         }
     } else if (file.kind == TextureFile::kPicture) {
         // The engine reads no such pictures; qex render decodes them.
-        entry["picture"] = true;
+        Image image;
+        const bool read = LoadImage(file.path, &image, &error);
+        entry["picture"] = {{"loads", read}};
+        if (read)
+            entry["picture"].update(
+                {{"width", image.width}, {"height", image.height}, {"alpha", image.hasAlpha}});
+        else
+            entry["picture"]["problem"] = error;
     }
     const std::string alphaName = AlphaPath(name);
     const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(directory, alphaName);
@@ -313,6 +337,7 @@ void DescribeContent(const std::string& path, QexPODModel* scene, Json* document
     (*document)["textures"] = List(scene->textureCount, [&](uint32_t i) {
         return DescribeTexture(directory, scene->textures[i].name, i);
     });
+    (*document)["translucent"] = DescribeTranslucency(*scene, (*document)["textures"]);
     (*document)["lights"] = DescribeLights(*scene);
     (*document)["cameras"] = DescribeCameras(*scene);
 }

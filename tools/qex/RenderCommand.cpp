@@ -16,6 +16,7 @@
 #include "RenderReport.h"
 #include "RenderTextures.h"
 #include "TextureFiles.h"
+#include "TextureOverrides.h"
 
 namespace {
 
@@ -156,6 +157,7 @@ std::string Renderer::WrongOutput() const {
     std::vector<std::string> inputs = {options_.input};
     for (const auto* more : {&effects.sky, &effects.emitters.emitters, &effects.emitters.textures})
         inputs.insert(inputs.end(), more->begin(), more->end());
+    for (const auto& [material, file] : SplitOverrides(options_.textures.overrides)) inputs.push_back(file);
     for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
         if (model_.scene.textures[i].name)
             inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);

@@ -229,11 +229,7 @@ QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
 }
 
 void SetUpTextureChoices(CLI::App* app, TextureChoices* choices) {
-    app->add_option("--texture", choices->overrides, kOverrideHelp)
-        ->type_size(1)
-        ->expected(1, 1000)
-        ->allow_extra_args(false)
-        ->check(CheckOverride);
+    AddTextureOption(app, &choices->overrides);
     app->add_option(
            "--flip-textures", choices->flipped,
            "whether V runs down the pictures beside the scene: yes or no (as its export options say, "

@@ -36,9 +36,11 @@ void CollectSkinned(QexPODModel* scene, uint32_t meshNode, uint32_t step, std::v
     const uint32_t indexSize = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
     for (int32_t b = 0; b < batches.batchCount; ++b) {
         const int32_t* bones = batches.boneTable + static_cast<ptrdiff_t>(b) * batches.maxBones;
-        for (int32_t i = 0; i < batches.bonesPerBatch[b]; ++i)
-            QexPODModel_GetBoneWorldMatrix(scene, &matrices[static_cast<size_t>(i)], node,
-                                           &scene->nodes[bones[i]]);
+        for (int32_t i = 0; i < batches.bonesPerBatch[b]; ++i) {
+            QexMatrix* matrix = &matrices[static_cast<size_t>(i)];
+            *matrix = g_sMatIdentity;
+            if (bones[i] >= 0) QexPODModel_GetBoneWorldMatrix(scene, matrix, node, &scene->nodes[bones[i]]);
+        }
         const uint32_t end =
             b + 1 < batches.batchCount ? static_cast<uint32_t>(batches.offsets[b + 1]) : mesh.faceCount;
         for (uint32_t i = static_cast<uint32_t>(batches.offsets[b]) * 3; i < end * 3; i += step) {

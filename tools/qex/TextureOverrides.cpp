@@ -2,6 +2,9 @@
 
 #include <algorithm>
 
+#include <CLI/CLI.hpp>
+
+#include "CommandLine.h"
 #include "TextureFiles.h"
 
 namespace {
@@ -13,14 +16,21 @@ size_t SplitPoint(const std::string& text) {
     return text.rfind('=');
 }
 
-}  // namespace
-
-std::string CheckOverride(const std::string& text) {
+// What is wrong with a text, or nothing.
+std::string Check(const std::string& text) {
     const size_t at = SplitPoint(text);
     if (at == std::string::npos || at + 1 == text.size())
         return "'" + text + "' is no texture; expected MATERIAL=FILE";
     const std::string file = text.substr(at + 1);
     return IsRegularFile(file) ? "" : file + ": no such file";
+}
+
+}  // namespace
+
+void AddTextureOption(CLI::App* app, std::vector<std::string>* texts) {
+    AddTexts(app, "--texture", texts,
+             "MATERIAL=FILE, a texture for a material, in place of its own; repeatable")
+        ->check(Check);
 }
 
 TextureOverrides SplitOverrides(const std::vector<std::string>& texts) {

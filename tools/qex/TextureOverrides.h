@@ -5,12 +5,14 @@
 #include <utility>
 #include <vector>
 
+namespace CLI {
+class App;
+}
+
 using TextureOverrides = std::vector<std::pair<std::string, std::string>>;  // material and file
 
-constexpr char kOverrideHelp[] = "MATERIAL=FILE, a texture for a material, in place of its own; repeatable";
-
-// What is wrong with a text that should be MATERIAL=FILE, FILE being there; empty when nothing is.
-std::string CheckOverride(const std::string& text);
+// Adds --texture, which may be given several times. The files have to be there.
+void AddTextureOption(CLI::App* app, std::vector<std::string>* texts);
 
 TextureOverrides SplitOverrides(const std::vector<std::string>& texts);
 
