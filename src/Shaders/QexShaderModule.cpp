@@ -22,7 +22,10 @@ constexpr float kDefaultThreshold = 0.5f;
 constexpr QexPODMaterial MakeWhite() {
     QexPODMaterial material = {};
     material.opacity = 1;
-    for (int i = 0; i < 3; ++i) material.ambient[i] = material.diffuse[i] = 1;
+    for (int i = 0; i < 3; ++i) {
+        material.ambient[i] = 0.3f;
+        material.diffuse[i] = 1;
+    }
     return material;
 }
 

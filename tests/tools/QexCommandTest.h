@@ -21,14 +21,18 @@ struct CommandResult {
 
 class QexCommandTest : public FolderTest {
   protected:
-    CommandResult Run(const std::vector<std::string>& arguments) const {
-        const std::string out = Path("stdout.txt"), err = Path("stderr.txt");
+    // Standard input comes from a file, standard output goes to one.
+    CommandResult Run(const std::vector<std::string>& arguments, const std::string& input = "/dev/null",
+                      std::string out = "") const {
+        const std::string err = Path("stderr.txt");
+        if (out.empty()) out = Path("stdout.txt");
         std::vector<char*> argv = {const_cast<char*>(QEX_COMMAND)};
         for (const std::string& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
         argv.push_back(nullptr);
         const pid_t child = fork();
         if (child == 0) {
             const int flags = O_WRONLY | O_CREAT | O_TRUNC;
+            dup2(open(input.c_str(), O_RDONLY), STDIN_FILENO);
             dup2(open(out.c_str(), flags, 0600), STDOUT_FILENO);
             dup2(open(err.c_str(), flags, 0600), STDERR_FILENO);
             execv(QEX_COMMAND, argv.data());
@@ -36,8 +40,8 @@ class QexCommandTest : public FolderTest {
         }
         int status = 0;
         waitpid(child, &status, 0);
-        return {WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status), ReadText(out),
-                ReadText(err)};
+        return {WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status),
+                std::filesystem::is_regular_file(out) ? ReadText(out) : "", ReadText(err)};
     }
 
     // One line on standard error that contains `part`, nothing on standard output.
@@ -104,6 +108,7 @@ inline void RemoveQuad(pod::Scene* scene) {
 inline void TextureQuad(pod::Scene* scene, const std::string& texture) {
     scene->textures = {texture};
     scene->materials[0].diffuseTexture = 0;
+    scene->materials[0].diffuse = {1, 1, 1};
 }
 
 inline void WriteScene(const std::string& path, const pod::Scene& scene) {

@@ -1,6 +1,6 @@
 # Tests of the qex command, which run it as a process of its own.
 find_package(nlohmann_json REQUIRED)
-foreach(name info render cli texture emitter)
+foreach(name info render cli texture emitter lookup)
     add_executable(qex_${name}_test ${CMAKE_CURRENT_LIST_DIR}/qex_${name}_test.cpp)
     target_include_directories(qex_${name}_test PRIVATE ${CMAKE_CURRENT_LIST_DIR}/..)
     target_compile_definitions(qex_${name}_test PRIVATE QEX_COMMAND="$<TARGET_FILE:qex_cli>")

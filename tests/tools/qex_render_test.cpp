@@ -47,6 +47,11 @@ size_t Count(const Image& image, const Rgb& colour) {
 // The quad from (0, 0) to (2, 1), 20 pixels a unit, around the middle of 200 x 100 pixels.
 constexpr Box kQuad = {100, 30, 140, 50};
 
+std::vector<std::string> With(std::vector<std::string> arguments, const std::vector<std::string>& more) {
+    arguments.insert(arguments.end(), more.begin(), more.end());
+    return arguments;
+}
+
 class QexRender : public QexCommandTest {
   protected:
     Image Load(const std::string& name) const {
@@ -58,9 +63,7 @@ class QexRender : public QexCommandTest {
     }
     CommandResult Render(const std::string& scene, const std::string& png,
                          const std::vector<std::string>& more = {}) const {
-        std::vector<std::string> arguments = {"render", scene, "-o", Path(png), "--size", "200x100"};
-        arguments.insert(arguments.end(), more.begin(), more.end());
-        const CommandResult result = Run(arguments);
+        const CommandResult result = Run(With({"render", scene, "-o", Path(png), "--size", "200x100"}, more));
         EXPECT_EQ(result.status, 0) << result.err;
         EXPECT_EQ(result.out, "");
         return result;
@@ -101,6 +104,78 @@ TEST_F(QexRender, DrawsTheQuadWhereTheCameraSeesIt) {
             const bool inside = x >= 100 && x < 140 && y >= 30 && y < 50;
             ASSERT_TRUE(Near(At(image, x, y), inside ? Rgb{255, 0, 0} : kBackground, 1)) << x << ", " << y;
         }
+    pod::Scene nameless = QuadScene();
+    nameless.nodes[0].name = "";
+    EXPECT_EQ(Picture(nameless).pixels, image.pixels);
+}
+
+// The quad turned about its lower edge, 60 degrees away from the camera: half of a light from there falls on
+// it.
+TEST_F(QexRender, IsLitWhereThereAreNormals) {
+    pod::Scene plain = QuadScene();
+    const float half = 3.14159265f / 6;
+    plain.materials[0].ambient = {0, 0, 0};
+    PlaceQuad(&plain, {{}, {{-std::sin(half), 0, 0, std::cos(half)}}, {}, {}});
+    pod::Scene bare = plain, white = plain, textured = plain, light = plain;
+    pod::MeshArrays arrays = Quad(0, 0, 2, 1);
+    arrays.normals.clear();
+    bare.meshes = {pod::BuildMesh(arrays)};
+    white.materials.clear();
+    white.nodes[0].material = -1;
+    TextureQuad(&textured, "tex.png");
+    textured.materials[0].diffuse = {0.5f, 1, 0};
+    WritePng("tex.png", 8, [](int, int) { return Rgb{255, 128, 255}; });
+    light.lights.resize(1);
+    light.lights[0].type = pod::kDirectionalLight;
+    light.lights[0].colour = {0.5f, 1, 1};
+    light.nodes.insert(light.nodes.begin() + 1, pod::BuildNode("sun", Placed(0, 0, 0), -1, 0));
+    light.cameras[0].target = 3;
+    const int lit = 166;  // of 255, 0.3 + 0.7 / 2
+    const struct {
+        const char* name;
+        pod::Scene scene;
+        Rgb colour;
+        std::vector<std::string> more;
+    } cases[] = {{"lit", plain, {lit, 0, 0}, {}},
+                 {"flat", plain, {255, 0, 0}, {"--shader", "texture"}},
+                 {"no normals", bare, {255, 0, 0}, {}},
+                 {"no material", white, {lit, lit, lit}, {}},
+                 {"texture", textured, {lit / 2, lit / 2, 0}, {}},
+                 {"light", light, {121, 0, 0}, {}},  // 0.3 + 0.7 / 4
+                 {"named", plain, {128, 0, 0}, {"--shader", "gouraud"}}};
+    for (const auto& c : cases) {
+        const Rgb seen = At(Picture(c.scene, With({"--camera", "0"}, c.more)), 120, 45);
+        EXPECT_TRUE(Near(seen, c.colour, 2)) << c.name << " " << seen[0] << " " << seen[1] << " " << seen[2];
+    }
+}
+
+TEST_F(QexRender, EdgesAreSmooth) {
+    pod::Scene scene = QuadScene();
+    PlaceQuad(&scene, {{}, {{0, 0, std::sin(0.1f), std::cos(0.1f)}}, {}, {}});
+    const auto mixed = [&](const std::vector<std::string>& more) {
+        const Image image = Picture(scene, more);
+        size_t count = 0;
+        double area = 0;
+        for (int y = 20; y < image.height; ++y)
+            for (int x = 0; x < image.width; ++x) {
+                const double share = (At(image, x, y)[0] - 64) / (255.0 - 64);
+                area += share;
+                count += share > 0.1 && share < 0.9;
+            }
+        EXPECT_NEAR(area, 800, 12);
+        return count;
+    };
+    EXPECT_EQ(mixed({"--antialias", "1"}), 0u);
+    const size_t smooth = mixed({});
+    EXPECT_GT(smooth, 60u);
+    // Drawn into the targets of an effect.
+    EXPECT_GT(mixed({"--dof", "0.09,0"}), 60u);
+    EXPECT_GT(mixed({"--shadow", "--text", "I"}), 60u);
+    // Letters have one size.
+    const auto letters = [&](const std::vector<std::string>& more) {
+        return Count(Picture(scene, With({"--text", "I am"}, more)), {255, 255, 255});
+    };
+    EXPECT_EQ(letters({}), letters({"--shadow"}));
 }
 
 TEST_F(QexRender, LowerEdgeOfATextureIsAtVZero) {
@@ -116,24 +191,10 @@ TEST_F(QexRender, LowerEdgeOfATextureIsAtVZero) {
             EXPECT_TRUE(Near(At(image, 110 + 20 * x, 35 + 10 * y), colours[y][x], 2)) << x << ", " << y;
 }
 
-TEST_F(QexRender, TransparentQuadsBlendTheNearerOneLast) {
-    pod::Scene scene = QuadScene();
-    scene.materials.push_back(scene.materials[0]);
-    scene.materials[0].opacity = scene.materials[1].opacity = 0.6f;
-    scene.materials[1].diffuse = {0, 1, 0};
-    scene.nodes.insert(scene.nodes.begin() + 1, pod::BuildNode("near", Placed(0, 0, 1), -1, 0, 1));
-    scene.meshNodeCount = 2;
-    scene.cameras[0].target = 3;
-    const Rgb blended = {61, 153, 41};  // 0.6 of green over 0.4 of (0.6 of red over 0.4 of blue)
-    for (int order = 0; order < 2; ++order) {
-        EXPECT_TRUE(Near(At(Picture(scene, {"--background", "0000ff"}), 120, 40), blended, 2)) << order;
-        std::swap(scene.nodes[0], scene.nodes[1]);
-    }
-}
-
 TEST_F(QexRender, FramesAreNumberedAndMove) {
-    WriteScene(Path("scene.pod"), MovingScene());
-    EXPECT_EQ(Render(Path("scene.pod"), "out.png", {"--frames", "0:3:1"}).err, "");
+    const std::string pod = Path("scene.pod");
+    WriteScene(pod, MovingScene());
+    EXPECT_EQ(Render(pod, "out.png", {"--frames", "0:3:1"}).err, "");
     for (int frame = 0; frame < 4; ++frame) {
         const Box shifted = {100 - 10 * frame, 30, 140 - 10 * frame, 50};
         EXPECT_EQ(Covered(Load("out-000" + std::to_string(frame) + ".png")), shifted) << "frame " << frame;
@@ -141,8 +202,23 @@ TEST_F(QexRender, FramesAreNumberedAndMove) {
     EXPECT_FALSE(std::filesystem::exists(Path("out-0004.png")));
     EXPECT_FALSE(std::filesystem::exists(Path("out.png")));
     // Between two frames the quad stands between their places.
-    EXPECT_EQ(Render(Path("scene.pod"), "half.png", {"--frame", "1.5"}).err, "");
+    EXPECT_EQ(Render(pod, "half.png", {"--frame", "1.5"}).err, "");
     EXPECT_EQ(Covered(Load("half.png")), (Box{85, 30, 125, 50}));
+    // Names with the number's place in them; frames that there are not.
+    EXPECT_EQ(Render(pod, "a%03db.jpg", {"--turn", "2"}).err, "");
+    EXPECT_EQ(ReadText(Path("a001b.jpg")).substr(0, 2), "\xFF\xD8");
+    EXPECT_TRUE(Contains(Render(pod, "end.png", {"--frame", "500"}).err, "the last frame is 4"));
+    WriteScene(pod, QuadScene());
+    EXPECT_TRUE(Contains(Render(pod, "still.png", {"--frames", "0:1:1"}).err, "has no animation"));
+    EXPECT_TRUE(Contains(Render(pod, "still.png", {"--frame", "5"}).err, "has no animation"));
+    // From standard input to standard output.
+    const CommandResult piped = Run({"render", "-", "-o", "-", "--size", "200x100"}, pod);
+    EXPECT_EQ(piped.err, "");
+    WriteText(Path("piped.png"), piped.out);
+    EXPECT_EQ(Covered(Load("piped.png")), kQuad);
+    ExpectRefused({"render", "-", "-o", Path("x.png")}, 1, "standard input: is empty");
+    ExpectRefused({"render", pod, "-o", "-", "--turn", "2"}, 2, "file name is expected");
+    ExpectRefused({"render", pod, "-o", Path("x.gif")}, 2, ".png, .jpg, .bmp or .tga");
 }
 
 TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
@@ -158,7 +234,9 @@ TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
                 {"first", {}},
                 {"short", {"--frames", "0:0:1"}},
                 {"turn", {"--turn", "3", "--orbit", "30,15"}},
-                {"orbit", {"--orbit", "150,15"}}};
+                {"orbit", {"--orbit", "150,15"}},
+                {"side", {"--camera", "auto", "--up", "-X"}},
+                {"lower", {"--camera", "auto", "--up=-x"}}};
     for (const auto& run : runs) Render(Path("scene.pod"), std::string(run.name) + ".png", run.arguments);
     const auto file = [&](const char* name) { return ReadBytes(Path(name)); };
     EXPECT_GT(Count(Load("one.png"), {255, 255, 255}), 50u);  // the letters
@@ -167,6 +245,8 @@ TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
     EXPECT_EQ(file("one.png"), file("run-0002.png"));
     EXPECT_EQ(file("first.png"), file("short-0000.png"));
     EXPECT_EQ(file("orbit.png"), file("turn-0001.png"));
+    EXPECT_EQ(file("side.png"), file("lower.png"));
+    EXPECT_NE(file("side.png"), file("turn-0000.png"));
     EXPECT_NE(file("turn-0000.png"), file("turn-0001.png"));
 }
 
@@ -186,10 +266,12 @@ TEST_F(QexRender, SaysWhyNothingShows) {
     const struct {
         std::function<void(pod::Scene*)> change;
         const char* part;
+        bool away = false;  // of the camera
     } cases[] = {
-        {[](auto* s) { PlaceQuad(s, Placed(50, 0, 0)); }, "outside the camera's view"},
-        {[](auto* s) { PlaceQuad(s, Placed(0, 0, 20)); }, "behind the camera"},
-        {[](auto* s) { PlaceQuad(s, Placed(0, 0, -200)); }, "far plane"},
+        {[](auto* s) { PlaceQuad(s, Placed(50, 0, 0)); }, "outside the camera's view; try --camera auto",
+         true},
+        {[](auto* s) { PlaceQuad(s, Placed(0, 0, 20)); }, "behind the camera", true},
+        {[](auto* s) { PlaceQuad(s, Placed(0, 0, -200)); }, "far plane", true},
         {FlattenQuad, "scale of 0"},
         {[](auto* s) { s->materials[0].opacity = 0.5f; }, "transparent"},
         {[](auto* s) { s->meshes[0].faceCount = 0; }, "no faces"},
@@ -200,12 +282,23 @@ TEST_F(QexRender, SaysWhyNothingShows) {
         pod::Scene scene = QuadScene();
         c.change(&scene);
         WriteScene(Path("scene.pod"), scene);
-        const CommandResult result = Render(Path("scene.pod"), "out.png");
+        const CommandResult result = Render(Path("scene.pod"), "out.png", {"--camera", "0"});
         EXPECT_EQ(CountLines(result.err), 1) << result.err;
         EXPECT_TRUE(Contains(result.err, "warning: ") && Contains(result.err, c.part))
             << c.part << result.err;
         EXPECT_EQ(Count(Load("out.png"), kBackground), 20000u) << c.part;
+        // Unless it is asked for, a camera that looks away gives way to one that does not.
+        const std::string err = Render(Path("scene.pod"), "auto.png").err;
+        EXPECT_EQ(CountLines(err), 1) << err;
+        EXPECT_EQ(Contains(err, "the automatic camera is used"), c.away) << err;
+        EXPECT_EQ(Covered(Load("auto.png"))[2] > 0, c.away) << c.part;
     }
+    // A part of a sequence.
+    pod::Scene moving = MovingScene();
+    for (float& x : moving.nodes[0].positions) x *= 5;
+    WriteScene(Path("scene.pod"), moving);
+    const std::string err = Render(Path("scene.pod"), "run.png", {"--frames", "0:3:1"}).err;
+    EXPECT_TRUE(Contains(err, "run-0003.png: nothing of the scene shows")) << err;
 }
 
 TEST_F(QexRender, TexturesAreFoundAsPvrThenKtxThenPicture) {
@@ -242,19 +335,16 @@ TEST_F(QexRender, NodesLightsAndEyes) {
     EXPECT_EQ(drawn({"--node", "quad=move:-2,0,0"}), (Box{60, 30, 100, 50}));
     EXPECT_EQ(drawn({"--node", "quad=move:-2,0,0", "--node", "quad=rotate:0,0,90"}), (Box{40, 10, 60, 50}));
     EXPECT_EQ(drawn({"--mirror", "0"}), (Box{100, 30, 140, 70}));
-    EXPECT_EQ(drawn({"--mirror", "0", "--shader", "simple"}), (Box{100, 30, 140, 70}));
-    // The lower left vertex lies straight under the light, the others aside.
-    const Image lit = Picture(scene, {"--shader", "gouraud", "--light", "0,0,1,ff8000"});
-    const Rgb near = At(lit, 101, 48), far = At(lit, 138, 31);
+    // The lower left vertex lies straight under the light.
+    const Rgb near = At(Picture(scene, {"--shader", "gouraud", "--light", "0,0,1,ff8000"}), 101, 48);
     EXPECT_TRUE(near[0] > 235 && near[2] == 0 && std::abs(near[1] - near[0] / 2) < 3) << near[0];
-    EXPECT_NEAR(far[0], 255 / std::sqrt(6.0), 12);
     const Image sides = Picture(scene, {"--stereo", "3,0", "--shader", "simple"});
     EXPECT_GT(Count(sides, {255, 255, 255}), 100u);
     EXPECT_FALSE(Near(At(sides, 60, 45), kBackground, 1) || Near(At(sides, 160, 45), kBackground, 1));
 
     // A light from above the camera throws the quad's shadow on the floor behind it, and nowhere else.
-    const Image bright = Picture(scene, {"--floor=-1", "--light", "1,6,20"});
-    const Image shaded = Picture(scene, {"--floor=-1", "--light", "1,6,20", "--shadow"});
+    const Image bright = Picture(scene, {"--floor=-1", "--light", "1,6,20", "--antialias", "1"});
+    const Image shaded = Picture(scene, {"--floor=-1", "--light", "1,6,20", "--shadow", "--antialias", "1"});
     int darker = 0;
     for (int y = 0; y < bright.height; ++y)
         for (int x = 0; x < bright.width; ++x) {
@@ -266,10 +356,7 @@ TEST_F(QexRender, NodesLightsAndEyes) {
 
     WriteScene(Path("scene.pod"), scene);
     const auto run = [&](const std::vector<std::string>& more) {
-        std::vector<std::string> arguments = {"render",      Path("scene.pod"), "-o",
-                                              Path("p.png"), "--size",          "200x100"};
-        arguments.insert(arguments.end(), more.begin(), more.end());
-        return Run(arguments);
+        return Run(With({"render", Path("scene.pod"), "-o", Path("p.png"), "--size", "200x100"}, more));
     };
     EXPECT_EQ(run({"--pick", "120,40", "--pick", "10,10"}).out, "120,40: quad\n10,10:\n");
     EXPECT_NE(run({"--node", "quad=hide"}).err.find("warning"), std::string::npos);
@@ -278,19 +365,14 @@ TEST_F(QexRender, NodesLightsAndEyes) {
 // The quad lies a tenth of the way to the far plane, the background at it. Columns 97 and 103 are beside the
 // quad's left edge.
 TEST_F(QexRender, DepthOfFieldIsSharpAtItsFocus) {
-    const Rgb red = {255, 0, 0}, depth = {23, 23, 23};  // of 255, (10 - 1) / (100 - 1)
-    EXPECT_TRUE(Near(At(Picture(QuadScene(), {"--shader", "depth"}), 120, 40), depth, 1));
+    const Rgb red = {255, 0, 0};
     const Image near = Picture(QuadScene(), {"--dof", "0.09,50"});
     EXPECT_TRUE(Near(At(near, 103, 40), red, 4));
-    EXPECT_GT(At(near, 97, 40)[0], kBackground[0] + 20);
     // Four steps to either side: eight pixels at half the resolution, four at full.
     EXPECT_GT(At(near, 94, 40)[0], kBackground[0] + 5);
     const Image full = Picture(QuadScene(), {"--dof", "0.09,50", "--dof-full"});
     EXPECT_GT(At(full, 97, 40)[0], kBackground[0] + 5);
     EXPECT_TRUE(Near(At(full, 94, 40), kBackground, 1));
-    const Image far = Picture(QuadScene(), {"--dof", "1,50,3,5"});
-    EXPECT_TRUE(Near(At(far, 97, 40), kBackground, 2));
-    EXPECT_LT(At(far, 103, 40)[0], 235);
     // The nodes have their own modules again for the next picture.
     WriteScene(Path("scene.pod"), MovingScene());
     EXPECT_EQ(Render(Path("scene.pod"), "run.png", {"--frames", "0:1:1", "--dof", "0.09,1"}).err, "");
@@ -327,49 +409,33 @@ TEST_F(QexRender, SkyIsSeenFromInsideAndMirroredInWater) {
             SavePng(Path(upright ? "upright.png" : "lying.png"), width, height, pixels.data(), &error));
     }
     pod::Scene scene = QuadScene();
-    const auto with = [](std::vector<std::string> arguments, const std::vector<std::string>& more) {
-        arguments.insert(arguments.end(), more.begin(), more.end());
-        return arguments;
-    };
     Image image = Picture(scene, six);
     EXPECT_TRUE(Near(At(image, 120, 40), {255, 0, 0}, 1));
-    for (int quarter = 0; quarter < 4; ++quarter)
-        EXPECT_TRUE(Near(At(image, quarter % 2 ? 150 : 50, quarter < 2 ? 20 : 80),
-                         face(5, quarter % 2 * 16, quarter / 2 * 16), 2))
-            << quarter;
     // The quad from 0 to 1 is seen from -1 to -2 in the water at -0.5, the sky's upper half below.
-    const auto surface = Picture(scene, with(six, {"--water", "-0.5"}));
+    const auto surface = Picture(scene, With(six, {"--water", "-0.5"}));
     EXPECT_TRUE(Near(At(surface, 120, 40), {255, 0, 0}, 1) && Near(At(surface, 120, 80), {255, 0, 0}, 1));
-    EXPECT_FALSE(Near(At(surface, 120, 58), {255, 0, 0}, 60));
-    EXPECT_TRUE(Near(At(surface, 50, 85), face(5, 0, 0), 4) && Near(At(surface, 160, 85), face(5, 16, 0), 4));
-    EXPECT_TRUE(Near(At(surface, 50, 20), face(5, 0, 0), 2));
-    // Under water there is none, and the sky as before.
-    EXPECT_EQ(Picture(scene, with(six, {"--water", "3"})).pixels, image.pixels);
-    // All faces, whichever way they come; the picture's middle is that way, the first half of its left.
+    EXPECT_TRUE(Near(At(surface, 50, 85), face(5, 0, 0), 4) && Near(At(surface, 50, 20), face(5, 0, 0), 2));
+    // Faces, whichever way they come.
     const struct {
         const char* orbit;
         int face;
-    } looks[] = {{"90,0", 1}, {"-90,0", 0}, {"180,0", 4}, {"0,-89", 2}, {"0,89", 3}};
+    } looks[] = {{"90,0", 1}, {"180,0", 4}, {"0,-89", 2}};
     FlattenQuad(&scene);
     for (const auto& look : looks) {
         const std::vector<std::string> camera = {"--camera", "auto", "--orbit", look.orbit};
-        image = Picture(scene, with(camera, six));
+        image = Picture(scene, With(camera, six));
         for (int quarter = 0; quarter < 4; ++quarter)
             EXPECT_TRUE(Near(At(image, quarter % 2 ? 150 : 50, quarter < 2 ? 15 : 85),
                              face(look.face, quarter % 2 * 16, quarter / 2 * 16), 2))
                 << look.orbit << " " << quarter;
         for (const char* cross : {"lying.png", "upright.png"})
-            EXPECT_EQ(Picture(scene, with(camera, {"--sky", Path(cross)})).pixels, image.pixels) << cross;
+            EXPECT_EQ(Picture(scene, With(camera, {"--sky", Path(cross)})).pixels, image.pixels) << cross;
     }
     const std::vector<std::string> render = {"render", Path("scene.pod"), "-o", Path("no.png")};
-    ExpectRefused(with(render, {"--water", "0"}), 2, "--sky");
-    ExpectRefused(with(render, {"--sky", "a.png", "--sky", "b.png"}), 2, "expected one picture, or six");
-    ExpectRefused(with(with(render, six), {"--water", "0", "--shadow"}), 2, "--shadow");
-    ExpectRefused(with(render, {"--sky", Path("none.png")}), 1, "none.png");
-    ExpectRefused(with(render, {"--sky", Path("px.png")}), 1,
-                  "32 x 32 pixels are not 4 x 3 or 3 x 4 squares");
-    six.back() = Path("lying.png");
-    ExpectRefused(with(render, six), 1, "128 x 96 pixels are not a square");
+    ExpectRefused(With(render, {"--water", "0"}), 2, "--sky");
+    ExpectRefused(With(render, {"--sky", "a.png", "--sky", "b.png"}), 2, "expected one picture, or six");
+    ExpectRefused(With(render, {"--sky", Path("none.png")}), 1, "none.png");
+    ExpectRefused(With(render, {"--sky", Path("px.png")}), 1, "32 x 32 pixels are not 4 x 3 or 3 x 4");
 }
 
 // One particle a unit wide and high, 20 pixels, that moves to the right, past the quad.
@@ -399,12 +465,7 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     const Image inSky = Picture(QuadScene(), sky);
     EXPECT_TRUE(Near(At(inSky, 60, 40), {255, 255, 255}, 12) && At(inSky, 54, 40)[0] > 60);
     EXPECT_TRUE(Near(At(inSky, 47, 40), {10, 20, 30}, 2) && Near(At(inSky, 72, 40), {10, 20, 30}, 2));
-    // A written file is the same as its description, and a white spot stands for the texture.
-    ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("near.emitter")}).status, 0);
-    EXPECT_EQ(picture("near.emitter", "2").pixels, image.pixels);
-    const CommandResult stats = Run(
-        {"render", Path("scene.pod"), "-o", Path("out.png"), "--emitter", Path("near.emitter"), "--stats"});
-    EXPECT_EQ(stats.out.rfind("load ", 0), 0u) << stats.out;
+    // A white spot stands for the texture.
     image = Picture(QuadScene(), {"--emitter", Path("near.txt"), "--emitter-time", "2"});
     EXPECT_TRUE(Near(At(image, 60, 40), {255, 255, 255}, 12) && Near(At(image, 51, 31), kBackground, 2));
     // Time goes on from picture to picture, 30 frames a second.
@@ -415,6 +476,7 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
         EXPECT_TRUE(
             Near(At(Load("run-000" + std::to_string(i) + ".png"), 40 + 20 * i, 40), {255, 255, 255}, 12));
     // Of files of other programs: the first animation is drawn where none is in use, and odd values are said.
+    ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("near.emitter")}).status, 0);
     Bytes odd = ReadBytes(Path("near.emitter"));
     PutWord(&odd, 0, 7);
     PutWord(&odd, 888, 0);
@@ -428,14 +490,10 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     EXPECT_TRUE(Near(At(Load("odd.png"), 60, 33), {0, 255, 0}, 2));
     const std::vector<std::string> render = {"render", Path("scene.pod"), "-o", Path("no.png")};
     WriteText(Path("bad.txt"), "lifetime 1 2\nemitting 2");
-    const auto refused = [&](std::vector<std::string> arguments, int status, const std::string& part) {
-        arguments.insert(arguments.begin(), render.begin(), render.end());
-        ExpectRefused(arguments, status, part);
-    };
-    refused({"--emitter", Path("bad.txt")}, 1,
-            "bad.txt: line 2: emitting: 2 is not a whole number from 0 to 1");
-    refused({"--emitter", Path("near.txt"), "--emitter-texture", Path("none.png")}, 1, "none.png");
-    refused({"--emitter-time", "1"}, 2, "--emitter");
+    ExpectRefused(With(render, {"--emitter", Path("bad.txt")}), 1, "bad.txt: line 2: emitting: 2 is not");
+    ExpectRefused(With(render, {"--emitter", Path("near.txt"), "--emitter-texture", Path("none.png")}), 1,
+                  "none.png");
+    ExpectRefused(With(render, {"--emitter-time", "1"}), 2, "--emitter");
 }
 
 TEST_F(QexRender, RealScenesShow) {

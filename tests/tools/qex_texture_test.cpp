@@ -314,14 +314,14 @@ TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
         const char* part;
     } cases[] = {
         {2, {a}, "--output is required"},
-        {2, {a, "-o", Path("out.dds")}, ".png, .pvr or .ktx"},
+        {2, {a, "-o", Path("out.dds")}, ".tga, .pvr or .ktx"},
         {2, {"-o", pvr}, "expected one picture or texture"},
         {2, {a, "-o", pvr, "--faces", a, a, a, a, a, a}, "expected one picture or texture"},
         {2, {"-o", pvr, "--faces", a, a, a, a, a}, "6 faces, not 5"},
         {2, {a, "-o", pvr, "--format", "rgb"}, "one of etc1, rgba8888, rgb888, rgba4444, rgba5551, rgb565, l8, la88, a8"},
         {2, {a, "-o", pvr, "--format", "pvrtc4"}, "PVRTC is read, not written"},
         {2, {a, "-o", Path("out.ktx"), "--format", "a8"}, "no a8 from KTX"},
-        {2, {a, "-o", png, "--mipmaps"}, "a PNG file has no"},
+        {2, {a, "-o", png, "--mipmaps"}, "a picture has no"},
         {2, {a, "-o", pvr, "--level", "0"}, "is a picture"},
         {2, {a, "-o", pvr, "--face", "6"}, "--face"},
         {2, {a, "-o", Path("gone/out.pvr")}, "cannot be written"},

@@ -20,6 +20,14 @@ class ConvertTest : public FolderTest {
         WriteBytes(Path(name), file);
     }
 
+    ConvertOptions Options(const std::string& input) const {
+        ConvertOptions options;
+        options.input = input;
+        options.output = Path("out.pod");
+        options.textureFormat = "rgba8888";
+        options.quiet = true;
+        return options;
+    }
     int Run(const ConvertOptions& options) {
         testing::internal::CaptureStderr();
         const int status = RunConvert(options);
@@ -35,13 +43,10 @@ class ConvertTest : public FolderTest {
     // Converts to out.pod, keeps what was said on standard error and reads the scene.
     QexPODModel& Convert(const std::string& input, const std::string& format = "rgba8888", double fps = 30,
                          const std::string& clip = "") {
-        ConvertOptions options;
-        options.input = input;
-        options.output = Path("out.pod");
+        ConvertOptions options = Options(input);
         options.textureFormat = format;
         options.fps = fps;
         options.clip = clip;
-        options.quiet = true;
         EXPECT_EQ(Run(options), 0) << said_;
         return Read();
     }

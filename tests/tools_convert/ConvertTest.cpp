@@ -3,6 +3,7 @@
 
 #include "ConvertMeshes.h"
 #include "ConvertSupport.h"
+#include "SceneBounds.h"
 
 namespace {
 
@@ -184,6 +185,79 @@ TEST_F(ConvertNodes, MirrorAndShear) {
     EXPECT_EQ(shear.animationFlags, 0u);
 }
 
+// ---- Placement ----
+
+std::vector<QexVec3> PointsAt(QexPODModel* scene, float frame) {
+    std::vector<QexVec3> points;
+    QexPODModel_SetFrame(scene, frame);
+    for (uint32_t i = 0; i < scene->meshNodeCount; ++i) CollectPoints(scene, i, 100000, &points);
+    return points;
+}
+
+// Every point, camera and light of a scene is where the one of the scene as it was goes to when space is
+// turned and scaled: in a scene with animation, mirror and shear, and in one with bones.
+TEST_F(ConvertNodes, StandUprightInAnySize) {
+    const struct {
+        const char *up, *scale;
+        float factor;
+        Floats turn;  // where +X, +Y and +Z go
+    } rows[] = {
+        {"Y", "0.5", 0.5f, {1, 0, 0, 0, 1, 0, 0, 0, 1}},     {"z", "3", 3, {1, 0, 0, 0, 0, -1, 0, 1, 0}},
+        {"-Z", "1", 1, {1, 0, 0, 0, 0, 1, 0, -1, 0}},        {"x", "2", 2, {0, 1, 0, -1, 0, 0, 0, 0, 1}},
+        {"-x", "1e-3", 1e-3f, {0, -1, 0, 1, 0, 0, 0, 0, 1}}, {"-y", "1", 1, {-1, 0, 0, 0, -1, 0, 0, 0, 1}}};
+    const std::string bison = "/usr/share/assimp/models/X/Testwuson.X";
+    for (const std::string& file : {Path("a.gltf"), bison}) {
+        if (!std::filesystem::exists(file)) continue;
+        Convert(file);
+        const auto before = std::move(pod_);
+        for (const auto& row : rows) {
+            ConvertOptions options = Options(file);
+            options.up = row.up;
+            options.scale = row.scale;
+            ASSERT_EQ(Run(options), 0) << said_;
+            QexPODModel &was = before->scene, &is = Read();
+            const auto moved = [&](const QexVec3& p, float factor) -> QexVec3 {
+                const float* t = row.turn.data();
+                return {factor * (t[0] * p.x + t[3] * p.y + t[6] * p.z),
+                        factor * (t[1] * p.x + t[4] * p.y + t[7] * p.z),
+                        factor * (t[2] * p.x + t[5] * p.y + t[8] * p.z)};
+            };
+            const auto expectSame = [&](const QexVec3& a, const QexVec3& b, float factor) {
+                EXPECT_NEAR(a.x, b.x, 1e-4f * factor);
+                EXPECT_NEAR(a.y, b.y, 1e-4f * factor);
+                EXPECT_NEAR(a.z, b.z, 1e-4f * factor);
+            };
+            for (const float frame : {0.0f, 1.0f, 17.5f}) {
+                const auto from = PointsAt(&was, frame), to = PointsAt(&is, frame);
+                ASSERT_EQ(from.size(), to.size());
+                for (size_t i = 0; i < from.size() && !HasFailure(); ++i)
+                    expectSame(to[i], moved(from[i], row.factor), row.factor);
+                // Lights and cameras come after the meshes; their axes keep their length.
+                for (uint32_t i = was.meshNodeCount; i < was.meshNodeCount + was.lightCount + was.cameraCount;
+                     ++i) {
+                    QexMatrix a, b;
+                    QexPODModel_GetWorldMatrix(&was, &a, &was.nodes[i]);
+                    QexPODModel_GetWorldMatrix(&is, &b, &is.nodes[i]);
+                    for (int c = 0; c < 4; ++c) {
+                        const float factor = c == 3 ? row.factor : 1, *p = a.m + 4 * c, *q = b.m + 4 * c;
+                        expectSame({q[0], q[1], q[2]}, moved({p[0], p[1], p[2]}, factor), factor);
+                    }
+                }
+            }
+            for (uint32_t i = 0; i < was.lightCount; ++i)
+                EXPECT_NEAR(is.lights[i].quadraticAttenuation * row.factor * row.factor,
+                            was.lights[i].quadraticAttenuation, 1e-5f);
+            for (uint32_t i = 0; i < was.cameraCount; ++i)
+                ExpectNear({is.cameras[i].nearPlane, is.cameras[i].farPlane},
+                           {was.cameras[i].nearPlane * row.factor, was.cameras[i].farPlane * row.factor});
+        }
+        ConvertOptions options = Options(file);
+        options.scale = "FIT:7.5";
+        ASSERT_EQ(Run(options), 0) << said_;
+        EXPECT_NEAR(BoundsOf(PointsAt(&Read(), file == bison ? 1 : 0)).LongestEdge(), 7.5f, 1e-3f);
+    }
+}
+
 TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
     WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
     WriteText(Path("points.obj"), "v 0 0 0\nv 1 0 0\np 1 2\n");
@@ -213,8 +287,7 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
         {Path("points.obj"), out, "etc1", 30, 1, "holds no triangles"},
     };
     for (const auto& row : rows) {
-        ConvertOptions options;
-        options.input = row.input;
+        ConvertOptions options = Options(row.input);
         options.output = row.output;
         options.textureFormat = row.format;
         options.fps = row.fps;
@@ -222,6 +295,17 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
         EXPECT_TRUE(Contains(said_, row.says)) << said_;
         EXPECT_EQ(said_.rfind("qex convert: ", 0), 0u) << said_;
         EXPECT_EQ(CountLines(said_), 1) << said_;
+    }
+    const char* placements[][3] = {{"up", "1", "'up' is no axis; x, y, z, -x"},
+                                   {"y", "0", "'0' is no scale; a number"},
+                                   {"y", "1x", "'1x' is no scale"},
+                                   {"y", "fit:-1", "'fit:-1' is no scale"}};
+    for (const auto& row : placements) {
+        ConvertOptions options = Options(good);
+        options.up = row[0];
+        options.scale = row[1];
+        EXPECT_EQ(Run(options), 2);
+        EXPECT_TRUE(Contains(said_, row[2])) << said_;
     }
     EXPECT_FALSE(std::filesystem::exists(out));
 }

@@ -21,9 +21,10 @@ enum class HeadlessGL {
 
 class HeadlessContext {
   public:
-    // Null on failure, with one line in *error (which may be null).
+    // Null on failure, with one line in *error (which may be null). Each pixel gets at least that many
+    // samples, if there is such a pbuffer; else one.
     static std::unique_ptr<HeadlessContext> Create(int width, int height, std::string* error,
-                                                   HeadlessGL gl = HeadlessGL::kContext);
+                                                   HeadlessGL gl = HeadlessGL::kContext, int samples = 1);
     ~HeadlessContext();
     HeadlessContext(const HeadlessContext&) = delete;
     HeadlessContext& operator=(const HeadlessContext&) = delete;
@@ -36,6 +37,7 @@ class HeadlessContext {
 
     int Width() const { return width_; }
     int Height() const { return height_; }
+    int Samples() const { return samples_; }
 
     // The driver's strings; empty without a context.
     std::string Vendor() const;
@@ -43,11 +45,12 @@ class HeadlessContext {
     std::string Version() const;
 
   private:
-    HeadlessContext(int width, int height) : width_(width), height_(height) {}
+    HeadlessContext(int width, int height, int samples) : width_(width), height_(height), samples_(samples) {}
     bool Open(std::string* error);
 
     int width_;
     int height_;
+    int samples_;
     // EGL handles, kept untyped so that users of this header need no EGL header.
     void* display_ = nullptr;
     void* surface_ = nullptr;

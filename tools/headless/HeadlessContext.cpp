@@ -35,7 +35,8 @@ EGLDisplay OpenDisplay() {
 }
 
 // EGL sorts deeper buffers first where several configurations fit, so the exact sizes are looked for.
-EGLConfig ChooseConfig(EGLDisplay display) {
+// Of those with enough samples the one with the fewest.
+EGLConfig ChooseConfig(EGLDisplay display, int samples) {
     static const EGLint wanted[] = {EGL_SURFACE_TYPE,
                                     EGL_PBUFFER_BIT,
                                     EGL_RENDERABLE_TYPE,
@@ -53,17 +54,21 @@ EGLConfig ChooseConfig(EGLDisplay display) {
                                     EGL_STENCIL_SIZE,
                                     8,
                                     EGL_NONE};
-    EGLConfig configs[64];
-    EGLint count = 0;
+    EGLConfig configs[64], best = nullptr;
+    EGLint count = 0, fewest = 0;
     if (!eglChooseConfig(display, wanted, configs, 64, &count)) return nullptr;
     for (EGLint i = 0; i < count; ++i) {
-        EGLint red = 0, depth = 0, samples = 0;
+        EGLint red = 0, depth = 0, has = 0;
         eglGetConfigAttrib(display, configs[i], EGL_RED_SIZE, &red);
         eglGetConfigAttrib(display, configs[i], EGL_DEPTH_SIZE, &depth);
-        eglGetConfigAttrib(display, configs[i], EGL_SAMPLES, &samples);
-        if (red == 8 && depth == 24 && samples == 0) return configs[i];
+        eglGetConfigAttrib(display, configs[i], EGL_SAMPLES, &has);
+        // Without multisampling it is 0.
+        if (red != 8 || depth != 24 || (has > 1 ? has : 1) < samples || (samples == 1 && has > 1)) continue;
+        if (best && has >= fewest) continue;
+        best = configs[i];
+        fewest = has;
     }
-    return nullptr;
+    return best;
 }
 
 std::string GLString(GLenum name) {
@@ -71,19 +76,62 @@ std::string GLString(GLenum name) {
     return text ? reinterpret_cast<const char*>(text) : "";
 }
 
+// What OpenGL ES 3.0 adds, which a context for 2.0 may have as well.
+constexpr GLenum kReadFramebuffer = 0x8CA8, kDrawFramebuffer = 0x8CA9, kRgba8 = 0x8058;
+using BlitFramebuffer = void (*)(GLint, GLint, GLint, GLint, GLint, GLint, GLint, GLint, GLbitfield, GLenum);
+
+BlitFramebuffer FindBlit() {
+    if (GLString(GL_VERSION).rfind("OpenGL ES 3", 0) != 0) return nullptr;
+    return reinterpret_cast<BlitFramebuffer>(eglGetProcAddress("glBlitFramebuffer"));
+}
+
+// Makes one pixel of the samples of each in another framebuffer, and binds that for the time that it lives:
+// reading from where the samples are takes one of them.
+class Resolved {
+  public:
+    Resolved(int width, int height) {
+        glGenRenderbuffers(1, &colour_);
+        glGenFramebuffers(1, &framebuffer_);
+        glGetIntegerv(GL_RENDERBUFFER_BINDING, &bound_);
+        glBindRenderbuffer(GL_RENDERBUFFER, colour_);
+        glRenderbufferStorage(GL_RENDERBUFFER, kRgba8, width, height);
+        glBindFramebuffer(kDrawFramebuffer, framebuffer_);
+        glFramebufferRenderbuffer(kDrawFramebuffer, GL_COLOR_ATTACHMENT0, GL_RENDERBUFFER, colour_);
+        const GLboolean scissor = glIsEnabled(GL_SCISSOR_TEST);
+        glDisable(GL_SCISSOR_TEST);
+        FindBlit()(0, 0, width, height, 0, 0, width, height, GL_COLOR_BUFFER_BIT, GL_NEAREST);
+        if (scissor) glEnable(GL_SCISSOR_TEST);
+        glBindFramebuffer(kReadFramebuffer, framebuffer_);
+    }
+    ~Resolved() {
+        glBindFramebuffer(GL_FRAMEBUFFER, 0);
+        glBindRenderbuffer(GL_RENDERBUFFER, static_cast<GLuint>(bound_));
+        glDeleteFramebuffers(1, &framebuffer_);
+        glDeleteRenderbuffers(1, &colour_);
+    }
+    Resolved(const Resolved&) = delete;
+    Resolved& operator=(const Resolved&) = delete;
+
+  private:
+    GLuint colour_ = 0, framebuffer_ = 0;
+    GLint bound_ = 0;
+};
+
 }  // namespace
 
 std::unique_ptr<HeadlessContext> HeadlessContext::Create(int width, int height, std::string* error,
-                                                         HeadlessGL gl) {
+                                                         HeadlessGL gl, int samples) {
     std::string ignored;
     if (!error) error = &ignored;
     if (width < 1 || height < 1) {
         *error = "a headless context needs a width and a height of at least 1";
         return nullptr;
     }
-    std::unique_ptr<HeadlessContext> context(new HeadlessContext(width, height));
+    std::unique_ptr<HeadlessContext> context(new HeadlessContext(width, height, samples));
     if (gl == HeadlessGL::kContext && !context->Open(error)) return nullptr;
-    return context;
+    if (gl == HeadlessGL::kNone || context->samples_ == 1 || FindBlit()) return context;
+    context.reset();
+    return Create(width, height, error, gl, 1);
 }
 
 bool HeadlessContext::Open(std::string* error) {
@@ -94,7 +142,8 @@ bool HeadlessContext::Open(std::string* error) {
     }
     display_ = display;
 
-    const EGLConfig config = ChooseConfig(display);
+    EGLConfig config = ChooseConfig(display, samples_);
+    if (!config && samples_ > 1) config = ChooseConfig(display, samples_ = 1);
     if (!config) {
         *error = "EGL offers no RGBA8888 pbuffer with 24-bit depth and 8-bit stencil for OpenGL ES 2.0";
         return false;
@@ -138,7 +187,10 @@ std::vector<uint8_t> HeadlessContext::ReadPixels() const {
     std::vector<uint8_t> topDown(rowBytes * static_cast<size_t>(height_));
     if (!context_) return topDown;
 
-    GLint alignment = 4;
+    GLint alignment = 4, framebuffer = 0;
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer);
+    std::unique_ptr<Resolved> resolved;
+    if (samples_ > 1 && framebuffer == 0) resolved = std::make_unique<Resolved>(width_, height_);
     glGetIntegerv(GL_PACK_ALIGNMENT, &alignment);
     std::vector<uint8_t> bottomUp(topDown.size());
     glPixelStorei(GL_PACK_ALIGNMENT, 4);

@@ -6,6 +6,7 @@
 #include <Qex.h>
 #include <algorithm>
 #include <assimp/Importer.hpp>
+#include <CLI/CLI.hpp>
 #include <cmath>
 #include <exception>
 #include <filesystem>
@@ -13,9 +14,13 @@
 #include "ConvertAnimation.h"
 #include "ConvertGltf.h"
 #include "ConvertLog.h"
+#include "ConvertPlacement.h"
+#include "ConvertProcess.h"
 #include "ConvertScene.h"
 #include "ConvertTextures.h"
+#include "OutputFile.h"
 #include "PodWriter.h"
+#include "TextureOverrides.h"
 
 namespace fs = std::filesystem;
 
@@ -27,17 +32,18 @@ constexpr double kMaxFps = 1000;
 struct FileType {
     const char* extension;
     bool textureReplacesColour;
+    bool linearColours;
     CameraQuirks cameras;
 };
 
 constexpr FileType kFileTypes[] = {
-    {".dae", true, {}},
-    {".zae", true, {}},
-    {".fbx", true, {}},
-    {".3ds", true, {false, false, true}},
-    {".ase", true, {false, true, false}},
-    {".gltf", false, {true, false, false}},
-    {".glb", false, {true, false, false}},
+    {".dae", true, false, {}},
+    {".zae", true, false, {}},
+    {".fbx", true, false, {}},
+    {".3ds", true, false, {false, false, true}},
+    {".ase", true, false, {false, true, false}},
+    {".gltf", false, true, {true, false, false}},
+    {".glb", false, true, {true, false, false}},
 };
 
 SceneSettings SettingsFor(const ConvertOptions& options) {
@@ -50,7 +56,7 @@ SceneSettings SettingsFor(const ConvertOptions& options) {
     }
     for (const FileType& type : kFileTypes) {
         if (extension != type.extension) continue;
-        settings.textureReplacesColour = type.textureReplacesColour;
+        settings.materials = {type.textureReplacesColour, type.linearColours, {}};
         settings.cameras = type.cameras;
     }
     return settings;
@@ -67,8 +73,9 @@ std::string OutputDirectory(const ConvertOptions& options) {
 }
 
 // kDone, or the status to end with after a message.
-int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
+int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placement* placement) {
     std::error_code ec;
+    std::string error;
     if (!ParseTextureFormat(options.textureFormat, format)) {
         return BadArgument(options.textureFormat, "no texture format; etc1, rgba8888 or rgb888 is expected");
     }
@@ -78,6 +85,13 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
         return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
     }
+    if (options.input == "-" || options.output == "-") {
+        return BadArgument("-", "no file; a scene and its textures lie side by side in a folder");
+    }
+    if (!ParsePlacement(options.up, options.scale, placement, &error)) {
+        std::fprintf(stderr, "qex convert: %s\n", error.c_str());
+        return kBadArgument;
+    }
     if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
         return BadArgument(options.output.empty() ? "--output" : options.output,
@@ -86,10 +100,10 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format) {
     if (!fs::is_directory(OutputDirectory(options), ec)) {
         return BadArgument(options.output, "cannot be written; its folder does not exist");
     }
-    if (fs::equivalent(options.input, options.output, ec)) {
-        return BadArgument(options.output, "is the input; another name is expected");
-    }
-    return kDone;
+    std::vector<std::string> inputs = {options.input};
+    for (const auto& [material, file] : SplitOverrides(options.textures)) inputs.push_back(file);
+    const std::string problem = WhyNotOutput(options.output, inputs);
+    return problem.empty() ? kDone : BadArgument(options.output, problem);
 }
 
 const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
@@ -99,12 +113,19 @@ const aiScene* Import(const std::string& path, Assimp::Importer* importer) {
                                                         aiProcess_CalcTangentSpace | aiProcess_SortByPType |
                                                         aiProcess_FindDegenerates | aiProcess_GenUVCoords |
                                                         aiProcess_TransformUVCoords);
-    // Its joining of vertices does not look at the bones that they follow.
+    // Its joining of vertices does not look at their colours and the bones that they follow.
     if (!scene || std::any_of(scene->mMeshes, scene->mMeshes + scene->mNumMeshes,
-                              [](const aiMesh* mesh) { return mesh->HasBones(); })) {
+                              [](const aiMesh* mesh) { return mesh->HasBones() || mesh->mColors[0]; })) {
         return scene;
     }
     return importer->ApplyPostProcessing(aiProcess_JoinIdenticalVertices | aiProcess_ImproveCacheLocality);
+}
+
+std::vector<std::string> MaterialNames(const aiScene& scene) {
+    std::vector<std::string> names;
+    for (unsigned i = 0; i < scene.mNumMaterials; ++i)
+        names.push_back(scene.mMaterials[i]->GetName().C_Str());
+    return names;
 }
 
 void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const TextureSet& textures,
@@ -123,11 +144,11 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 scene.lights.size(), scene.frameCount, scene.fps.value_or(0));
     if (batches) std::printf("bone batches %d, ", batches);
     if (batches && scene.frameCount) std::printf("bind pose at frame 0, animation from frame 1, ");
-    std::printf("textures %zu in %d %s files beside it, warnings %d\n", textures.Names().size(),
-                textures.FilesWritten(), options.textureFormat.c_str(), log.Warnings());
+    std::printf("textures %zu in %d files beside it, warnings %d\n", textures.Names().size(),
+                textures.FilesWritten(), log.Warnings());
 }
 
-int ConvertFile(const ConvertOptions& options, TextureFormat format) {
+int ConvertFile(const ConvertOptions& options, TextureFormat format, const Placement& placement) {
     ConvertLog log(options.input);
     std::error_code ec;
     if (!fs::is_regular_file(options.input, ec)) {
@@ -144,6 +165,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
     if (!source || !source->mRootNode) {
         std::string reason = importer.GetErrorString();
         reason.resize(std::min(reason.size(), reason.find('\n')));
+        if (reason.find("bad_alloc") != std::string::npos) throw std::bad_alloc();
         log.Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason +
                   ")");
         return kBadInput;
@@ -151,6 +173,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
 
     if (options.listClips) {
         ListClips(*source);
+        if (!source->mNumAnimations) log.Error("has no animations");
         return kDone;
     }
     SceneSettings settings = SettingsFor(options);
@@ -159,6 +182,9 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         if (clip < 0) return BadArgument("--clip", error);
         settings.clip = clip;
     }
+    settings.materials.overrides = SplitOverrides(options.textures);
+    error = UnknownMaterial(settings.materials.overrides, MaterialNames(*source));
+    if (!error.empty()) return BadArgument("--texture", error);
     TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
     pod::Scene scene;
     const ExitStatus status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
@@ -166,24 +192,53 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format) {
         log.Error(error);
         return status;
     }
-    if (!textures.WriteError().empty()) return BadArgument(textures.WriteError(), "cannot be written");
-    if (!pod::WriteFile(options.output, pod::WritePod(scene))) {
-        return BadArgument(options.output, "cannot be written");
+    if (!textures.WriteError().empty()) {
+        std::fprintf(stderr, "qex convert: %s\n", textures.WriteError().c_str());
+        return kBadArgument;
     }
+    if (!PlaceScene(placement, &scene)) log.Warn("has no size that could be made to fit");
+    if (!WriteOutput(options.output, pod::WritePod(scene), &error)) return BadArgument(options.output, error);
     if (!options.quiet) PrintSummary(options, scene, textures, log);
     return kDone;
 }
 
 }  // namespace
 
+void SetUpConvert(CLI::App* app, ConvertOptions* options) {
+    app->add_option("IN", options->input, "scene: glTF, FBX, Collada, OBJ, 3DS, X, ...")->required();
+    app->add_option("-o,--output", options->output,
+                    "POD scene, needed unless clips are listed; its textures are written beside it");
+    app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
+        ->check(CLI::Range(1.0, 1000.0));
+    app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
+    app->add_flag("--list-clips", options->listClips,
+                  "print index, name, seconds and channels of the animations; convert nothing");
+    app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")
+        ->check(CLI::Range(1, 16));
+    app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
+        ->transform(CLI::IsMember({"etc1", "rgba8888", "rgb888"}, CLI::ignore_case));
+    AddTextureOption(app, &options->textures);
+    app->add_option("--up", options->up, "the file's vertical axis: x, y, z, -x, -y or -z (y)");
+    app->add_option("--scale", options->scale,
+                    "a factor, or fit:SIZE for the length of the longest edge (1)");
+    app->add_option("--memory", options->memory, "megabytes of memory that it may take (4096)")
+        ->check(CLI::Range(64, 1 << 24));
+    app->add_flag("-q,--quiet", options->quiet, "no summary");
+}
+
 int RunConvert(const ConvertOptions& options) {
     TextureFormat format;
-    const int argumentStatus = CheckArguments(options, &format);
+    Placement placement;
+    const int argumentStatus = CheckArguments(options, &format, &placement);
     if (argumentStatus != kDone) return argumentStatus;
-    try {
-        return ConvertFile(options, format);
-    } catch (const std::exception& failure) {  // out of memory, or a folder that vanishes while it is read
-        ConvertLog(options.input).Error(std::string("cannot be converted (") + failure.what() + ")");
+    return RunInProcess(options.input, options.memory, [&]() -> int {
+        try {
+            return ConvertFile(options, format, placement);
+        } catch (const std::bad_alloc&) {
+            ConvertLog(options.input).Error(NeedsMoreMemory(options.memory));
+        } catch (const std::exception& failure) {  // such as a folder that vanishes while it is read
+            ConvertLog(options.input).Error(std::string("cannot be converted (") + failure.what() + ")");
+        }
         return kBadInput;
-    }
+    });
 }

@@ -2,6 +2,11 @@
 #pragma once
 
 #include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
 
 struct ConvertOptions {
     std::string input;
@@ -10,9 +15,16 @@ struct ConvertOptions {
     double fps = 30;                     // whole frames per second of the sampled animation
     int maxBones = 16;                   // in a bone batch of a skinned mesh, 1 to 16
     std::string clip;                    // name or index of the animation; the first when empty
+    std::vector<std::string> textures;   // MATERIAL=FILE, see TextureOverrides.h
+    std::string up = "y";                // the source's vertical axis: x, y, z, -x, -y or -z
+    std::string scale = "1";             // a number above 0, or fit:SIZE for the scene's longest edge
+    int memory = 4096;                   // megabytes that the conversion may take
     bool listClips = false;              // print the animations and convert nothing
     bool quiet = false;                  // no summary; warnings and errors still show
 };
+
+// Gives the verb its options.
+void SetUpConvert(CLI::App* app, ConvertOptions* options);
 
 // Returns the exit status: 0, 1 when the input cannot be read or holds nothing to draw, 2 for a bad
 // argument or an output that cannot be written. Errors are one line on standard error.

@@ -24,3 +24,7 @@ class ConvertLog {
     std::string file_;
     int warnings_ = 0;
 };
+
+inline std::string NeedsMoreMemory(int megabytes) {
+    return "needs more than " + std::to_string(megabytes) + " MB of memory; --memory allows more";
+}

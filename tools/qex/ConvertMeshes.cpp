@@ -30,6 +30,20 @@ std::array<uint8_t, 4> ToBytes(const aiColor4D& c) {
     return out;
 }
 
+template <class T>
+void CopyVertex(const std::vector<T>& from, uint32_t vertex, std::vector<T>* to) {
+    if (!from.empty()) to->push_back(from[vertex]);
+}
+
+void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* to) {
+    CopyVertex(from.positions, vertex, &to->positions);
+    CopyVertex(from.normals, vertex, &to->normals);
+    CopyVertex(from.tangents, vertex, &to->tangents);
+    CopyVertex(from.binormals, vertex, &to->binormals);
+    CopyVertex(from.uvs, vertex, &to->uvs);
+    CopyVertex(from.colours, vertex, &to->colours);
+}
+
 pod::MeshArrays CopyMesh(const aiMesh& mesh, const MeshContent& content) {
     const unsigned count = mesh.mNumVertices;
     pod::MeshArrays out;
@@ -46,27 +60,25 @@ pod::MeshArrays CopyMesh(const aiMesh& mesh, const MeshContent& content) {
     if (mesh.mColors[0]) {
         for (unsigned i = 0; i < count; ++i) out.colours.push_back(ToBytes(mesh.mColors[0][i]));
     }
-    for (unsigned f = 0; f < mesh.mNumFaces; ++f) {
-        const aiFace& face = mesh.mFaces[f];
-        if (face.mNumIndices != 3) continue;
-        const bool inRange = face.mIndices[0] < count && face.mIndices[1] < count && face.mIndices[2] < count;
-        if (inRange) out.indices.insert(out.indices.end(), face.mIndices, face.mIndices + 3);
-    }
+    out.indices = TrianglesOf(mesh);
     return out;
 }
 
-template <class T>
-void CopyVertex(const std::vector<T>& from, uint32_t vertex, std::vector<T>* to) {
-    if (!from.empty()) to->push_back(from[vertex]);
-}
-
-void CopyVertex(const pod::MeshArrays& from, uint32_t vertex, pod::MeshArrays* to) {
-    CopyVertex(from.positions, vertex, &to->positions);
-    CopyVertex(from.normals, vertex, &to->normals);
-    CopyVertex(from.tangents, vertex, &to->tangents);
-    CopyVertex(from.binormals, vertex, &to->binormals);
-    CopyVertex(from.uvs, vertex, &to->uvs);
-    CopyVertex(from.colours, vertex, &to->colours);
+// Gives each corner of a triangle a vertex, and UVs, of its own, which take the place of the colours.
+void SplitCorners(const std::vector<std::array<float, 2>>& uvs, pod::MeshArrays* mesh,
+                  std::vector<VertexBones>* bones) {
+    pod::MeshArrays corners;
+    std::vector<VertexBones> cornerBones;
+    mesh->uvs.clear();
+    mesh->colours.clear();
+    for (const uint32_t vertex : mesh->indices) {
+        corners.indices.push_back(static_cast<uint32_t>(corners.indices.size()));
+        CopyVertex(*mesh, vertex, &corners);
+        CopyVertex(*bones, vertex, &cornerBones);
+    }
+    corners.uvs = uvs;
+    *mesh = std::move(corners);
+    *bones = std::move(cornerBones);
 }
 
 template <class T>
@@ -125,6 +137,18 @@ void CopyBatches(const SkinPiece& piece, pod::Mesh* mesh) {
 
 }  // namespace
 
+std::vector<uint32_t> TrianglesOf(const aiMesh& mesh) {
+    const unsigned count = mesh.mNumVertices;
+    std::vector<uint32_t> indices;
+    for (unsigned f = 0; f < mesh.mNumFaces; ++f) {
+        const aiFace& face = mesh.mFaces[f];
+        if (face.mNumIndices != 3) continue;
+        const bool inRange = face.mIndices[0] < count && face.mIndices[1] < count && face.mIndices[2] < count;
+        if (inRange) indices.insert(indices.end(), face.mIndices, face.mIndices + 3);
+    }
+    return indices;
+}
+
 std::vector<pod::MeshArrays> SplitMesh(pod::MeshArrays mesh, uint32_t maxVertices) {
     std::vector<pod::MeshArrays> pieces;
     if (mesh.positions.size() <= maxVertices) {
@@ -157,6 +181,7 @@ std::vector<pod::Mesh> ConvertMesh(const aiMesh& mesh, const MeshContent& conten
     std::vector<VertexBones> noBones;
     pod::MeshArrays arrays = CopyMesh(mesh, content);
     if (arrays.indices.empty()) return out;
+    if (!content.cornerUvs.empty()) SplitCorners(content.cornerUvs, &arrays, &noBones);
     JoinVertices(&arrays, &noBones);
     for (const pod::MeshArrays& piece : SplitMesh(std::move(arrays), kMaxMeshVertices)) {
         out.push_back(pod::BuildMesh(piece));
@@ -168,6 +193,7 @@ std::vector<pod::Mesh> ConvertSkinnedMesh(const aiMesh& mesh, const MeshContent&
                                           std::vector<VertexBones> bones, int maxBones, std::string* error) {
     std::vector<pod::Mesh> out;
     pod::MeshArrays whole = CopyMesh(mesh, content);
+    if (!content.cornerUvs.empty()) SplitCorners(content.cornerUvs, &whole, &bones);
     JoinVertices(&whole, &bones);
     const int needed = MostBonesOfATriangle(bones, whole.indices);
     if (needed > maxBones) {

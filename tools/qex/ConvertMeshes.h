@@ -10,12 +10,16 @@
 struct aiMesh;
 
 struct MeshContent {
-    bool tangents = false;   // also tangents and binormals, for a normal map
-    unsigned uvChannel = 0;  // the channel that the diffuse texture uses
+    bool tangents = false;                        // also tangents and binormals, for a normal map
+    unsigned uvChannel = 0;                       // the channel that the diffuse texture uses
+    std::vector<std::array<float, 2>> cornerUvs;  // of the triangles, in place of the mesh's UVs and colours
 };
 
 // The most vertices that a mesh of 16-bit indices takes.
 constexpr uint32_t kMaxMeshVertices = 65535;
+
+// The corners of all triangles, three each, that a mesh has vertices for.
+std::vector<uint32_t> TrianglesOf(const aiMesh& mesh);
 
 // Cuts a mesh, in the order of its triangles, into pieces of at most `maxVertices` vertices. Vertices on a
 // cut are repeated; a mesh that fits comes back whole and unchanged.

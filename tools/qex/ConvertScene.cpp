@@ -5,6 +5,7 @@
 #include <map>
 
 #include "ConvertAnimation.h"
+#include "ConvertColours.h"
 #include "ConvertMaterials.h"
 #include "ConvertMeshes.h"
 
@@ -25,6 +26,9 @@ void WarnAboutWhatIsLost(const aiScene& source, const SceneSettings& settings, C
         if (!IsTriangles(mesh)) loose += mesh.mNumFaces;
         morphed += mesh.mNumAnimMeshes > 0;
     }
+    // The importer's own, for files of motion or cameras alone.
+    if (source.mNumMaterials == 1 && source.mMaterials[0]->GetName() == aiString("SkeletonMaterial"))
+        log->Warn("the file has no meshes; pointed bodies show where its nodes are");
     if (loose) log->Warn(Plural(loose, "point, line or degenerate triangle") + " dropped");
     if (morphed) log->Warn(Plural(morphed, "mesh part") + " with morph targets converted without them");
     if (source.mNumAnimations > 1 && !settings.clip) {
@@ -37,51 +41,77 @@ void WarnAboutWhatIsLost(const aiScene& source, const SceneSettings& settings, C
 // Materials that meshes use, converted at first use; the importer adds others that nothing needs.
 class MaterialSet {
   public:
-    MaterialSet(const aiScene& source, const SceneSettings& settings, TextureSet* textures, ConvertLog* log,
-                std::vector<pod::Material>* out)
+    MaterialSet(const aiScene& source, const MaterialSettings& settings, TextureSet* textures,
+                ConvertLog* log, std::vector<pod::Material>* out)
         : source_(source), settings_(settings), textures_(textures), log_(log), out_(out) {}
 
-    int Add(unsigned index, MeshContent* content) {
-        if (index >= source_.mNumMaterials) return -1;
-        const auto [entry, isNew] = known_.emplace(index, Known{});
+    const MaterialResult& Convert(unsigned index) {
+        static const MaterialResult none;
+        if (index >= source_.mNumMaterials) return none;
+        const auto [entry, isNew] = converted_.emplace(index, MaterialResult{});
+        if (isNew) entry->second = ConvertMaterial(*source_.mMaterials[index], settings_, textures_, log_);
+        return entry->second;
+    }
+
+    // Its number in the scene. With a texture of vertex colours (not -1) it is another one.
+    int Place(unsigned index, int colourTexture) {
+        if (index >= source_.mNumMaterials && colourTexture < 0) return -1;
+        const auto [entry, isNew] =
+            placed_.emplace(std::make_pair(index, colourTexture), static_cast<int>(out_->size()));
         if (isNew) {
-            const MaterialResult result =
-                ConvertMaterial(*source_.mMaterials[index], settings_.textureReplacesColour, textures_, log_);
-            entry->second.index = static_cast<int>(out_->size());
-            entry->second.content.uvChannel = result.uvChannel;
-            entry->second.content.tangents = result.material.bumpTexture >= 0;
-            out_->push_back(result.material);
+            out_->push_back(Convert(index).material);
+            if (colourTexture >= 0) UseColourTexture(colourTexture, *textures_, &out_->back());
         }
-        *content = entry->second.content;
-        return entry->second.index;
+        return entry->second;
     }
 
   private:
-    struct Known {
-        int index = -1;
-        MeshContent content;
-    };
     const aiScene& source_;
-    const SceneSettings& settings_;
+    const MaterialSettings& settings_;
     TextureSet* textures_;
     ConvertLog* log_;
     std::vector<pod::Material>* out_;
-    std::map<unsigned, Known> known_;
+    std::map<unsigned, MaterialResult> converted_;
+    std::map<std::pair<unsigned, int>, int> placed_;
 };
+
+// Collects the colours of vertices whose materials leave room for them. In linear files they multiply the
+// material's colour, in others they stand in its place.
+void CollectColours(const aiScene& source, bool linear, MaterialSet* materials, ConvertLog* log,
+                    ColourAtlas* atlas) {
+    unsigned lost = 0;
+    for (unsigned i = 0; i < source.mNumMeshes; ++i) {
+        const aiMesh& mesh = *source.mMeshes[i];
+        if (!IsTriangles(mesh)) continue;
+        const MaterialResult& material = materials->Convert(mesh.mMaterialIndex);
+        if (!HasColours(mesh, linear)) continue;
+        ColourRules rules{linear, material.alphaCounts, {1, 1, 1}};
+        if (linear) rules.tint = material.material.diffuse;
+        lost += material.textured;
+        if (!material.textured) atlas->Add(i, mesh, rules);
+    }
+    if (lost) log->Warn("vertex colours of " + Plural(lost, "mesh part") + " with textures are not drawn");
+    if (atlas->Fits()) return;
+    log->Warn("there are too many vertex colours for a texture; they are not drawn");
+    *atlas = {};
+}
 
 // A mesh whose bones do not fit leaves the reason in `error`.
 std::vector<std::vector<MeshPart>> ConvertMeshes(const aiScene& source, const SkinSet& skins, int maxBones,
+                                                 const ColourAtlas& atlas, int colourTexture,
                                                  MaterialSet* materials, std::vector<pod::Mesh>* out,
                                                  std::string* error) {
     std::vector<std::vector<MeshPart>> parts(source.mNumMeshes);
     for (unsigned i = 0; i < source.mNumMeshes; ++i) {
-        if (!IsTriangles(*source.mMeshes[i])) continue;
-        MeshContent content;
-        const int material = materials->Add(source.mMeshes[i]->mMaterialIndex, &content);
+        const aiMesh& from = *source.mMeshes[i];
+        if (!IsTriangles(from)) continue;
+        const MaterialResult& result = materials->Convert(from.mMaterialIndex);
+        MeshContent content{result.material.bumpTexture >= 0, result.uvChannel, {}};
+        if (atlas.Has(i)) content.cornerUvs = atlas.Uvs(i);
+        const int material = materials->Place(from.mMaterialIndex, atlas.Has(i) ? colourTexture : -1);
         const MeshSkin* skin = skins.Of(i).vertices.empty() ? nullptr : &skins.Of(i);
-        for (pod::Mesh& mesh :
-             skin ? ConvertSkinnedMesh(*source.mMeshes[i], content, skin->vertices, maxBones, error)
-                  : ConvertMesh(*source.mMeshes[i], content)) {
+        for (pod::Mesh& mesh : skin ? ConvertSkinnedMesh(from, content, skin->vertices, maxBones, error)
+                                    : ConvertMesh(from, content)) {
             parts[i].push_back({static_cast<int>(out->size()), material, skin});
             out->push_back(std::move(mesh));
         }
@@ -110,8 +140,12 @@ FrameTimes PlanSceneFrames(const aiScene& source, const SceneSettings& settings,
 ExitStatus ConvertScene(const aiScene& source, const SceneSettings& settings, TextureSet* textures,
                         ConvertLog* log, pod::Scene* out, std::string* error) {
     const SkinSet skins(source, log);
-    MaterialSet materials(source, settings, textures, log, &out->materials);
-    const auto parts = ConvertMeshes(source, skins, settings.maxBones, &materials, &out->meshes, error);
+    MaterialSet materials(source, settings.materials, textures, log, &out->materials);
+    ColourAtlas atlas;
+    CollectColours(source, settings.materials.linearColours, &materials, log, &atlas);
+    const int colourTexture = atlas.Empty() ? -1 : textures->AddPlain("colours", atlas.Draw());
+    const auto parts = ConvertMeshes(source, skins, settings.maxBones, atlas, colourTexture, &materials,
+                                     &out->meshes, error);
     if (!error->empty()) return kBadArgument;
     if (out->meshes.empty()) {
         *error = "holds no triangles; a scene with at least one mesh is expected";

@@ -3,6 +3,7 @@
 
 #include <optional>
 
+#include "ConvertMaterials.h"
 #include "ConvertNodes.h"
 #include "ConvertTextures.h"
 #include "PodWriter.h"
@@ -11,9 +12,9 @@ struct aiScene;
 
 struct SceneSettings {
     double fps = 30;
-    int maxBones = 16;                   // in a batch
-    std::optional<int> clip;             // index of the animation; the first unless given
-    bool textureReplacesColour = false;  // see ConvertMaterial
+    int maxBones = 16;        // in a batch
+    std::optional<int> clip;  // index of the animation; the first unless given
+    MaterialSettings materials;
     CameraQuirks cameras;
 };
 

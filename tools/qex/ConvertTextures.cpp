@@ -2,10 +2,13 @@
 
 #include <assimp/scene.h>
 #include <algorithm>
+#include <cstring>
 #include <filesystem>
 #include <iterator>
 
+#include "OutputFile.h"
 #include "PodWriter.h"
+#include "TextureFiles.h"
 #include "TextureWrite.h"
 
 namespace fs = std::filesystem;
@@ -14,39 +17,12 @@ namespace {
 
 constexpr int kMaxSide = 4096;
 constexpr size_t kMaxStem = 64;
-
-std::string Lower(std::string text) {
-    for (char& c : text) {
-        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-    }
-    return text;
-}
-
-// The entry of `directory` called `name`, whatever its case; an exact match goes first.
-fs::path FindEntry(const fs::path& directory, const std::string& name) {
-    std::error_code ec;
-    if (fs::exists(directory / name, ec)) return directory / name;
-    const std::string wanted = Lower(name);
-    for (const auto& entry : fs::directory_iterator(directory, ec)) {
-        if (Lower(entry.path().filename().string()) == wanted) return entry.path();
-    }
-    return {};
-}
-
-fs::path FindBelow(fs::path directory, const fs::path& relative) {
-    for (const fs::path& part : relative) {
-        if (part.empty() || part == ".") continue;
-        directory = part == ".." ? directory / ".." : FindEntry(directory, part.string());
-        if (directory.empty()) return {};
-    }
-    std::error_code ec;
-    return fs::is_regular_file(directory, ec) ? directory : fs::path();
-}
+constexpr char kFileUrl[] = "file://";
 
 // Scenes name their pictures with either slash, and now and then as URLs.
 std::string CleanPath(std::string path) {
-    std::replace(path.begin(), path.end(), '\\', '/');
-    if (path.rfind("file://", 0) == 0) path.erase(0, 7);
+    path = SlashedPath(path);
+    if (path.rfind(kFileUrl, 0) == 0) path.erase(0, strlen(kFileUrl));
     return path;
 }
 
@@ -89,14 +65,14 @@ int PowerOfTwoSide(int side) {
     return upperIsCloser ? lower * 2 : lower;
 }
 
-std::vector<uint8_t> EncodePvr(const Image& image, TextureFormat format) {
+std::vector<uint8_t> EncodePvr(const Image& image, TextureFormat format, bool mipmaps) {
     Image level = FlipRows(image);
     const int width = PowerOfTwoSide(image.width), height = PowerOfTwoSide(image.height);
     if (width != image.width || height != image.height) {
         level = ResizeImage(level, width, height);
         level.hasAlpha = image.hasAlpha;
     }
-    return EncodePvrFile({level}, *FindFormat(kFormatNames[static_cast<size_t>(format)]), true, true);
+    return EncodePvrFile({level}, *FindFormat(kFormatNames[static_cast<size_t>(format)]), mipmaps, true);
 }
 
 TextureSet::TextureSet(const aiScene* scene, std::string inputPath, std::string outputDirectory,
@@ -126,18 +102,26 @@ int TextureSet::Add(const std::string& path, const std::string& opacityPath, Tex
         }
         SwapRedGreen(&image);
     }
-    entry->second = WriteTexture(path, std::move(image), use);
+    entry->second = WriteTexture(path, image, use == TextureUse::kColour && image.hasAlpha, {format_, true});
     return entry->second;
 }
 
-int TextureSet::WriteTexture(const std::string& path, Image image, TextureUse use) {
+int TextureSet::AddFile(const std::string& file, TextureUse use) {
+    return Add(kFileUrl + fs::absolute(file).string(), "", use);
+}
+
+int TextureSet::AddPlain(const std::string& name, const Image& image) {
+    return WriteTexture(name, image, image.hasAlpha, {TextureFormat::kRgb888, false});
+}
+
+int TextureSet::WriteTexture(const std::string& path, const Image& image, bool withAlpha,
+                             const Coding& coding) {
     const std::string stem = UniqueStem(path);
-    const bool withAlpha = use == TextureUse::kColour && image.hasAlpha;
-    if (!Write(stem + ".pvr", image)) return -1;
+    if (!Write(stem + ".pvr", image, coding)) return -1;
     std::error_code ec;
     const std::string alphaName = stem + "_a.pvr";
     if (withAlpha) {
-        if (!Write(alphaName, AlphaAsGrey(image))) return -1;
+        if (!Write(alphaName, AlphaAsGrey(image), coding)) return -1;
     } else if (fs::exists(fs::path(outputDirectory_) / alphaName, ec)) {
         log_->Warn(alphaName + " lies in the output folder and will be taken for the alpha of " + stem +
                    ".pvr; remove it unless that is meant");
@@ -147,13 +131,14 @@ int TextureSet::WriteTexture(const std::string& path, Image image, TextureUse us
     return static_cast<int>(names_.size()) - 1;
 }
 
-bool TextureSet::Write(const std::string& name, const Image& image) {
+bool TextureSet::Write(const std::string& name, const Image& image, const Coding& coding) {
     const std::string path = (fs::path(outputDirectory_) / name).string();
-    if (pod::WriteFile(path, EncodePvr(image, format_))) {
+    std::string problem;
+    if (WriteOutput(path, EncodePvr(image, coding.format, coding.mipmaps), &problem)) {
         ++filesWritten_;
         return true;
     }
-    writeError_ = path;
+    writeError_ = path + ": " + problem;
     return false;
 }
 
@@ -175,7 +160,9 @@ bool TextureSet::Load(const std::string& path, Image* image) {
 }
 
 bool TextureSet::LoadEmbedded(const std::string& path, Image* image, std::string* error, bool* found) {
-    const aiTexture* texture = scene_->GetEmbeddedTexture(path.c_str());
+    // Looked up by the last part of the name alone, which a file of one's choice may have, too.
+    const aiTexture* texture =
+        path.rfind(kFileUrl, 0) == 0 ? nullptr : scene_->GetEmbeddedTexture(path.c_str());
     *found = texture != nullptr;
     if (!texture) return false;
     // Height 0 marks a whole picture file of mWidth bytes.
@@ -200,12 +187,12 @@ std::string TextureSet::Find(const std::string& path) const {
     std::error_code ec;
     if (clean.is_absolute() && fs::is_regular_file(clean, ec)) return clean.string();
     if (clean.is_relative()) {
-        const fs::path found = FindBelow(inputDirectory_, clean);
-        if (!found.empty()) return found.string();
+        const std::string found = FindFile(inputDirectory_, clean.string());
+        if (!found.empty()) return found;
     }
     for (const char* folder : {"", "textures", "texture", "images", "maps"}) {
-        const fs::path found = FindBelow(inputDirectory_, fs::path(folder) / clean.filename());
-        if (!found.empty()) return found.string();
+        const std::string found = FindFile(inputDirectory_, (fs::path(folder) / clean.filename()).string());
+        if (!found.empty()) return found;
     }
     return {};
 }

@@ -6,6 +6,8 @@
 
 #include <unistd.h>
 
+#include "CommandLine.h"
+
 namespace {
 
 struct Capture {
@@ -32,6 +34,9 @@ std::string ReadAndRestore() {
     char buffer[4096];
     for (size_t n; (n = fread(buffer, 1, sizeof buffer, capture.file)) > 0;) text.append(buffer, n);
     fclose(capture.file);
+    // Past the collections that this one lies in: they would show it once more.
+    const int error = g_captures.empty() ? STDERR_FILENO : g_captures.front().savedErr;
+    if (GetTalk().verbose) dprintf(error, "%s", text.c_str());
     return text;
 }
 
@@ -40,7 +45,7 @@ void ShowErrorsAtExit() {
     while (!g_captures.empty()) {
         std::istringstream lines(ReadAndRestore());
         for (std::string line; std::getline(lines, line);)
-            if (line.rfind("E/", 0) == 0) fprintf(stderr, "%s\n", line.c_str());
+            if (line.rfind("E/", 0) == 0 && !GetTalk().verbose) fprintf(stderr, "%s\n", line.c_str());
     }
 }
 

@@ -4,7 +4,7 @@
 //
 // The engine prints progress lines on standard output, and messages on standard error with "I/TAG: " or
 // "E/TAG: " in front. When the process ends meanwhile (a GL error is fatal), the error lines still reach
-// standard error.
+// standard error. With --verbose all lines go there once they are collected.
 #pragma once
 
 #include <string>

@@ -4,9 +4,13 @@
 #include <stb/stb_image_resize.h>
 #include <stb/stb_image_write.h>
 #include <algorithm>
+#include <cctype>
 #include <cstdio>
+#include <filesystem>
 #include <limits>
 #include <memory>
+
+#include "OutputFile.h"
 
 namespace {
 
@@ -19,6 +23,59 @@ bool ReadWholeFile(const std::string& path, std::vector<uint8_t>* bytes) {
         bytes->insert(bytes->end(), chunk, chunk + got);
     }
     return std::ferror(file.get()) == 0;
+}
+
+// The writers of the picture types, of 3 or 4 channels; 0 when they fail.
+using Encode = int (*)(stbi_write_func* write, void* to, int width, int height, int channels,
+                       const void* pixels);
+
+int EncodePng(stbi_write_func* write, void* to, int width, int height, int channels, const void* pixels) {
+    return stbi_write_png_to_func(write, to, width, height, channels, pixels, width * channels);
+}
+
+int EncodeJpeg(stbi_write_func* write, void* to, int width, int height, int channels, const void* pixels) {
+    constexpr int kQuality = 92;
+    return stbi_write_jpg_to_func(write, to, width, height, channels, pixels, kQuality);
+}
+
+const struct {
+    const char* extension;
+    Encode encode;
+} kWriters[] = {{".png", EncodePng},
+                {".jpg", EncodeJpeg},
+                {".jpeg", EncodeJpeg},
+                {".bmp", stbi_write_bmp_to_func},
+                {".tga", stbi_write_tga_to_func}};
+
+// Null for other extensions. Streams have none.
+Encode FindEncode(const std::string& path) {
+    std::error_code error;
+    std::string extension = std::filesystem::path(path).extension().string();
+    for (char& c : extension) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    for (const auto& writer : kWriters)
+        if (extension == writer.extension) return writer.encode;
+    const bool stream = path == "-" || std::filesystem::is_other(path, error);
+    return extension.empty() && stream ? EncodePng : nullptr;
+}
+
+void Append(void* to, void* data, int size) {
+    const uint8_t* bytes = static_cast<const uint8_t*>(data);
+    static_cast<std::vector<uint8_t>*>(to)->insert(static_cast<std::vector<uint8_t>*>(to)->end(), bytes,
+                                                   bytes + size);
+}
+
+bool Save(const std::string& path, Encode encode, int width, int height, const uint8_t* pixels,
+          std::string* error) {
+    const size_t size = static_cast<size_t>(width) * static_cast<size_t>(height) * 4;
+    std::vector<uint8_t> bytes, rgb;
+    bool opaque = true;
+    for (size_t i = 3; i < size && opaque; i += 4) opaque = pixels[i] == 255;
+    for (size_t i = 0; i < size && opaque; ++i)
+        if (i % 4 < 3) rgb.push_back(pixels[i]);
+    if (encode(Append, &bytes, width, height, opaque ? 3 : 4, opaque ? rgb.data() : pixels))
+        return WriteOutput(path, bytes, error);
+    *error = "cannot be written: no memory for the picture";
+    return false;
 }
 
 }  // namespace
@@ -61,9 +118,19 @@ void UpdateHasAlpha(Image* image) {
 }
 
 bool SavePng(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error) {
-    if (stbi_write_png(path.c_str(), width, height, 4, pixels, width * 4)) return true;
-    *error = "cannot be written";
-    return false;
+    return Save(path, EncodePng, width, height, pixels, error);
+}
+
+bool SavePicture(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error) {
+    *error = WhyNoPictureName(path);
+    return error->empty() && Save(path, FindEncode(path), width, height, pixels, error);
+}
+
+std::string WhyNoPictureName(const std::string& path) {
+    std::error_code error;
+    if (FindEncode(path)) return "";
+    if (std::filesystem::is_directory(path, error)) return "is a folder; the name of a picture is expected";
+    return "is no picture's name; one that ends in .png, .jpg, .bmp or .tga is expected";
 }
 
 Image ResizeImage(const Image& image, int width, int height) {
@@ -75,6 +142,28 @@ Image ResizeImage(const Image& image, int width, int height) {
                        4);
     UpdateHasAlpha(&out);
     return out;
+}
+
+std::vector<uint8_t> ShrinkPixels(const std::vector<uint8_t>& pixels, int width, int height, int scale) {
+    const size_t w = static_cast<size_t>(width), h = static_cast<size_t>(height),
+                 n = static_cast<size_t>(scale);
+    std::vector<uint8_t> out(w * h * 4);
+    for (size_t i = 0; i < out.size(); ++i) {
+        const size_t x = i / 4 % w * n, y = i / 4 / w * n;
+        size_t sum = n * n / 2;
+        for (size_t k = 0; k < n * n; ++k) sum += pixels[((y + k / n) * w * n + x + k % n) * 4 + i % 4];
+        out[i] = static_cast<uint8_t>(sum / (n * n));
+    }
+    return out;
+}
+
+void BlendWhite(const std::vector<uint8_t>& cover, int coverWidth, std::vector<uint8_t>* pixels, int width) {
+    const size_t w = static_cast<size_t>(width);
+    for (size_t i = 0; i < pixels->size(); ++i) {
+        const size_t x = i / 4 % w, y = i / 4 / w;
+        const int white = i % 4 == 3 ? 0 : cover[(y * static_cast<size_t>(coverWidth) + x) * 4];
+        (*pixels)[i] = static_cast<uint8_t>((*pixels)[i] + (255 - (*pixels)[i]) * white / 255);
+    }
 }
 
 Image HalveImage(const Image& image) {

@@ -1,4 +1,5 @@
-// Pictures in and out for the qex command: PNG, JPEG, TGA, BMP, PSD, GIF and PNM are read, PNG is written.
+// Pictures in and out for the qex command: PNG, JPEG, TGA, BMP, PSD, GIF and PNM are read, PNG, JPEG,
+// BMP and TGA are written.
 #pragma once
 
 #include <cstddef>
@@ -24,9 +25,19 @@ bool LoadImage(const uint8_t* data, size_t size, Image* image, std::string* erro
 // Looks at every pixel and sets `hasAlpha`.
 void UpdateHasAlpha(Image* image);
 
-// `pixels` is top-down RGBA without padding.
+// Writes a picture of the type that the extension names. `pixels` is top-down RGBA without padding. False,
+// with the reason, when it does not get there whole.
+bool SavePicture(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error);
 bool SavePng(const std::string& path, int width, int height, const uint8_t* pixels, std::string* error);
+
+// What is wrong with the name of a picture that is to be written, or nothing. Standard output and devices are
+// PNG.
+std::string WhyNoPictureName(const std::string& path);
 
 // Both keep the value range linear (no gamma) and filter each channel by itself.
 Image ResizeImage(const Image& image, int width, int height);
+// The mean of each scale x scale pixels, of RGBA that are `scale` times as wide and high.
+std::vector<uint8_t> ShrinkPixels(const std::vector<uint8_t>& pixels, int width, int height, int scale);
+// Lays white over RGBA pixels, as much of it as the red of others, the upper left part of wider ones.
+void BlendWhite(const std::vector<uint8_t>& cover, int coverWidth, std::vector<uint8_t>* pixels, int width);
 Image HalveImage(const Image& image);  // 2 x 2 box, for mipmaps; a side of 1 stays 1

@@ -3,7 +3,11 @@
 #include <cstdint>
 #include <cstdio>
 
+#include <CLI/CLI.hpp>
+
+#include "CommandLine.h"
 #include "Info.h"
+#include "OutputFile.h"
 #include "RenderDiagnosis.h"
 #include "TextureFiles.h"
 
@@ -54,16 +58,39 @@ bool DescribeContainer(const std::string& path, Json* document, std::string* err
     return false;
 }
 
+void SetUpInfo(CLI::App* app, InfoOptions* options) {
+    app->add_option("FILES", options->inputs, "files to look into, - for standard input")->required();
+    app->add_flag("-q,--quiet", GetTalk().quiet, "only what would draw wrong, a line each");
+    app->add_flag("--json", options->json,
+                  "as JSON, several files as an array, and nothing else on standard output");
+}
+
 int RunInfo(const InfoOptions& options) {
-    Json document = {{"file", CleanText(options.input)}};
-    std::string error;
-    if (!Describe(options.input, &document, &error)) {
-        fprintf(stderr, "qex info: %s: %s\n", CleanText(options.input).c_str(), CleanText(error).c_str());
-        return 1;
+    Json documents = Json::array();
+    int status = 0;
+    for (const std::string& path : options.inputs) {
+        const InputFile input(path);
+        Json document = {{"file", CleanText(input.Name())}};
+        std::string error;
+        if (Describe(input.Path(), &document, &error)) {
+            documents.push_back(document);
+            continue;
+        }
+        fprintf(stderr, "qex info: %s: %s\n", CleanText(input.Name()).c_str(), CleanText(error).c_str());
+        status = 1;
     }
-    if (options.json)
-        printf("%s\n", document.dump(2).c_str());
-    else
-        PrintInfo(document);
-    return 0;
+    if (options.json && !documents.empty())
+        printf("%s\n", (options.inputs.size() == 1 ? documents[0] : documents).dump(2).c_str());
+    if (options.json) return status;
+    for (const Json& document : documents) {
+        if (!GetTalk().quiet) {
+            PrintInfo(document);
+            if (&document != &documents.back()) printf("\n");
+            continue;
+        }
+        for (const Json& problem : document["problems"])
+            printf("%s: %s\n", document["file"].get<std::string>().c_str(),
+                   problem.get<std::string>().c_str());
+    }
+    return status;
 }

@@ -2,11 +2,19 @@
 #pragma once
 
 #include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
 
 struct InfoOptions {
-    std::string input;
+    std::vector<std::string> inputs;
     bool json = false;
 };
 
-// Returns the exit status: 0, or 1 for a file that cannot be read as any of the formats.
+// Gives the verb its options.
+void SetUpInfo(CLI::App* app, InfoOptions* options);
+
+// Returns the exit status: 0, or 1 when a file cannot be read as any of the formats; the others are shown.
 int RunInfo(const InfoOptions& options);

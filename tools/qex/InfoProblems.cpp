@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <map>
 
 #include "Info.h"
 #include "SceneBounds.h"
@@ -43,10 +44,13 @@ uint32_t CountNonFinitePositions(const QexPODMesh& mesh) {
 
 void CheckTextures(Finder* finder) {
     const QexPODModel& scene = *finder->scene;
-    std::vector<bool> diffuse(scene.textureCount);
-    for (uint32_t i = 0; i < scene.materialCount; ++i)
-        if (scene.materials[i].diffuseTexture >= 0)
-            diffuse[static_cast<size_t>(scene.materials[i].diffuseTexture)] = true;
+    std::vector<bool> diffuse(scene.textureCount), used(scene.textureCount);
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const QexPODMaterial& m = scene.materials[i];
+        if (m.diffuseTexture >= 0) diffuse[static_cast<size_t>(m.diffuseTexture)] = true;
+        for (const int32_t* index = &m.diffuseTexture; index <= &m.refractionTexture; ++index)
+            if (*index >= 0) used[static_cast<size_t>(*index)] = true;
+    }
     for (uint32_t i = 0; i < scene.textureCount; ++i) {
         const Json& texture = finder->textures[i];
         const std::string label = Label("texture", i, scene.textures[i].name);
@@ -55,6 +59,14 @@ void CheckTextures(Finder* finder) {
         else if (!texture["found"].get<bool>())
             finder->Add(label + " is missing: no .pvr, .ktx or picture of that name beside the scene" +
                         (diffuse[i] ? "" : " (no material draws its colour)"));
+        else if (texture.contains("picture") && !texture["picture"]["loads"].get<bool>())
+            finder->Add(label + ", file " + texture["file"].get<std::string>() + ": " +
+                        texture["picture"]["problem"].get<std::string>());
+        else if (texture.contains("picture"))
+            finder->Add(label +
+                        " is there as a picture only: qex render decodes it, the engine alone does not; " +
+                        "qex texture makes a PVR of it");
+        if (!used[i]) finder->Add(label + " belongs to no material: it is not drawn");
         if (!texture.contains("content")) continue;
         for (const Json& problem : texture["content"]["problems"])
             finder->Add(label + ", file " + texture["file"].get<std::string>() + ": " +
@@ -90,6 +102,12 @@ void CheckDrawnMesh(Finder* finder, const QexPODMesh& mesh, const std::string& l
 void CheckMaterials(Finder* finder, const std::vector<bool>& used) {
     for (uint32_t i = 0; i < finder->scene->materialCount; ++i) {
         const QexPODMaterial& material = finder->scene->materials[i];
+        const char* effect = material.effectFile && *material.effectFile ? material.effectFile
+                             : material.effectName                       ? material.effectName
+                                                                         : "";
+        if (*effect)
+            finder->Add(Label("material", i, material.name) + " has an effect of its own, " +
+                        CleanText(effect) + ": it is not read, a shader module of the engine draws instead");
         if (used[i] && !(material.opacity > kThreshold))
             finder->Add(Label("material", i, material.name) + " has an opacity of " +
                         Number(material.opacity) + ": what is not above 0.5 becomes 0 and is not drawn");
@@ -132,6 +150,11 @@ void CheckScales(Finder* finder) {
     }
 }
 
+bool IsOneTexel(const Json& texture) {
+    return texture.contains("content") && texture["content"].value("width", 0u) == 1 &&
+           texture["content"].value("height", 0u) == 1;
+}
+
 void CheckMeshNodes(Finder* finder) {
     const QexPODModel& scene = *finder->scene;
     std::vector<bool> meshes(scene.meshCount), materials(scene.materialCount);
@@ -147,7 +170,8 @@ void CheckMeshNodes(Finder* finder) {
         }
         materials[static_cast<size_t>(node.materialIndex)] = true;
         const bool uvs = mesh.uvwChannelCount && mesh.uvws[0].componentCount;
-        if (scene.materials[node.materialIndex].diffuseTexture >= 0 && !uvs)
+        const int32_t texture = scene.materials[node.materialIndex].diffuseTexture;
+        if (texture >= 0 && !uvs && !IsOneTexel(finder->textures[static_cast<size_t>(texture)]))
             finder->Add(label + ": its material has a texture, but mesh " + std::to_string(node.objectIndex) +
                         " has no UVs: it gets one colour");
     }
@@ -186,6 +210,24 @@ void CheckLightsAndCameras(Finder* finder) {
     }
 }
 
+// What the engine has put right at loading; of lines that differ in numbers only the first, with their count.
+void AddRepairs(Finder* finder, const std::vector<std::string>& lines) {
+    std::map<std::string, size_t> seen;
+    std::vector<const std::string*> firsts;
+    const auto kind = [](std::string line) {
+        line.erase(std::remove_if(line.begin(), line.end(),
+                                  [](char c) { return (c >= '0' && c <= '9') || c == '-'; }),
+                   line.end());
+        return line;
+    };
+    for (const std::string& line : lines)
+        if (++seen[kind(line)] == 1) firsts.push_back(&line);
+    for (const std::string* line : firsts) {
+        const size_t more = seen[kind(*line)] - 1;
+        finder->Add(*line + (more ? " (and " + std::to_string(more) + " more like this)" : ""));
+    }
+}
+
 }  // namespace
 
 std::vector<std::string> FindSceneProblems(QexPODModel* scene, const Json& textures,
@@ -195,7 +237,6 @@ std::vector<std::string> FindSceneProblems(QexPODModel* scene, const Json& textu
     CheckMeshNodes(&finder);
     CheckScales(&finder);
     CheckLightsAndCameras(&finder);
-    for (const char* part : {"stands still", "it keeps one"})
-        for (const std::string& line : engine.Messages(part)) finder.Add(line);
+    AddRepairs(&finder, engine.Messages("<QexPODModel_ReadFromSourceStream>"));
     return finder.lines;
 }

@@ -6,7 +6,9 @@
 #include <memory>
 #include <set>
 
+#include "ImageFile.h"
 #include "Info.h"
+#include "InfoExporter.h"
 #include "SceneBounds.h"
 #include "TextureFiles.h"
 
@@ -17,7 +19,6 @@ constexpr size_t kBoundsPoints = 4u << 20;
 constexpr size_t kAnimationPoints = 1u << 20;
 constexpr uint32_t kMostFrames = 200;  // looked at for the bounds of an animation
 constexpr double kDegrees = 180 / 3.14159265358979;
-constexpr uint32_t kOptionsBlock = 1002, kHistoryBlock = 1003, kSceneBlock = 1001;
 
 const char* const kDataTypes[] = {"unset",
                                   "float",
@@ -53,24 +54,11 @@ Json BoundsJson(const Bounds& bounds) {
             {"high", {bounds.high.x, bounds.high.y, bounds.high.z}}};
 }
 
-// Text blocks that exporters put before the scene.
 void DescribeExporter(const std::string& path, Json* document) {
-    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
-    std::error_code error;
-    const uint64_t size = std::filesystem::file_size(path, error);
-    std::vector<uint8_t> marker(8);
-    while (file && !error && fread(marker.data(), 1, 8, file.get()) == 8) {
-        const uint32_t id = ReadLE32(marker, 0), length = ReadLE32(marker, 4);
-        if (id == kSceneBlock || length > size) return;
-        if (id != kOptionsBlock && id != kHistoryBlock) {
-            if (fseek(file.get(), static_cast<long>(length), SEEK_CUR) != 0) return;
-            continue;
-        }
-        std::string text(length, '\0');
-        if (fread(&text[0], 1, length, file.get()) != length) return;
-        text = CleanText(text.substr(0, text.find('\0')));
-        (*document)[id == kHistoryBlock ? "exporter" : "exportOptions"] = text;
-    }
+    const ExporterText text = ReadExporterText(path);
+    if (text.history) (*document)["exporter"] = CleanText(*text.history);
+    if (text.options) (*document)["exportOptions"] = CleanText(*text.options);
+    if (text.FlipsTextureV()) (*document)["flipTextureV"] = *text.FlipsTextureV();
 }
 
 // ---- Nodes ----
@@ -213,12 +201,27 @@ Json DescribeMaterial(const QexPODModel& scene, uint32_t index) {
     return entry;
 }
 
+// Materials that let through what is behind them: by their opacity, or the alpha of their texture.
+Json DescribeTranslucency(const QexPODModel& scene, const Json& textures) {
+    Json list = Json::array();
+    for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const QexPODMaterial& m = scene.materials[i];
+        Json entry = {{"index", i}, {"name", TextOrNull(m.name)}, {"opacity", m.opacity}};
+        const Json texture = m.diffuseTexture < 0 ? Json() : textures[static_cast<size_t>(m.diffuseTexture)];
+        if (texture.contains("alphaFile"))
+            entry["alphaFile"] = texture["alphaFile"];
+        else if (texture.contains("picture") && texture["picture"].value("alpha", false))
+            entry["alphaFile"] = texture["file"];
+        if (m.opacity < 1 || entry.contains("alphaFile")) list.push_back(std::move(entry));
+    }
+    return list;
+}
+
 // Which file stands for the texture, and whether it can be read.
 Json DescribeTexture(const std::string& directory, const char* name, uint32_t index) {
     Json entry = {{"index", index}, {"name", TextOrNull(name)}, {"found", false}};
     if (!name) return entry;
-    const std::string path = directory + name;
-    const TextureFile file = FindTexture(path);
+    const TextureFile file = FindTexture(directory, name);
     std::string error;
     if (file.kind != TextureFile::kMissing) {
         entry["found"] = true;
@@ -233,10 +236,17 @@ Json DescribeTexture(const std::string& directory, const char* name, uint32_t in
         }
     } else if (file.kind == TextureFile::kPicture) {
         // The engine reads no such pictures; qex render decodes them.
-        entry["picture"] = true;
+        Image image;
+        const bool read = LoadImage(file.path, &image, &error);
+        entry["picture"] = {{"loads", read}};
+        if (read)
+            entry["picture"].update(
+                {{"width", image.width}, {"height", image.height}, {"alpha", image.hasAlpha}});
+        else
+            entry["picture"]["problem"] = error;
     }
-    const std::string alphaName = AlphaPath(path);
-    const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(alphaName);
+    const std::string alphaName = AlphaPath(name);
+    const TextureFile alpha = alphaName.empty() ? TextureFile() : FindTexture(directory, alphaName);
     if (alpha.kind == TextureFile::kContainer) entry["alphaFile"] = CleanText(alpha.path);
     return entry;
 }
@@ -327,6 +337,7 @@ void DescribeContent(const std::string& path, QexPODModel* scene, Json* document
     (*document)["textures"] = List(scene->textureCount, [&](uint32_t i) {
         return DescribeTexture(directory, scene->textures[i].name, i);
     });
+    (*document)["translucent"] = DescribeTranslucency(*scene, (*document)["textures"]);
     (*document)["lights"] = DescribeLights(*scene);
     (*document)["cameras"] = DescribeCameras(*scene);
 }

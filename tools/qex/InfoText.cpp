@@ -60,6 +60,9 @@ void PrintOverview(const Json& d) {
     const Json& counts = d["counts"];
     if (d.contains("exporter")) Line("exporter", Words(d["exporter"]));
     if (d.contains("exportOptions")) Line("export options", Words(d["exportOptions"]));
+    if (d.contains("flipTextureV"))
+        Line("textures", d["flipTextureV"].get<bool>() ? "V runs down the pictures (bFlipTextureV=1)"
+                                                       : "V runs up the pictures (bFlipTextureV=0)");
     Line("holds", Plural(counts["nodes"], "node") + " (" + Plural(counts["meshNodes"], "mesh node") + "), " +
                       Words(counts["meshes"]) + (counts["meshes"] == 1 ? " mesh, " : " meshes, ") +
                       Plural(counts["materials"], "material") + ", " + Plural(counts["textures"], "texture") +
@@ -126,6 +129,16 @@ void PrintMaterials(const Json& materials) {
     }
 }
 
+void PrintTranslucent(const Json& materials) {
+    Heading("Translucent", materials);
+    for (const Json& material : materials) {
+        std::string text = "opacity " + Words(material["opacity"]);
+        if (material.contains("alphaFile")) text += ", alpha from " + Words(material["alphaFile"]);
+        printf("  %s: %s; drawn after the opaque ones, over what is behind\n", Named(material).c_str(),
+               text.c_str());
+    }
+}
+
 // What a PVR or KTX file that stands for a texture is.
 std::string ContainerText(const Json& content) {
     std::string text = Words(content["format"]);
@@ -133,6 +146,12 @@ std::string ContainerText(const Json& content) {
     if (content.contains("glInternalFormat")) text += " " + Words(content["glInternalFormat"]);
     if (content.contains("width")) text += ", " + Words(content["width"]) + " x " + Words(content["height"]);
     return text + (content["loads"].get<bool>() ? "" : ", refused");
+}
+
+std::string PictureText(const Json& picture) {
+    if (!picture["loads"].get<bool>()) return "a picture, damaged";
+    return "a picture, " + Words(picture["width"]) + " x " + Words(picture["height"]) +
+           ": qex render decodes it, the engine alone does not";
 }
 
 void PrintTextures(const Json& textures) {
@@ -144,8 +163,7 @@ void PrintTextures(const Json& textures) {
         } else {
             text += Words(texture["file"]);
             if (texture.contains("content")) text += " (" + ContainerText(texture["content"]) + ")";
-            if (texture.contains("picture"))
-                text += " (a picture: qex render decodes it, the engine alone does not)";
+            if (texture.contains("picture")) text += " (" + PictureText(texture["picture"]) + ")";
         }
         if (texture.contains("alphaFile")) text += ", alpha from " + Words(texture["alphaFile"]);
         printf("  %s\n", text.c_str());
@@ -196,6 +214,7 @@ void PrintInfo(const Json& document) {
         PrintNodes(document["nodes"]);
         PrintMeshes(document["meshes"]);
         PrintMaterials(document["materials"]);
+        PrintTranslucent(document["translucent"]);
         PrintTextures(document["textures"]);
         PrintLightsAndCameras(document);
     } else {

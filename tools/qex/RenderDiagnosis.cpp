@@ -5,7 +5,6 @@
 #include <cstring>
 #include <filesystem>
 
-#include "Headless.h"
 #include "SceneBounds.h"
 
 namespace {
@@ -24,7 +23,11 @@ const Magic kMagics[] = {
     {"xof ", 4, "a DirectX scene"},       {"DDS ", 4, "a DDS texture"},
 };
 
-bool OnlyBackground(const std::vector<uint8_t>& pixels, uint32_t background) {
+const char kNothing[] = "; there is nothing to draw (qex info shows what it holds)";
+
+}  // namespace
+
+bool ShowsOnly(uint32_t background, const std::vector<uint8_t>& pixels) {
     const int want[3] = {static_cast<int>(background >> 16 & 0xFF), static_cast<int>(background >> 8 & 0xFF),
                          static_cast<int>(background & 0xFF)};
     for (size_t i = 0; i < pixels.size(); i += 4)
@@ -34,6 +37,8 @@ bool OnlyBackground(const std::vector<uint8_t>& pixels, uint32_t background) {
         }
     return true;
 }
+
+namespace {
 
 // The clip planes that all points lie beyond, in words; empty when some point is inside all of them.
 std::string OutsideOf(const QexCamera& camera, const std::vector<QexVec3>& points) {
@@ -80,29 +85,29 @@ std::string WhyNotPod(const std::string& path, const std::string& wanted) {
 }
 
 std::string WhyNothingShows(const QexModel& model, const QexCamera& camera,
-                            const qex::HeadlessContext& context, uint32_t background,
                             const std::vector<QexVec3>& points) {
-    if (!OnlyBackground(context.ReadPixels(), background)) return "";
     const QexPODModel& scene = model.scene;
-    const std::string nothing = "nothing of the scene shows: ";
-    if (!scene.meshNodeCount) return nothing + "it has no mesh nodes";
+    if (!scene.meshNodeCount) return std::string("it has no mesh nodes") + kNothing;
     uint64_t faces = 0;
-    bool anyOpaque = false;
+    bool anyOpaque = false, anyEnabled = false;
     for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
         const QexPODNode& node = scene.nodes[i];
         faces += scene.meshes[node.objectIndex].faceCount + scene.meshes[node.objectIndex].stripCount;
+        anyEnabled |= (node.stateFlags & QEX_NODE_RENDERING_ENABLED) != 0;
         // The modules' threshold: what is not above it is not drawn.
         anyOpaque |= node.materialIndex < 0 || scene.materials[node.materialIndex].opacity > 0.5f;
     }
-    if (!faces) return nothing + "its meshes have no faces";
-    if (points.empty()) return nothing + "its meshes have no positions, or none that are finite numbers";
+    if (!faces) return std::string("its meshes have no faces") + kNothing;
+    if (points.empty())
+        return std::string("its meshes have no positions, or none that are finite numbers") + kNothing;
     const Bounds bounds = BoundsOf(points);
-    const bool point =
-        bounds.low.x == bounds.high.x && bounds.low.y == bounds.high.y && bounds.low.z == bounds.high.z;
-    if (point) return nothing + "it is shrunk to a point (a scale of 0?)";
+    if (bounds.LongestEdge() == 0) return std::string("it is shrunk to a point (a scale of 0?)") + kNothing;
+    if (!anyEnabled) return "all its nodes are hidden";
     if (!anyOpaque)
-        return nothing + "all its materials are transparent (an opacity of at most 0.5 is not drawn)";
+        return "all its materials are transparent (an opacity of at most 0.5 is not drawn); try --shader "
+               "simple to see its shape";
     const std::string outside = OutsideOf(camera, points);
-    if (!outside.empty()) return nothing + outside;
-    return nothing + "it has the colour of the background, or is too small to be seen";
+    if (!outside.empty()) return outside + "; try --camera auto";
+    return "it has the colour of the background, or is too small to be seen; try --background or --camera "
+           "auto";
 }

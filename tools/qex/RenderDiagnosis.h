@@ -7,15 +7,13 @@
 
 #include "Qex.h"
 
-namespace qex {
-class HeadlessContext;
-}
-
 // Why a file cannot be what is wanted, judged by its first bytes: missing, a directory, empty, a format that
 // no qex verb reads. Empty when it may be it.
 std::string WhyNotPod(const std::string& path, const std::string& wanted = "a POD scene");
 
-// When the bound framebuffer shows nothing but the background (0xRRGGBB): why. Empty when something shows.
+// Whether RGBA pixels all have a colour, 0xRRGGBB, or one as good as it.
+bool ShowsOnly(uint32_t background, const std::vector<uint8_t>& pixels);
+
+// Why nothing of a scene shows, whose vertices are at `points`, and what may help.
 std::string WhyNothingShows(const QexModel& model, const QexCamera& camera,
-                            const qex::HeadlessContext& context, uint32_t background,
                             const std::vector<QexVec3>& points);

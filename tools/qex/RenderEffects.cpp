@@ -5,49 +5,13 @@
 
 #include <GLES2/gl2.h>
 
+#include "RenderShading.h"
+
 namespace {
 
-// The clip-space z of a camera's near and far plane.
-constexpr float kNearDepth = 0, kFarDepth = 1;
 constexpr float kShadowIntensity = 0.4f, kShadowBias = 0.01f;
 constexpr float kCasterMargin = 1.3f;
 constexpr float kMirrorOpacity = 0.6f;  // of the plane over its image
-
-using Create = QexShaderModule* (*)(void);
-using ReleaseModule = void (*)(QexShaderModule**);
-using SetParameters = void (*)(QexShaderModule*, float, float);
-
-// Modules by their short names. What has no skinned sister leaves skinned nodes to the engine's choice.
-struct ShaderRow {
-    const char* name;
-    Create create;
-    ReleaseModule release;
-    Create createSkinned;
-    ReleaseModule releaseSkinned;
-    SetParameters setDepth, setSkinnedDepth;
-};
-
-#define PAIR(Name, Skinned) Name##_CreateProgram, Name##_Release, Skinned##_CreateProgram, Skinned##_Release
-
-const ShaderRow kShaders[] = {
-    {"texture", PAIR(QexTextureShader, QexSkinningTextureShader), nullptr, nullptr},
-    {"texture-noalpha", PAIR(QexTextureNoAlphaShader, QexSkinningTextureNoAlphaShader), nullptr, nullptr},
-    {"gouraud", PAIR(QexGouraudShader, QexSkinningGouraudShader), nullptr, nullptr},
-    {"specular", PAIR(QexGouraudSpecularShader, QexSkinningGouraudSpecularShader), nullptr, nullptr},
-    {"normalmap", PAIR(QexGouraudNormalMapShader, QexSkinningGouraudNormalMapShader), nullptr, nullptr},
-    {"shadow", PAIR(QexGouraudShadowShader, QexSkinningGouraudShader), nullptr, nullptr},
-    {"shadow-ext", PAIR(QexGouraudShadowExtShader, QexSkinningGouraudShader), nullptr, nullptr},
-    {"uv", PAIR(QexUVDisplacementShader, QexSkinningTextureShader), nullptr, nullptr},
-    {"simple", QexSimpleShader_CreateProgram, QexSimpleShader_Release, nullptr, nullptr, nullptr, nullptr},
-    {"depth", PAIR(QexDepthShader, QexSkinningDepthShader), QexDepthShader_SetParameters,
-     QexSkinningDepthShader_SetParameters},
-};
-
-const ShaderRow* FindShader(const std::string& name) {
-    for (const ShaderRow& row : kShaders)
-        if (name == row.name) return &row;
-    return nullptr;
-}
 
 // The names of the scene's nodes, as many as a line may hold.
 std::string NodeNames(const QexPODModel& scene) {
@@ -91,49 +55,6 @@ QexVec3 ShadowDirection(const QexLightSet& lights, const QexCamera& camera) {
 
 }  // namespace
 
-std::string ShaderNames() {
-    std::string names;
-    for (const ShaderRow& row : kShaders) names += (names.empty() ? "" : ", ") + std::string(row.name);
-    return names;
-}
-
-bool IsShaderName(const std::string& name) {
-    return FindShader(name) != nullptr;
-}
-
-void SceneShaders::Use(QexModel* model, const std::string& name) {
-    const ShaderRow* row = FindShader(name);
-    if (!row) return;
-    Release();
-    row_ = static_cast<size_t>(row - kShaders);
-    static_ = row->create();
-    if (row->createSkinned) skinned_ = row->createSkinned();
-    const std::pair<SetParameters, QexShaderModule*> modules[] = {{row->setDepth, static_},
-                                                                  {row->setSkinnedDepth, skinned_}};
-    for (const auto& [set, module] : modules) {
-        if (!set || !module) continue;
-        QexRenderState_UseProgram(module->program);
-        set(module, kNearDepth, kFarDepth);
-    }
-    QexModel_SetShaderProgramForAllNode(model, static_, skinned_);
-}
-
-void SceneShaders::Release() {
-    if (static_) kShaders[row_].release(&static_);
-    if (skinned_) kShaders[row_].releaseSkinned(&skinned_);
-}
-
-ShaderOverride::ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned)
-    : model_(model) {
-    if (!model) return;
-    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) own_.push_back(model->scene.nodes[i].shader);
-    QexModel_SetShaderProgramForAllNode(model, module, skinned);
-}
-
-ShaderOverride::~ShaderOverride() {
-    for (size_t i = 0; i < own_.size(); ++i) model_->scene.nodes[i].shader = own_[i];
-}
-
 int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem) {
     const int32_t index = QexModel_FindNodeIdxByName(&model, name.c_str());
     if (index < 0) *problem = "no node '" + name + "'; the scene has " + NodeNames(model.scene);
@@ -153,20 +74,6 @@ std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes)
         if (change.what == "face") QexModel_SetNodeFaceTo(model, node, &v);
     }
     return "";
-}
-
-QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera) {
-    QexLightSet set = {};
-    for (const QexLight& light : options.lights)
-        if (set.count < QEX_MAX_LIGHTS) set.lights[set.count++] = light;
-    if (!set.count) QexModel_GetLight(model, &set);
-    if (!set.count) {
-        QexVec3 direction;
-        QexVec3_Subtract(&direction, &camera.target, &camera.eye);
-        set.count = 1;
-        set.lights[0] = {QEX_LIGHT_DIRECTIONAL, {direction.x, direction.y, direction.z}, {1, 1, 1, 1}};
-    }
-    return set;
 }
 
 void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model, const QexLightSet& lights,
@@ -192,7 +99,9 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model,
 void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
                   const QexCamera& camera) {
     const QexShadowCaster all = {model, 1, nullptr, 0};
-    const int32_t node = QexModel_FindNodeIdxByName(model, options.mirrorNode.c_str());
+    // An empty name is that of every node without one.
+    const int32_t node =
+        options.mirrorNode.empty() ? -1 : QexModel_FindNodeIdxByName(model, options.mirrorNode.c_str());
     QexReflection* reflection = nullptr;
     if (options.mirror) {
         const QexVec3 normal = {0, 1, 0}, point = {0, *options.mirror, 0};
@@ -208,10 +117,11 @@ void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightS
     QexReflection_Release(reflection);
 }
 
-void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, const DrawPass& draw) {
+void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, int scale,
+                          const DrawPass& draw) {
     const DepthOfField& effect = *options.depthOfField;
-    // Steps of a pixel of the targets.
-    const float step = options.fullBlur ? 1 : 2;
+    // Steps of a pixel of the targets, as they are shown.
+    const float step = (options.fullBlur ? 1.0f : 2.0f) * static_cast<float>(scale);
     const float stepX = step / static_cast<float>(engine->width),
                 stepY = step / static_cast<float>(engine->height);
     for (uint32_t half : {0, 1})
@@ -223,14 +133,16 @@ void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& option
     s_drawPass = nullptr;
 }
 
-void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera,
+void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera, int scale,
                  const std::vector<QexVec2>& points) {
     std::vector<uint32_t> hit(model->scene.meshNodeCount + size_t{1});
     QexModel_UpdateModelBoundingBox(model, nullptr);
     QexModel_CalcScreenBBox(engine, model, &camera);
     for (const QexVec2& point : points) {
         int32_t count = 0;
-        QexModel_Pick(model, nullptr, &point, &count, hit.data(),
+        const float s = static_cast<float>(scale);
+        const QexVec2 drawn = {point.x * s, point.y * s};
+        QexModel_Pick(model, nullptr, &drawn, &count, hit.data(),
                       static_cast<int32_t>(model->scene.meshNodeCount));
         printf("%g,%g:", static_cast<double>(point.x), static_cast<double>(point.y));
         for (int32_t i = 0; i < count; ++i) {

@@ -4,14 +4,25 @@
 #include <cstring>
 
 #include <GLES2/gl2.h>
+#include <CLI/CLI.hpp>
 
+#include "InfoExporter.h"
 #include "TextureFiles.h"
+#include "TextureOverrides.h"
 #include "TextureWrite.h"
 
 namespace {
 
 constexpr uint32_t kNormalMapUnit = 1;  // of the normal-mapped modules
 
+// Where the textures of the model at hand come from; the engine's hook takes no pointer of ours.
+struct Lookup {
+    std::string directory;
+    TextureOverrides overrides;
+    bool vRunsDown = false;
+};
+
+Lookup g_lookup;
 std::vector<std::string> g_problems;
 std::vector<QexTexture> g_normalMaps;  // by material
 
@@ -52,15 +63,21 @@ void Upload(QexTexture* texture, Image image, const std::string& name) {
     QexTexture_SetName(texture, name.c_str());
 }
 
-// Reads a picture into the model's texture of a material; its first row is the picture's lower edge.
-bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
-    Image image;
+// Reads a picture with the row first that lies at V = 0.
+bool ReadPicture(const char* what, const std::string& path, Image* image) {
     std::string error;
-    if (!LoadImage(path, &image, &error)) {
-        g_problems.push_back("texture " + path + ": " + error);
+    if (!LoadImage(path, image, &error)) {
+        g_problems.push_back(std::string(what) + " " + path + ": " + error);
         return false;
     }
-    image = FlipRows(image);
+    if (!g_lookup.vRunsDown) *image = FlipRows(*image);
+    return true;
+}
+
+// Reads a picture into the model's texture of a material.
+bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
+    Image image;
+    if (!ReadPicture("texture", path, &image)) return false;
     Upload(model->textures[material], image, FileName(path));
     if (!image.hasAlpha) return true;
     model->alphaTextures[material] = NewTexture();
@@ -72,15 +89,22 @@ bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
 // Pictures hold a normal's x in red and y in green; the engine reads them the other way round.
 bool LoadNormalPicture(QexTexture* texture, const std::string& path) {
     Image image;
-    std::string error;
-    if (!LoadImage(path, &image, &error)) {
-        g_problems.push_back("normal map " + path + ": " + error);
-        return false;
-    }
-    image = FlipRows(image);
+    if (!ReadPicture("normal map", path, &image)) return false;
     for (size_t i = 0; i < image.pixels.size(); i += 4) std::swap(image.pixels[i], image.pixels[i + 1]);
     Upload(texture, image, FileName(path));
     return true;
+}
+
+// A PVR or KTX file into an empty record.
+bool LoadContainer(QexTexture* texture, const std::string& path) {
+    const auto load = Extension(path) == "ktx" ? QexTexture_LoadKTXFromFile : QexTexture_LoadPVRFromFile;
+    return load(texture, path.c_str(), nullptr, 1, 0) == 0;
+}
+
+// The file given for a material in place of its own texture; empty when none is.
+std::string Chosen(const QexModel* model, uint32_t material) {
+    const char* name = model->scene.materials[material].name;
+    return OverrideOf(g_lookup.overrides, name ? name : "");
 }
 
 // Whether a mesh has what a normal map is laid on.
@@ -99,7 +123,9 @@ int32_t BindNormalMap(QexModel* model, uint32_t nodeIndex) {
 }
 
 int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
-    const TextureFile found = FindTexture(path);
+    // Those that are given come later, as materials without a texture get them, too.
+    if (!Chosen(model, CurrentMaterial(model)).empty()) return 1;
+    const TextureFile found = FindTexture(g_lookup.directory, path + g_lookup.directory.size());
     if (found.kind == TextureFile::kMissing) {
         g_problems.push_back("texture " + std::string(path) +
                              " is missing (no .pvr, .ktx or picture of that name)");
@@ -113,12 +139,12 @@ int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
 }
 
 // A texture of one texel for a material that has none.
-QexTexture* ColourTexture(const QexPODMaterial& material) {
+QexTexture* ColourTexture(const QexPODMaterial& material, bool white) {
     QexTexture* texture = NewTexture();
     if (!texture) return nullptr;
     uint8_t texel[4] = {0, 0, 0, 255};
     for (int i = 0; i < 3; ++i) {
-        const float c = material.diffuse[i];
+        const float c = white ? 1 : material.diffuse[i];
         texel[i] = static_cast<uint8_t>((c > 0 ? c < 1 ? c : 1.0f : 0.0f) * 255.0f + 0.5f);
     }
     QexTexture_CreateFromPixels(texture, 1, 1, QEX_TEXFMT_RGBA8888, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_REPEAT,
@@ -127,14 +153,34 @@ QexTexture* ColourTexture(const QexPODMaterial& material) {
     return texture;
 }
 
-// The alpha texture of a material whose texture name has another extension than the files that are there.
-void FindAlpha(QexModel* model, uint32_t material, const std::string& directory) {
+// The file that a material's colour comes from; empty when there is none.
+std::string FileOf(const QexModel* model, uint32_t material) {
+    const std::string given = Chosen(model, material);
     const int32_t index = model->scene.materials[material].diffuseTexture;
-    if (index < 0 || !model->scene.textures[index].name || model->alphaTextures[material]) return;
-    const TextureFile found = FindTexture(AlphaPath(directory + model->scene.textures[index].name));
+    if (!given.empty() || index < 0 || !model->scene.textures[index].name) return given;
+    return FindTexture(g_lookup.directory, model->scene.textures[index].name).path;
+}
+
+void LoadGiven(QexModel* model, uint32_t material, const std::string& path) {
+    if (!model->textures[material]) QexModel_ReplaceTextureByIdx(model, NewTexture(), material);
+    const std::string extension = Extension(path);
+    if (extension != "pvr" && extension != "ktx")
+        LoadPicture(model, material, path);
+    else if (!LoadContainer(model->textures[material], path))
+        g_problems.push_back("texture " + path + " cannot be loaded");
+}
+
+// The alpha texture of a material, where the engine has looked for it under another name.
+void FindAlpha(QexModel* model, uint32_t material, const std::string& file) {
+    const int32_t index = model->scene.materials[material].diffuseTexture;
+    if (file.empty() || model->alphaTextures[material]) return;
+    const bool given = !Chosen(model, material).empty();
+    const TextureFile found =
+        given ? FindTexture(Directory(file), AlphaPath(FileName(file)))
+              : FindTexture(g_lookup.directory, AlphaPath(model->scene.textures[index].name));
     if (found.kind != TextureFile::kContainer) return;
     QexTexture* texture = NewTexture();
-    if (texture && QexTexture_LoadPVRFromFile(texture, found.path.c_str(), nullptr, 1, 0) == 0) {
+    if (texture && LoadContainer(texture, found.path)) {
         model->alphaTextures[material] = texture;
         return;
     }
@@ -143,22 +189,20 @@ void FindAlpha(QexModel* model, uint32_t material, const std::string& directory)
 
 }  // namespace
 
-std::vector<std::string> LoadNormalMaps(QexModel* model, const std::string& directory) {
+std::vector<std::string> LoadNormalMaps(QexModel* model) {
     const QexPODModel& scene = model->scene;
     g_problems.clear();
     g_normalMaps.assign(scene.materialCount, {});
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const int32_t index = scene.materials[i].bumpTexture;
         if (index < 0 || !scene.textures[index].name) continue;
-        const std::string path = directory + scene.textures[index].name;
-        const TextureFile found = FindTexture(path);
-        const std::string extension = Extension(found.path);
+        const TextureFile found = FindTexture(g_lookup.directory, scene.textures[index].name);
         if (found.kind == TextureFile::kMissing)
-            g_problems.push_back("normal map " + path + " is missing");
+            g_problems.push_back("normal map " + g_lookup.directory + scene.textures[index].name +
+                                 " is missing");
         else if (found.kind == TextureFile::kPicture)
             LoadNormalPicture(&g_normalMaps[i], found.path);
-        else if ((extension == "ktx" ? QexTexture_LoadKTXFromFile : QexTexture_LoadPVRFromFile)(
-                     &g_normalMaps[i], found.path.c_str(), nullptr, 1, 0) != 0)
+        else if (!LoadContainer(&g_normalMaps[i], found.path))
             g_problems.push_back("normal map " + found.path + " cannot be loaded");
     }
     for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
@@ -184,27 +228,49 @@ QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
     return texture;
 }
 
-void SetTextureHook(QexModel* model) {
+void SetUpTextureChoices(CLI::App* app, TextureChoices* choices) {
+    AddTextureOption(app, &choices->overrides);
+    app->add_option(
+           "--flip-textures", choices->flipped,
+           "whether V runs down the pictures beside the scene: yes or no (as its export options say, "
+           "else no)")
+        ->transform(CLI::CheckedTransformer(std::map<std::string, bool>{{"yes", true}, {"no", false}},
+                                            CLI::ignore_case));
+}
+
+void SetTextureHook(QexModel* model, const std::string& scenePath, const TextureChoices& choices) {
     g_problems.clear();
+    g_lookup.directory = Directory(scenePath);
+    g_lookup.overrides = SplitOverrides(choices.overrides);
+    g_lookup.vRunsDown =
+        choices.flipped.value_or(ReadExporterText(scenePath).FlipsTextureV().value_or(false));
     model->loadTextureHook = LoadTextureHook;
 }
 
-std::vector<std::string> CompleteTextures(QexModel* model, const std::string& directory) {
+std::string CheckTextureChoices(const QexModel* model) {
+    std::vector<std::string> names;
+    for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
+        const char* name = model->scene.materials[i].name;
+        names.push_back(name ? name : "");
+    }
+    return UnknownMaterial(g_lookup.overrides, names);
+}
+
+std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<bool>& lit) {
     QexPODModel& scene = model->scene;
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
+        const std::string given = Chosen(model, i), file = FileOf(model, i);
+        if (!given.empty()) LoadGiven(model, i, given);
         const QexTexture* texture = model->textures[i];
-        const int32_t index = scene.materials[i].diffuseTexture;
         if (texture && texture->glName == 0) {
-            // The hook could not read the picture; the engine keeps an empty record for it.
+            // The picture could not be read; the engine keeps an empty record for it.
             QexMemory_Free(QexModel_ReplaceTextureByIdx(model, nullptr, i));
             texture = nullptr;
         }
-        if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i]), i);
-        FindAlpha(model, i, directory);
-        if (!texture || index < 0 || !scene.textures[index].name) continue;
+        if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i], lit[i]), i);
+        FindAlpha(model, i, file);
         // A KTX file sets no filter, and GL's own wants a whole chain of mipmaps.
-        const TextureFile file = FindTexture(directory + scene.textures[index].name);
-        if (Extension(file.path) == "ktx") QexTexture_SetFilter(model->textures[i], QEX_FILTER_LINEAR);
+        if (texture && Extension(file) == "ktx") QexTexture_SetFilter(model->textures[i], QEX_FILTER_LINEAR);
     }
     for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
         QexPODNode& node = scene.nodes[i];

@@ -4,7 +4,11 @@
 #include <cstdio>
 #include <cstring>
 
+#include <CLI/CLI.hpp>
+
+#include "CommandLine.h"
 #include "ImageFile.h"
+#include "OutputFile.h"
 
 namespace {
 
@@ -23,13 +27,23 @@ void Paste(const Image& image, size_t left, size_t top, size_t width, std::vecto
 
 }  // namespace
 
+void SetUpSheet(CLI::App* app, SheetOptions* options) {
+    app->add_option("PICTURES", options->inputs, "pictures, row by row; - is standard input")->required();
+    app->add_option("-o,--output", options->output, "PNG, JPEG, BMP or TGA file, by its extension")
+        ->required();
+    app->add_option("--columns", options->columns, "pictures in a row (4)")->check(NumberFrom(1, 1000));
+    app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(NumberFrom(0, 1000));
+}
+
 int RunSheet(const SheetOptions& options) {
     std::vector<Image> images(options.inputs.size());
-    std::string error;
+    std::string error = WhyNoPictureName(options.output);
+    if (error.empty()) error = WhyNotOutput(options.output, options.inputs);
+    if (!error.empty()) return Fail(options.output + ": " + error, 2);
     size_t cellWidth = 0, cellHeight = 0;
     for (size_t i = 0; i < images.size(); ++i) {
-        if (!LoadImage(options.inputs[i], &images[i], &error))
-            return Fail(options.inputs[i] + ": " + error, 1);
+        const InputFile input(options.inputs[i]);
+        if (!LoadImage(input.Path(), &images[i], &error)) return Fail(input.Name() + ": " + error, 1);
         cellWidth = std::max(cellWidth, static_cast<size_t>(images[i].width));
         cellHeight = std::max(cellHeight, static_cast<size_t>(images[i].height));
     }
@@ -42,7 +56,7 @@ int RunSheet(const SheetOptions& options) {
     for (size_t i = 0; i < images.size(); ++i)
         Paste(images[i], gap + i % columns * (cellWidth + gap), gap + i / columns * (cellHeight + gap), width,
               &sheet);
-    if (SavePng(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error))
+    if (SavePicture(options.output, static_cast<int>(width), static_cast<int>(height), sheet.data(), &error))
         return 0;
     return Fail(options.output + ": " + error, 2);
 }

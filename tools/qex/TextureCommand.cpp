@@ -4,10 +4,14 @@
 #include <cstdio>
 #include <cstring>
 
+#include <CLI/CLI.hpp>
+
+#include "CommandLine.h"
 #include "ImageFile.h"
-#include "PodWriter.h"
+#include "OutputFile.h"
 #include "TextureContainer.h"
 #include "TextureFiles.h"
+#include "TextureFormats.h"
 #include "TextureWrite.h"
 
 namespace {
@@ -22,6 +26,10 @@ struct Failure {
 
 void Say(const std::string& text) {
     fprintf(stderr, "qex texture: %s\n", text.c_str());
+}
+
+bool WritesPicture(const TextureOptions& options) {
+    return WhyNoPictureName(options.output).empty();
 }
 
 bool IsTexture(const std::vector<uint8_t>& file, const std::string& path) {
@@ -62,7 +70,7 @@ Failure LoadTexture(std::vector<uint8_t> file, const TextureOptions& options, co
         return {1, path + ": has no level " + std::to_string(level) + ", it has " + std::to_string(levels)};
     if (first >= faces)
         return {1, path + ": has no face " + std::to_string(first) + ", it has " + std::to_string(faces)};
-    const bool one = options.face >= 0 || Extension(options.output) == "png" || faces != 6;
+    const bool one = options.face >= 0 || WritesPicture(options) || faces != 6;
     for (size_t face = first; face < (one ? first + 1 : faces); ++face)
         images->push_back(DecodeFace(texture, level, face));
     return {};
@@ -71,9 +79,11 @@ Failure LoadTexture(std::vector<uint8_t> file, const TextureOptions& options, co
 Failure Load(const TextureOptions& options, const std::string& path, std::vector<Image>* images) {
     std::vector<uint8_t> file;
     std::string error;
-    if (!ReadFileBytes(path, SIZE_MAX, &file, &error)) return {1, path + ": " + error};
-    const Failure failure = IsTexture(file, path) ? LoadTexture(std::move(file), options, path, images)
-                                                  : LoadPicture(file, options, path, images);
+    const InputFile input(path);
+    const std::string& name = input.Name();
+    if (!ReadFileBytes(input.Path(), SIZE_MAX, &file, &error)) return {1, name + ": " + error};
+    const Failure failure = IsTexture(file, path) ? LoadTexture(std::move(file), options, name, images)
+                                                  : LoadPicture(file, options, name, images);
     if (failure.status) return failure;
     const Image& image = images->back();
     if (std::max(image.width, image.height) > kMaxSide)
@@ -101,15 +111,16 @@ Failure LoadAll(const TextureOptions& options, std::vector<Image>* images) {
 // What is wrong with the options before any file is read; empty when nothing is.
 std::string Misuse(const TextureOptions& options) {
     const std::string extension = Extension(options.output), &format = options.format;
-    const bool png = extension == "png", ktx = extension == "ktx";
-    if (!png && !ktx && extension != "pvr")
-        return "'" + options.output + "' is no output; expected a name that ends in .png, .pvr or .ktx";
+    const bool picture = WritesPicture(options), ktx = extension == "ktx";
+    if (!picture && !ktx && extension != "pvr")
+        return "'" + options.output +
+               "' is no output; expected a name that ends in .png, .jpg, .bmp, .tga, .pvr or .ktx";
     if (options.input.empty() == options.faces.empty())
         return "expected one picture or texture, or the six faces of a cube map after --faces";
     if (!options.faces.empty() && options.faces.size() != 6)
         return "a cube map has 6 faces, not " + std::to_string(options.faces.size());
-    if (png && !(format.empty() && !options.mipmaps && options.faces.empty()))
-        return "a PNG file has no --format, --mipmaps or --faces";
+    if (picture && !(format.empty() && !options.mipmaps && options.faces.empty()))
+        return "a picture has no --format, --mipmaps or --faces";
     if (!options.faces.empty() && (options.level >= 0 || options.face >= 0))
         return "--level and --face do not go with --faces";
     if (format.rfind("pvrtc", 0) == 0) return "PVRTC is read, not written; expected one of " + FormatNames();
@@ -123,8 +134,9 @@ std::string Misuse(const TextureOptions& options) {
 Failure WriteTexture(const TextureOptions& options, const PixelFormat& format,
                      const std::vector<Image>& faces, const std::string& path) {
     const auto encode = Extension(path) == "ktx" ? EncodeKtxFile : EncodePvrFile;
-    if (pod::WriteFile(path, encode(faces, format, options.mipmaps, options.flip))) return {};
-    return {2, path + ": cannot be written"};
+    std::string problem;
+    if (WriteOutput(path, encode(faces, format, options.mipmaps, options.flip), &problem)) return {};
+    return {2, path + ": " + problem};
 }
 
 Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& faces) {
@@ -154,21 +166,52 @@ Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& f
 }
 
 Failure Convert(const TextureOptions& options) {
-    const std::string misuse = Misuse(options);
+    std::string misuse = Misuse(options);
     if (!misuse.empty()) return {2, misuse};
+    std::vector<std::string> inputs = options.faces;
+    inputs.push_back(options.input);
+    for (const std::string& output : {options.output, AlphaPath(options.output)}) {
+        misuse = WhyNotOutput(output, inputs);
+        if (!misuse.empty()) return {2, output + ": " + misuse};
+        if (options.format != "etc1") break;
+    }
     std::vector<Image> images;
     const Failure failure = LoadAll(options, &images);
     if (failure.status) return failure;
     if (options.flip)
         for (Image& image : images) image = FlipRows(image);
-    if (Extension(options.output) != "png") return WriteTextures(options, images);
+    if (!WritesPicture(options)) return WriteTextures(options, images);
     std::string error;
     const Image& image = images[0];
-    if (SavePng(options.output, image.width, image.height, image.pixels.data(), &error)) return {};
+    if (image.hasAlpha && Extension(options.output)[0] == 'j')
+        Say(options.output + ": warning: the alpha is lost in JPEG");
+    if (SavePicture(options.output, image.width, image.height, image.pixels.data(), &error)) return {};
     return {2, options.output + ": " + error};
 }
 
 }  // namespace
+
+void SetUpTexture(CLI::App* app, TextureOptions* options) {
+    app->add_option("IN", options->input,
+                    "PNG, JPEG, TGA, ... picture, or PVR or KTX texture; - is standard input");
+    app->add_option("-o,--output", options->output,
+                    "PNG, JPEG, BMP or TGA picture, or PVR or KTX texture, by its extension")
+        ->required();
+    app->add_option("--format", options->format, FormatNames() + " (rgba8888 with alpha, rgb888 without)");
+    app->add_flag("--mipmaps", options->mipmaps, "write the whole mipmap chain");
+    app->add_flag("--flip", options->flip, "turn the rows over; else the first is the picture's top");
+    app->add_option("--faces", options->faces, "instead of IN: squares +X -X +Y -Y +Z -Z of a cube map")
+        ->expected(1, 100);
+    app->add_option("--level", options->level, "mipmap level of the texture IN (0)")
+        ->check(NumberFrom(0, 31));
+    app->add_option("--face", options->face, "face of the cube map IN (PNG: 0; PVR and KTX: all)")
+        ->check(NumberFrom(0, 5));
+    app->footer(
+        "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88\n"
+        "and a8; those in etc1 are black until QexTexture_SetFilter is called, unless they have --mipmaps.\n"
+        "PVRTC is read, not written. In a picture luminance is grey, and alpha 8 is white with alpha. From\n"
+        "texture to texture blocks and mipmaps are made anew.");
+}
 
 int RunTexture(const TextureOptions& options) {
     const Failure failure = Convert(options);

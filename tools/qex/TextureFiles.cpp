@@ -8,6 +8,35 @@
 #include <filesystem>
 #include <memory>
 
+namespace fs = std::filesystem;
+
+namespace {
+
+// The entry of a folder called `name`, whatever its case; an exact match goes first.
+fs::path FindEntry(const fs::path& directory, const std::string& name) {
+    std::error_code ec;
+    if (fs::exists(directory / name, ec)) return directory / name;
+    const std::string wanted = Lower(name);
+    fs::directory_iterator entries(directory, ec);
+    for (; !ec && entries != fs::directory_iterator(); entries.increment(ec))
+        if (Lower(entries->path().filename().string()) == wanted) return entries->path();
+    return {};
+}
+
+TextureFile FindInFolder(const std::string& directory, const std::string& name) {
+    const std::string base = WithoutExtension(name);
+    for (const char* extension : {".pvr", ".ktx", "", ".png", ".jpg", ".jpeg", ".tga", ".bmp"}) {
+        const std::string found = FindFile(directory, *extension ? base + extension : name);
+        if (found.empty()) continue;
+        const std::string kind = Extension(found);
+        const bool container = kind == "pvr" || kind == "ktx";
+        return {container ? TextureFile::kContainer : TextureFile::kPicture, found};
+    }
+    return {};
+}
+
+}  // namespace
+
 bool IsRegularFile(const std::string& path) {
     std::error_code error;
     return std::filesystem::is_regular_file(path, error);
@@ -30,9 +59,7 @@ std::string WithoutExtension(const std::string& path) {
 std::string Extension(const std::string& path) {
     std::string extension = path.substr(WithoutExtension(path).size());
     if (!extension.empty()) extension.erase(0, 1);
-    std::transform(extension.begin(), extension.end(), extension.begin(),
-                   [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
-    return extension;
+    return Lower(extension);
 }
 
 std::string AlphaPath(const std::string& path) {
@@ -40,14 +67,31 @@ std::string AlphaPath(const std::string& path) {
     return path.substr(0, path.size() - 4) + "_a." + path.substr(path.size() - 3);
 }
 
-TextureFile FindTexture(const std::string& path) {
-    const std::string base = WithoutExtension(path);
-    for (const char* container : {".pvr", ".ktx"})
-        if (IsRegularFile(base + container)) return {TextureFile::kContainer, base + container};
-    if (IsRegularFile(path)) return {TextureFile::kPicture, path};
-    for (const char* picture : {".png", ".jpg", ".jpeg", ".tga", ".bmp"})
-        if (IsRegularFile(base + picture)) return {TextureFile::kPicture, base + picture};
-    return {};
+std::string Lower(std::string text) {
+    for (char& c : text) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    return text;
+}
+
+std::string SlashedPath(std::string path) {
+    std::replace(path.begin(), path.end(), '\\', '/');
+    return path;
+}
+
+std::string FindFile(const std::string& directory, const std::string& relative) {
+    fs::path found = directory.empty() ? "." : directory;
+    for (const fs::path& part : fs::path(relative).relative_path()) {
+        if (part.empty() || part == ".") continue;
+        found = part == ".." ? found / ".." : FindEntry(found, part.string());
+        if (found.empty()) return "";
+    }
+    if (!IsRegularFile(found.string())) return "";
+    return directory.empty() ? found.string().substr(2) : found.string();
+}
+
+TextureFile FindTexture(const std::string& directory, const std::string& name) {
+    const std::string path = SlashedPath(name);
+    const TextureFile found = FindInFolder(directory, path);
+    return found.kind == TextureFile::kMissing ? FindInFolder(directory, FileName(path)) : found;
 }
 
 bool ReadFileBytes(const std::string& path, size_t most, std::vector<uint8_t>* bytes, std::string* error) {
