@@ -69,6 +69,9 @@ TEST_F(ConvertMaterial, LinearColoursAreEncoded) {
     ExpectNear(m->diffuse, {0.7354f, 0.5371f, 0.0258f});
     EXPECT_FLOAT_EQ(m->opacity, 0.75f);
     EXPECT_EQ(m->diffuseTexture, -1);
+    EXPECT_EQ(said_, "");
+    ConvertSquare(pbr("[1,1,1,0.5]"));
+    EXPECT_TRUE(Contains(said_, "1 material of an opacity up to 0.5: not drawn")) << said_;
     // Glow in one colour: a texel of all the light there can be, and shares of it.
     m = &ConvertSquare(pbr("[0.25,0,0.25,1]") + R"(,"emissiveFactor":[0.25,0.5,0])").materials[0];
     ASSERT_EQ(m->diffuseTexture, 0);

@@ -163,7 +163,7 @@ int ConvertFile(const ConvertOptions& options, TextureFormat format, const Place
     Assimp::Importer importer;
     const aiScene* source = Import(options.input, &importer);
     if (!source || !source->mRootNode) {
-        std::string reason = importer.GetErrorString();
+        std::string reason = source ? "it holds no nodes" : importer.GetErrorString();
         reason.resize(std::min(reason.size(), reason.find('\n')));
         if (reason.find("bad_alloc") != std::string::npos) throw std::bad_alloc();
         log.Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason +

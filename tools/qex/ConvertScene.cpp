@@ -11,6 +11,8 @@
 
 namespace {
 
+constexpr float kLeastOpacity = 0.5f;  // the modules draw what is above it
+
 std::string Plural(unsigned count, const char* noun) {
     return std::to_string(count) + " " + noun + (count == 1 ? "" : "s");
 }
@@ -152,6 +154,10 @@ ExitStatus ConvertScene(const aiScene& source, const SceneSettings& settings, Te
         return kBadInput;
     }
     WarnAboutWhatIsLost(source, settings, log);
+    const auto faint = std::count_if(out->materials.begin(), out->materials.end(),
+                                     [](const pod::Material& m) { return !(m.opacity > kLeastOpacity); });
+    if (faint)
+        log->Warn(Plural(static_cast<unsigned>(faint), "material") + " of an opacity up to 0.5: not drawn");
     const FrameTimes frames = PlanSceneFrames(source, settings, skins.Any(), log);
     ConvertNodes(source, parts, skins, frames, settings.cameras, log, out);
     out->textures = textures->Names();
