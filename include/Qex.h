@@ -16,6 +16,9 @@
  * - A GL error is fatal: it is logged with the module and line that found it, and the process ends with
  *   exit status 255.
  * - GL object names and enumerants appear as uint32_t, so this header needs no GL header.
+ * - Names begin with Qex, or with the record that they work on. A few others are exported as well
+ *   (createWindow, fontdata, ...), where a program's own names may be the same: they are declared where
+ *   QEX_UNPREFIXED_NAMES is defined before this header is included.
  */
 #ifndef QEX_H
 #define QEX_H
@@ -48,22 +51,52 @@ typedef struct QexShadowInfo QexShadowInfo;
  * Base: diagnostics, memory, time and float animation
  *
  * Messages go to the Android log; on other hosts the log is standard error, one line a message, as
- * "I/Qex: text" and "E/Qex: text". No GL context needed on this page.
+ * "I/Qex: text" and "E/Qex: text". Everything is written at first; a program chooses how much with
+ * QexLog_SetLevel and where to with QexLog_SetSink. No GL context needed on this page.
  * ====================================================================================================== */
+
+/** Weights of messages. What loaders print counts as an error or a warning when it begins with "ERROR:" or
+ *  "WARNING:", and as information otherwise. */
+#define QEX_LOG_INFO 4
+#define QEX_LOG_WARNING 5
+#define QEX_LOG_ERROR 6
+#define QEX_LOG_NONE 7 /* as a level: nothing */
+
+/** Leaves lighter messages out, wherever the log goes; only the line of a fatal GL error is written at every
+ *  level. Once this function or QexLog_SetSink was called, for good, the engine writes to the log alone: what
+ *  QexSystem_Printf, QexTime_UpdateFPS and the water print goes there once, and not to standard streams.
+ *  @param level  QEX_LOG_..., the lightest to be written; QEX_LOG_INFO at first
+ *  @return the level before. */
+QEX_API int32_t QexLog_SetLevel(int32_t level);
+
+/** Receives the log's messages. It may not call functions of the engine.
+ *  @param user    as given to QexLog_SetSink
+ *  @param weight  QEX_LOG_INFO, QEX_LOG_WARNING or QEX_LOG_ERROR
+ *  @param tag     "Qex", "QexEngine", "Emitter" ..., never null
+ *  @param text    the message without a newline at its end; gone after the call */
+typedef void (*QexLogSink)(void* user, int32_t weight, const char* tag, const char* text);
+
+/** Sends the messages that the level lets through to a function instead of the log; see QexLog_SetLevel for
+ *  what is printed.
+ *  @param sink  null: the log again
+ *  @param user  passed on to it, the application's; may be null */
+QEX_API void QexLog_SetSink(QexLogSink sink, void* user);
 
 /** Writes one message to the log at priority 4 (information).
  *  @param tag     log tag, "Qex" for the engine's own messages; null counts as ""
  *  @param format  printf format, not null; a message has no length limit and needs no trailing newline
- *  @return the log call's result: positive when the message was written, negative on failure. */
+ *  @return the log call's result: positive when the message was written, negative on failure; 0 when the
+ *  level leaves it out. */
 QEX_API int32_t QexLog(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
 
 /** Writes one message to the log at priority 6 (error); otherwise as QexLog.
  *  @param tag     log tag; null counts as ""
  *  @param format  printf format, not null
- *  @return the log call's result: positive when the message was written, negative on failure. */
+ *  @return as QexLog. */
 QEX_API int32_t QexError(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
 
-/** Writes a text to standard output as it stands, then the same text to the log at priority 4, tag "Qex".
+/** Writes a text to standard output as it stands, then the same text to the log at priority 4, tag "Qex"; to
+ *  the log alone after QexLog_SetLevel or QexLog_SetSink.
  *  @param format  printf format, not null
  *  @return always 1. */
 QEX_API int32_t QexSystem_Printf(const char* format, ...) QEX_PRINTF(1, 2);
@@ -456,8 +489,10 @@ QEX_API float Qex_ArcCos(float a);
 /** @return v clamped to the range between a and b, which may come in either order. */
 QEX_API float QexMath_ClampFloat(float v, float a, float b);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** @return 1 when n is a power of two, else 0; 0 for 0. */
 QEX_API uint32_t util_number_is_power_2(uint32_t n);
+#endif
 
 /** @return 1 when the host stores integers little-endian, else 0. */
 QEX_API int32_t QexIsLittleEndian(void);
@@ -510,6 +545,7 @@ QEX_API void QexQuaternion_Slerp(QexQuaternion* out, const QexQuaternion* a, con
  *              degrees. At the poles (Y at +-pi/2) Z is 0 and X has the opposite sign. */
 QEX_API void QexMatrix_ToEulerAnglesXYZ(const QexMatrix* m, float* out);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Both sets of Euler angles of a rotation matrix, for QexMatrix_RotateXYZ.
  *  @param m     rotation matrix, no scale; may be null
  *  @param out1  out, three floats: angles about X, Y, Z in degrees; may be null
@@ -554,6 +590,7 @@ QEX_API int32_t GetTranslationFromMatrix(const QexMatrix* m, QexVec3* out);
  *  @param out  out; may be m; may be null
  *  @return 1, or 0 when a pointer is null. */
 QEX_API int32_t GetTranslationMatrixFromMatrix(const QexMatrix* m, QexMatrix* out);
+#endif
 
 /* ======================================================================================================
  * Math: boxes, planes, equations, random numbers
@@ -649,6 +686,7 @@ QEX_API int32_t QexMath_CalculateInfinitePlane(void* out, int32_t stride, const 
  *  @param n       number of equations; below 1 nothing happens */
 QEX_API void QexMath_LinearEqSolve(float* result, float** rows, int32_t n);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** A random number. The first call seeds the C library's lrand48 generator with the time.
  *  @return 0 to 2147483647. */
 QEX_API int32_t GetRandomNumber(void);
@@ -665,6 +703,7 @@ QEX_API float GetRandomFloatByRange(float min, float max);
  *  @param max  largest result, >= min
  *  @return min to max; up to max + 1 when max is negative. */
 QEX_API int32_t GetRandomInt(int32_t min, int32_t max);
+#endif
 
 /* ======================================================================================================
  * Math: camera
@@ -1621,10 +1660,12 @@ QEX_API extern QexRenderState g_QexCachedRenderStates;
 /** Multiplies the opacity of everything that the shader modules draw; 1.0 at first. Set it with
  *  QexRenderer_SetGlobalAlpha. */
 QEX_API extern float g_fQexGlobalAlpha;
+#ifdef QEX_UNPREFIXED_NAMES
 /** Alpha-test reference for the application; 0.95 at first. The engine does not read it. */
 QEX_API extern float g_fAlphaTestCmpValue;
 /** Specular switch for the application; 0 at first. The engine does not read it. */
 QEX_API extern uint32_t g_bSpecularOn;
+#endif
 
 /** Forgets what is cached, so that the next choices reach GL.
  *  @param context  not read, may be null */
@@ -1902,10 +1943,12 @@ QEX_API void QexTexture_Release(QexTexture* texture);
 /** Names a texture: at most 31 characters. No GL context needed. @return 0. */
 QEX_API int32_t QexTexture_SetName(QexTexture* texture, const char* name);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Finds the last '/', '\\' or ':' of a path. No GL context needed.
  *  @return a pointer to that character (it is part of the result), to the start of the path when there is
  * none after the first character, or null for an empty path. */
 QEX_API const char* GetNameFromFullPath(const char* path);
+#endif
 
 /** @return the white default texture. No GL context needed. */
 QEX_API QexTexture* Qextexture_GetDefault(void);
@@ -2617,9 +2660,11 @@ typedef struct QexModelShadowProgram {
     int32_t mvpMatrixLoc; /* "mvpMatrix" */
 } QexModelShadowProgram;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The shared shadow programs, made with the default shaders. */
 QEX_API extern QexSkinShadowProgram m_SkinShadowShaderProgram;
 QEX_API extern QexModelShadowProgram m_uModelShadowShaderProgram;
+#endif
 
 /** Clears a model record. No GL context needed. @return 0. */
 QEX_API int32_t QexModel_Create(QexModel* model);
@@ -2726,8 +2771,10 @@ typedef struct TransparentSPODNodeInfo {
     int32_t passID; /* pass of the call that put it off */
 } TransparentSPODNodeInfo;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The eye of the last camera that a render call used. */
 QEX_API extern QexVec3 g_VecEyePos;
+#endif
 
 /** Draws the model from a camera, without regard to opacity. */
 QEX_API void QexModel_RenderWithCamera(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
@@ -3273,9 +3320,11 @@ QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
  * a function says not.
  * ====================================================================================================== */
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The font sheet: RGBA8888, 256 x 48, first row first; 32 columns and 3 rows of cells 8 x 16 with the
  *  characters 32 to 127; white, alpha 0 or 255. */
 QEX_API extern const uint8_t fontdata[49152];
+#endif
 
 /** Creates the font for a surface of that size in pixels; the engine's initialisation calls it.
  *  @return 0 (also when it exists already), or -1 when the shaders or memory cannot be had. */
@@ -3456,9 +3505,11 @@ typedef struct QexTex2DShader {
     int32_t mvpMatrixLoc; /* "MVPMatrix" */
 } QexTex2DShader;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** One for the application's use: attributes 0 inVertex, 1 inNormal, 2 inTexCoord, the texture on unit 0.
  * Read only. */
 QEX_API extern QexTex2DShader m_Tex2DShader;
+#endif
 
 /** A program that shows a texture by the pixel's place on the screen. */
 typedef struct QexPlaneTexShader {
@@ -3467,8 +3518,10 @@ typedef struct QexPlaneTexShader {
     int32_t rcpWindowSizeLoc; /* "RcpWindowSize" */
 } QexPlaneTexShader;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The one that draws the water: attribute 0 inVertex, the texture on unit 0. Read only. */
 QEX_API extern QexPlaneTexShader m_PlaneTexShader;
+#endif
 
 /** Makes the sky's cube: six faces of four vertices, each a triangle strip, in the order -Z, +X, +Z, -X, +Y,
  *  -Y. Both arrays are freed by the caller with QexMemory_Free. No GL context needed.
@@ -3536,6 +3589,7 @@ typedef struct QexBillboard {
     float opacity;    /* multiplies the texture's alpha; products of 0.001 and less become 0 */
 } QexBillboard;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** GL names of the shared program and its shaders, 0 while there is none. Read only. */
 QEX_API extern uint32_t g_BillboardVShader;
 QEX_API extern uint32_t g_BillboardFShader;
@@ -3557,6 +3611,7 @@ QEX_API extern const uint8_t g_BB_indices[4];
 /** The directions (0, 1, 0) and (0, 0, 1), which building the program sets. */
 QEX_API extern QexVec3 g_VecUp;
 QEX_API extern QexVec3 g_VecNormal;
+#endif
 
 /** Creates a billboard in mode QEX_BILLBOARD_SCREEN at the origin, of scale 1 and opacity 1.
  *  @param texture  see QexBillboard.texture; null means the default texture
@@ -3794,6 +3849,7 @@ typedef int32_t (*QexSceneCallback)(QexRuntimeContext* context, void* user1, voi
                                     QexShaderModule* shader, QexShaderModule* skinnedShader,
                                     const float* colour);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The targets. 0 and 1: first and second blur pass at half resolution; 2: the sharp picture; 3: the first
  *  blur pass at full resolution, then the depth; 4: the second blur pass at full resolution. */
 QEX_API extern QexRenderTarget PostProcessingRenderTargets[QEX_POST_PROCESSING_TARGETS];
@@ -3812,6 +3868,7 @@ QEX_API extern uint32_t m_iProgNamePP;
  *  3). */
 QEX_API extern const char* pVertexShaderPP;
 QEX_API extern const char* pFragmentShaderPP;
+#endif
 
 /** Creates the quad, the targets and the programs for a screen. What an earlier call made is released first.
  *  @param context  its size is the screen's
@@ -3987,11 +4044,13 @@ QEX_API int32_t QexInitEGL(QexRuntimeContext* context);
 /** Window-system step of QexEngine_Shutdown; does nothing. @return 0. */
 QEX_API int32_t QexShutdownEGL(QexRuntimeContext* context);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Does nothing. @return 0. */
 QEX_API int32_t createWindow(void);
 
 /** Does nothing. @return 0. */
 QEX_API int32_t destroyWindow(void);
+#endif
 
 #ifdef __cplusplus
 }

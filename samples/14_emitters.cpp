@@ -1,5 +1,7 @@
 // Sample 14: a fountain, a fire and its smoke, each an emitter. Their settings are written to files and read
 // back, as an application ships them; textures are not in the files and are set afterwards.
+#define QEX_UNPREFIXED_NAMES
+
 #include <cstdlib>
 
 #include "Sample.h"

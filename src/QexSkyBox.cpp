@@ -191,9 +191,9 @@ void SetWaves() {
     QexVec2 translations[2];
     for (int i = 0; i < 2; ++i)
         translations[i] = {WaveStep(kBumpVelocities[i].x), WaveStep(kBumpVelocities[i].y)};
-    printf("T0:%f, S0:%f, T1:%f, S1:%f\n", static_cast<double>(translations[0].x),
-           static_cast<double>(kBumpScales[0].x), static_cast<double>(translations[1].x),
-           static_cast<double>(kBumpScales[1].x));
+    QexDiagnostics_Print(stdout, "T0:%f, S0:%f, T1:%f, S1:%f\n", static_cast<double>(translations[0].x),
+                         static_cast<double>(kBumpScales[0].x), static_cast<double>(translations[1].x),
+                         static_cast<double>(kBumpScales[1].x));
     for (int i = 0; i < 2; ++i) {
         QEX_GL(glUniform2fv(g_QexWaterProgram.bumpTranslation[i], 1, &translations[i].x));
         QEX_GL(glUniform2fv(g_QexWaterProgram.bumpScale[i], 1, &kBumpScales[i].x));
