@@ -1682,27 +1682,64 @@ QEX_API void QexRenderState_ActiveTexture(uint32_t unit);
  *  @param name    GL name, 0 for none */
 QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
 
+/** Depth functions: how a pixel's depth has to compare with the one that is there for it to be drawn. */
+#define QEX_DEPTH_NEVER 0
+#define QEX_DEPTH_LESS 1
+#define QEX_DEPTH_EQUAL 2
+#define QEX_DEPTH_LESS_EQUAL 3 /* what scenes want */
+#define QEX_DEPTH_GREATER 4
+#define QEX_DEPTH_NOT_EQUAL 5
+#define QEX_DEPTH_GREATER_EQUAL 6
+#define QEX_DEPTH_ALWAYS 7 /* what text and pictures over a scene want */
+
+/** Culling modes: the faces that are left out. The corners of a front face run counter-clockwise. */
+#define QEX_CULL_NONE 0
+#define QEX_CULL_BACK 1
+#define QEX_CULL_FRONT 2
+#define QEX_CULL_BOTH 3
+
+/** Blending modes: what becomes of the colour that is there. */
+#define QEX_BLEND_NONE 0      /* replaced */
+#define QEX_BLEND_ALPHA 1     /* covered as far as the new one's alpha says */
+#define QEX_BLEND_ADD_ALPHA 2 /* the new one times its alpha is added */
+#define QEX_BLEND_ADD 3       /* the new one is added */
+
+/** As alphaMode of QexRenderer_SetAlphaBlendModeSeparate: the alpha that is there stays. */
+#define QEX_BLEND_KEEP_ALPHA 0
+
+/** Blend factors of QexRenderer_SetBlendFactor, GL's own. */
+#define QEX_FACTOR_ZERO 0x0000u
+#define QEX_FACTOR_ONE 0x0001u
+#define QEX_FACTOR_SRC_COLOR 0x0300u
+#define QEX_FACTOR_ONE_MINUS_SRC_COLOR 0x0301u
+#define QEX_FACTOR_SRC_ALPHA 0x0302u
+#define QEX_FACTOR_ONE_MINUS_SRC_ALPHA 0x0303u
+#define QEX_FACTOR_DST_ALPHA 0x0304u
+#define QEX_FACTOR_ONE_MINUS_DST_ALPHA 0x0305u
+#define QEX_FACTOR_DST_COLOR 0x0306u
+#define QEX_FACTOR_ONE_MINUS_DST_COLOR 0x0307u
+#define QEX_FACTOR_SRC_ALPHA_SATURATE 0x0308u
+
 /** Enables the depth test and sets its function.
- *  @param mode  0 never, 1 less, 2 equal, 3 less or equal, 4 greater, 5 not equal, 6 greater or equal,
- *               7 always; any other keeps the function */
+ *  @param mode  QEX_DEPTH_...; any other keeps the function */
 QEX_API void QexRenderer_SetZTestFunc(uint32_t mode);
 
 /** Switches depth writes. @param flag  0 off, any other on */
 QEX_API void QexRenderer_SetZWrite(int32_t flag);
 
-/** Sets face culling. @param mode  0 off, 1 back faces, 2 front faces, 3 both; any other is ignored */
+/** Sets face culling. @param mode  QEX_CULL_...; any other is ignored */
 QEX_API void QexRenderer_SetBackFaceCulling(int32_t mode);
 
-/** Sets GL's blend factors without enabling blending. @param source, destination  GL factors */
+/** Sets GL's blend factors without enabling blending. @param source, destination  QEX_FACTOR_... */
 QEX_API void QexRenderer_SetBlendFactor(uint32_t source, uint32_t destination);
 
-/** Sets blending. @param mode  0 off, 1 source alpha over, 2 additive times alpha, 3 additive; any other is
- *  ignored */
+/** Sets blending. @param mode  QEX_BLEND_NONE to QEX_BLEND_ADD; any other is ignored */
 QEX_API void QexRenderer_SetAlphaBlendMode(int32_t mode);
 
 /** Sets blending apart for colour and alpha.
  *  @param mode       as QexRenderer_SetAlphaBlendMode
- *  @param alphaMode  1 to 3 likewise for the alpha channel; any other keeps the destination's alpha */
+ *  @param alphaMode  QEX_BLEND_ALPHA to QEX_BLEND_ADD likewise for the alpha channel; any other is
+ *                    QEX_BLEND_KEEP_ALPHA */
 QEX_API void QexRenderer_SetAlphaBlendModeSeparate(int32_t mode, uint32_t alphaMode);
 
 /** Sets g_fQexGlobalAlpha. @return the value before. No GL context needed. */
@@ -2750,6 +2787,76 @@ QEX_API uint32_t QexModel_GetNumNodes(const QexModel* model);
 QEX_API uint32_t QexModel_GetNumMeshNodes(const QexModel* model);
 
 /* ======================================================================================================
+ * Models from arrays
+ *
+ * Geometry that the application makes: a mesh of plain arrays becomes a model in one call. Boxes, spheres,
+ * cylinders and planes are there to begin with. Their textures stand upright where the first row is the lower
+ * edge, as `qex convert` and `qex texture --flip` write them. Front faces are counter-clockwise.
+ * ====================================================================================================== */
+
+/** What 16-bit indices reach. */
+#define QEX_MESH_MAX_VERTICES 65536u
+
+/** A mesh. Zero it and set what there is; the arrays stay the application's. */
+typedef struct QexMesh {
+    uint32_t vertexCount;     /* 1 to QEX_MESH_MAX_VERTICES */
+    const QexVec3* positions; /* not null */
+    const QexVec3* normals;   /* of unit length; null: the model is drawn unlit */
+    const QexVec2* uvs;       /* texture coordinates; null: none */
+    const uint32_t* colours;  /* 0xAARRGGBB a vertex; null: white */
+    uint32_t indexCount;      /* three a triangle; 0: each three vertices are one */
+    const uint16_t* indices;  /* null where the count is 0 */
+    void* memory;             /* arrays that QexMesh_Create... made, else null */
+} QexMesh;
+
+/** Makes the mesh of a box around the origin: 24 vertices, on each face the whole texture.
+ *  @param mesh  out; what it held is overwritten, not released. Release with QexMesh_Release
+ *  @param width, height, depth  along x, y and z, > 0
+ *  @return 0; -1, with a line in the log and an empty mesh, for sizes that are not above 0 or when memory
+ *  runs out. No GL context needed. */
+QEX_API int32_t QexMesh_CreateBox(QexMesh* mesh, float width, float height, float depth);
+
+/** Makes the mesh of a sphere around the origin: the texture once around from west to east, seen from
+ *  outside, its lower edge at the pole -Y and its middle in the direction +Z.
+ *  @param radius    > 0
+ *  @param segments  3 to 128 from pole to pole, twice as many around
+ *  @return as QexMesh_CreateBox, which says the rest; -1 also for other segments. */
+QEX_API int32_t QexMesh_CreateSphere(QexMesh* mesh, float radius, uint32_t segments);
+
+/** Makes the mesh of a cylinder about the y axis, its middle in the origin, closed by two discs: the texture
+ *  once around its side, and its inscribed circle on each disc.
+ *  @param radius, height  > 0
+ *  @param segments        around, 3 to 4096
+ *  @return as QexMesh_CreateSphere. */
+QEX_API int32_t QexMesh_CreateCylinder(QexMesh* mesh, float radius, float height, uint32_t segments);
+
+/** Makes the mesh of a rectangle at y = 0 around the origin that is seen from above, the texture's lower edge
+ *  towards +Z.
+ *  @param width, depth  along x and z, > 0
+ *  @param segments      cells along each side, 1 to 255; vertex lighting gets finer with them
+ *  @param repeat        how often the texture goes along each side
+ *  @return as QexMesh_CreateSphere. */
+QEX_API int32_t QexMesh_CreatePlane(QexMesh* mesh, float width, float depth, uint32_t segments, float repeat);
+
+/** Frees what QexMesh_Create... made and empties the mesh; the application's own arrays are left alone.
+ *  @param mesh  null does nothing. No GL context needed. */
+QEX_API void QexMesh_Release(QexMesh* mesh);
+
+/** Makes a model of a mesh: one mesh node, "mesh", with a white material of ambient 0.2 and diffuse 0.8. It
+ * is drawn, moved, picked and unloaded like any other. With normals its module is lit (an even 0.2 where no
+ *  lights are given), without them unlit; meshes with normals and texture coordinates get tangents, for
+ *  QexGouraudNormalMapShader. No module reads vertex colours: one colour for all vertices becomes a texture
+ * of one pixel, others a texture with a patch for each triangle, whose vertices are parted then, so that at
+ * most 21,845 triangles can have colours. The mesh is copied.
+ *  @param model    cleared first; unload before what it holds
+ *  @param mesh     arrays of at least the counts; vertices that no index names are allowed
+ *  @param texture  stays the application's, alive as long as the model; colours are left out with it, with a
+ *                  line in the log; null: the colours, or white
+ *  @return 0; -1, with a line in the log and an empty model, for null pointers, counts out of range, an index
+ *  that names no vertex, or when memory runs out. Needs a current GL context. */
+QEX_API int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh, QexTexture* texture);
+
+/* ======================================================================================================
  * Models: rendering
  *
  * The render calls draw mesh nodes in index order, each through its shader module. A `pass` argument draws
@@ -3401,6 +3508,45 @@ QEX_API int32_t QexTexture_Draw2(const QexRuntimeContext* context, QexTexture* t
                                  float scaleX, float scaleY, uint32_t colour);
 
 /* ======================================================================================================
+ * Pictures on the screen
+ *
+ * Images of a HUD from files. Texture files may begin with the picture's upper edge (`qex texture` as it is)
+ * or with its lower one (`qex texture --flip`, `qex convert`, TGA) and say so in their header. GL and
+ * QexTexture_Draw take the first row for the lower edge; a picture remembers, and stands upright either way.
+ * Blending, depth test and culling are left as the application sets them.
+ * ====================================================================================================== */
+
+/** A picture. */
+typedef struct QexPicture {
+    QexTexture texture;
+    QexTexture alpha;  /* from the second file of a picture without alpha of its own; glName 0 for none */
+    uint32_t topFirst; /* 1: the first row is the upper edge */
+} QexPicture;
+
+/** Loads a picture from a PVR, KTX or TGA file, and its alpha from the file with "_a" before the extension if
+ *  there is one, as `qex texture --format etc1` writes it. It is filtered linearly and clamped.
+ *  @param picture  out; what it held is overwritten, not released
+ *  @param path     at most 255 characters
+ *  @return 0; -1, with a line in the log and an empty picture, when it cannot be loaded. Needs a current GL
+ *  context; release with QexPicture_Release. */
+QEX_API int32_t QexPicture_Load(QexPicture* picture, const char* path);
+
+/** Draws a picture, or a part of it, upright.
+ *  @param context        its size is the screen's
+ *  @param picture        loaded; null: a plain rectangle in the colour
+ *  @param part           pixels of the picture, within it, right and bottom included; null: all of it
+ *  @param x, y           upper left corner, pixels from the screen's upper left
+ *  @param width, height  pixels on the screen, > 0; 0 both: as many as the picture's
+ *  @param colour         0xAARRGGBB, multiplied; 0xFFFFFFFF as it is
+ *  @return 0; -1, with a line in the log and nothing drawn, without a context or for an empty picture, a part
+ *  that is not within it, or no size. Needs a current GL context without bound buffers. */
+QEX_API int32_t QexPicture_Draw(const QexRuntimeContext* context, QexPicture* picture, const QexRect* part,
+                                float x, float y, float width, float height, uint32_t colour);
+
+/** Releases a picture's textures and empties it. @param picture  null does nothing */
+QEX_API void QexPicture_Release(QexPicture* picture);
+
+/* ======================================================================================================
  * Render targets
  *
  * Framebuffers to draw into instead of the screen, with an RGBA texture for colour and a 16-bit depth buffer.
@@ -4022,6 +4168,16 @@ QEX_API int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, 
  *  textures, font. Arguments and result as QexEngine_Init. */
 QEX_API int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSize,
                                            QexEngineConfig* config);
+
+/** Tells the engine that the drawing surface has another size. The context's size, the text with its standing
+ *  strings, stereo and everything else that reads the context follow; so does post-processing that was
+ *  initialised at the former size, with the filters of its targets. Cameras, the GL viewport and the
+ *  application's own render targets do not: project and set them anew. Needs a current GL context.
+ *  @param context        initialised
+ *  @param width, height  pixels, 1 and more
+ *  @return 0; -1, with a line in the log and nothing changed, for a smaller size or a null context; -1 when
+ *  post-processing cannot be had at the new size. */
+QEX_API int32_t QexEngine_Resize(QexRuntimeContext* context, int32_t width, int32_t height);
 
 /** Ends what QexEngine_Init began. Models must be unloaded before: their shared shaders go with it. */
 QEX_API void QexEngine_Shutdown(QexRuntimeContext* context);

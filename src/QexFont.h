@@ -18,3 +18,7 @@ struct QexFontProgram {
 };
 
 const QexFontProgram* QexFont_GetProgram();
+
+// Follows a screen of another size: the projection, and the standing text, which stays at its distance from
+// the upper edge. Without a font nothing happens.
+void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore);
