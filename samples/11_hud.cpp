@@ -1,15 +1,6 @@
 // Sample 11: images and text over a scene. A frame, a gauge that shows part of its image, a round picture cut
 // out by an alpha texture, a caption that stays, and numbers and text that are drawn for one frame only.
-#include <cstdio>
-
 #include "window.h"
-
-// Loads a picture, whose file says which way up it is.
-static bool Load(const Window& window, QexPicture* picture, const char* name) {
-    char path[256];
-    snprintf(path, sizeof path, "%s%s", window.files, name);
-    return QexPicture_Load(picture, path) == 0;
-}
 
 int main(int argc, char** argv) {
     Window window;
@@ -17,7 +8,8 @@ int main(int argc, char** argv) {
     QexModel cubes;
     Window_LoadModel(&window, &cubes, "grid.pod");
     QexPicture gauge, view;  // view_a.pvr cuts the view out
-    if (!Load(window, &gauge, "gauge.pvr") || !Load(window, &view, "view.pvr")) return 1;
+    Window_LoadPicture(&window, &gauge, "gauge.pvr");
+    Window_LoadPicture(&window, &view, "view.pvr");
 
     QexRuntimeContext* engine = &window.engine;
     // A line of text begins 32 pixels further up than its y says.

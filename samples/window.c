@@ -166,6 +166,12 @@ void Window_LoadTexture(const Window* window, QexTexture* texture, const char* n
     QexTexture_SetWrapping(texture, QEX_WRAP_CLAMP);
 }
 
+void Window_LoadPicture(const Window* window, QexPicture* picture, const char* name) {
+    char path[sizeof s_Files + 64];
+    snprintf(path, sizeof path, "%s%s", window->files, name);
+    if (QexPicture_Load(picture, path) != 0) exit(Fail(path, "cannot be loaded"));
+}
+
 void Window_LoadModel(const Window* window, QexModel* model, const char* name) {
     QexModel_Create(model);
     if (QexModel_LoadContent(model, window->files, name) != 0) exit(Fail(name, "cannot be loaded"));

@@ -37,6 +37,9 @@ QexCamera Window_Camera(const Window* window, QexVec3 eye, QexVec3 target);
 /* Loads a PVR file of the samples, linearly filtered and clamped; the program ends where that fails. */
 void Window_LoadTexture(const Window* window, QexTexture* texture, const char* name);
 
+/* Loads a picture of the samples; the program ends where that fails. */
+void Window_LoadPicture(const Window* window, QexPicture* picture, const char* name);
+
 /* Loads a scene of the samples with its textures; the program ends where that fails. */
 void Window_LoadModel(const Window* window, QexModel* model, const char* name);
 
