@@ -4,7 +4,11 @@
 #include <string.h>
 
 #include <GLES2/gl2.h>
+#include <Qex.h>
 #include <SDL.h>
+
+/* A program's own names, which the header would clash with if it declared them unasked. */
+enum { createWindow, destroyWindow, fontdata, GetRandomInt, GetScaleFromMatrix, blurShaderProgram, g_VecUp };
 
 void __wrap_SDL_GL_SwapWindow(SDL_Window* window);
 
