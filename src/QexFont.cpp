@@ -152,7 +152,7 @@ void PointAt(int32_t location, GLint size, const void* data) {
 }
 
 void SetState() {
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     QexRenderState_UseProgram(s_Program.program);
 }
 

@@ -77,7 +77,7 @@ QexMatrix ViewProjection() {
 void BindTarget(GLuint framebuffer) {
     // Whatever the application's last frame ended with.
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, framebuffer));
     QEX_GL(glViewport(0, 0, kTargetSize, kTargetSize));
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
@@ -86,8 +86,8 @@ void BindTarget(GLuint framebuffer) {
 void BindScreen(const QexRuntimeContext* context) {
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(s_SavedFramebuffer)));
     QEX_GL(glViewport(0, 0, context->width, context->height));
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetBackFaceCulling(1);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
 }
 
 void DrawSky(const QexSkyBox& box) {
@@ -114,7 +114,7 @@ void DrawScene(QexSkyBox* box) {
     if (box->drawScene) box->drawScene(box, &s_View, &s_Projection);
     const QexCamera& camera = *box->camera;
     QexMatrix_Perspective(&s_Projection, camera.fov, camera.aspect, camera.nearPlane, camera.farPlane);
-    QexRenderer_SetBackFaceCulling(1);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
     DrawSky(*box);
 }
 
@@ -179,7 +179,7 @@ void DrawReflection(QexSkyBox* box) {
     SetCamera(*box->camera);
     MirrorView();
     ClipAtWater(box->camera->farPlane);
-    QexRenderer_SetBackFaceCulling(2);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_FRONT);
     DrawScene(box);
 }
 
@@ -285,9 +285,9 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
     if (!CreateTarget(&s_Reflection) || !CreateTarget(&s_Surface)) return -1;
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetBackFaceCulling(1);
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     s_Drawable = linked;
     return 0;
 }

@@ -298,7 +298,7 @@ TEST_F(PictureTest, StandUprightWhicheverRowComesFirst) {
         expected.Fill(40, 21, 42, 22, blue);
         expected.Fill(60, 20, 66, 24, green);
         Clear();
-        QexRenderer_SetAlphaBlendMode(0);
+        QexRenderer_SetAlphaBlendMode(QEX_BLEND_NONE);
         const auto draw = [&](const QexRect* part, float x, float width, float height) {
             EXPECT_EQ(QexPicture_Draw(&runtime_, &picture, part, x, 20, width, height, 0xFFFFFFFF), 0);
         };
@@ -321,7 +321,7 @@ TEST_F(PictureTest, AlphaFileRectanglesAndErrors) {
     QexPicture picture;
     ASSERT_EQ(QexPicture_Load(&picture, path.c_str()), 0);
     Clear(1, 1, 1, 1);
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     EXPECT_EQ(QexPicture_Draw(&runtime_, &picture, nullptr, 10, 20, 10, 30, 0xFFFFFFFF), 0);
     EXPECT_EQ(QexPicture_Draw(&runtime_, nullptr, nullptr, 40, 20, 3, 2, 0xFF102030), 0);
     const Picture drawn = Read();
