@@ -48,7 +48,7 @@ int main(int argc, char** argv) {
     View view = {&engine.model, &camera};
     s_View = &view;
     if (QexPostProcessing_Initialize(&engine.context) != 0) abort();
-    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
 
     for (const bool half : {false, true}) {
         const auto draw = [&engine, half] {

@@ -16,6 +16,9 @@
  * - A GL error is fatal: it is logged with the module and line that found it, and the process ends with
  *   exit status 255.
  * - GL object names and enumerants appear as uint32_t, so this header needs no GL header.
+ * - Names begin with Qex, or with the record that they work on. A few others are exported as well
+ *   (createWindow, fontdata, ...), where a program's own names may be the same: they are declared where
+ *   QEX_UNPREFIXED_NAMES is defined before this header is included.
  */
 #ifndef QEX_H
 #define QEX_H
@@ -48,22 +51,52 @@ typedef struct QexShadowInfo QexShadowInfo;
  * Base: diagnostics, memory, time and float animation
  *
  * Messages go to the Android log; on other hosts the log is standard error, one line a message, as
- * "I/Qex: text" and "E/Qex: text". No GL context needed on this page.
+ * "I/Qex: text" and "E/Qex: text". Everything is written at first; a program chooses how much with
+ * QexLog_SetLevel and where to with QexLog_SetSink. No GL context needed on this page.
  * ====================================================================================================== */
+
+/** Weights of messages. What loaders print counts as an error or a warning when it begins with "ERROR:" or
+ *  "WARNING:", and as information otherwise. */
+#define QEX_LOG_INFO 4
+#define QEX_LOG_WARNING 5
+#define QEX_LOG_ERROR 6
+#define QEX_LOG_NONE 7 /* as a level: nothing */
+
+/** Leaves lighter messages out, wherever the log goes; only the line of a fatal GL error is written at every
+ *  level. Once this function or QexLog_SetSink was called, for good, the engine writes to the log alone: what
+ *  QexSystem_Printf, QexTime_UpdateFPS and the water print goes there once, and not to standard streams.
+ *  @param level  QEX_LOG_..., the lightest to be written; QEX_LOG_INFO at first
+ *  @return the level before. */
+QEX_API int32_t QexLog_SetLevel(int32_t level);
+
+/** Receives the log's messages. It may not call functions of the engine.
+ *  @param user    as given to QexLog_SetSink
+ *  @param weight  QEX_LOG_INFO, QEX_LOG_WARNING or QEX_LOG_ERROR
+ *  @param tag     "Qex", "QexEngine", "Emitter" ..., never null
+ *  @param text    the message without a newline at its end; gone after the call */
+typedef void (*QexLogSink)(void* user, int32_t weight, const char* tag, const char* text);
+
+/** Sends the messages that the level lets through to a function instead of the log; see QexLog_SetLevel for
+ *  what is printed.
+ *  @param sink  null: the log again
+ *  @param user  passed on to it, the application's; may be null */
+QEX_API void QexLog_SetSink(QexLogSink sink, void* user);
 
 /** Writes one message to the log at priority 4 (information).
  *  @param tag     log tag, "Qex" for the engine's own messages; null counts as ""
  *  @param format  printf format, not null; a message has no length limit and needs no trailing newline
- *  @return the log call's result: positive when the message was written, negative on failure. */
+ *  @return the log call's result: positive when the message was written, negative on failure; 0 when the
+ *  level leaves it out. */
 QEX_API int32_t QexLog(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
 
 /** Writes one message to the log at priority 6 (error); otherwise as QexLog.
  *  @param tag     log tag; null counts as ""
  *  @param format  printf format, not null
- *  @return the log call's result: positive when the message was written, negative on failure. */
+ *  @return as QexLog. */
 QEX_API int32_t QexError(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
 
-/** Writes a text to standard output as it stands, then the same text to the log at priority 4, tag "Qex".
+/** Writes a text to standard output as it stands, then the same text to the log at priority 4, tag "Qex"; to
+ *  the log alone after QexLog_SetLevel or QexLog_SetSink.
  *  @param format  printf format, not null
  *  @return always 1. */
 QEX_API int32_t QexSystem_Printf(const char* format, ...) QEX_PRINTF(1, 2);
@@ -456,8 +489,10 @@ QEX_API float Qex_ArcCos(float a);
 /** @return v clamped to the range between a and b, which may come in either order. */
 QEX_API float QexMath_ClampFloat(float v, float a, float b);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** @return 1 when n is a power of two, else 0; 0 for 0. */
 QEX_API uint32_t util_number_is_power_2(uint32_t n);
+#endif
 
 /** @return 1 when the host stores integers little-endian, else 0. */
 QEX_API int32_t QexIsLittleEndian(void);
@@ -510,6 +545,7 @@ QEX_API void QexQuaternion_Slerp(QexQuaternion* out, const QexQuaternion* a, con
  *              degrees. At the poles (Y at +-pi/2) Z is 0 and X has the opposite sign. */
 QEX_API void QexMatrix_ToEulerAnglesXYZ(const QexMatrix* m, float* out);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Both sets of Euler angles of a rotation matrix, for QexMatrix_RotateXYZ.
  *  @param m     rotation matrix, no scale; may be null
  *  @param out1  out, three floats: angles about X, Y, Z in degrees; may be null
@@ -554,6 +590,7 @@ QEX_API int32_t GetTranslationFromMatrix(const QexMatrix* m, QexVec3* out);
  *  @param out  out; may be m; may be null
  *  @return 1, or 0 when a pointer is null. */
 QEX_API int32_t GetTranslationMatrixFromMatrix(const QexMatrix* m, QexMatrix* out);
+#endif
 
 /* ======================================================================================================
  * Math: boxes, planes, equations, random numbers
@@ -649,6 +686,7 @@ QEX_API int32_t QexMath_CalculateInfinitePlane(void* out, int32_t stride, const 
  *  @param n       number of equations; below 1 nothing happens */
 QEX_API void QexMath_LinearEqSolve(float* result, float** rows, int32_t n);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** A random number. The first call seeds the C library's lrand48 generator with the time.
  *  @return 0 to 2147483647. */
 QEX_API int32_t GetRandomNumber(void);
@@ -665,6 +703,7 @@ QEX_API float GetRandomFloatByRange(float min, float max);
  *  @param max  largest result, >= min
  *  @return min to max; up to max + 1 when max is negative. */
 QEX_API int32_t GetRandomInt(int32_t min, int32_t max);
+#endif
 
 /* ======================================================================================================
  * Math: camera
@@ -1625,10 +1664,12 @@ QEX_API extern QexRenderState g_QexCachedRenderStates;
 /** Multiplies the opacity of everything that the shader modules draw; 1.0 at first. Set it with
  *  QexRenderer_SetGlobalAlpha. */
 QEX_API extern float g_fQexGlobalAlpha;
+#ifdef QEX_UNPREFIXED_NAMES
 /** Alpha-test reference for the application; 0.95 at first. The engine does not read it. */
 QEX_API extern float g_fAlphaTestCmpValue;
 /** Specular switch for the application; 0 at first. The engine does not read it. */
 QEX_API extern uint32_t g_bSpecularOn;
+#endif
 
 /** Forgets what is cached, so that the next choices reach GL.
  *  @param context  not read, may be null */
@@ -1645,27 +1686,64 @@ QEX_API void QexRenderState_ActiveTexture(uint32_t unit);
  *  @param name    GL name, 0 for none */
 QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
 
+/** Depth functions: how a pixel's depth has to compare with the one that is there for it to be drawn. */
+#define QEX_DEPTH_NEVER 0
+#define QEX_DEPTH_LESS 1
+#define QEX_DEPTH_EQUAL 2
+#define QEX_DEPTH_LESS_EQUAL 3 /* what scenes want */
+#define QEX_DEPTH_GREATER 4
+#define QEX_DEPTH_NOT_EQUAL 5
+#define QEX_DEPTH_GREATER_EQUAL 6
+#define QEX_DEPTH_ALWAYS 7 /* what text and pictures over a scene want */
+
+/** Culling modes: the faces that are left out. The corners of a front face run counter-clockwise. */
+#define QEX_CULL_NONE 0
+#define QEX_CULL_BACK 1
+#define QEX_CULL_FRONT 2
+#define QEX_CULL_BOTH 3
+
+/** Blending modes: what becomes of the colour that is there. */
+#define QEX_BLEND_NONE 0      /* replaced */
+#define QEX_BLEND_ALPHA 1     /* covered as far as the new one's alpha says */
+#define QEX_BLEND_ADD_ALPHA 2 /* the new one times its alpha is added */
+#define QEX_BLEND_ADD 3       /* the new one is added */
+
+/** As alphaMode of QexRenderer_SetAlphaBlendModeSeparate: the alpha that is there stays. */
+#define QEX_BLEND_KEEP_ALPHA 0
+
+/** Blend factors of QexRenderer_SetBlendFactor, GL's own. */
+#define QEX_FACTOR_ZERO 0x0000u
+#define QEX_FACTOR_ONE 0x0001u
+#define QEX_FACTOR_SRC_COLOR 0x0300u
+#define QEX_FACTOR_ONE_MINUS_SRC_COLOR 0x0301u
+#define QEX_FACTOR_SRC_ALPHA 0x0302u
+#define QEX_FACTOR_ONE_MINUS_SRC_ALPHA 0x0303u
+#define QEX_FACTOR_DST_ALPHA 0x0304u
+#define QEX_FACTOR_ONE_MINUS_DST_ALPHA 0x0305u
+#define QEX_FACTOR_DST_COLOR 0x0306u
+#define QEX_FACTOR_ONE_MINUS_DST_COLOR 0x0307u
+#define QEX_FACTOR_SRC_ALPHA_SATURATE 0x0308u
+
 /** Enables the depth test and sets its function.
- *  @param mode  0 never, 1 less, 2 equal, 3 less or equal, 4 greater, 5 not equal, 6 greater or equal,
- *               7 always; any other keeps the function */
+ *  @param mode  QEX_DEPTH_...; any other keeps the function */
 QEX_API void QexRenderer_SetZTestFunc(uint32_t mode);
 
 /** Switches depth writes. @param flag  0 off, any other on */
 QEX_API void QexRenderer_SetZWrite(int32_t flag);
 
-/** Sets face culling. @param mode  0 off, 1 back faces, 2 front faces, 3 both; any other is ignored */
+/** Sets face culling. @param mode  QEX_CULL_...; any other is ignored */
 QEX_API void QexRenderer_SetBackFaceCulling(int32_t mode);
 
-/** Sets GL's blend factors without enabling blending. @param source, destination  GL factors */
+/** Sets GL's blend factors without enabling blending. @param source, destination  QEX_FACTOR_... */
 QEX_API void QexRenderer_SetBlendFactor(uint32_t source, uint32_t destination);
 
-/** Sets blending. @param mode  0 off, 1 source alpha over, 2 additive times alpha, 3 additive; any other is
- *  ignored */
+/** Sets blending. @param mode  QEX_BLEND_NONE to QEX_BLEND_ADD; any other is ignored */
 QEX_API void QexRenderer_SetAlphaBlendMode(int32_t mode);
 
 /** Sets blending apart for colour and alpha.
  *  @param mode       as QexRenderer_SetAlphaBlendMode
- *  @param alphaMode  1 to 3 likewise for the alpha channel; any other keeps the destination's alpha */
+ *  @param alphaMode  QEX_BLEND_ALPHA to QEX_BLEND_ADD likewise for the alpha channel; any other is
+ *                    QEX_BLEND_KEEP_ALPHA */
 QEX_API void QexRenderer_SetAlphaBlendModeSeparate(int32_t mode, uint32_t alphaMode);
 
 /** Sets g_fQexGlobalAlpha. @return the value before. No GL context needed. */
@@ -1906,10 +1984,12 @@ QEX_API void QexTexture_Release(QexTexture* texture);
 /** Names a texture: at most 31 characters. No GL context needed. @return 0. */
 QEX_API int32_t QexTexture_SetName(QexTexture* texture, const char* name);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Finds the last '/', '\\' or ':' of a path. No GL context needed.
  *  @return a pointer to that character (it is part of the result), to the start of the path when there is
  * none after the first character, or null for an empty path. */
 QEX_API const char* GetNameFromFullPath(const char* path);
+#endif
 
 /** @return the white default texture. No GL context needed. */
 QEX_API QexTexture* Qextexture_GetDefault(void);
@@ -2641,9 +2721,11 @@ typedef struct QexModelShadowProgram {
     int32_t mvpMatrixLoc; /* "mvpMatrix" */
 } QexModelShadowProgram;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The shared shadow programs, made with the default shaders. */
 QEX_API extern QexSkinShadowProgram m_SkinShadowShaderProgram;
 QEX_API extern QexModelShadowProgram m_uModelShadowShaderProgram;
+#endif
 
 /** Clears a model record. No GL context needed. @return 0. */
 QEX_API int32_t QexModel_Create(QexModel* model);
@@ -2732,6 +2814,76 @@ QEX_API uint32_t QexModel_GetNumNodes(const QexModel* model);
 QEX_API uint32_t QexModel_GetNumMeshNodes(const QexModel* model);
 
 /* ======================================================================================================
+ * Models from arrays
+ *
+ * Geometry that the application makes: a mesh of plain arrays becomes a model in one call. Boxes, spheres,
+ * cylinders and planes are there to begin with. Their textures stand upright where the first row is the lower
+ * edge, as `qex convert` and `qex texture --flip` write them. Front faces are counter-clockwise.
+ * ====================================================================================================== */
+
+/** What 16-bit indices reach. */
+#define QEX_MESH_MAX_VERTICES 65536u
+
+/** A mesh. Zero it and set what there is; the arrays stay the application's. */
+typedef struct QexMesh {
+    uint32_t vertexCount;     /* 1 to QEX_MESH_MAX_VERTICES */
+    const QexVec3* positions; /* not null */
+    const QexVec3* normals;   /* of unit length; null: the model is drawn unlit */
+    const QexVec2* uvs;       /* texture coordinates; null: none */
+    const uint32_t* colours;  /* 0xAARRGGBB a vertex; null: white */
+    uint32_t indexCount;      /* three a triangle; 0: each three vertices are one */
+    const uint16_t* indices;  /* null where the count is 0 */
+    void* memory;             /* arrays that QexMesh_Create... made, else null */
+} QexMesh;
+
+/** Makes the mesh of a box around the origin: 24 vertices, on each face the whole texture.
+ *  @param mesh  out; what it held is overwritten, not released. Release with QexMesh_Release
+ *  @param width, height, depth  along x, y and z, > 0
+ *  @return 0; -1, with a line in the log and an empty mesh, for sizes that are not above 0 or when memory
+ *  runs out. No GL context needed. */
+QEX_API int32_t QexMesh_CreateBox(QexMesh* mesh, float width, float height, float depth);
+
+/** Makes the mesh of a sphere around the origin: the texture once around from west to east, seen from
+ *  outside, its lower edge at the pole -Y and its middle in the direction +Z.
+ *  @param radius    > 0
+ *  @param segments  3 to 128 from pole to pole, twice as many around
+ *  @return as QexMesh_CreateBox, which says the rest; -1 also for other segments. */
+QEX_API int32_t QexMesh_CreateSphere(QexMesh* mesh, float radius, uint32_t segments);
+
+/** Makes the mesh of a cylinder about the y axis, its middle in the origin, closed by two discs: the texture
+ *  once around its side, and its inscribed circle on each disc.
+ *  @param radius, height  > 0
+ *  @param segments        around, 3 to 4096
+ *  @return as QexMesh_CreateSphere. */
+QEX_API int32_t QexMesh_CreateCylinder(QexMesh* mesh, float radius, float height, uint32_t segments);
+
+/** Makes the mesh of a rectangle at y = 0 around the origin that is seen from above, the texture's lower edge
+ *  towards +Z.
+ *  @param width, depth  along x and z, > 0
+ *  @param segments      cells along each side, 1 to 255; vertex lighting gets finer with them
+ *  @param repeat        how often the texture goes along each side
+ *  @return as QexMesh_CreateSphere. */
+QEX_API int32_t QexMesh_CreatePlane(QexMesh* mesh, float width, float depth, uint32_t segments, float repeat);
+
+/** Frees what QexMesh_Create... made and empties the mesh; the application's own arrays are left alone.
+ *  @param mesh  null does nothing. No GL context needed. */
+QEX_API void QexMesh_Release(QexMesh* mesh);
+
+/** Makes a model of a mesh: one mesh node, "mesh", with a white material of ambient 0.2 and diffuse 0.8. It
+ * is drawn, moved, picked and unloaded like any other. With normals its module is lit (an even 0.2 where no
+ *  lights are given), without them unlit; meshes with normals and texture coordinates get tangents, for
+ *  QexGouraudNormalMapShader. No module reads vertex colours: one colour for all vertices becomes a texture
+ * of one pixel, others a texture with a patch for each triangle, whose vertices are parted then, so that at
+ * most 21,845 triangles can have colours. The mesh is copied.
+ *  @param model    cleared first; unload before what it holds
+ *  @param mesh     arrays of at least the counts; vertices that no index names are allowed
+ *  @param texture  stays the application's, alive as long as the model; colours are left out with it, with a
+ *                  line in the log; null: the colours, or white
+ *  @return 0; -1, with a line in the log and an empty model, for null pointers, counts out of range, an index
+ *  that names no vertex, or when memory runs out. Needs a current GL context. */
+QEX_API int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh, QexTexture* texture);
+
+/* ======================================================================================================
  * Models: rendering
  *
  * The render calls draw mesh nodes in index order, each through its shader module. A `pass` argument draws
@@ -2753,8 +2905,10 @@ typedef struct TransparentSPODNodeInfo {
     int32_t passID; /* pass of the call that put it off */
 } TransparentSPODNodeInfo;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The eye of the last camera that a render call used. */
 QEX_API extern QexVec3 g_VecEyePos;
+#endif
 
 /** Draws the model from a camera, without regard to opacity. */
 QEX_API void QexModel_RenderWithCamera(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
@@ -3308,9 +3462,11 @@ QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
  * current GL context, except where a function says not.
  * ====================================================================================================== */
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The font sheet: RGBA8888, 256 x 48, first row first; 32 columns and 3 rows of cells 8 x 16 with the
  *  characters 32 to 127; white, alpha 0 or 255. */
 QEX_API extern const uint8_t fontdata[49152];
+#endif
 
 /** Creates the font for a surface of that size in pixels; the engine's initialisation calls it.
  *  @return 0 (also when it exists already), or -1 when the shaders or memory cannot be had. */
@@ -3398,6 +3554,45 @@ QEX_API int32_t QexTexture_Draw(const QexRuntimeContext* context, QexTexture* te
 QEX_API int32_t QexTexture_Draw2(const QexRuntimeContext* context, QexTexture* texture,
                                  QexTexture* alphaTexture, float x, float y, const QexRect* rectangle,
                                  float scaleX, float scaleY, uint32_t colour);
+
+/* ======================================================================================================
+ * Pictures on the screen
+ *
+ * Images of a HUD from files. Texture files may begin with the picture's upper edge (`qex texture` as it is)
+ * or with its lower one (`qex texture --flip`, `qex convert`, TGA) and say so in their header. GL and
+ * QexTexture_Draw take the first row for the lower edge; a picture remembers, and stands upright either way.
+ * Blending, depth test and culling are left as the application sets them.
+ * ====================================================================================================== */
+
+/** A picture. */
+typedef struct QexPicture {
+    QexTexture texture;
+    QexTexture alpha;  /* from the second file of a picture without alpha of its own; glName 0 for none */
+    uint32_t topFirst; /* 1: the first row is the upper edge */
+} QexPicture;
+
+/** Loads a picture from a PVR, KTX or TGA file, and its alpha from the file with "_a" before the extension if
+ *  there is one, as `qex texture --format etc1` writes it. It is filtered linearly and clamped.
+ *  @param picture  out; what it held is overwritten, not released
+ *  @param path     at most 255 characters
+ *  @return 0; -1, with a line in the log and an empty picture, when it cannot be loaded. Needs a current GL
+ *  context; release with QexPicture_Release. */
+QEX_API int32_t QexPicture_Load(QexPicture* picture, const char* path);
+
+/** Draws a picture, or a part of it, upright.
+ *  @param context        its size is the screen's
+ *  @param picture        loaded; null: a plain rectangle in the colour
+ *  @param part           pixels of the picture, within it, right and bottom included; null: all of it
+ *  @param x, y           upper left corner, pixels from the screen's upper left
+ *  @param width, height  pixels on the screen, > 0; 0 both: as many as the picture's
+ *  @param colour         0xAARRGGBB, multiplied; 0xFFFFFFFF as it is
+ *  @return 0; -1, with a line in the log and nothing drawn, without a context or for an empty picture, a part
+ *  that is not within it, or no size. Needs a current GL context without bound buffers. */
+QEX_API int32_t QexPicture_Draw(const QexRuntimeContext* context, QexPicture* picture, const QexRect* part,
+                                float x, float y, float width, float height, uint32_t colour);
+
+/** Releases a picture's textures and empties it. @param picture  null does nothing */
+QEX_API void QexPicture_Release(QexPicture* picture);
 
 /* ======================================================================================================
  * Render targets
@@ -3505,9 +3700,11 @@ typedef struct QexTex2DShader {
     int32_t mvpMatrixLoc; /* "MVPMatrix" */
 } QexTex2DShader;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** One for the application's use: attributes 0 inVertex, 1 inNormal, 2 inTexCoord, the texture on unit 0.
  * Read only. */
 QEX_API extern QexTex2DShader m_Tex2DShader;
+#endif
 
 /** A program that shows a texture by the pixel's place on the screen. */
 typedef struct QexPlaneTexShader {
@@ -3516,8 +3713,10 @@ typedef struct QexPlaneTexShader {
     int32_t rcpWindowSizeLoc; /* "RcpWindowSize" */
 } QexPlaneTexShader;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The one that draws the water: attribute 0 inVertex, the texture on unit 0. Read only. */
 QEX_API extern QexPlaneTexShader m_PlaneTexShader;
+#endif
 
 /** Makes the sky's cube: six faces of four vertices, each a triangle strip, in the order -Z, +X, +Z, -X, +Y,
  *  -Y. Both arrays are freed by the caller with QexMemory_Free. No GL context needed.
@@ -3585,6 +3784,7 @@ typedef struct QexBillboard {
     float opacity;    /* multiplies the texture's alpha; products of 0.001 and less become 0 */
 } QexBillboard;
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** GL names of the shared program and its shaders, 0 while there is none. Read only. */
 QEX_API extern uint32_t g_BillboardVShader;
 QEX_API extern uint32_t g_BillboardFShader;
@@ -3606,6 +3806,7 @@ QEX_API extern const uint8_t g_BB_indices[4];
 /** The directions (0, 1, 0) and (0, 0, 1), which building the program sets. */
 QEX_API extern QexVec3 g_VecUp;
 QEX_API extern QexVec3 g_VecNormal;
+#endif
 
 /** Creates a billboard in mode QEX_BILLBOARD_SCREEN at the origin, of scale 1 and opacity 1.
  *  @param texture  see QexBillboard.texture; null means the default texture
@@ -3844,6 +4045,7 @@ typedef int32_t (*QexSceneCallback)(QexRuntimeContext* context, void* user1, voi
                                     QexShaderModule* shader, QexShaderModule* skinnedShader,
                                     const float* colour);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** The targets. 0 and 1: first and second blur pass at half resolution; 2: the sharp picture; 3: the first
  *  blur pass at full resolution, then the depth; 4: the second blur pass at full resolution. */
 QEX_API extern QexRenderTarget PostProcessingRenderTargets[QEX_POST_PROCESSING_TARGETS];
@@ -3862,6 +4064,7 @@ QEX_API extern uint32_t m_iProgNamePP;
  *  3). */
 QEX_API extern const char* pVertexShaderPP;
 QEX_API extern const char* pFragmentShaderPP;
+#endif
 
 /** Creates the quad, the targets and the programs for a screen. What an earlier call made is released first.
  *  @param context  its size is the screen's
@@ -4017,6 +4220,16 @@ QEX_API int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, 
 QEX_API int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSize,
                                            QexEngineConfig* config);
 
+/** Tells the engine that the drawing surface has another size. The context's size, the text with its standing
+ *  strings, stereo and everything else that reads the context follow; so does post-processing that was
+ *  initialised at the former size, with the filters of its targets. Cameras, the GL viewport and the
+ *  application's own render targets do not: project and set them anew. Needs a current GL context.
+ *  @param context        initialised
+ *  @param width, height  pixels, 1 and more
+ *  @return 0; -1, with a line in the log and nothing changed, for a smaller size or a null context; -1 when
+ *  post-processing cannot be had at the new size. */
+QEX_API int32_t QexEngine_Resize(QexRuntimeContext* context, int32_t width, int32_t height);
+
 /** Ends what QexEngine_Init began. Models must be unloaded before: their shared shaders go with it. */
 QEX_API void QexEngine_Shutdown(QexRuntimeContext* context);
 
@@ -4038,11 +4251,13 @@ QEX_API int32_t QexInitEGL(QexRuntimeContext* context);
 /** Window-system step of QexEngine_Shutdown; does nothing. @return 0. */
 QEX_API int32_t QexShutdownEGL(QexRuntimeContext* context);
 
+#ifdef QEX_UNPREFIXED_NAMES
 /** Does nothing. @return 0. */
 QEX_API int32_t createWindow(void);
 
 /** Does nothing. @return 0. */
 QEX_API int32_t destroyWindow(void);
+#endif
 
 #ifdef __cplusplus
 }

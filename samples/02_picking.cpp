@@ -1,36 +1,52 @@
 // Sample 2: what is under a pixel? Works out where each node is on the screen, picks at a point, brings the
 // nearest node that was hit forward and writes its name above the point.
-#include "Sample.h"
+#include <cstdio>
+
+#include "window.h"
 
 constexpr int kMostHits = 9;
 
-int main(int argc, char** argv) {
-    Sample sample(argc, argv);
-    if (!sample.Started()) return 1;
-    SampleModel cubes(scenes::Grid(9));
-    QexModel* model = &cubes.model;
-    const QexCamera camera = sample.Camera({3, 2, 4}, {1, 1, 0});
-
+// The mesh node nearest to the eye whose box on the screen is around the point, or -1.
+static int Nearest(Window* window, QexModel* model, const QexCamera& camera, const QexVec2& point) {
     // The boxes in the world, from them those on the screen, and among these the ones around the point.
-    const QexVec2 point = {240, 130};
     uint32_t hits[kMostHits];
     int32_t count;
     QexModel_UpdateModelBoundingBox(model, nullptr);
-    QexModel_CalcScreenBBox(&sample.engine, model, &camera);
+    QexModel_CalcScreenBBox(&window->engine, model, &camera);
     QexModel_Pick(model, nullptr, &point, &count, hits, kMostHits);
     const QexBoundingBox* boxes = model->screenBoxes;
-    uint32_t nearest = count ? hits[0] : 0;
-    for (int32_t i = 1; i < count; ++i)
-        if (boxes[hits[i]].centre.z < boxes[nearest].centre.z) nearest = hits[i];
+    int nearest = -1;
+    for (int32_t i = 0; i < count; ++i)
+        if (nearest < 0 || boxes[hits[i]].centre.z < boxes[nearest].centre.z)
+            nearest = static_cast<int>(hits[i]);
+    return nearest;
+}
 
-    sample.Clear();
-    if (count) QexModel_SetNodePosition(model, nearest, 0, 0, 0.7f);
-    QexModel_RenderWithCamera(model, nullptr, &camera, nullptr, 0);
-    const char* name = count ? QexModel_GetNodeName(model, nearest) : "nothing";
-    QexFont_DrawTempString(&sample.engine, static_cast<int32_t>(point.x), static_cast<int32_t>(point.y), name,
-                           0xFFFF4040);
-    printf("%d boxes around %.0f, %.0f; nearest: %s\n", count, static_cast<double>(point.x),
-           static_cast<double>(point.y), name);
-    const int status = sample.Finish();
-    return count ? status : 1;
+int main(int argc, char** argv) {
+    Window window;
+    if (Window_Open(&window, "Picking", argc, argv) != 0) return 1;
+    QexModel cubes;
+    Window_LoadModel(&window, &cubes, "grid.pod");
+    int hit = -1;
+
+    while (Window_Frame(&window)) {
+        const QexCamera camera = Window_Camera(&window, {3, 2, 4}, {1, 1, 0});
+        const QexVec2 point = {0.75f * static_cast<float>(window.width),
+                               0.54f * static_cast<float>(window.height)};
+        for (uint32_t i = 0; i < QexModel_GetNumMeshNodes(&cubes); ++i)
+            QexModel_SetNodePosition(&cubes, i, 0, 0, 0);
+        hit = Nearest(&window, &cubes, camera, point);
+        if (hit >= 0) QexModel_SetNodePosition(&cubes, static_cast<uint32_t>(hit), 0, 0, 0.7f);
+
+        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        QexModel_RenderWithCamera(&cubes, nullptr, &camera, nullptr, 0);
+        const char* name = hit >= 0 ? QexModel_GetNodeName(&cubes, static_cast<uint32_t>(hit)) : "nothing";
+        QexFont_DrawTempString(&window.engine, static_cast<int32_t>(point.x), static_cast<int32_t>(point.y),
+                               name, 0xFFFF4040);
+    }
+    printf("hit: node %d\n", hit);
+
+    QexModel_Unload(&cubes);
+    const int status = Window_Close(&window);
+    return hit >= 0 ? status : 1;
 }

@@ -1,39 +1,41 @@
 // Sample 6: a skinned character, at five moments of its animation beside each other. The scene brings no bone
 // batches: the engine cuts the mesh into pieces of at most 16 bones when it reads it.
-#include "Sample.h"
+#include <cmath>
+#include <cstdio>
 
-constexpr uint32_t kBones = 40, kFrames = 60;
+#include "window.h"
 
 int main(int argc, char** argv) {
-    Sample sample(argc, argv);
-    if (!sample.Started()) return 1;
-    SampleModel worm(scenes::Worm(kBones, kFrames));
-    worm.SetChequers(1, 0xF0D890, 0xC07030);
-    QexModel* model = &worm.model;
-    worm.SetLightColours(1, 0.2f);
+    Window window;
+    if (Window_Open(&window, "Character", argc, argv) != 0) return 1;
+    QexModel worm;
+    Window_LoadModel(&window, &worm, "tentacle.pod");
 
     // Static nodes take the first module, nodes that follow bones the second.
     QexShaderModule* still = QexGouraudShader_CreateProgram();
     QexShaderModule* skinned = QexSkinningGouraudShader_CreateProgram();
-    QexModel_SetShaderProgramForAllNode(model, still, skinned);
-    QexModel_EnableNodeRendering(model, 0, 0);  // the floor
+    QexModel_SetShaderProgramForAllNode(&worm, still, skinned);
+    QexModel_EnableNodeRendering(&worm, 0, 0);  // the floor
+    printf("40 bones in %d batches\n", worm.scene.meshes[1].boneBatches.batchCount);
 
     QexLightSet lights = {};
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-1, -1, -2}, {1, 1, 1, 1}};
-    const QexCamera camera = sample.Camera({0, 2.5f, 15}, {0, 2, 0});
-    sample.Clear();
-    for (int i = 0; i < 5; ++i) {
-        QexPODModel_SetFrame(&model->scene, static_cast<float>(1 + i * 12));
-        QexMatrix place;
-        QexMatrix_Translate(&place, 2.6f * static_cast<float>(i - 2), 0, 0);
-        QexModel_RenderWithCamera(model, &lights, &camera, &place, 0);
+    while (Window_Frame(&window)) {
+        const QexCamera camera = Window_Camera(&window, {0, 2.5f, 15}, {0, 2, 0});
+        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        for (int i = 0; i < 5; ++i) {
+            // Frame 0 is the bind pose; the animation is 59 frames from 1 on.
+            const float frame = 30 * (window.seconds - 1) + 12 * static_cast<float>(i);
+            QexPODModel_SetFrame(&worm.scene, 1 + std::fmod(frame, 58.0f));
+            QexMatrix place;
+            QexMatrix_Translate(&place, 2.6f * static_cast<float>(i - 2), 0, 0);
+            QexModel_RenderWithCamera(&worm, &lights, &camera, &place, 0);
+        }
     }
-    printf("%d bones in %d batches\n", static_cast<int>(kBones),
-           model->scene.meshes[1].boneBatches.batchCount);
 
-    const int status = sample.Finish();
+    QexModel_Unload(&worm);
     QexGouraudShader_Release(&still);
     QexSkinningGouraudShader_Release(&skinned);
-    return status;
+    return Window_Close(&window);
 }

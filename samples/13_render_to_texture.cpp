@@ -1,44 +1,57 @@
 // Sample 13: a picture within the picture. The scene is drawn into a texture first, that texture onto a cube,
 // and the cube's picture into the corner of the screen.
-#include "Sample.h"
+#include "window.h"
+
+static void ClearTarget(float red, float green, float blue) {
+    glClearColor(red, green, blue, 1);
+    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
+}
 
 int main(int argc, char** argv) {
-    Sample sample(argc, argv);
-    if (!sample.Started()) return 1;
-    SampleModel cubes(scenes::Grid(9));
-    cubes.SetChequers(0, 0xF0D890, 0x3070A0);
-    SampleModel screen(scenes::Still({{"screen", scenes::Cube(), {0, 0, 0}}}));
-
-    // Drawing into one target inside drawing into another: the end of the inner one goes back to the outer.
+    Window window;
+    if (Window_Open(&window, "Render to texture", argc, argv) != 0) return 1;
+    QexModel cubes, screen;
+    Window_LoadModel(&window, &cubes, "grid.pod");
     QexRenderTarget picture, corner;
     QexRenderTarget_Create(&picture, 128, 128, 0);
     QexRenderTarget_Create(&corner, 96, 72, 0);
     QexTexture_SetFilter(&picture.colorTexture, QEX_FILTER_LINEAR);
-    sample.Clear();
-    QexRenderer_SetBackFaceCulling(1);
 
-    QexRenderTarget_BeginScene(&corner);
-    glClearColor(0.1f, 0.1f, 0.1f, 1);
-    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
-    QexRenderTarget_BeginScene(&picture);
-    glClearColor(0.6f, 0.3f, 0.3f, 1);
-    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
-    QexCamera camera = sample.Camera({2.5f, 2.2f, 3}, {1, 1, 0});
-    QexCamera_Project(&camera, 0.8f, 1, 0.1f, 100);
-    QexModel_RenderWithCamera(&cubes.model, nullptr, &camera, nullptr, 0);
-    QexRenderTarget_EndScene(&picture);
+    // The cube shows the picture as it is: without normals there is no light.
+    QexMesh box;
+    QexMesh_CreateBox(&box, 2, 2, 2);
+    box.normals = nullptr;
+    QexModel_CreateFromMesh(&screen, &box, &picture.colorTexture);
+    QexMesh_Release(&box);
 
-    // The cube shows it, small in the corner and large on the screen.
-    QexTexture* before = QexModel_ReplaceTextureByIdx(&screen.model, &picture.colorTexture, 0);
-    camera = sample.Camera({3, 2, 4}, {0, 0, 0});
-    QexModel_RenderWithCamera(&screen.model, nullptr, &camera, nullptr, 0);
-    QexRenderTarget_EndScene(&corner);
-    QexModel_RenderWithCamera(&screen.model, nullptr, &camera, nullptr, 0);
-    QexModel_ReplaceTextureByIdx(&screen.model, before, 0);
+    while (Window_Frame(&window)) {
+        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
 
-    QexRenderer_SetZTestFunc(7);
-    QexTexture_Draw(&sample.engine, &corner.colorTexture, 8, 8, nullptr, 1, 1, 0xFFFFFFFF);
+        // Drawing into one target inside drawing into another: the end of the inner one goes back to the
+        // outer.
+        QexRenderTarget_BeginScene(&corner);
+        ClearTarget(0.1f, 0.1f, 0.1f);
+        QexRenderTarget_BeginScene(&picture);
+        ClearTarget(0.6f, 0.3f, 0.3f);
+        QexCamera camera = Window_Camera(&window, {2.5f, 2.2f, 3}, {1, 1, 0});
+        QexCamera_Project(&camera, 0.8f, 1, 0.1f, 100);
+        QexModel_RenderWithCamera(&cubes, nullptr, &camera, nullptr, 0);
+        QexRenderTarget_EndScene(&picture);
+
+        // The cube, small in the corner and large on the screen.
+        camera = Window_Camera(&window, {3, 2, 4}, {0, 0, 0});
+        QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);
+        QexRenderTarget_EndScene(&corner);
+        QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);
+
+        QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
+        QexTexture_Draw(&window.engine, &corner.colorTexture, 8, 8, nullptr, 1, 1, 0xFFFFFFFF);
+    }
+
+    QexModel_Unload(&screen);
+    QexModel_Unload(&cubes);
     QexRenderTarget_Release(&corner);
     QexRenderTarget_Release(&picture);
-    return sample.Finish();
+    return Window_Close(&window);
 }

@@ -1,8 +1,9 @@
 // Sample 15: a firework from a particle set. The vertex shader moves all sparks of a rocket; when they have
 // burnt out the set says so, and the next rocket goes off in another place and colour.
+#include <cmath>
 #include <cstdlib>
 
-#include "Sample.h"
+#include "window.h"
 
 static constexpr uint32_t kSparks = 150;
 static constexpr float kDuration = 1.6f, kStep = 1 / 60.0f;
@@ -40,35 +41,45 @@ static void Fire(QexParticleSet* set, int32_t, int32_t) {
     QexParticleSet_Trigger(set);
 }
 
-int main(int argc, char** argv) {
-    Sample sample(argc, argv);
-    if (!sample.Started()) return 1;
-    SampleTexture spark(32, 32, scenes::Spot(32, {255, 255, 255}));
-    // The red of a second texture gives each spark its shape.
-    SampleTexture shape(32, 32, [](float s, float t) {
-        const float x = std::fabs(s - 0.5f), y = std::fabs(t - 0.5f);
-        return QexVec4{1.2f - 6 * std::min(x, y) - 2 * std::max(x, y), 0, 0, 1};
-    });
-    QexParticleSet set;
-    if (QexParticleSet_Create(&set, &spark.texture, &shape.texture, kSparks, 22, kDuration) != 0) return 1;
-    set.onFinished = Fire;
-    srand(1);
-    Load(&set);
-    sample.Clear(0.02f, 0.02f, 0.08f);
-    QexRenderer_SetAlphaBlendMode(2);
-    const QexCamera camera = sample.Camera({0, 0, 5}, {0, 0.3f, 0});
-
-    // Three rockets, one after the other. The picture keeps the sparks of a third of a second, like a long
-    // exposure.
-    Fire(&set, 0, 0);
+// Three rockets, one after the other, with the sparks of a third of a second, like a long exposure.
+static void Expose(QexParticleSet* set, const QexCamera& camera) {
     for (int rocket = 0; rocket < 3; ++rocket) {
         const int shown = s_Rocket;
         while (s_Rocket == shown) {
-            QexParticleSet_Update(&set, kStep, &camera, nullptr);
-            if (set.time > 0.45f && set.time < 0.75f) QexParticleSet_Draw(&set);
+            QexParticleSet_Update(set, kStep, &camera, nullptr);
+            if (set->time > 0.45f && set->time < 0.75f) QexParticleSet_Draw(set);
         }
     }
+}
+
+int main(int argc, char** argv) {
+    Window window;
+    if (Window_Open(&window, "Firework", argc, argv) != 0) return 1;
+    QexTexture spark, shape;
+    Window_LoadTexture(&window, &spark, "spark.pvr");
+    Window_LoadTexture(&window, &shape, "star.pvr");  // its red gives each spark its shape
+    QexParticleSet set;
+    if (QexParticleSet_Create(&set, &spark, &shape, kSparks, 22, kDuration) != 0) return 1;
+    set.onFinished = Fire;
+    srand(1);
+    Load(&set);
+    Fire(&set, 0, 0);
+
+    while (Window_Frame(&window)) {
+        const QexCamera camera = Window_Camera(&window, {0, 0, 5}, {0, 0.3f, 0});
+        Window_Clear(&window, 0.02f, 0.02f, 0.08f);
+        QexRenderer_SetAlphaBlendMode(QEX_BLEND_ADD_ALPHA);
+        if (window.picture) {
+            Expose(&set, camera);
+        } else {
+            QexParticleSet_Update(&set, window.elapsed, &camera, nullptr);
+            QexParticleSet_Draw(&set);
+        }
+    }
+
     set.onFinished = nullptr;
     QexParticleSet_Release(&set);
-    return sample.Finish();
+    QexTexture_Release(&spark);
+    QexTexture_Release(&shape);
+    return Window_Close(&window);
 }

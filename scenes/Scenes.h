@@ -49,6 +49,10 @@ std::vector<uint8_t> Waves(uint32_t size);
 // nodes: it has no batches.
 pod::Scene Worm(uint32_t bones, uint32_t frames);
 
+// A figure 1.8 high that faces +Z and walks on the spot, a step of both legs from frame 1 to the last. Frame
+// 0 is its bind pose. Its texture has four bands, from below: shoes, trousers, shirt, skin.
+pod::Scene Walker(uint32_t frames);
+
 // `count` mesh nodes on a square grid in the XY plane, one apart, all drawing the same cube at a quarter of
 // its size.
 pod::Scene Grid(uint32_t count);

@@ -1,20 +1,25 @@
 // Diagnostics for the engine's own modules: what ends the process, and what is only reported.
 //
 // The printing functions themselves are public (Qex.h). This header adds the two reports that carry a
-// source location: a GL error, which is fatal, and memory that could not be had. A source file names the
-// module that it belongs to by defining QEX_MODULE, the module's path without extension; a module may span
-// several files.
+// source location: a GL error, which is fatal, and memory that could not be had; and the lines of standard
+// streams alone. A source file names the module that it belongs to by defining QEX_MODULE, the module's path
+// without extension; a module may span several files.
 #pragma once
 
 #include <cstdint>
+#include <cstdio>
 
 #include "Qex.h"
 
-// Logs the GL error with its place, in a second line the source file, as a module may have several, and ends
-// the process with exit status 255.
+// Logs the GL error with its place, in a second line the source file, as a module may have several, at any
+// level, and ends the process with exit status 255.
 [[noreturn]] void QexDiagnostics_FatalGLError(uint32_t error, const char* module, const char* file, int line);
 
 // Prints the out-of-memory line. The caller decides how to go on.
 void QexDiagnostics_OutOfMemory(const char* module, int line);
+
+// Prints on a standard stream; once the program has asked for a log level or sink, to the log instead, as
+// information.
+void QexDiagnostics_Print(FILE* stream, const char* format, ...) QEX_PRINTF(2, 3);
 
 #define QEX_TAG "Qex"

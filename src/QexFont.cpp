@@ -220,7 +220,7 @@ void PointAt(int32_t location, GLint size, const void* data) {
 }
 
 void SetState() {
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     QexRenderState_UseProgram(s_Program.program);
 }
 
@@ -308,6 +308,16 @@ bool QexFont_CanDraw(const char* function) {
 
 const QexFontProgram* QexFont_GetProgram() {
     return &s_Program;
+}
+
+void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore) {
+    if (!s_Created) return;
+    QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(width), 0, static_cast<float>(height), 0, 1);
+    QexRenderState_UseProgram(s_Program.program);
+    QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    const float up = static_cast<float>(height - heightBefore);
+    for (uint32_t glyph = 0; glyph < s_Text.count; ++glyph)
+        for (float(&position)[3] : s_Text.positions[glyph]) position[1] += up;
 }
 
 extern "C" {

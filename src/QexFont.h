@@ -25,3 +25,7 @@ bool QexFont_IsCreated();
 // Whether the font's program is there, which an application may have released by itself. An error line in the
 // function's name, once, when it is not.
 bool QexFont_CanDraw(const char* function);
+
+// Follows a screen of another size: the projection, and the standing text, which stays at its distance from
+// the upper edge. Without a font nothing happens.
+void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore);

@@ -26,6 +26,9 @@ inline bool QexModel_IsOutdated(const QexModel* model) {
     return model->sharedGeneration && model->sharedGeneration != QexModel_GetSharedGeneration();
 }
 
+// The lit module that models made of arrays share: made when first asked for, gone with the others.
+QexShaderModule* QexModel_GetSharedLitShader();
+
 // Frees an array of casters and their node lists, as shadow and reflection records own one.
 inline void QexModel_FreeCasters(QexShadowCaster* casters, uint32_t count) {
     for (uint32_t i = 0; i < count; ++i) QexMemory_Free(casters[i].nodeIndices);

@@ -78,6 +78,7 @@ ShadowShaders s_SkinShadowShaders;
 ShadowShaders s_ModelShadowShaders;
 int32_t s_ReferenceCount;
 uint32_t s_Generation = 1;  // counts the shared sets that there were, from 1
+QexShaderModule* s_Lit;
 
 int32_t Location(GLuint program, const char* name) {
     int32_t location;
@@ -145,6 +146,11 @@ uint32_t QexModel_GetSharedGeneration() {
     return s_Generation;
 }
 
+QexShaderModule* QexModel_GetSharedLitShader() {
+    if (!s_Lit) s_Lit = QexGouraudShader_CreateProgram();
+    return s_Lit;
+}
+
 extern "C" {
 
 QexSkinShadowProgram m_SkinShadowShaderProgram = {0, -1, -1, -1};
@@ -179,6 +185,7 @@ void QexModel_ReleaseShader(int32_t force) {
     QexTextureShader_Release(&s_Shared.texture);
     QexSkinningTextureShader_Release(&s_Shared.skinning);
     QexSimpleShader_Release(&s_Shared.simple);
+    QexGouraudShader_Release(&s_Lit);
     s_ReferenceCount = 0;
     ++s_Generation;
 }
@@ -200,6 +207,7 @@ void QexModel_ReleaseShadowTexture(void) {
 void QexModel_SetAlphaTestCmpValue(float threshold) {
     if (s_Shared.texture) QexTextureShader_SetAlphaThreshold(s_Shared.texture, threshold);
     if (s_Shared.skinning) QexSkinningTextureShader_SetAlphaThreshold(s_Shared.skinning, threshold);
+    if (s_Lit) QexGouraudShader_SetAlphaThreshold(s_Lit, threshold);
 }
 
 }  // extern "C"

@@ -188,8 +188,8 @@ void QexModel_RenderShadow(const QexRuntimeContext* context, const QexMatrix* mo
     QEX_GL(glDisable(GL_SCISSOR_TEST));
     QEX_GL(glViewport(0, 0, shared->shadowWidth, shared->shadowHeight));
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetBackFaceCulling(1);
-    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     QEX_GL(glClearColor(1, 1, 1, 1));
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
     QexModel_RenderFromShadowCamera(modelMatrix, info);

@@ -172,7 +172,7 @@ void QexParticleSet_Draw(QexParticleSet* set) {
     for (const auto& attribute : kAttributes)
         QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(*attribute.location)));
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
 }
 
 void QexParticleSet_Release(QexParticleSet* set) {

@@ -98,11 +98,11 @@ void QexReflection_RenderReflection(QexReflection* reflection, const QexLightSet
     if (reflection->useStencil)
         QexModel_RenderReflectionPlaneStencil(reflection->model, reflection->planeNode, lights, nullptr, view,
                                               projection);
-    QexRenderer_SetBackFaceCulling(2);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_FRONT);
     DrawReflected(reflection, lights, camera);
     if (reflection->useStencil) glDisable(GL_STENCIL_TEST);
     glClear(GL_DEPTH_BUFFER_BIT);
-    QexRenderer_SetBackFaceCulling(1);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
     if (!plane) return;
     QexModel_RenderNodeWithViewProjection(reflection->model, reflection->planeNode, lights, nullptr, view,
                                           projection);

@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "QexDiagnostics.h"
+#include "QexFont.h"
 
 namespace {
 
@@ -49,6 +50,19 @@ bool HasContext(const char* function) {
     return false;
 }
 
+// Post-processing anew, if it was made for a screen of that size. Its targets keep their filters.
+int32_t ResizePostProcessing(const QexRuntimeContext* context, int32_t width, int32_t height) {
+    const QexTexture& screen = PostProcessingRenderTargets[2].colorTexture;
+    if (!DOFShaderProgram || screen.width != width || static_cast<int32_t>(screen.height) != height) return 0;
+    uint8_t filters[QEX_POST_PROCESSING_TARGETS];
+    for (uint32_t i = 0; i < QEX_POST_PROCESSING_TARGETS; ++i)
+        filters[i] = QexPP_GetRenderTarget(i)->colorTexture.filter;
+    const int32_t result = QexPostProcessing_Initialize(context);
+    for (uint32_t i = 0; result == 0 && i < QEX_POST_PROCESSING_TARGETS; ++i)
+        QexTexture_SetFilter(&QexPP_GetRenderTarget(i)->colorTexture, filters[i]);
+    return result;
+}
+
 }  // namespace
 
 extern "C" {
@@ -78,6 +92,20 @@ int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSi
     s_OwnerDrawInitialized = 1;
     QexLog(QEX_TAG, "<QexEngine_InitForOwnerDraw> Owner draw initialized ok");
     return 0;
+}
+
+int32_t QexEngine_Resize(QexRuntimeContext* context, int32_t width, int32_t height) {
+    if (!context || width < 1 || height < 1) {
+        QexError(QEX_TAG, "<QexEngine_Resize> a surface of %d x %d pixels%s", width, height,
+                 context ? "" : ", no context");
+        return -1;
+    }
+    const int32_t widthBefore = context->width, heightBefore = context->height;
+    if (width == widthBefore && height == heightBefore) return 0;
+    context->width = width;
+    context->height = height;
+    QexFont_Resize(width, height, heightBefore);
+    return ResizePostProcessing(context, widthBefore, heightBefore);
 }
 
 void QexEngine_Shutdown(QexRuntimeContext* context) {

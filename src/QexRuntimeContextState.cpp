@@ -6,14 +6,14 @@ namespace {
 
 constexpr uint32_t kUnknown = 0xFFFFFFFFu;
 
-// Blend factors by mode 1 to 3.
+// Blend factors by mode, from QEX_BLEND_ALPHA on.
 const struct {
     GLenum source;
     GLenum destination;
 } kBlendFactors[] = {{GL_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA}, {GL_SRC_ALPHA, GL_ONE}, {GL_ONE, GL_ONE}};
 
 void SetBlending(int32_t mode, GLenum alphaSource, GLenum alphaDestination) {
-    if (mode == 0) {
+    if (mode == QEX_BLEND_NONE) {
         QEX_GL(glDisable(GL_BLEND));
         return;
     }
@@ -56,7 +56,7 @@ void QexRenderState_Bind(uint32_t target, uint32_t name) {
 void QexRenderer_SetZTestFunc(uint32_t mode) {
     glEnable(GL_DEPTH_TEST);
     // GL_NEVER to GL_ALWAYS are consecutive, in the order of the modes.
-    if (mode < 8) glDepthFunc(GL_NEVER + mode);
+    if (mode <= QEX_DEPTH_ALWAYS) glDepthFunc(GL_NEVER + mode);
 }
 
 void QexRenderer_SetZWrite(int32_t flag) {
@@ -65,9 +65,9 @@ void QexRenderer_SetZWrite(int32_t flag) {
 
 void QexRenderer_SetBackFaceCulling(int32_t mode) {
     static const GLenum faces[] = {GL_BACK, GL_FRONT, GL_FRONT_AND_BACK};
-    if (mode == 0) {
+    if (mode == QEX_CULL_NONE) {
         QEX_GL(glDisable(GL_CULL_FACE));
-    } else if (mode >= 1 && mode <= 3) {
+    } else if (mode >= QEX_CULL_BACK && mode <= QEX_CULL_BOTH) {
         QEX_GL(glEnable(GL_CULL_FACE));
         QEX_GL(glCullFace(faces[mode - 1]));
     }

@@ -77,7 +77,7 @@ QexMatrix ViewProjection() {
 void BindTarget(GLuint framebuffer) {
     // Whatever the application's last frame ended with.
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetZTestFunc(3);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, framebuffer));
     QEX_GL(glViewport(0, 0, kTargetSize, kTargetSize));
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT));
@@ -86,8 +86,8 @@ void BindTarget(GLuint framebuffer) {
 void BindScreen(const QexRuntimeContext* context) {
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(s_SavedFramebuffer)));
     QEX_GL(glViewport(0, 0, context->width, context->height));
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetBackFaceCulling(1);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
 }
 
 void DrawSky(const QexSkyBox& box) {
@@ -114,7 +114,7 @@ void DrawScene(QexSkyBox* box) {
     if (box->drawScene) box->drawScene(box, &s_View, &s_Projection);
     const QexCamera& camera = *box->camera;
     QexMatrix_Perspective(&s_Projection, camera.fov, camera.aspect, camera.nearPlane, camera.farPlane);
-    QexRenderer_SetBackFaceCulling(1);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
     DrawSky(*box);
 }
 
@@ -179,7 +179,7 @@ void DrawReflection(QexSkyBox* box) {
     SetCamera(*box->camera);
     MirrorView();
     ClipAtWater(box->camera->farPlane);
-    QexRenderer_SetBackFaceCulling(2);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_FRONT);
     DrawScene(box);
 }
 
@@ -191,9 +191,9 @@ void SetWaves() {
     QexVec2 translations[2];
     for (int i = 0; i < 2; ++i)
         translations[i] = {WaveStep(kBumpVelocities[i].x), WaveStep(kBumpVelocities[i].y)};
-    printf("T0:%f, S0:%f, T1:%f, S1:%f\n", static_cast<double>(translations[0].x),
-           static_cast<double>(kBumpScales[0].x), static_cast<double>(translations[1].x),
-           static_cast<double>(kBumpScales[1].x));
+    QexDiagnostics_Print(stdout, "T0:%f, S0:%f, T1:%f, S1:%f\n", static_cast<double>(translations[0].x),
+                         static_cast<double>(kBumpScales[0].x), static_cast<double>(translations[1].x),
+                         static_cast<double>(kBumpScales[1].x));
     for (int i = 0; i < 2; ++i) {
         QEX_GL(glUniform2fv(g_QexWaterProgram.bumpTranslation[i], 1, &translations[i].x));
         QEX_GL(glUniform2fv(g_QexWaterProgram.bumpScale[i], 1, &kBumpScales[i].x));
@@ -285,9 +285,9 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
     if (!CreateTarget(&s_Reflection) || !CreateTarget(&s_Surface)) return -1;
     QexRenderer_SetZWrite(1);
-    QexRenderer_SetBackFaceCulling(1);
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     s_Drawable = linked;
     return 0;
 }

@@ -1,10 +1,9 @@
 #include <sys/time.h>
 
 #include <cmath>
-#include <cstdio>
 #include <cstring>
 
-#include "Qex.h"
+#include "QexDiagnostics.h"
 
 namespace {
 
@@ -104,7 +103,7 @@ void QexTime_UpdateFPS(QexFrameRate* record) {
     if (period < kMeterPeriod) return;
 
     record->rate = static_cast<float>(g_clock.meterFrames) / static_cast<float>(period) * 1000.0f;
-    fprintf(stderr, "<QexTime_UpdateFPS>FPS=%7.3f\n", static_cast<double>(record->rate));
+    QexDiagnostics_Print(stderr, "<QexTime_UpdateFPS>FPS=%7.3f\n", static_cast<double>(record->rate));
     g_clock.meterStart = now;
     g_clock.meterFrames = 0;
 }

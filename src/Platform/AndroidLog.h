@@ -1,5 +1,5 @@
-// The Android log. On Android this is the platform's own header; elsewhere the two functions that the engine
-// uses are declared here with the same contract, and AndroidLog.cpp defines them over standard error.
+// The Android log. On Android this is the platform's own header; elsewhere the one function that the engine
+// uses is declared here with the same contract, and AndroidLog.cpp defines it over standard error.
 #pragma once
 
 #if defined(__ANDROID__)
@@ -9,13 +9,6 @@
 
 enum { ANDROID_LOG_INFO = 4, ANDROID_LOG_ERROR = 6 };
 
-extern "C" {
-__attribute__((visibility("hidden"), format(printf, 3, 4))) int __android_log_print(int priority,
-                                                                                    const char* tag,
-                                                                                    const char* format, ...);
-__attribute__((visibility("hidden"), format(printf, 3, 0))) int __android_log_vprint(int priority,
-                                                                                     const char* tag,
-                                                                                     const char* format,
-                                                                                     va_list arguments);
-}
+extern "C" __attribute__((visibility("hidden"), format(printf, 3, 0))) int __android_log_vprint(
+    int priority, const char* tag, const char* format, va_list arguments);
 #endif

@@ -127,7 +127,7 @@ TEST_F(BillboardTest, LifeAndStateLeftBehind) {
         const std::string program = std::to_string(g_BillboardShaderProgramID);
         QexRenderState_UseProgram(0);
         QexRenderState_ActiveTexture(GL_TEXTURE2);
-        QexRenderer_SetBackFaceCulling(0);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
         EXPECT_EQ(StateChange([&] { QexBillboard_Draw(second, &camera); }),
                   "program: 0 -> " + program + "\nactiveUnit: 2 -> 0\ncullFace: 0 -> 1\n");
         const GLCalls calls([&] {

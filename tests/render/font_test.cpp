@@ -124,8 +124,8 @@ TEST_F(FontTest, StateLeftBehind) {
     for (const auto& draw : draws) {
         QexRenderState_UseProgram(0);
         QexRenderState_ActiveTexture(GL_TEXTURE2);
-        QexRenderer_SetAlphaBlendMode(0);
-        QexRenderer_SetZTestFunc(7);
+        QexRenderer_SetAlphaBlendMode(QEX_BLEND_NONE);
+        QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
         EXPECT_EQ(StateChange(draw), "program: 0 -> " + std::to_string(before) +
                                          "\nactiveUnit: 2 -> 3\n"
                                          "blend: 0 -> 1\ndepthFunc: GL_ALWAYS -> GL_LEQUAL\n");

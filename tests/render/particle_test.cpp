@@ -124,7 +124,7 @@ TEST_F(ParticleSetTest, LifeAndStateLeftBehind) {
     QexParticleSet_Trigger(&set_);
     QexParticleSet_Draw(&set_);
     QexRenderState_ActiveTexture(GL_TEXTURE2);
-    QexRenderer_SetZTestFunc(7);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
     glDisable(GL_DEPTH_TEST);
     glDepthMask(GL_FALSE);
     const GLCalls creation([&] {

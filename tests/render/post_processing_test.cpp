@@ -146,9 +146,9 @@ TEST_F(PostProcessingTest, BlurIsAGaussianAlongRowsThenColumns) {
                  {128, 96, 2, NAN, 9, 1},  {128, 96, 2, 2, NAN, 1},     {128, 96, 2, 2, -9, 1},
                  {128, 96, 2, 2, 0.5f, 1}, {128, 96, 2, INFINITY, 9, 1}};
     // All that could cut into a quad.
-    QexRenderer_SetZTestFunc(0);
-    QexRenderer_SetBackFaceCulling(3);
-    QexRenderer_SetAlphaBlendMode(2);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_NEVER);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BOTH);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ADD_ALPHA);
     for (const auto& c : cases) {
         const QexRuntimeContext screen = Screen(c.width, c.height);
         const bool half = c.mode < 2;
@@ -182,9 +182,9 @@ TEST_F(PostProcessingTest, DepthOfFieldMixesSharpAndBlurred) {
         float focus, range;
         int mode;
     } cases[] = {{0.5f, 0, 1}, {9, 100, 1}, {9, 100, 2}, {0.4f, 1.5f, 0}, {0.4f, 1.5f, 2}, {0.4f, -5, 1}};
-    QexRenderer_SetZTestFunc(0);
-    QexRenderer_SetBackFaceCulling(3);
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_NEVER);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BOTH);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     for (const auto& c : cases) {
         Clear(0, 1, 0, 1);
         EXPECT_EQ(DrawDOF(c.focus, c.range, c.mode), 0);
@@ -219,9 +219,9 @@ TEST_F(PostProcessingTest, PassesInOrderAndNothingElseChanges) {
     QexRenderTarget_Create(&outer, 64, 64, 0);
     glBindFramebuffer(GL_FRAMEBUFFER, outer.framebuffer);
     glViewport(5, 6, 50, 40);
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetBackFaceCulling(1);
-    QexRenderer_SetAlphaBlendMode(1);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     DrawDOF(0.5f, 1, 0);
     s_Calls.clear();
     std::string bound;

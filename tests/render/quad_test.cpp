@@ -62,8 +62,8 @@ TEST_F(QuadTest, VerticesOfTextureRectangleAndNothing) {
 TEST_F(QuadTest, ColourAndAlphaOfThePixels) {
     const uint8_t rows[] = {255, 0, 0, 255, 255, 0, 0, 255, 0, 255, 0, 255, 0, 255, 0, 255};
     ScopedTexture texture(2, 2, rows), half({128, 0, 0, 255});
-    QexRenderer_SetAlphaBlendMode(1);
-    QexRenderer_SetZTestFunc(7);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
     Clear(0, 0, 1, 1);
     QexTexture_Draw(&runtime_, &texture, 20, 10, nullptr, 10, 10, 0xFFFFFFFF);
     QexTexture_Draw2(&runtime_, &texture, &half, 60, 10, nullptr, 10, 10, 0x80FF80FF);

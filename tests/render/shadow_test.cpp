@@ -74,7 +74,7 @@ class ShadowTest : public RenderTest {
         QexModel_RenderShadow(&runtime_, nullptr, info);
         model.model.bindTextureHook = nullptr;  // which is for the map alone
         glDisable(GL_SCISSOR_TEST);
-        QexRenderer_SetBackFaceCulling(0);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
         Clear();
         model.Material().diffuse[0] = model.Material().diffuse[1] = model.Material().diffuse[2] = 1;
         model.Material().ambient[0] = model.Material().ambient[1] = model.Material().ambient[2] = 0;
@@ -212,7 +212,7 @@ class ReflectionTest : public RenderTest {
         glClearStencil(0);
         glClear(GL_STENCIL_BUFFER_BIT);
         Clear(0, 0, 1, 1);
-        QexRenderer_SetZTestFunc(3);
+        QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     }
 
     QexCamera camera_;
@@ -232,7 +232,7 @@ TEST_F(ReflectionTest, ShowsTheMirroredSceneWithinThePlane) {
         const QexShadowCaster all = {&model.model, 1, nullptr, 0}, listed = {&model.model, 0, &square, 1};
         const auto drawn = [&](uint32_t node, const QexMatrix* matrix) {
             Begin();
-            QexRenderer_SetBackFaceCulling(0);
+            QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
             QexModel_RenderNodeWithViewProjection(&model.model, node, nullptr, matrix, &camera_.viewMatrix,
                                                   &camera_.projectionMatrix);
             return Read();

@@ -314,9 +314,9 @@ TEST_F(SkinningTest, MeshesGetTheBatchesThatTheyLack) {
         for (uint32_t i = 0; i < strips.vertexCount; ++i) indices.push_back(i);
         strips.faces = pod::IndexElement(indices, true);
         strips.stripLengths.assign(kQuads, 2);
-        QexRenderer_SetBackFaceCulling(1);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
         EXPECT_TRUE(SamePicture(draw(WithoutBatches(influences)), draw(strips)));
-        QexRenderer_SetBackFaceCulling(0);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
     }
 }
 

@@ -164,7 +164,7 @@ class SkyTest : public SkyTestOn<RenderTest> {
         QexRenderTarget_Create(&target, kTarget, kTarget, 0);
         QexRenderTarget_BeginScene(&target);
         Clear();
-        QexRenderer_SetBackFaceCulling(2);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_FRONT);
         QexModel_RenderWithViewProjection(s_model, nullptr, nullptr, &view, &camera_.projectionMatrix, 0);
         const std::vector<Rgba> pixels = ReadTarget();
         glViewport(0, 0, kWidth, kHeight);

@@ -7,6 +7,32 @@ namespace {
 
 class StateTest : public NullRenderTest {};
 
+// Names mean what GL calls so.
+constexpr uint32_t kPairs[][2] = {{GL_NEVER + QEX_DEPTH_LESS, GL_LESS},
+                                  {GL_NEVER + QEX_DEPTH_EQUAL, GL_EQUAL},
+                                  {GL_NEVER + QEX_DEPTH_LESS_EQUAL, GL_LEQUAL},
+                                  {GL_NEVER + QEX_DEPTH_GREATER, GL_GREATER},
+                                  {GL_NEVER + QEX_DEPTH_NOT_EQUAL, GL_NOTEQUAL},
+                                  {GL_NEVER + QEX_DEPTH_GREATER_EQUAL, GL_GEQUAL},
+                                  {GL_NEVER + QEX_DEPTH_ALWAYS, GL_ALWAYS},
+                                  {QEX_FACTOR_ZERO, GL_ZERO},
+                                  {QEX_FACTOR_ONE, GL_ONE},
+                                  {QEX_FACTOR_SRC_COLOR, GL_SRC_COLOR},
+                                  {QEX_FACTOR_ONE_MINUS_SRC_COLOR, GL_ONE_MINUS_SRC_COLOR},
+                                  {QEX_FACTOR_SRC_ALPHA, GL_SRC_ALPHA},
+                                  {QEX_FACTOR_ONE_MINUS_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA},
+                                  {QEX_FACTOR_DST_ALPHA, GL_DST_ALPHA},
+                                  {QEX_FACTOR_ONE_MINUS_DST_ALPHA, GL_ONE_MINUS_DST_ALPHA},
+                                  {QEX_FACTOR_DST_COLOR, GL_DST_COLOR},
+                                  {QEX_FACTOR_ONE_MINUS_DST_COLOR, GL_ONE_MINUS_DST_COLOR},
+                                  {QEX_FACTOR_SRC_ALPHA_SATURATE, GL_SRC_ALPHA_SATURATE}};
+constexpr bool AllAlike() {
+    for (const auto& pair : kPairs)
+        if (pair[0] != pair[1]) return false;
+    return true;
+}
+static_assert(AllAlike(), "a name differs from GL's");
+
 TEST_F(StateTest, OnlyChangesReachGL) {
     const GLCalls calls([] {
         for (int pass = 0; pass < 2; ++pass) {

@@ -36,7 +36,7 @@ TEST_F(StereoTest, EachEyeHasItsMaskItsViewportAndItsPicture) {
     };
     LoadedModel model(SceneOf(pod::BuildMesh(Rectangle(40, 24, 80, 72))));
     QexShaderModule* white = QexSimpleShader_CreateProgram();
-    QexRenderer_SetZTestFunc(1);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS);
     for (const auto& [width, mode, separation, left, right, columns] : cases) {
         runtime_.width = width;
         EXPECT_EQ(QexRenderer_EnableStereo3D(&runtime_, mode, 99), 0);

@@ -1,6 +1,8 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <string>
+#include <vector>
 
 #include "Qex.h"
 #include "support/Capture.h"
@@ -22,6 +24,55 @@ TEST(Diagnostics, PrioritiesAndTagsAreToldApartAndTextsArriveWhole) {
     }
     EXPECT_EQ(output.Text(), "mesh: 3 of 4.5\n");
     EXPECT_EQ(errors.Text(), expected);
+}
+
+struct Message {
+    int32_t weight;
+    std::string tag, text;
+    bool operator==(const Message& m) const { return weight == m.weight && tag == m.tag && text == m.text; }
+};
+
+void Keep(void* user, int32_t weight, const char* tag, const char* text) {
+    static_cast<std::vector<Message>*>(user)->push_back({weight, tag, text});
+}
+
+// In a process of its own, as a program that has chosen its log keeps it.
+TEST(DiagnosticsDeathTest, LevelAndSinkTakeAllThatIsWritten) {
+    const auto run = [] {
+        const std::string text(2000, 'x');
+        std::vector<Message> kept;
+        Capture errors(STDERR_FILENO), output(STDOUT_FILENO);
+        const auto writeAll = [&] {
+            QexLog("Emitter", "one");
+            QexError(nullptr, "%s\n", text.c_str());
+            QexSystem_Printf("progress %d\n", 7);
+            QexSystem_Printf("WARNING:<Load> odd\n");
+            QexSystem_Printf("ERROR:<Load> broken\n");
+        };
+        QexLog_SetSink(Keep, &kept);
+        writeAll();
+        std::vector<Message> expected = {{QEX_LOG_INFO, "Emitter", "one"},
+                                         {QEX_LOG_ERROR, "", text},
+                                         {QEX_LOG_INFO, "Qex", "progress 7"},
+                                         {QEX_LOG_WARNING, "Qex", "WARNING:<Load> odd"},
+                                         {QEX_LOG_ERROR, "Qex", "ERROR:<Load> broken"}};
+        bool good = kept == expected;
+        for (const int32_t level : {QEX_LOG_WARNING, QEX_LOG_ERROR, QEX_LOG_NONE}) {
+            kept.clear();
+            QexLog_SetLevel(level);
+            writeAll();
+            expected.erase(std::remove_if(expected.begin(), expected.end(),
+                                          [level](const Message& m) { return m.weight < level; }),
+                           expected.end());
+            good = good && kept == expected;
+        }
+        good = good && QexLog_SetLevel(QEX_LOG_WARNING) == QEX_LOG_NONE && QexLog("Qex", "not written") == 0;
+        QexLog_SetSink(nullptr, nullptr);
+        QexSystem_Printf("WARNING: once\n");
+        good = good && output.Text().empty() && errors.Text() == "I/Qex: WARNING: once\n";
+        exit(good ? 0 : 1);
+    };
+    EXPECT_EXIT(run(), testing::ExitedWithCode(0), "");
 }
 
 }  // namespace

@@ -89,7 +89,7 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model,
     QexModel_RenderShadow(engine, nullptr, info);
     glDisable(GL_SCISSOR_TEST);
     glClearColor(clear[0], clear[1], clear[2], clear[3]);
-    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
     if (floor) QexModel_RenderFromCameraWithShadow(floor, &lights, &camera, nullptr, info, 0);
     for (uint32_t pass = 0; pass <= model->scene.highestPass; ++pass)
         QexModel_RenderFromCameraWithShadow(model, &lights, &camera, nullptr, info, pass);

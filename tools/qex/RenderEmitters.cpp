@@ -96,8 +96,8 @@ void Emitters::Run(float seconds) {
 
 void Emitters::Draw(const QexCamera& camera) const {
     if (emitters_.empty()) return;
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetAlphaBlendModeSeparate(1, 0);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetAlphaBlendModeSeparate(QEX_BLEND_ALPHA, QEX_BLEND_KEEP_ALPHA);
     for (QexParticleEmitter* emitter : emitters_) {
         const int32_t mode = ModeOf(*emitter);
         // Billboards that face the screen do not take a scale from the view matrix.

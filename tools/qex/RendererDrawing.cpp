@@ -97,9 +97,9 @@ void Renderer::Clear(uint32_t colour) {
 
 // Everything that can be seen, with modules that show its depth.
 void Renderer::DrawDepth(QexShaderModule* module, QexShaderModule* skinned) {
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetBackFaceCulling(0);
-    QexRenderer_SetAlphaBlendMode(0);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_NONE);
     QexModel* floor = floor_ ? floor_->Model() : nullptr;
     const ShaderOverride floorDepth(floor, module, skinned), modelDepth(&model_, module, skinned);
     if (floor) QexModel_RenderWithCamera(floor, nullptr, &camera_, nullptr, 0);
@@ -135,15 +135,15 @@ void Renderer::DrawScene(const QexCamera& camera) {
 void Renderer::DrawOpaque(const QexCamera& camera) {
     transparentCount_ = 0;
     const QexLightSet lights = ChooseLights(&model_, options_.effects, camera);
-    QexRenderer_SetZTestFunc(3);
-    QexRenderer_SetBackFaceCulling(0);
-    QexRenderer_SetAlphaBlendModeSeparate(1, 0);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+    QexRenderer_SetAlphaBlendModeSeparate(QEX_BLEND_ALPHA, QEX_BLEND_KEEP_ALPHA);
     QexModel* floor = floor_ ? floor_->Model() : nullptr;
     if (floor && options_.effects.mirror)
         floor_->DrawMirrorImage(&model_, lights, camera);
     else
         DrawMirrored(&model_, options_.effects, lights, camera);
-    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
     if (options_.effects.shadow) {
         DrawWithShadow(&engine_, floor, &model_, lights, camera);
         return;
@@ -163,7 +163,7 @@ void Renderer::DrawBlended(const QexCamera& camera) {
         for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
             QexModel_RenderAlphaBlendingNodes(transparent_.data(), transparentCount_, pass);
     }
-    QexRenderer_SetBackFaceCulling(0);
+    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
     QexRenderer_SetZWrite(1);
     if (emitters_) emitters_->Draw(camera);
 }
