@@ -158,7 +158,7 @@ void Renderer::DrawOpaque(const QexCamera& camera) {
 void Renderer::DrawBlended(const QexCamera& camera) {
     // The far sides of transparent bodies first, then the near ones.
     QexRenderer_SetZWrite(0);
-    for (int32_t culled : {2, 1}) {
+    for (int32_t culled : {QEX_CULL_FRONT, QEX_CULL_BACK}) {
         QexRenderer_SetBackFaceCulling(culled);
         for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
             QexModel_RenderAlphaBlendingNodes(transparent_.data(), transparentCount_, pass);
