@@ -178,9 +178,11 @@ TEST_F(QexInfo, NamesEveryProblem) {
              PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}});
              s->frameCount = 3;
          },
-         "node 0: position has fewer keys than frames; it stands still"},
+         "node 0: position has fewer keys than frames; it holds the last key"},
         {[](auto* s) { s->materials[0].opacity = 0.5f; }, "material 0 (paint) has an opacity of 0.5"},
         {[](auto* s) { s->nodes[0].material = -1; }, "mesh node 0 (quad) has no material"},
+        {[](auto* s) { s->nodes[0].material = 9; }, "1 node(s) name a material that is not there"},
+        {[](auto* s) { s->cameras[0].target = 9; }, "1 camera(s) have a target that is not there"},
         {[](auto* s) {
              s->lights.resize(1);
              s->lights[0].type = pod::kSpotLight;
@@ -203,7 +205,7 @@ TEST_F(QexInfo, NamesEveryProblem) {
              s->cameras.clear();
              s->frameCount = 12;
          },
-         "node 0: position has fewer keys than frames; it stands still (and 2 more like this)"},
+         "node 0: position has fewer keys than frames; it holds the last key (and 2 more like this)"},
     };
     for (const auto& c : cases) {
         pod::Scene scene = QuadScene();

@@ -36,6 +36,7 @@ bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* 
 bool DescribeTga(const std::vector<uint8_t>& file, Json* document, std::string* error);
 bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* error);
 
+constexpr char kPartialChain[] = "its mipmap chain is not whole: it is decoded, and the rest is made";
 constexpr char kNoMipmaps[] = "its sides are no powers of two: a plain GL ES 2.0 has no mipmaps for it";
 
 // InfoCommand.cpp. Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.

@@ -60,7 +60,7 @@ bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* 
         problems.push_back(kNoMipmaps);
     else if (refusal.empty() && pvr.format->coding == PixelFormat::kEtc1 && pvr.levels > 1 &&
              pvr.levels < FullChain(pvr.width, pvr.height))
-        problems.push_back("its mipmap chain is not whole: it is black where the GL takes ETC1");
+        problems.push_back(kPartialChain);
     if (refusal.empty() && !pvr.cube && pvr.surfaces > 1)
         problems.push_back("it is no cube map: the last of its surfaces is what shows");
     if (refusal.empty() && pvr.cube && pvr.surfaces < 6)

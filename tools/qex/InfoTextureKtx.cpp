@@ -66,13 +66,16 @@ bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* 
         problems.push_back("the engine refuses it: " + refusal);
         return true;
     }
-    if (ktx.Compressed() && !(ktx.format && ktx.format->coding == PixelFormat::kEtc1))
+    if (ktx.Compressed() && !(ktx.format && ktx.format->Compressed()))
         problems.push_back("only a GL with the extension takes " + GlName(ktx.glInternalFormat));
     const uint32_t chain = FullChain(ktx.width, ktx.height);
     if (!MipmapsFit(ktx.width, ktx.height, ktx.levels ? ktx.levels : chain))
         problems.push_back(kNoMipmaps);
-    else if (ktx.Compressed() && ktx.levels < chain)
-        problems.push_back("its mipmap chain is not whole: black until QexTexture_SetFilter is called");
+    else if (ktx.format && ktx.Compressed() && levels.size() > 1 && levels.size() < chain)
+        problems.push_back(kPartialChain);
+    if (levels.size() < ktx.levels)
+        problems.push_back("level " + std::to_string(levels.size()) +
+                           " or the one behind it is not of its size: it is made from level 0");
     if (ktx.depth > 1 || ktx.arrayElements > 0)
         problems.push_back("only the first picture is read of a volume or an array");
     return true;

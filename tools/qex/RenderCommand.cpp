@@ -100,8 +100,10 @@ bool Renderer::Load() {
         for (const std::string& line : LoadNormalMaps(&model_)) warnings.push_back(line);
     output.Stop();
     loadTime_ = Milliseconds(start);
-    for (const std::string& line : output.Messages("stands still")) warnings.push_back(line);
-    for (const std::string& line : output.Messages("ERROR:")) warnings.push_back(line);
+    // Whatever of a scene that was read had to be put right.
+    for (const char* part : {"<QexPODModel_ReadFromSourceStream>", "ERROR:"})
+        for (const std::string& line : output.Messages(part))
+            if (result == 0) warnings.push_back(line);
     for (const std::string& line : warnings) Warn(line);
     if (result == 0) return true;
     Fail(input_.Name() + ": " + output.FirstError(), 1);

@@ -114,10 +114,13 @@ bool ReadKtxHeader(const TextureBytes& file, KtxFile* ktx) {
         *field = KtxWord(file, *ktx, at);
         at += 4;
     }
+    if (!ktx->faces) ktx->faces = 1;  // a picture of no faces is a picture
     ktx->format = FindKtxFormat(ktx->glFormat, ktx->glType, ktx->glInternalFormat);
     return true;
 }
 
+// As the engine does it: where a level is not of its size, those before it stay, but one whose rows may have
+// been read shifted.
 std::string FindKtxLevels(const TextureBytes& file, const KtxFile& ktx, std::vector<TextureLevel>* levels) {
     uint64_t at = kKtxHeaderBytes + uint64_t{ktx.keyValueBytes};
     const uint64_t size = file.size();
@@ -129,6 +132,11 @@ std::string FindKtxLevels(const TextureBytes& file, const KtxFile& ktx, std::vec
         const uint64_t padded = (uint64_t{bytes} + 3) / 4 * 4;
         for (uint32_t face = 0; face < ktx.faces; ++face) level.faces.push_back(at + 4 + face * padded);
         if (ktx.format) level.rowBytes = RowBytes(*ktx.format, width, height, bytes);
+        if (i > 0 && ktx.format && !level.rowBytes) {
+            const bool shifted = !ktx.Compressed() && levels->back().width * ktx.format->bits / 8 % 4;
+            if (shifted && i > 1) levels->pop_back();
+            return "";
+        }
         levels->push_back(level);
         // The padding behind the last face may be missing.
         if (level.faces.back() + bytes > size) return "cut short in level " + std::to_string(i);
