@@ -14,7 +14,7 @@
  * - Results: 0 for success and a negative code for failure, unless a function says otherwise. Pointers must
  *   not be null unless a function says that they may be.
  * - A GL error is fatal: it is logged with the module and line that found it, and the process ends with
- *   exit status 255.
+ *   exit status 255. A library that was built with QEX_GL_CHECKS off does not look for them.
  * - GL object names and enumerants appear as uint32_t, so this header needs no GL header.
  * - Names begin with Qex, or with the record that they work on. A few others are exported as well
  *   (createWindow, fontdata, ...), where a program's own names may be the same: they are declared where
@@ -1491,7 +1491,7 @@ QEX_API uint32_t CStdVectorInt_Size(const CStdVectorInt* vector);
  *  @param bonesPerVertex  1 to 4 weights and bone indices a vertex
  *  @return 0, or -1 with the indices unchanged: another number of bones a vertex, a triangle with more bones
  *  than maxBones, a bone or vertex index out of range, elements that reach beyond the stride, more than 512
- *  batches, or no memory. outVertices is not written then, and there is nothing to release. */
+ *  batches, or no memory. outVertices is not written then, and batches holds nothing to release. */
 QEX_API int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
                                       uint32_t* indices, uint32_t vertexCount, const void* vertices,
                                       uint32_t stride, uint32_t weightOffset, uint32_t weightType,
@@ -1511,7 +1511,8 @@ QEX_API void QexBoneBatches_Release(QexBoneBatches* batches);
  * ====================================================================================================== */
 
 /** Moves every node whose animation is enabled to a frame (nodes of a speed other than 1 move a part of the
- *  way), wrapped into the animation: its last frame is where it starts again, and shows the first.
+ *  way forward, of a whole turn where they are there already), wrapped into the animation, whose last frame
+ *  is where it starts again and shows the first.
  *  @param frame  in frames, fraction included; below 0 the loop is counted backwards from its end; what is no
  *                finite number, or 4294967040 and more either way, counts as 0 */
 QEX_API void QexPODModel_SetFrame(QexPODModel* scene, float frame);
@@ -3588,7 +3589,8 @@ QEX_API int32_t QexTexture_Draw2(const QexRuntimeContext* context, QexTexture* t
  * Images of a HUD from files. Texture files may begin with the picture's upper edge (`qex texture` as it is)
  * or with its lower one (`qex texture --flip`, `qex convert`, TGA) and say so in their header. GL and
  * QexTexture_Draw take the first row for the lower edge; a picture remembers, and stands upright either way.
- * Blending, depth test and culling are left as the application sets them.
+ * Blending (QEX_BLEND_ALPHA for what is translucent), depth test and culling are left as the application sets
+ * them.
  * ====================================================================================================== */
 
 /** A picture. */
