@@ -14,7 +14,7 @@
  * - Results: 0 for success and a negative code for failure, unless a function says otherwise. Pointers must
  *   not be null unless a function says that they may be.
  * - A GL error is fatal: it is logged with the module and line that found it, and the process ends with
- *   exit status 255.
+ *   exit status 255. A library that was built with QEX_GL_CHECKS off does not look for them.
  * - GL object names and enumerants appear as uint32_t, so this header needs no GL header.
  * - Names begin with Qex, or with the record that they work on. A few others are exported as well
  *   (createWindow, fontdata, ...), where a program's own names may be the same: they are declared where
@@ -55,16 +55,16 @@ typedef struct QexShadowInfo QexShadowInfo;
  * QexLog_SetLevel and where to with QexLog_SetSink. No GL context needed on this page.
  * ====================================================================================================== */
 
-/** Weights of messages. What loaders print counts as an error or a warning when it begins with "ERROR:" or
- *  "WARNING:", and as information otherwise. */
+/** Weights of messages. What QexSystem_Printf prints, as the loaders do, counts as an error or a warning when
+ *  its format begins with "ERROR:" or "WARNING:" in any case, and as information otherwise. */
 #define QEX_LOG_INFO 4
 #define QEX_LOG_WARNING 5
 #define QEX_LOG_ERROR 6
 #define QEX_LOG_NONE 7 /* as a level: nothing */
 
-/** Leaves lighter messages out, wherever the log goes; only the line of a fatal GL error is written at every
- *  level. Once this function or QexLog_SetSink was called, for good, the engine writes to the log alone: what
- *  QexSystem_Printf, QexTime_UpdateFPS and the water print goes there once, and not to standard streams.
+/** Leaves lighter messages out, wherever the log goes; only the two lines of a fatal GL error are written at
+ *  every level. From the first call of this function or of QexLog_SetSink on, what QexSystem_Printf,
+ *  QexTime_UpdateFPS and the water print goes to the log, and no more to standard output or error.
  *  @param level  QEX_LOG_..., the lightest to be written; QEX_LOG_INFO at first
  *  @return the level before. */
 QEX_API int32_t QexLog_SetLevel(int32_t level);
@@ -73,7 +73,7 @@ QEX_API int32_t QexLog_SetLevel(int32_t level);
  *  @param user    as given to QexLog_SetSink
  *  @param weight  QEX_LOG_INFO, QEX_LOG_WARNING or QEX_LOG_ERROR
  *  @param tag     "Qex", "QexEngine", "Emitter" ..., never null
- *  @param text    the message without a newline at its end; gone after the call */
+ *  @param text    the message without the newline at its end; gone after the call */
 typedef void (*QexLogSink)(void* user, int32_t weight, const char* tag, const char* text);
 
 /** Sends the messages that the level lets through to a function instead of the log; see QexLog_SetLevel for
@@ -84,7 +84,8 @@ QEX_API void QexLog_SetSink(QexLogSink sink, void* user);
 
 /** Writes one message to the log at priority 4 (information).
  *  @param tag     log tag, "Qex" for the engine's own messages; null counts as ""
- *  @param format  printf format, not null; a message has no length limit and needs no trailing newline
+ *  @param format  printf format, not null; no trailing newline is needed, and no length limit set but that of
+ *                 Android's log
  *  @return the log call's result: positive when the message was written, negative on failure; 0 when the
  *  level leaves it out. */
 QEX_API int32_t QexLog(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
@@ -96,7 +97,7 @@ QEX_API int32_t QexLog(const char* tag, const char* format, ...) QEX_PRINTF(2, 3
 QEX_API int32_t QexError(const char* tag, const char* format, ...) QEX_PRINTF(2, 3);
 
 /** Writes a text to standard output as it stands, then the same text to the log at priority 4, tag "Qex"; to
- *  the log alone after QexLog_SetLevel or QexLog_SetSink.
+ *  the log alone after QexLog_SetLevel or QexLog_SetSink. See QEX_LOG_... for its weight.
  *  @param format  printf format, not null
  *  @return always 1. */
 QEX_API int32_t QexSystem_Printf(const char* format, ...) QEX_PRINTF(1, 2);
@@ -243,10 +244,10 @@ QEX_API uint32_t QexFloatAnimation_Animate(QexFloatAnimation* animation, float d
  * Math: vectors, matrices, scalars
  *
  * Plain functions over the caller's records; nothing allocates. The output comes first, except in the
- * transforms, where it comes last. No pointer may be null. Inputs are not changed, and an output may be an
- * input as well unless a function says otherwise. Functions with a pointer result return their output.
- * Input that has no answer (near = far, an axis of length 0, ...) gives infinities or NaNs, never a crash.
- * No GL context needed on this page.
+ * transforms and the reflection, where it comes last. No pointer may be null. Inputs are not changed, and an
+ * output may be an input as well unless a function says otherwise. Functions with a pointer result return
+ * their output. Input that has no answer (near = far, an axis of length 0, ...) gives zeros, infinities or
+ * NaNs, never a crash. No GL context needed on this page.
  * ====================================================================================================== */
 
 /** Two floats. */
@@ -310,7 +311,8 @@ QEX_API float QexVec4_DotProduct(const QexVec4* a, const QexVec4* b);
 /** out = a x b, right-handed. */
 QEX_API void QexVec3_CrossProduct(QexVec3* out, const QexVec3* a, const QexVec3* b);
 
-/** out = a at unit length. A vector of length 0 gives (0, 0, 0).
+/** out = a at unit length. A vector of length 0 gives (0, 0, 0). Lengths from 1e-19 to 1e19 are good,
+ *  others are off or give (0, 0, 0) as well.
  *  @return out. */
 QEX_API QexVec3* QexVec3_Normalize(QexVec3* out, const QexVec3* a);
 
@@ -462,8 +464,8 @@ QEX_API void QexMatrix_TransformHomoVec3Array(const QexMatrix* m, const void* in
 /** @return 1 when a > 1e-7, -1 when a < -1e-7, else 0. */
 QEX_API float Qex_Sign(float a);
 
-/** Square root by Newton's iteration, to about 1e-6 absolute.
- *  @return the root; 0 when a <= 0. */
+/** Square root by Newton's iteration, to 1e-6 for a below 1, to 1e-7 of the root above.
+ *  @return the root; 0 when a <= 0; infinity and NaN as they are. */
 QEX_API float Qex_Sqrt(float a);
 
 /** Arc tangent by a short series, to 1.4e-5.
@@ -784,10 +786,10 @@ typedef struct QexResFile {
 } QexResFile;
 
 /** Reads a whole file. Test QexResFile_IsOpen afterwards: a file that opens and cannot be read in full (a
- *  directory, a pipe, more than 2 GiB, no memory) gives 0 with the record closed and no message.
+ *  directory, 2 GiB or more, no memory) gives 0 with the record closed and no message.
  *  @param record  out; what it held is overwritten, not released
- *  @param path    path of the file; the record keeps its first 63 characters
- *  @return 0 when the file could be opened, -1 when it could not (logged with the path). */
+ *  @param path    path of the file; the record keeps its first 63 characters; null counts as missing
+ *  @return 0 when the file could be opened, -1 when it could not or is a pipe (logged with the path). */
 QEX_API int32_t QexResFile_Create(QexResFile* record, const char* path);
 
 /** Opens a view of a block. The block is not copied and stays the caller's.
@@ -831,7 +833,7 @@ QEX_API void QexResFile_Close(QexResFile* record);
 QEX_API void QexResFile_Release(QexResFile* record);
 
 /** @param path  path of a file; null counts as missing
- *  @return 1 when the file can be opened for reading, else 0. */
+ *  @return 1 when the file can be opened for reading, else 0; 0 for a pipe. */
 QEX_API int32_t QexResFile_Exists(const char* path);
 
 /** A forward-reading cursor over a whole file. Words are little-endian in the data on every host. Nothing is
@@ -1023,6 +1025,7 @@ QEX_API void QexNameCache_Clear(QexNameCache* cache);
 /** Releases both blocks. The cache is empty afterwards and may be added to again.
  *  @param cache  cache, not null */
 QEX_API void QexNameCache_Release(QexNameCache* cache);
+
 /* ======================================================================================================
  * POD scenes: records, reading, vertex access
  *
@@ -1123,7 +1126,7 @@ typedef struct QexPODMaterial {
 
 /** The batches of a skinned mesh: each draws a run of triangles with a small set of bones. */
 typedef struct QexBoneBatches {
-    int32_t* boneTable;     /* batchCount rows of maxBones node indices */
+    int32_t* boneTable;     /* batchCount rows of maxBones node indices; -1: follows the mesh node */
     int32_t* bonesPerBatch; /* bones used in each row */
     int32_t* offsets;       /* first triangle of each batch, rising from 0 */
     int32_t maxBones;       /* length of a row of boneTable */
@@ -1280,7 +1283,7 @@ struct QexPODModel {
  *  @param scene    filled; its former contents are overwritten, not released
  *  @param path     file path
  *  @param optionA  passed on to QexPODModel_ReadFromSourceStream, like the three after it
- *  @return 0 when the file could be opened, -1 when not. The result of reading does not show here: a scene
+ *  @return 0 when the file could be read, -1 when not. What its bytes hold does not show here: a scene
  *  that was read whole has a non-null `runtime`; otherwise it is partly filled. Release it in both cases. */
 QEX_API int32_t QexPODModel_ReadFromFile(QexPODModel* scene, const char* path, uint32_t optionA,
                                          uint32_t option2, uint32_t optionB, uint32_t option4);
@@ -1294,7 +1297,9 @@ QEX_API int32_t QexPODModel_ReadFromMemory(QexPODModel* scene, const void* data,
                                            uint32_t option4);
 
 /** Reads a POD scene from an open stream, from its position to its end.
- *  @param scene    filled; null reads and checks only the blocks outside the scene
+ *  @param scene    filled; null reads and checks only the blocks outside the scene, which ends in -1 unless
+ *                  optionA or optionB is set
+ *  @param stream   open stream; null or closed gives -1, without a line
  *  @param optionA  non-zero: the end of the stream finishes the read even without version or scene
  *  @param option2  not read
  *  @param optionB  as optionA
@@ -1391,7 +1396,7 @@ typedef struct CStdVectorInt {
 /** Makes an empty set without room. */
 QEX_API void CBatch_Constructor(CBatch* batch);
 
-/** Frees the set's storage. */
+/** Frees the set's storage. CBatch_Constructor makes it usable again. */
 QEX_API void CBatch_Destructor(CBatch* batch);
 
 /** Empties the set and gives it room for `capacity` bones; without memory, or below 1, for none. */
@@ -1486,7 +1491,7 @@ QEX_API uint32_t CStdVectorInt_Size(const CStdVectorInt* vector);
  *  @param bonesPerVertex  1 to 4 weights and bone indices a vertex
  *  @return 0, or -1 with the indices unchanged: another number of bones a vertex, a triangle with more bones
  *  than maxBones, a bone or vertex index out of range, elements that reach beyond the stride, more than 512
- *  batches, or no memory. */
+ *  batches, or no memory. outVertices is not written then, and batches holds nothing to release. */
 QEX_API int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
                                       uint32_t* indices, uint32_t vertexCount, const void* vertices,
                                       uint32_t stride, uint32_t weightOffset, uint32_t weightType,
@@ -1506,12 +1511,13 @@ QEX_API void QexBoneBatches_Release(QexBoneBatches* batches);
  * ====================================================================================================== */
 
 /** Moves every node whose animation is enabled to a frame (nodes of a speed other than 1 move a part of the
- *  way), wrapped into the animation.
+ *  way forward, of a whole turn where they are there already), wrapped into the animation, whose last frame
+ *  is where it starts again and shows the first.
  *  @param frame  in frames, fraction included; below 0 the loop is counted backwards from its end; what is no
- *                finite number counts as 0 */
+ *                finite number, or 4294967040 and more either way, counts as 0 */
 QEX_API void QexPODModel_SetFrame(QexPODModel* scene, float frame);
 
-/** Sets one node's frame, wrapped by the frame count when it lies beyond the last.
+/** Sets one node's frame, wrapped by the frame count when it lies beyond the last; below 0 counts as 0.
  *  @return 0, or -12. */
 QEX_API int32_t QexPODModel_SetNodeAnimationFrame(QexPODModel* scene, uint32_t index, float frame);
 
@@ -1567,7 +1573,7 @@ QEX_API void QexPODModel_SetNodeRotation(QexPODModel* scene, uint32_t index, flo
 /** Sets the scale part of a node's override. */
 QEX_API void QexPODModel_SetNodeScale(QexPODModel* scene, uint32_t index, float x, float y, float z);
 
-/** Sets a node's whole override matrix; it is used as it is. */
+/** Sets a node's whole override matrix; it is used as it is until a part is set, which replaces it. */
 QEX_API void QexPODModel_SetNodeMatrix(QexPODModel* scene, uint32_t index, const QexMatrix* matrix);
 
 /** Takes a node's override away. The world matrices that are cached stay until the next change of a frame or
@@ -1902,7 +1908,7 @@ QEX_API void QexShaders_SetShaderUVDisplacement(QexShaderModule* module, uint32_
 struct QexTexture {
     char name[32];         /* at most 31 characters and a NUL */
     uint8_t stage;         /* texture unit 0 to 4 that it is bound to */
-    uint8_t bytesPerPixel; /* 4, 3 or 2; 0 where the format has no code */
+    uint8_t bytesPerPixel; /* 4, 3 or 2, as the format; what its loader left where that has no code */
     uint8_t filter;        /* QEX_FILTER_... last applied */
     uint8_t wrap;          /* QEX_WRAP_... last applied */
     uint32_t flags;        /* QEX_TEXFLAG_... */
@@ -1922,7 +1928,8 @@ struct QexTexture {
  *  @param stage    unit 0 to 4
  *  @param filter   QEX_FILTER_...
  *  @param wrap     QEX_WRAP_...
- *  @param pixels   width * height pixels, rows tightly packed; kept by pointer, not owned
+ *  @param pixels   width * height pixels, rows tightly packed; kept by pointer, not owned; null: the texture
+ *                  has no image until QexTexture_Download
  *  @return 0. Unknown codes are skipped, as the single functions say. The name becomes "Noname". */
 QEX_API int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height,
                                             uint32_t format, int32_t ignored, uint32_t stage, uint32_t filter,
@@ -1946,8 +1953,9 @@ QEX_API int32_t QexTexture_CreateTGAFromMemSized(QexTexture* texture, int32_t ig
                                                  uint32_t size);
 
 /** QexTexture_CreateTGAFromMem on a file, named after it (GetNameFromFullPath).
- *  @return 0 once the file could be opened, -1 when not. A file that is cut short or of another kind leaves
- *  the record without a GL texture (glName 0) and a line in the log. */
+ *  @return 0 once the file could be opened; -1 when not, with the record as it was. A file that is cut short
+ *  or of another kind leaves the record without a GL texture (glName 0), with a line in the log unless only
+ *  its depth is another. */
 QEX_API int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint32_t stage,
                                              uint32_t filter, uint32_t wrap, const char* path);
 
@@ -1991,7 +1999,7 @@ QEX_API int32_t QexTexture_SetName(QexTexture* texture, const char* name);
 QEX_API const char* GetNameFromFullPath(const char* path);
 #endif
 
-/** @return the white default texture. No GL context needed. */
+/** @return the white default texture, empty before QexTexture_CreateDefault. No GL context needed. */
 QEX_API QexTexture* Qextexture_GetDefault(void);
 
 /** Creates the default texture (64 x 64, white) and the flat normal map (16 x 16) unless they exist. The
@@ -2004,7 +2012,7 @@ QEX_API int32_t QexTexture_ReleaseDefault(void);
 /** Makes a cube map whose texels hold the positive parts of the unit direction through them.
  *  @param texture  out; name, stage, filter and wrap are left alone
  *  @param size     edge in pixels, > 0
- *  @return 0, or -1 when memory runs out. */
+ *  @return 0, or -1, with a line printed, for a size that the GL does not take or when memory runs out. */
 QEX_API int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t size);
 
 /** The legacy PVR header, as QexTexture_LoadPVRFromMem gives it back. */
@@ -2025,13 +2033,14 @@ typedef struct QexPVRHeader {
 } QexPVRHeader;
 
 /** Loads a legacy PVR image, or a KTX 1.1 image, from memory. ETC1 goes to the GL as it is, or is decoded to
- * RGB where the GL does not take it; PVRTC is decoded to RGBA. Where the header asks for mipmaps that the
- * file lacks, the GL makes them, except for ETC1 that it takes as it is.
+ *  RGB where the GL does not take it or mipmaps are missing; PVRTC is decoded to RGBA. Where the header asks
+ *  for mipmaps that the file lacks, the GL makes them; a GL that has none of that size gets level 0 alone,
+ *  with a line printed. GL filters linearly in the nearest mipmap, repeats powers of two, clamps others.
  *  @param texture     out; cleared by the caller: name, stage, filter and wrap are left alone
  *  @param file        the whole file; the caller vouches for its length
  *  @param header      out, the PVR header in its current form, or null
  *  @param decode      0: PVRTC is refused
- *  @param firstLevel  levels above it are skipped; it becomes level 0
+ *  @param firstLevel  levels above it are skipped; it becomes level 0; width and height stay the file's
  *  @param pixelData   the pixels when they do not follow the header, or null
  *  @return 0; -1, with a line printed, for anything that cannot be loaded; a KTX image gives the result of
  *  QexTexture_LoadKTXFromMem. */
@@ -2053,12 +2062,12 @@ QEX_API int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path
                                            int32_t decode, uint32_t firstLevel);
 
 /** Loads a KTX 1.1 image of either byte order from memory: a compressed format that the GL takes as it is,
- * ETC1 on any GL, or RGB / RGBA of bytes or of 16-bit pixels (565, 4444, 5551). Rows may be padded to 4 bytes
- * or tight. No filter is set, and GL's own asks for all mipmaps: those that the file lacks the GL makes,
- * except for compressed formats that it takes as they are; a single level of those needs
- * QexTexture_SetFilter.
+ *  ETC1 and PVRTC (of powers of two) on any GL, or RGB / RGBA of bytes or of 16-bit pixels (565, 4444, 5551).
+ *  Rows may be padded to 4 bytes or tight. GL's own filter, which asks for all mipmaps, stays: those that the
+ *  file lacks, or from one that is not of its size on, the GL makes. Where it cannot, of a single level that
+ *  is compressed, say, the filter is linear without mipmaps. Powers of two repeat, other sizes are clamped.
  *  @param file  the whole file; the caller vouches for its length; the arguments after it are not read
- *  @return 0; -3 when it is no KTX 1.1; -4 for any other uncompressed format; -1, with a line printed, for
+ *  @return 0; -3 when it is no KTX 1.1; with a line printed, -4 for any other uncompressed format and -1 for
  *  sizes that cannot be or a compressed format that the GL does not take. */
 QEX_API int32_t QexTexture_LoadKTXFromMem(QexTexture* texture, const void* file, QexPVRHeader* header,
                                           int32_t decode, uint32_t firstLevel, const void* pixelData);
@@ -2114,13 +2123,15 @@ QEX_API void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t wid
  * number of nodes and models. Texture units: 0 diffuse, 1 normal map, 2 shadow map, 3 alpha texture. Alpha is
  * opacity (material's times g_fQexGlobalAlpha) times the alpha source, and 0 when that is not above the
  * module's threshold; a node without a material is opaque. A mesh without one of the attributes that a module
- * reads supplies (0, 0, 0, 1) for it. Needs a current GL context, except for the threshold functions.
+ * reads supplies (0, 0, 0, 1) for it. DrawMesh does not check its node: it has to be a mesh node of a model
+ * whose geometry is loaded. When the GL does not take a module's shaders, its reason is logged and the GL
+ * error ends the process. Needs a current GL context, except to set or get thresholds, shifts and fades.
  * ====================================================================================================== */
 
 /** Draws one node.
  *  @param module       the instance whose `render` is called
  *  @param model        a loaded model
- *  @param nodeIndex    a mesh node; one whose rendering flag is clear is skipped
+ *  @param nodeIndex    a mesh node; one whose rendering flag is clear is skipped, as is any other number
  *  @param lights       the lights; only lit modules read them
  *  @param modelMatrix  applied in front of the node's world matrix, or null
  *  @param view         world to camera
@@ -2198,8 +2209,9 @@ QEX_API void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* m
                                             const QexShadowInfo* shadow);
 
 /* QexSkinningTextureShader (QEX_SHADER_SKINNING_TEXTURE): as QexTextureShader for meshes that follow bones,
- * one draw a bone batch, up to 16 bones a batch and 4 a vertex. It leaves the node's pass alone. Slots:
- * boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the threshold. */
+ * one draw a bone batch, up to 16 bones a batch and 4 a vertex; other meshes are not drawn. It leaves the
+ * node's pass alone. Slots: boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations;
+ * the threshold. */
 
 /** Most bones in a batch that the skinned modules draw. */
 #define QEX_MAX_BATCH_BONES 16
@@ -2356,7 +2368,8 @@ QEX_API void QexGouraudSpecularShader_Render(QexShaderModule* module, QexModel* 
 /* QexGouraudNormalMapShader (QEX_SHADER_GOURAUD_NORMALMAP): as QexGouraudShader, lit per fragment with a
  * tangent-space normal map on unit 1, whose texels hold the normal's x in green, y in red, z in blue, from -1
  * to 1 as 0 to 1. The module binds the blank map; a real one comes from the model's bindTextureHook. Meshes
- * need tangents and binormals. Slots as QexGouraudShader. */
+ * need tangents; where they have those and normals, but no binormals, QexModel_DownloadGeometry makes them.
+ * Slots as QexGouraudShader. */
 
 /** Creates the normal-mapped module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexGouraudNormalMapShader_CreateProgram(void);
@@ -2435,7 +2448,7 @@ QEX_API void QexGouraudShadowExtShader_Render(QexShaderModule* module, QexModel*
                                               const QexShadowInfo* shadow);
 
 /* QexSkinningTextureNoAlphaShader (QEX_SHADER_SKINNING_TEXTURE_NOALPHA): as QexTextureNoAlphaShader for
- * meshes that follow bones. Slots as QexSkinningTextureShader. */
+ * meshes that follow bones; the model's bindTextureHook is not asked. Slots as QexSkinningTextureShader. */
 
 /** Creates the unlit skinned module without alpha texture, threshold 0.5. @return as
  * QexTextureShader_CreateProgram. */
@@ -2532,7 +2545,8 @@ QEX_API void QexSkinningGouraudNormalMapShader_Render(QexShaderModule* module, Q
                                                       const QexShadowInfo* shadow);
 
 /* QexDepthShader (no kind): depth as a grey level: 0 nearer than near, 1 beyond far, z / (far - near)
- * between, z being the clip-space z. No threshold. Slots: near, far, mvpMatrix locations. */
+ * between, z being the clip-space z. No threshold; textures are bound and a node's pass changes as by
+ * QexTextureShader. Slots: near, far, mvpMatrix locations. */
 
 /** Creates the depth module; near and far are not set yet. @return as QexTextureShader_CreateProgram. */
 QEX_API QexShaderModule* QexDepthShader_CreateProgram(void);
@@ -2551,9 +2565,9 @@ QEX_API void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uin
                                    const QexMatrix* view, const QexMatrix* projection,
                                    const QexShadowInfo* shadow);
 
-/* QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha as in
- * QexSkinningTextureShader. Slots: near, far, boneCount, boneMatrixArray, viewProjMatrix, opacity,
- * alphaThreshold locations; the threshold. */
+/* QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha 0 where it is
+ * for QexSkinningTextureShader, else 1; it leaves the node's pass alone. Slots: near, far, boneCount,
+ * boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the threshold. */
 
 /** Creates the skinned depth module, threshold 0.5; near and far are not set yet. @return as
  * QexTextureShader_CreateProgram. */
@@ -2582,7 +2596,7 @@ QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* mo
  * it reads the attributes a_v4Position and a_v2TexCoord and the texture on unit 0. A pixel becomes the mean
  * of those beside it, the one i steps away weighted with exp(-i * i / (2 * sigma * sigma)), its alpha 1.
  * `samples` is 9, 7, 5 or anything else, no number included: 4, 3, 2 or 1 pixels on each side. The sign of
- * sigma does not count; 0 leaves the picture as it is, as does, where the GPU tells it, what is no number.
+ * sigma does not count; 0, or what is no number, leaves the picture as it is.
  * Slots: a_v4Position, u_m4Projection, a_v2TexCoord, u_s2dTexture, sigma, blurSize, horizontal_or_vertical,
  * samples locations; the projection, 16 floats by columns. */
 
@@ -2641,14 +2655,15 @@ QEX_API void QexDOFShader_SetParameters(QexShaderModule* module, float focus, fl
 /** Called before a node's diffuse texture is bound. @return non-zero: the hook bound a texture itself. */
 typedef int32_t (*QexBindTextureHook)(QexModel* model, uint32_t nodeIndex);
 /** Called before a material's texture is loaded.
- *  @param path      directory and texture name; may be rewritten
+ *  @param path      directory and texture name; may be rewritten, which the alpha texture's does not follow
  *  @param capacity  characters that path holds, besides the NUL
  *  @return 0: the engine loads `path`. Non-zero: the hook dealt with it; the material's record (the last
  *  non-null entry of model->textures) is zeroed, and the hook may fill it with a texture of its own, which
  * the model then owns. QexModel_LoadTextureFromCache makes no record: there the material's entries stay null.
  */
 typedef int32_t (*QexLoadTextureHook)(QexModel* model, char* path, int32_t capacity);
-/** Called once for each mesh node at the end of loading. @return not read. */
+/** Called once for each mesh node near the end of loading; the default modules are set after it. @return not
+ *  read. */
 typedef int32_t (*QexMeshNodeLoadedHook)(QexModel* model, QexPODMesh* mesh, uint32_t meshNodeIndex);
 
 struct QexModel {
@@ -2656,7 +2671,8 @@ struct QexModel {
     QexPODModel scene;
     QexTexture** textures;              /* diffuse texture of each material, null where none */
     QexTexture** alphaTextures;         /* alpha texture of each material, null where none */
-    QexBoundingBox* nodeBoxes;          /* box of each mesh node in the world */
+    QexBoundingBox* nodeBoxes;          /* box of each mesh node in the world: its corners, as of
+                                           QexModel_UpdateModelBoundingBox, 0 before */
     QexBoundingBox* screenBoxes;        /* box of each mesh node on screen, see QexModel_CalcScreenBBox */
     uint32_t* vertexBuffers;            /* GL buffer of each mesh */
     uint32_t* indexBuffers;             /* GL buffer of each mesh, 0 for one without indices */
@@ -2730,8 +2746,8 @@ QEX_API extern QexModelShadowProgram m_uModelShadowShaderProgram;
 /** Clears a model record. No GL context needed. @return 0. */
 QEX_API int32_t QexModel_Create(QexModel* model);
 
-/** Loads a model whole: scene, buffers, textures, default shaders, boxes; then calls the hook for each mesh
- *  node. A model that was loaded before is unloaded first.
+/** Loads a model whole: scene, default shaders, buffers, textures; then calls the hook for each mesh node and
+ *  gives all of them the default modules. A model that was loaded before is unloaded first.
  *  @param directory  put in front of the file's and the textures' names as it is, with its separator
  *  @param file       POD file; directory and name together at most 255 characters
  *  @return 0, or the failing step's result, with lines in the log that say what is wrong; the model then
@@ -2749,17 +2765,19 @@ QEX_API int32_t QexModel_LoadContent(QexModel* model, const char* directory, con
 QEX_API int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_t size,
                                               QexNameCache* cache);
 
-/** Reads the scene only. No GL context needed.
+/** Reads the scene only, in place of what the model holds. No GL context needed, unless that is GL objects.
  *  @return 0; -1 when the file cannot be opened or does not hold a sound scene (nothing is kept then). */
 QEX_API int32_t QexModel_LoadFromFile(QexModel* model, const char* directory, const char* file);
 
-/** Reads the scene only, from memory that must outlive it. No GL context needed. @return 0, or -1. */
+/** QexModel_LoadFromFile from memory, which must outlive the scene. @return 0, or -1. */
 QEX_API int32_t QexModel_LoadFromMemory(QexModel* model, const void* data, uint32_t size);
 
 /** Creates the GL buffers and works out each mesh's box and attribute layout. Vertices are laid out
- * interleaved where the file does not; 32-bit indices become 16-bit ones.
- *  @return 0; -1 with a line in the log when memory runs out or a mesh needs more than 16-bit indices or a
- *  batch more than QEX_MAX_BATCH_BONES bones. */
+ *  interleaved where the file does not; 32-bit indices become 16-bit ones; batches of more than
+ *  QEX_MAX_BATCH_BONES bones are cut into smaller ones; binormals that are missing next to normals and
+ *  tangents are made.
+ *  @return 0; -1 with a line in the log when memory runs out, a mesh needs more than 16-bit indices, or a
+ *  batch cannot be cut. */
 QEX_API int32_t QexModel_DownloadGeometry(QexModel* model);
 
 /** Loads each material's diffuse texture (directory and name) and alpha texture ("_a" before the last four
@@ -2775,7 +2793,8 @@ QEX_API int32_t QexModel_LoadTextureFromCache(QexModel* model, QexNameCache* cac
 QEX_API int32_t QexModel_CreateDefaultShader(void);
 
 /** Balances one QexModel_CreateDefaultShader; the last one frees the shared set.
- *  @param force  1: frees it whatever the count */
+ *  @param force  1: frees it whatever the count; models that were loaded with it are no longer drawn then,
+ *                with a line in the log each, until they are loaded again */
 QEX_API void QexModel_ReleaseShader(int32_t force);
 
 /** Sets the size of the shadow target that is made with the next shared set; 512 x 512 at first. No GL
@@ -2840,7 +2859,7 @@ typedef struct QexMesh {
  *  @param mesh  out; what it held is overwritten, not released. Release with QexMesh_Release
  *  @param width, height, depth  along x, y and z, > 0
  *  @return 0; -1, with a line in the log and an empty mesh, for sizes that are not above 0 or when memory
- *  runs out. No GL context needed. */
+ *  runs out; -1 for null. No GL context needed. */
 QEX_API int32_t QexMesh_CreateBox(QexMesh* mesh, float width, float height, float depth);
 
 /** Makes the mesh of a sphere around the origin: the texture once around from west to east, seen from
@@ -2861,7 +2880,8 @@ QEX_API int32_t QexMesh_CreateCylinder(QexMesh* mesh, float radius, float height
  *  towards +Z.
  *  @param width, depth  along x and z, > 0
  *  @param segments      cells along each side, 1 to 255; vertex lighting gets finer with them
- *  @param repeat        how often the texture goes along each side
+ *  @param repeat        how often the texture goes along each side; above 1 it has to wrap with
+ *                       QEX_WRAP_REPEAT
  *  @return as QexMesh_CreateSphere. */
 QEX_API int32_t QexMesh_CreatePlane(QexMesh* mesh, float width, float depth, uint32_t segments, float repeat);
 
@@ -2873,14 +2893,15 @@ QEX_API void QexMesh_Release(QexMesh* mesh);
  * is drawn, moved, picked and unloaded like any other. With normals its module is lit (an even 0.2 where no
  *  lights are given), without them unlit; meshes with normals and texture coordinates get tangents, for
  *  QexGouraudNormalMapShader. No module reads vertex colours: one colour for all vertices becomes a texture
- * of one pixel, others a texture with a patch for each triangle, whose vertices are parted then, so that at
- * most 21,845 triangles can have colours. The mesh is copied.
+ *  of one pixel, others a texture with a patch for each triangle, whose vertices are parted then, so that at
+ *  most 21,845 triangles can have colours; such a mesh gets no tangents. Neither module regards the
+ *  alpha of texture or colours; QexTextureNoAlphaShader does. The mesh is copied.
  *  @param model    cleared first; unload before what it holds
  *  @param mesh     arrays of at least the counts; vertices that no index names are allowed
  *  @param texture  stays the application's, alive as long as the model; colours are left out with it, with a
  *                  line in the log; null: the colours, or white
- *  @return 0; -1, with a line in the log and an empty model, for null pointers, counts out of range, an index
- *  that names no vertex, or when memory runs out. Needs a current GL context. */
+ *  @return 0; -1, with a line in the log and an empty model, for null pointers, counts out of range or of no
+ *  whole triangles, an index that names no vertex, or when memory runs out. Needs a current GL context. */
 QEX_API int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh, QexTexture* texture);
 
 /* ======================================================================================================
@@ -2888,7 +2909,7 @@ QEX_API int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh, Qe
  *
  * The render calls draw mesh nodes in index order, each through its shader module. A `pass` argument draws
  * only the nodes whose mesh has that pass ID (0 after reading). `modelMatrix` is applied in front of every
- * node's world matrix and may be null; `lights` may be null where no module is lit. Nothing is allocated.
+ * node's world matrix and may be null; so may `lights`, for no light. Nothing is allocated.
  * Needs a current GL context, except where a function says not.
  * ====================================================================================================== */
 
@@ -2982,7 +3003,7 @@ QEX_API void QexModel_SetAlphaBlendingNodes(QexModel* model, const char* const* 
 /** Puts the named nodes into the alpha-blending list and stores their blend order. Other nodes are left
  * alone. No GL context needed.
  *  @param names   node names, or null: nothing happens
- *  @param orders  one value per node of the scene, indexed by node */
+ *  @param orders  one value per node of the scene, indexed by node; null: orders stay */
 QEX_API void QexModel_SetAlphaBlendingNodesWithOrder(QexModel* model, const char* const* names,
                                                      const int32_t* orders, int32_t count);
 
@@ -2996,7 +3017,8 @@ QEX_API void QexModel_SetShaderProgram(QexModel* model, uint32_t nodeIndex, QexS
 QEX_API void QexModel_SetShaderProgramForAllNode(QexModel* model, QexShaderModule* staticModule,
                                                  QexShaderModule* skinnedModule);
 
-/** Sets the alpha threshold of the two default modules, where they exist. No GL context needed. */
+/** Sets the alpha threshold of the modules that models get by default, the lit one of models from arrays
+ *  included, where they exist. No GL context needed. */
 QEX_API void QexModel_SetAlphaTestCmpValue(float threshold);
 
 /** Does nothing; kept for callers. */
@@ -3121,7 +3143,8 @@ typedef struct QexReflection {
 } QexReflection;
 
 /** Makes a reflection in a mesh node, whose mesh must be flat: the plane goes through its first vertex, along
- * its first normal, as the node stands now. No GL context needed.
+ *  its first normal, as the node stands now. A mesh without an interleaved block, as QexModel_CreateFromMesh
+ *  makes them, gives the plane y = 0 of the world, with lines in the log. No GL context needed.
  *  @param casters     casterCount models and nodes to reflect; copied. The plane node itself is not drawn for
  * an entry of its own model that asks for all nodes
  *  @param useStencil  1 needs a stencil buffer, cleared to 0 at the start of each frame
@@ -3150,7 +3173,8 @@ QEX_API void QexReflection_RenderReflection(QexReflection* reflection, const Qex
                                             const QexCamera* camera);
 
 /** Sets the stencil to 1 where a plane node is, and leaves the stencil test on: what is drawn next shows only
- *  there. @param modelMatrix  in front of the node's world matrix, or null */
+ *  there. The depth test and the whole colour mask are on afterwards.
+ *  @param modelMatrix  in front of the node's world matrix, or null */
 QEX_API void QexModel_RenderReflectionPlaneStencil(QexModel* model, uint32_t planeNode,
                                                    const QexLightSet* lights, const QexMatrix* modelMatrix,
                                                    const QexMatrix* view, const QexMatrix* projection);
@@ -3454,7 +3478,7 @@ QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
  *
  * (x, y) places a text's upper left corner, x from the left edge of the surface, y downwards, but y is
  * counted from 32 pixels above the surface: y = 32 is its upper edge, and a first line that is to stand 8
- * pixels below the edge has y = 40. Below y = 32 it is cut off, at y = 16 and less it cannot be seen.
+ * pixels below the edge has y = 40. Below y = 32 it is cut off, at y = 16 and less one line cannot be seen.
  *
  * Strings are UTF-8. The characters 32 to 127 and 160 to 255 (Latin-1) have glyphs, others are drawn as an
  * empty box; a line feed starts a new line below the first. Lines are 16 pixels high, characters 8 wide,
@@ -3504,7 +3528,8 @@ QEX_API int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t 
  *  @return 0; -1, and no change, for a scale out of range. */
 QEX_API int32_t QexFont_SetScale(float scale);
 
-/** Measures a string as it would be drawn now: its longest line and all its lines. No GL context needed.
+/** Measures a string as it would be drawn now: its longest line and all its lines, one for "". No GL context
+ *  needed.
  *  @param width, height  out, pixels; either may be null */
 QEX_API void QexFont_MeasureString(const char* string, float* width, float* height);
 
@@ -3512,7 +3537,8 @@ QEX_API void QexFont_MeasureString(const char* string, float* width, float* heig
 QEX_API void QexFont_ClearString(void);
 
 /** Draws the persistent text from the engine's own memory: no GL buffer may be bound. Leaves blending on
- *  (source alpha over), the depth function at less or equal, texture unit 3 active. */
+ *  (source alpha over), the depth function at less or equal, texture unit 3 active, or 0 where characters
+ *  below and above 127 mix. */
 QEX_API void QexFont_Draw(void);
 
 /** Draws a string at once. The longest so far decides how much memory is kept for it. Leaves the state that
@@ -3541,8 +3567,10 @@ typedef struct QexRect {
 } QexRect;
 
 /** Draws a texture, or a part of it, texel by pixel at scale 1.
- *  @param texture    its filter and wrap stay as they are; null: the default texture, one pixel at scale 1
- *  @param rectangle  the part to draw; null, or without a texture: all of it, and one pixel more each way
+ *  @param texture    its filter and wrap stay as they are; null: the default texture, 65 / 64 pixels wide
+ *  @param rectangle  the part to draw: right + 1 - left by bottom + 1 - top pixels at scale 1, onto which the
+ *                    texels up to right - 1 and bottom - 1 are stretched; null: all of it, on one pixel more
+ *                    each way
  *  @param colour     0xAARRGGBB, multiplies the texels
  *  @return 0; what the log call returns when there is no font and it cannot be created */
 QEX_API int32_t QexTexture_Draw(const QexRuntimeContext* context, QexTexture* texture, float x, float y,
@@ -3561,20 +3589,21 @@ QEX_API int32_t QexTexture_Draw2(const QexRuntimeContext* context, QexTexture* t
  * Images of a HUD from files. Texture files may begin with the picture's upper edge (`qex texture` as it is)
  * or with its lower one (`qex texture --flip`, `qex convert`, TGA) and say so in their header. GL and
  * QexTexture_Draw take the first row for the lower edge; a picture remembers, and stands upright either way.
- * Blending, depth test and culling are left as the application sets them.
+ * Blending (QEX_BLEND_ALPHA for what is translucent), depth test and culling are left as the application sets
+ * them.
  * ====================================================================================================== */
 
 /** A picture. */
 typedef struct QexPicture {
     QexTexture texture;
-    QexTexture alpha;  /* from the second file of a picture without alpha of its own; glName 0 for none */
+    QexTexture alpha;  /* from the second file, its red counts; glName 0 for none */
     uint32_t topFirst; /* 1: the first row is the upper edge */
 } QexPicture;
 
 /** Loads a picture from a PVR, KTX or TGA file, and its alpha from the file with "_a" before the extension if
  *  there is one, as `qex texture --format etc1` writes it. It is filtered linearly and clamped.
  *  @param picture  out; what it held is overwritten, not released
- *  @param path     at most 255 characters
+ *  @param path     not null; above 253 characters no second file is looked for
  *  @return 0; -1, with a line in the log and an empty picture, when it cannot be loaded. Needs a current GL
  *  context; release with QexPicture_Release. */
 QEX_API int32_t QexPicture_Load(QexPicture* picture, const char* path);
@@ -3584,28 +3613,29 @@ QEX_API int32_t QexPicture_Load(QexPicture* picture, const char* path);
  *  @param picture        loaded; null: a plain rectangle in the colour
  *  @param part           pixels of the picture, within it, right and bottom included; null: all of it
  *  @param x, y           upper left corner, pixels from the screen's upper left
- *  @param width, height  pixels on the screen, > 0; 0 both: as many as the picture's
+ *  @param width, height  pixels on the screen, > 0; 0 both: as many as the picture or the part has
  *  @param colour         0xAARRGGBB, multiplied; 0xFFFFFFFF as it is
  *  @return 0; -1, with a line in the log and nothing drawn, without a context or for an empty picture, a part
  *  that is not within it, or no size. Needs a current GL context without bound buffers. */
 QEX_API int32_t QexPicture_Draw(const QexRuntimeContext* context, QexPicture* picture, const QexRect* part,
                                 float x, float y, float width, float height, uint32_t colour);
 
-/** Releases a picture's textures and empties it. @param picture  null does nothing */
+/** Releases a picture's textures and empties it. Needs a current GL context. @param picture  loaded, or
+ *  zeroed; null does nothing */
 QEX_API void QexPicture_Release(QexPicture* picture);
 
 /* ======================================================================================================
  * Render targets
  *
  * Framebuffers to draw into instead of the screen, with an RGBA texture for colour and a 16-bit depth buffer.
- * The record is the caller's. Targets do not follow the size of the screen.
+ * The record is the caller's. Targets do not follow the size of the screen. Needs a current GL context.
  * ====================================================================================================== */
 
 /** A render target. */
 typedef struct QexRenderTarget {
     uint32_t created;        /* 1 after QexRenderTarget_Create */
     uint32_t framebuffer;    /* GL name, 0 for none, as the two below */
-    QexTexture colorTexture; /* what was drawn; unfiltered, its format the GL enumerant GL_RGBA */
+    QexTexture colorTexture; /* what was drawn; unfiltered, its format the GL enumerant GL_RGBA, flags 1 */
     uint32_t depthRenderbuffer;
     int32_t viewport[4];      /* x, y, width, height while it is drawn into */
     int32_t savedViewport[4]; /* of before QexRenderTarget_BeginScene */
@@ -4026,7 +4056,7 @@ QEX_API void QexParticleEmitter_Release(QexParticleEmitter* emitter);
  *
  * Depth of field. The application draws its scene in a callback, once in colour and once as depth; the
  * engine blurs the colours in two passes and mixes sharp and blurred pixels by their distance from a focus.
- * Start it once the screen's size is known, and anew when the size changes. Functions that draw return -1,
+ * Start it once the screen's size is known; QexEngine_Resize follows the size. Functions that draw return -1,
  * with a line in the log, before QexPostProcessing_Initialize, and -9 without an argument they need, and
  * draw nothing then. Quads are drawn without depth test, blending and culling, which are put back; the
  * program, the active unit and the textures of units 0 to 2 change. Needs a current GL context without bound
@@ -4068,8 +4098,9 @@ QEX_API extern const char* pFragmentShaderPP;
 
 /** Creates the quad, the targets and the programs for a screen. What an earlier call made is released first.
  *  @param context  its size is the screen's
- *  @return 0; -9 for null; -1, with a line in the log, for a size below 1 or above what the GL draws into, or
- *  when the copy program cannot be made. Nothing is left then. */
+ *  @return 0; -9 for null; -1, with a line in the log, for a size below 1 or above what the GL draws into:
+ *  what an earlier call made stays then; -1 when the copy program cannot be made or memory runs out: nothing
+ *  is left then. */
 QEX_API int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context);
 
 /** Releases what QexPostProcessing_Initialize made; without it, nothing. @return 0. */
@@ -4123,7 +4154,8 @@ QEX_API int32_t QexPP_DrawNormalScene(QexRuntimeContext* context, void* user1, v
  *  @param source  the picture, none of the targets' own
  *  @param first   takes the rows: as wide as the screen, or half as wide, rounded down
  *  @param second  takes the result, of the same size
- *  @return 0; -10 for another width, and `first` stays bound (QexRenderTarget_EndScene takes it back). */
+ *  @return 0, or as said above; -10 for another width: `first` stays bound (QexRenderTarget_EndScene takes it
+ *  back). */
 QEX_API int32_t QexPP_DrawBlurImage(const QexRuntimeContext* context, void* user1, void* user2, void* user3,
                                     float sigma, float samples, float blurH, float blurV, QexTexture* source,
                                     QexRenderTarget* first, QexRenderTarget* second);
@@ -4216,7 +4248,8 @@ struct QexRuntimeContext {
 QEX_API int32_t QexEngine_Init(QexRuntimeContext* context, uint32_t configSize, QexEngineConfig* config);
 
 /** Initialises the engine on a surface that the application draws: memory pool, clock, render state, built-in
- *  textures, font. Arguments and result as QexEngine_Init. */
+ *  textures, font. Arguments and result as QexEngine_Init; 0, too, when the font cannot be made, with a line
+ *  in the log. */
 QEX_API int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSize,
                                            QexEngineConfig* config);
 
@@ -4227,10 +4260,12 @@ QEX_API int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t 
  *  @param context        initialised
  *  @param width, height  pixels, 1 and more
  *  @return 0; -1, with a line in the log and nothing changed, for a smaller size or a null context; -1 when
- *  post-processing cannot be had at the new size. */
+ *  post-processing cannot be had at the new size, which all else has then. */
 QEX_API int32_t QexEngine_Resize(QexRuntimeContext* context, int32_t width, int32_t height);
 
-/** Ends what QexEngine_Init began. Models must be unloaded before: their shared shaders go with it. */
+/** Ends what QexEngine_Init began, in the same GL context. The shaders that models share go with it: a model
+ *  that is not unloaded before is drawn no more, but may still be unloaded. What other families created
+ *  (sky box, post-processing, billboards, particle sets, textures) is for the application to release. */
 QEX_API void QexEngine_Shutdown(QexRuntimeContext* context);
 
 /** Ends what QexEngine_InitForOwnerDraw began. */
