@@ -1938,8 +1938,8 @@ QEX_API int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, 
 /** Creates a texture from an uncompressed 24- or 32-bit TGA image in memory. Only width, height and depth of
  *  its header are read; pixels follow the 18-byte header in stored order. The caller vouches for the length.
  *  @param ignored  not read; stage, filter, wrap as in QexTexture_CreateFromPixels
- *  @return 0; -4 for another depth; -1, with a line in the log, for a size of 0, beyond GL's limit or too
- *  large to hold. No GL texture is made then. */
+ *  @return 0; with a line in the log and without a GL texture -4 for another depth, -1 for a size of 0,
+ * beyond GL's limit or too large to hold. */
 QEX_API int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t ignored, uint32_t stage,
                                             uint32_t filter, uint32_t wrap, const void* tga);
 

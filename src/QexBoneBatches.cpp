@@ -432,6 +432,7 @@ int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount,
                               uint32_t weightOffset, uint32_t weightType, uint32_t indexOffset,
                               uint32_t indexType, uint32_t triangleCount, int32_t maxBones,
                               uint32_t bonesPerVertex) {
+    memset(batches, 0, sizeof *batches);
     if (bonesPerVertex < 1 || bonesPerVertex > 4 || maxBones < 1) return -1;
     const QexBoneVertices layout = {static_cast<const uint8_t*>(vertices),
                                     vertexCount,

@@ -313,8 +313,11 @@ const QexFontProgram* QexFont_GetProgram() {
 void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore) {
     if (!s_Created) return;
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(width), 0, static_cast<float>(height), 0, 1);
-    QexRenderState_UseProgram(s_Program.program);
-    QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    // A program that is made later takes the projection then.
+    if (s_Program.program) {
+        QexRenderState_UseProgram(s_Program.program);
+        QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    }
     const float up = static_cast<float>(height - heightBefore);
     for (uint32_t glyph = 0; glyph < s_Text.count; ++glyph)
         for (float(&position)[3] : s_Text.positions[glyph]) position[1] += up;

@@ -32,7 +32,7 @@ float Qex_Sign(float a) {
 }
 
 float Qex_Sqrt(float a) {
-    if (a <= 0) return 0;
+    if (a < FLT_MIN) return 0;  // half of the least numbers would be 0
     if (a == 1) return 1;
     if (!(a <= FLT_MAX)) return a;
     // A large root can swing between two neighbours that are further apart than the limit, so the steps are

@@ -23,7 +23,7 @@ T* AllocZeroed(uint32_t count) {
 bool JoinPath(char (&path)[kPathSize], const char* directory, const char* name) {
     const int length = snprintf(path, kPathSize, "%s%s", directory, name);
     if (length >= 0 && static_cast<size_t>(length) < kPathSize) return true;
-    QexError(QEX_TAG, "<QexModel_LoadContent> the path %s%s is longer than %zu characters", directory, name,
+    QexError(QEX_TAG, "<QexModel_LoadFromFile> the path %s%s is longer than %zu characters", directory, name,
              kPathSize - 1);
     return false;
 }

@@ -98,8 +98,7 @@ int32_t QexPicture_Load(QexPicture* picture, const char* path) {
     Header header;
     if (!picture || !path) return Refuse("QexPicture_Load", "no picture or no path");
     memset(picture, 0, sizeof *picture);
-    if (!ReadHeader(&header, path)) return -1;
-    if (!Load(&picture->texture, path, header)) {
+    if (!ReadHeader(&header, path) || !Load(&picture->texture, path, header)) {
         QexError(QEX_TAG, "<QexPicture_Load> %s is no picture that can be loaded", path);
         return -1;
     }

@@ -109,7 +109,11 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
     texture->height = static_cast<uint32_t>(header.height);
     texture->bytesPerPixel = static_cast<uint8_t>(header.bytesPerPixel);
     QexTexture_SetStage(texture, stage);
-    if (header.bytesPerPixel != 4 && header.bytesPerPixel != 3) return -4;
+    if (header.bytesPerPixel != 4 && header.bytesPerPixel != 3) {
+        QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %d bytes a pixel; images have 3 or 4",
+                 header.bytesPerPixel);
+        return -4;
+    }
     if (!QexTexture_IsPossibleSize(static_cast<uint32_t>(header.width), texture->height, false)) {
         QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %d x %d pixels are not possible here", header.width,
                  header.height);

@@ -198,6 +198,9 @@ TEST_F(FontTest, ProgramsComeAndGoWithoutTheFont) {
     for (int round = 0; round < 3; ++round) {
         QexFont_ReleaseShader(1);
         Capture log(STDERR_FILENO);
+        // Sizes may change meanwhile.
+        EXPECT_EQ(QexEngine_Resize(&runtime_, kWidth + round, kHeight), 0);
+        EXPECT_EQ(QexEngine_Resize(&runtime_, kWidth, kHeight), 0);
         Add(0, 40, "text");
         EXPECT_TRUE(SamePicture(Drawn(QexFont_Draw), background_));
         EXPECT_TRUE(SamePicture(draw(), background_));
