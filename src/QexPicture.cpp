@@ -24,8 +24,10 @@ struct Header {
 bool ReadHeader(Header* header, const char* path) {
     QexResFile file;
     memset(header, 0, sizeof *header);
-    QexResFile_Create(&file, path);
+    const int32_t result = QexResFile_Create(&file, path);
     const bool open = QexResFile_IsOpen(&file);
+    // What cannot even be opened was said.
+    if (!open && result == 0) QexError(QEX_TAG, "<QexPicture_Load> %s cannot be read", path);
     if (open) {
         const uint32_t size = QexResFile_GetSize(&file);
         header->size = size < sizeof header->bytes ? size : static_cast<uint32_t>(sizeof header->bytes);
@@ -98,7 +100,8 @@ int32_t QexPicture_Load(QexPicture* picture, const char* path) {
     Header header;
     if (!picture || !path) return Refuse("QexPicture_Load", "no picture or no path");
     memset(picture, 0, sizeof *picture);
-    if (!ReadHeader(&header, path) || !Load(&picture->texture, path, header)) {
+    if (!ReadHeader(&header, path)) return -1;
+    if (!Load(&picture->texture, path, header)) {
         QexError(QEX_TAG, "<QexPicture_Load> %s is no picture that can be loaded", path);
         return -1;
     }
