@@ -139,7 +139,7 @@ uint32_t NextCharacter(const char** text) {
     for (uint32_t i = 1; i <= follow; ++i) {
         if ((bytes[i] & 0xC0) != 0x80) {
             *text += 1;
-            return bytes[0] < kFirstLatin ? bytes[0] : UINT32_MAX;
+            return UINT32_MAX;
         }
         character = character << 6 | (bytes[i] & 0x3Fu);
     }
@@ -313,8 +313,10 @@ const QexFontProgram* QexFont_GetProgram() {
 void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore) {
     if (!s_Created) return;
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(width), 0, static_cast<float>(height), 0, 1);
-    QexRenderState_UseProgram(s_Program.program);
-    QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    if (s_Program.program) {
+        QexRenderState_UseProgram(s_Program.program);
+        QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    }
     const float up = static_cast<float>(height - heightBefore);
     for (uint32_t glyph = 0; glyph < s_Text.count; ++glyph)
         for (float(&position)[3] : s_Text.positions[glyph]) position[1] += up;
