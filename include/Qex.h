@@ -2026,7 +2026,7 @@ typedef struct QexPVRHeader {
 
 /** Loads a legacy PVR image, or a KTX 1.1 image, from memory. ETC1 goes to the GL as it is, or is decoded to
  * RGB where the GL does not take it; PVRTC is decoded to RGBA. Where the header asks for mipmaps that the
- * file lacks, the GL makes them, except for ETC1 that it takes as it is.
+ * file lacks, ETC1 is decoded, too, and the GL makes them.
  *  @param texture     out; cleared by the caller: name, stage, filter and wrap are left alone
  *  @param file        the whole file; the caller vouches for its length
  *  @param header      out, the PVR header in its current form, or null
@@ -2053,10 +2053,10 @@ QEX_API int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path
                                            int32_t decode, uint32_t firstLevel);
 
 /** Loads a KTX 1.1 image of either byte order from memory: a compressed format that the GL takes as it is,
- * ETC1 on any GL, or RGB / RGBA of bytes or of 16-bit pixels (565, 4444, 5551). Rows may be padded to 4 bytes
- * or tight. No filter is set, and GL's own asks for all mipmaps: those that the file lacks the GL makes,
- * except for compressed formats that it takes as they are; a single level of those needs
- * QexTexture_SetFilter.
+ * ETC1 and PVRTC on any GL, or RGB / RGBA of bytes or of 16-bit pixels (565, 4444, 5551). Rows may be padded
+ * to 4 bytes or tight. No filter is set, and GL's own asks for all mipmaps: those that the file lacks, or
+ * that are not of their size, the GL makes. Where it cannot, of one compressed level and of a format of its
+ * own, the filter becomes GL_LINEAR.
  *  @param file  the whole file; the caller vouches for its length; the arguments after it are not read
  *  @return 0; -3 when it is no KTX 1.1; -4 for any other uncompressed format; -1, with a line printed, for
  *  sizes that cannot be or a compressed format that the GL does not take. */
