@@ -139,7 +139,7 @@ uint32_t NextCharacter(const char** text) {
     for (uint32_t i = 1; i <= follow; ++i) {
         if ((bytes[i] & 0xC0) != 0x80) {
             *text += 1;
-            return bytes[0] < kFirstLatin ? bytes[0] : UINT32_MAX;
+            return UINT32_MAX;
         }
         character = character << 6 | (bytes[i] & 0x3Fu);
     }

@@ -126,14 +126,16 @@ bool CheckHeader(KTX* ktx) {
                               ktx->height);
         return false;
     }
+    if (ktx->pvrtcBits && !IsPowerOfTwo(*ktx)) {
+        QexTextureLoad_Refuse(kFunction, "PVRTC of a size that is no power of two.");
+        return false;
+    }
     if (!ktx->Compressed() || QexTexture_IsCompressedFormat(ktx->internalFormat)) return true;
     ktx->decodes = ktx->IsETC() || ktx->pvrtcBits;
     if (!ktx->decodes)
         QexTextureLoad_Refuse(kFunction, "the GL does not take the compressed format 0x%X.",
                               ktx->internalFormat);
-    else if (ktx->pvrtcBits && !IsPowerOfTwo(*ktx))
-        QexTextureLoad_Refuse(kFunction, "PVRTC of a size that is no power of two.");
-    return ktx->decodes && (!ktx->pvrtcBits || IsPowerOfTwo(*ktx));
+    return ktx->decodes;
 }
 
 // The image data of a level.

@@ -23,22 +23,18 @@ TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
         {{"paint", pod}, "'paint'; expected info, render"},
         {{"--bogus"}, "unknown option '--bogus'; expected info, render"},
         {{"rendr", pod}, "did you mean render?"},
-        {{"info", "--yaml", pod}, "--yaml"},
         {{"render", pod, "--outptu", png}, "unknown option '--outptu'; did you mean --output?"},
         {{"render", pod, "-o", png, "--fraems=1:2"}, "did you mean --frames?"},
         {{"render", pod, "-o", png, "--up", "w"}, "'w' is no axis; expected x, y, z, -x, -y or -z"},
         {{"convert", "-", "-o", Path("b.pod")}, "side by side"},
         {{"render", pod}, "--output"},
         {{"render", pod, "-o", png, "--size", "0x0"}, "expected WIDTHxHEIGHT"},
-        {{"render", pod, "-o", png, "--size", "abc"}, "expected WIDTHxHEIGHT"},
         {{"render", pod, "-o", png, "--frame", "abc"}, "'abc' is no number from 0 to 1000000"},
         {{"render", pod, "-o", png, "--frames", "5:1:1"}, "FIRST <= LAST"},
         {{"render", pod, "-o", png, "--frames", "0:5:0"}, "STEP > 0"},
-        {{"render", pod, "-o", png, "--frames", "nan:nan:nan"}, "FIRST:LAST:STEP"},
         {{"render", pod, "-o", png, "--camera", "-1"}, "expected a number from 0 on, or auto"},
         {{"render", pod, "-o", png, "--camera", "7"}, "no camera 7, the scene has 1"},
         {{"render", pod, "-o", png, "--orbit", "10,95"}, "PITCH from -89 to 89"},
-        {{"render", pod, "-o", png, "--turn", "0"}, "--turn"},
         {{"render", pod, "-o", png, "--background", "red"}, "expected RRGGBB"},
         {{"render", pod, "-o", Path("none/a.png")}, "none/a.png: cannot be written"},
         {{"render", pod, "-o", png, "--shader", "toon"}, "'toon' is no shader; expected one of texture, "},
@@ -53,7 +49,6 @@ TEST_F(QexCli, UsageErrorsNameWhatIsExpected) {
         {{"render", pod, "-o", png, "--dof", "0.5,1,0,9"}, "SIGMA above 0"},
         {{"render", pod, "-o", png, "--dof", "0,1", "--stereo", "3,0"}, "excludes --dof"},
         {{"render", pod, "-o", png, "--pick", "7"}, "expected X,Y in pixels"},
-        {{"sheet", png}, "--output"},
         {{"convert", "a.obj"}, "--output"},
         {{"convert", "a.obj", "-o", "b.pod", "--texture-format", "dxt"}, "etc1,rgba8888,rgb888"},
         {{"convert", "a.obj", "-o", "b.pod", "--max-bones", "17"}, "--max-bones"},
@@ -181,6 +176,10 @@ TEST_F(QexCli, AnOutputIsNoneOfTheInputs) {
     struct stat status = {};
     stat(Path("target.png").c_str(), &status);
     EXPECT_EQ(status.st_mode & 0777, 0640u);
+    std::filesystem::remove(Path("target.png"));
+    EXPECT_EQ(Run({"sheet", png, "-o", Path("out.png")}).err, "");
+    EXPECT_TRUE(std::filesystem::is_symlink(Path("out.png")) &&
+                LoadImage(Path("target.png"), &image, &error));
 }
 
 TEST_F(QexCli, SheetPutsPicturesSideBySide) {
@@ -205,7 +204,6 @@ TEST_F(QexCli, SheetPutsPicturesSideBySide) {
     ASSERT_TRUE(LoadImage(out, &sheet, &error)) << error;
     EXPECT_EQ(sheet.width * 10 + sheet.height, 42);
     ExpectRefused({"sheet", left, Path("gone.png"), "-o", out}, 1, "gone.png");
-    ExpectRefused({"sheet", left, "-o", Path("none/out.png")}, 2, "none/out.png");
 }
 
 TEST_F(QexCli, StandardStreamsStandForFiles) {
@@ -237,6 +235,7 @@ TEST_F(QexCli, StandardStreamsStandForFiles) {
 
 // Every option that --help shows is in the manual page and is completed.
 TEST_F(QexCli, ManualAndCompletionHoldAllOptions) {
+    EXPECT_EQ(Run({"--version"}).out.rfind("qex ", 0), 0u);
     WriteText(Path("completion"), Run({"completion", "bash"}).out);
     const auto complete = [&](const std::string& words) {
         const std::string script = "source " + Path("completion") + "; COMP_WORDS=(qex " + words +
@@ -248,6 +247,8 @@ TEST_F(QexCli, ManualAndCompletionHoldAllOptions) {
     EXPECT_EQ(complete("ren"), "render\n");
     EXPECT_EQ(complete("render --shader tex"), "texture texture-noalpha\n");
     EXPECT_EQ(complete("convert --texture-f"), "--texture-format\n");
+    WriteText(Path("two  words.obj"), "");
+    EXPECT_EQ(complete("convert " + Path("two")), Path("two  words.obj") + "\n");
     for (const char* verb : {"info", "render", "convert", "texture", "emitter", "sheet"}) {
         const std::string help = Run({verb, "--help"}).out, page = Run({"man", verb}).out;
         EXPECT_TRUE(Contains(help, "Exit status: 0")) << help;
@@ -270,15 +271,5 @@ TEST_F(QexCli, ManualAndCompletionHoldAllOptions) {
         if (system(groff.c_str()) == 0) {
             EXPECT_EQ(ReadText(Path("said")), "");
         }
-    }
-}
-
-TEST_F(QexCli, HelpAndVersionGoToStandardOutput) {
-    for (const std::vector<std::string>& arguments :
-         {std::vector<std::string>{"--help"}, {"--version"}, {"render", "--help"}}) {
-        const CommandResult result = Run(arguments);
-        EXPECT_EQ(result.status, 0);
-        EXPECT_TRUE(Contains(result.out, "qex")) << result.out;
-        EXPECT_EQ(result.err, "");
     }
 }

@@ -129,7 +129,6 @@ TEST_F(QexInfo, NamesEveryProblem) {
     Bytes cut = UniformPvr(pod::kPvrRgba8888, 8, {1, 2, 3, 4});
     cut.pop_back();
     WriteBytes(Path("bgra.pvr"), UniformPvr(pod::kPvrBgra8888, 8, {1, 2, 3, 4}));
-    WriteBytes(Path("r555.pvr"), UniformPvr(pod::kPvrRgb555, 8, {1, 2}));
     WriteBytes(Path("cut.pvr"), cut);
     WriteText(Path("junk.pvr"), "junk");
     WriteText(Path("broken.png"), "no picture");
@@ -141,7 +140,6 @@ TEST_F(QexInfo, NamesEveryProblem) {
     } cases[] = {
         {[](auto* s) { TextureQuad(s, "gone.png"); }, "texture 0 (gone.png) is missing"},
         {[](auto* s) { TextureQuad(s, "bgra.png"); }, "BGRA 8888 pixels"},
-        {[](auto* s) { TextureQuad(s, "r555.pvr"); }, "RGB 555 pixels"},
         {[](auto* s) { TextureQuad(s, "cut.pvr"); }, "cut short: 255 bytes of pixels instead of 256"},
         {[](auto* s) { TextureQuad(s, "junk.pvr"); }, "junk.pvr: is neither a PVR texture"},
         {[](auto* s) { s->meshes[0].vertices.components = 0; }, "mesh 0 has no positions"},
@@ -174,11 +172,6 @@ TEST_F(QexInfo, NamesEveryProblem) {
              s->frameCount = 2;
          },
          "scaled to 0 at frame 0"},
-        {[](auto* s) {
-             PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}});
-             s->frameCount = 3;
-         },
-         "node 0: position has fewer keys than frames; it holds the last key"},
         {[](auto* s) { s->materials[0].opacity = 0.5f; }, "material 0 (paint) has an opacity of 0.5"},
         {[](auto* s) { s->nodes[0].material = -1; }, "mesh node 0 (quad) has no material"},
         {[](auto* s) { s->nodes[0].material = 9; }, "1 node(s) name a material that is not there"},

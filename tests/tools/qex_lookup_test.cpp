@@ -17,11 +17,12 @@ class QexLookup : public QexCommandTest {
             pixels.insert(pixels.end(), {0, uint8_t(i < 32 ? 255 : 0), uint8_t(i < 32 ? 0 : 255), 255});
         ASSERT_TRUE(SavePng(Path(name), 8, 8, pixels.data(), &error)) << error;
     }
-    std::string Draw(const std::vector<std::string>& more = {}) const {
-        std::vector<std::string> arguments = {"render", Path("s.pod"), "-o",       Path("out.png"),
-                                              "--size", "200x100",     "--shader", "texture"};
+    std::string Draw(const std::vector<std::string>& more = {}, bool piped = false) const {
+        std::vector<std::string> arguments = {
+            "render", piped ? "-" : Path("s.pod"), "-o", Path("out.png"), "--size", "200x100", "--shader",
+            "texture"};
         arguments.insert(arguments.end(), more.begin(), more.end());
-        const CommandResult result = Run(arguments);
+        const CommandResult result = Run(arguments, piped ? Path("s.pod") : "/dev/null");
         Image image;
         std::string error = result.err;
         if (result.status || !LoadImage(Path("out.png"), &image, &error)) return error;
@@ -61,6 +62,8 @@ TEST_F(QexLookup, FollowsTheExportOptionThatTurnsVOver) {
         const std::string text = Run({"info", Path("s.pod")}).out;
         EXPECT_TRUE(row.info ? Contains(text, row.info) : !Contains(text, "V runs")) << text;
     }
+    WriteQuad("", "bFlipTextureV=1");
+    EXPECT_EQ(Draw({"--texture", "paint=" + Path("tex.png")}, true), kTurned);
 }
 
 TEST_F(QexLookup, NamesMayDifferInCaseAndFolder) {

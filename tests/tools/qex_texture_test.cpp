@@ -324,7 +324,6 @@ TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
         {2, {a, "-o", png, "--mipmaps"}, "a picture has no"},
         {2, {a, "-o", pvr, "--level", "0"}, "is a picture"},
         {2, {a, "-o", pvr, "--face", "6"}, "--face"},
-        {2, {a, "-o", Path("gone/out.pvr")}, "cannot be written"},
         {1, {Path("gone.png"), "-o", pvr}, "gone.png: is not a file"},
         {1, {Path("one.pvr"), "-o", png, "--level", "1"}, "has no level 1, it has 1"},
         {1, {Path("one.pvr"), "-o", png, "--face", "1"}, "has no face 1, it has 1"},
@@ -390,11 +389,9 @@ TEST_F(QexTextureVerb, RealTexturesHoldTheirPictures) {
         {"v2_cube_etc1_8x8_mips3.pvr", 1, 8, 8, 0, 1, 2007, 56},
         {"v2_etc1_16x8_mips4.pvr", 1, 4, 2, 2, 0, 2008, 64 + 16},
         {"v2_pvrtc4_64x16_mips6.pvr", 4, 32, 8, 1, 0, 2009, 512},
-        {"v2_pvrtc2_32x64_mips6.pvr", 2, 16, 32, 1, 0, 2010, 512},
         {"v2_mgl_pvrtc4_16x16.pvr", 4, 16, 16, 0, 0, 2011, 0},
         {"v2_mgl_pvrtc2_16x8.pvr", 2, 16, 8, 0, 0, 2012, 0},
         {"be_rgb565_6x5.ktx", 565, 6, 5, 0, 0, 2101, 0},
-        {"be_rgba8_4x4.ktx", 8888, 4, 4, 0, 0, 2103, 0},
         {"be_etc1_cube_8x8.ktx", 1, 8, 8, 0, 3, 2113, 0},
         {"le_rgb8_7x5_tight_rows.ktx", 888, 3, 2, 1, 0, 2121, 0},
         {"le_rgb8_7x5_padded_rows.ktx", 888, 3, 2, 1, 0, 2121, 0},
@@ -402,11 +399,8 @@ TEST_F(QexTextureVerb, RealTexturesHoldTheirPictures) {
         {"le_rgba8_cube_4x4_mips_kv.ktx", 8888, 2, 2, 1, 2, 2152, 0},
         {"libktx_etc1_cube_mips_16x16.ktx", 1, 8, 8, 1, 2, 0, 6 * 128 + 2 * 32},
         {"libktx_etc1_npot_20x12.ktx", 1, 20, 12, 0, 0, 0, 0},
-        {"libktx_rgb8_cube_mips_6x6.ktx", 888, 3, 3, 1, 4, 0, 6 * 108 + 4 * 27},
         {"libktx_rgb8_mips_20x10.ktx", 888, 5, 2, 2, 0, 0, 600 + 150},
-        {"libktx_rgb8_mips_7x5.ktx", 888, 3, 2, 1, 0, 0, 105},
         {"libktx_rgba8_cube_mips_8x8.ktx", 8888, 1, 1, 3, 5, 0, 6 * (256 + 64 + 16) + 5 * 4},
-        {"libktx_rgba8_mips_16x16.ktx", 8888, 16, 16, 0, 0, 0, 0},
     };
     // clang-format on
     for (const auto& row : rows) {

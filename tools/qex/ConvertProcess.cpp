@@ -9,6 +9,7 @@
 
 #include <cerrno>
 #include <csignal>
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 
@@ -27,19 +28,22 @@ constexpr bool kSanitized = true;
 constexpr bool kSanitized = false;
 #endif
 
-void Limit(int what, rlim_t most) {
+void Limit(int what, uint64_t bytes) {
+    // rlim_t may have 32 bits.
+    const rlim_t most = bytes < RLIM_INFINITY ? static_cast<rlim_t>(bytes) : RLIM_INFINITY;
     const rlimit limit = {most, most};
     setrlimit(static_cast<decltype(RLIMIT_AS)>(what), &limit);
 }
 
-[[noreturn]] void RunChild(int errors, int megabytes, const std::function<int()>& work) {
+[[noreturn]] void RunChild(int errors, pid_t parent, int megabytes, const std::function<int()>& work) {
     dup2(errors, STDERR_FILENO);
     close(errors);
 #ifdef __linux__
     prctl(PR_SET_PDEATHSIG, SIGKILL);  // it shall not outlive a command that is stopped
+    if (getppid() != parent) _exit(kBadInput);
 #endif
     Limit(RLIMIT_CORE, 0);
-    if (!kSanitized) Limit(RLIMIT_AS, static_cast<rlim_t>(megabytes) << 20);
+    if (!kSanitized) Limit(RLIMIT_AS, static_cast<uint64_t>(megabytes) << 20);
     int status = work();
     std::string problem;
     if (!FinishStandardOutput(&problem)) {
@@ -65,7 +69,7 @@ class Messages {
         }
         if (!text_.empty()) Take(text_);
     }
-    bool Any() const { return passed_; }
+    bool AnyError() const { return error_; }
     // The last thing that a library has said.
     const std::string& Reason() const { return reason_; }
 
@@ -73,12 +77,12 @@ class Messages {
     void Take(const std::string& line) {
         const bool ours = line.compare(0, strlen(kOurs), kOurs) == 0;
         if (ours || kSanitized || GetTalk().verbose) fprintf(stderr, "%s\n", line.c_str());
-        passed_ |= ours;
+        error_ |= ours && line.find(": warning: ") == std::string::npos;
         if (!ours && !line.empty()) reason_ = line;
     }
 
     std::string text_, reason_;
-    bool passed_ = false;
+    bool error_ = false;
 };
 
 std::string WhyItEnded(int status, const Messages& messages, int megabytes) {
@@ -99,14 +103,14 @@ int RunInProcess(const std::string& file, int megabytes, const std::function<int
     int ends[2];
     fflush(nullptr);  // else what waits there is written twice
     const bool piped = pipe(ends) == 0;
-    const pid_t child = piped ? fork() : -1;
+    const pid_t parent = getpid(), child = piped ? fork() : -1;
     if (child < 0) {
         ConvertLog(file).Error(std::string("no process can be started for it: ") + strerror(errno));
         return kBadInput;
     }
     if (child == 0) {
         close(ends[0]);
-        RunChild(ends[1], megabytes, work);
+        RunChild(ends[1], parent, megabytes, work);
     }
     close(ends[1]);
     Messages messages;
@@ -115,7 +119,8 @@ int RunInProcess(const std::string& file, int megabytes, const std::function<int
     int status = 0;
     while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
     }
-    if (WIFEXITED(status) && (WEXITSTATUS(status) == kDone || messages.Any())) return WEXITSTATUS(status);
+    if (WIFEXITED(status) && (WEXITSTATUS(status) == kDone || messages.AnyError()))
+        return WEXITSTATUS(status);
     ConvertLog(file).Error(WhyItEnded(status, messages, megabytes));
     return kBadInput;
 }

@@ -112,7 +112,7 @@ std::string BashCompletion(const CLI::App& command) {
            "        COMPREPLY=($(compgen -W \"$options\" -- \"$word\"))\n"
            "    else\n"
            "        compopt -o filenames 2>/dev/null\n"
-           "        COMPREPLY=($(compgen -f -- \"$word\"))\n"
+           "        mapfile -t COMPREPLY < <(compgen -f -- \"$word\")\n"
            "    fi\n}\ncomplete -F _qex qex\n";
 }
 

@@ -53,8 +53,10 @@ int OpenNewFile(const fs::path& folder, std::string* path) {
 
 bool WriteAndRename(const std::string& path, const void* data, size_t size) {
     std::error_code error;
-    // A link stays one: the file that it leads to is what is replaced.
-    const fs::path target = fs::is_symlink(path, error) ? fs::weakly_canonical(path, error) : fs::path(path);
+    // A link stays one: the file that it leads to is what is replaced, or made where there is none.
+    const bool link = fs::is_symlink(path, error);
+    if (link && !fs::exists(path, error)) return WriteInPlace(path, data, size);
+    const fs::path target = link ? fs::canonical(path, error) : fs::path(path);
     struct stat old = {};
     const bool replaces = stat(target.c_str(), &old) == 0;
     // A rename would go past the file's own protection.

@@ -90,7 +90,7 @@ bool Renderer::Load() {
     const auto start = Clock::now();
     EngineOutput output;
     QexModel_Create(&model_);
-    SetTextureHook(&model_, options_.input, options_.textures);
+    SetTextureHook(&model_, directory, input_.Path(), options_.textures);
     const int32_t result = QexModel_LoadContent(&model_, directory.c_str(), file.c_str());
     modelLoaded_ = true;
     std::vector<std::string> warnings;

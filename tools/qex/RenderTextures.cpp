@@ -238,9 +238,10 @@ void SetUpTextureChoices(CLI::App* app, TextureChoices* choices) {
                                             CLI::ignore_case));
 }
 
-void SetTextureHook(QexModel* model, const std::string& scenePath, const TextureChoices& choices) {
+void SetTextureHook(QexModel* model, const std::string& directory, const std::string& scenePath,
+                    const TextureChoices& choices) {
     g_problems.clear();
-    g_lookup.directory = Directory(scenePath);
+    g_lookup.directory = directory;
     g_lookup.overrides = SplitOverrides(choices.overrides);
     g_lookup.vRunsDown =
         choices.flipped.value_or(ReadExporterText(scenePath).FlipsTextureV().value_or(false));
@@ -269,7 +270,7 @@ std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<boo
         }
         if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i], lit[i]), i);
         FindAlpha(model, i, file);
-        // A KTX file sets no filter, and GL's own wants a whole chain of mipmaps.
+        // A KTX file sets no filter, and GL's own takes the nearest texel of each level.
         if (texture && Extension(file) == "ktx") QexTexture_SetFilter(model->textures[i], QEX_FILTER_LINEAR);
     }
     for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {

@@ -20,10 +20,11 @@ struct TextureChoices {
 
 void SetUpTextureChoices(CLI::App* app, TextureChoices* choices);
 
-// Puts the texture hook into a model that will be loaded from `scenePath`. For NAME.png it looks for
-// NAME.pvr, NAME.ktx, then NAME.png and other picture formats of that name (see FindTexture); pictures are
-// decoded here, with their alpha channel as the alpha texture.
-void SetTextureHook(QexModel* model, const std::string& scenePath, const TextureChoices& choices);
+// Puts the texture hook into a model that will be loaded from `scenePath`, its textures from `directory`. For
+// NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other picture formats of that name (see
+// FindTexture); pictures are decoded here, with their alpha channel as the alpha texture.
+void SetTextureHook(QexModel* model, const std::string& directory, const std::string& scenePath,
+                    const TextureChoices& choices);
 
 // After loading: a line about the first material with a texture of its choice that the scene lacks; else
 // empty.

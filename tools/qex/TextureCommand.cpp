@@ -208,9 +208,8 @@ void SetUpTexture(CLI::App* app, TextureOptions* options) {
         ->check(NumberFrom(0, 5));
     app->footer(
         "ETC1 has no alpha: that of the picture goes into a second file, NAME_a. KTX files have no l8, la88\n"
-        "and a8; those in etc1 are black until QexTexture_SetFilter is called, unless they have --mipmaps.\n"
-        "PVRTC is read, not written. In a picture luminance is grey, and alpha 8 is white with alpha. From\n"
-        "texture to texture blocks and mipmaps are made anew.");
+        "and a8. PVRTC is read, not written. In a picture luminance is grey, and alpha 8 is white with\n"
+        "alpha. From texture to texture blocks and mipmaps are made anew.");
 }
 
 int RunTexture(const TextureOptions& options) {
