@@ -61,12 +61,16 @@ Frames FindFrames(const QexPODModel* scene, const QexPODNode* node) {
 // The channels of a node, as QexPODNode::keyFrames counts them.
 enum Channel { kPosition, kRotation, kScale, kMatrix };
 
-// Where a frame's key starts in its channel's data, in floats. Frames beyond the channel's keys hold the
-// last.
-uint64_t KeyOffset(const QexPODNode* node, Channel channel, const uint32_t* index, uint32_t frame,
-                   uint32_t keyFloats) {
-    const uint32_t keyed = node->keyFrames[channel];
-    if (keyed && frame >= keyed) frame = keyed - 1;
+// The same for a channel, which may have keys for the first frames only: the last of them holds. A count of 0
+// stands for all frames, so its last is the highest number there is.
+inline Frames WithinKeys(const QexPODNode* node, Channel channel, const Frames& frames) {
+    const uint32_t last = node->keyFrames[channel] - 1;
+    if (__builtin_expect(last >= frames.b, 1)) return frames;
+    return {frames.a < last ? frames.a : last, last};
+}
+
+// Where a frame's key starts in its channel's data, in floats.
+inline uint64_t KeyOffset(const uint32_t* index, uint32_t frame, uint32_t keyFloats) {
     return index ? index[frame] : uint64_t{frame} * keyFloats;
 }
 
@@ -83,8 +87,9 @@ inline QexVec3 InterpolateVec3(const QexPODNode* node, Channel channel, const Fr
                                const float* data, const uint32_t* index, uint32_t keyFloats,
                                uint32_t animatedBit) {
     if (!(node->animationFlags & animatedBit)) return LoadKey<QexVec3>(data, 0);
-    const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(node, channel, index, frames.a, keyFloats));
-    const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(node, channel, index, frames.b, keyFloats));
+    const Frames keyed = WithinKeys(node, channel, frames);
+    const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(index, keyed.a, keyFloats));
+    const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(index, keyed.b, keyFloats));
     QexVec3 result;
     QexVec3_Lerp(&result, &a, &b, node->frameFraction);
     return result;
@@ -106,11 +111,11 @@ void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames
     }
     QexQuaternion q = LoadKey<QexQuaternion>(node->rotation, 0);
     if (node->animationFlags & QEX_NODE_ROTATION_ANIMATED) {
-        const uint32_t* index = node->rotationIndex;
+        const Frames keyed = WithinKeys(node, kRotation, frames);
         const QexQuaternion a =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node, kRotation, index, frames.a, 4));
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, keyed.a, 4));
         const QexQuaternion b =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node, kRotation, index, frames.b, 4));
+            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, keyed.b, 4));
         QexQuaternion_Slerp(&q, &a, &b, node->frameFraction);
     }
     QexQuaternion_ToRotationMatrix(out, &q);
@@ -414,9 +419,8 @@ void QexPODModel_GetTransformationMatrix(const QexPODModel* scene, QexMatrix* ou
     QexMatrix_Identity(out);
     if (!node->matrix) return;
     const bool animated = node->animationFlags & QEX_NODE_MATRIX_ANIMATED;
-    const uint32_t frame = FindFrames(scene, node).a;
-    *out = LoadKey<QexMatrix>(node->matrix,
-                              animated ? KeyOffset(node, kMatrix, node->matrixIndex, frame, 16) : 0);
+    const uint32_t frame = WithinKeys(node, kMatrix, FindFrames(scene, node)).a;
+    *out = LoadKey<QexMatrix>(node->matrix, animated ? KeyOffset(node->matrixIndex, frame, 16) : 0);
 }
 
 void QexPODModel_GetWorldMatrixNoCache(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {
