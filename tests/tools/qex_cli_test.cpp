@@ -214,7 +214,9 @@ TEST_F(QexCli, StandardStreamsStandForFiles) {
     WriteScene(pod, QuadScene());
     for (const std::vector<std::string>& verb :
          {std::vector<std::string>{"texture", "-", "-o", "-"}, {"sheet", "-", "-o", "-", "--gap", "0"}}) {
-        WriteText(Path("piped.png"), Run(verb, png).out);
+        const CommandResult piped = Run(verb, png);
+        ASSERT_EQ(piped.status, 0) << verb[0] << piped.err;
+        WriteText(Path("piped.png"), piped.out);
         Image image;
         ASSERT_TRUE(LoadImage(Path("piped.png"), &image, &error)) << verb[0] << error;
         EXPECT_EQ(image.pixels, pixels) << verb[0];

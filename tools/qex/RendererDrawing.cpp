@@ -11,6 +11,7 @@
 namespace {
 
 constexpr size_t kFramingPoints = 200000;  // of each mesh node over all frames, about
+constexpr size_t kFramingPictures = 200;   // of a sequence that the camera is fitted to, at most
 
 }  // namespace
 
@@ -27,8 +28,10 @@ void Renderer::SetFrame(double frame) {
 // Collects what the automatic camera has to show, over all frames, with its mirror image.
 void Renderer::Frame() {
     const size_t count = options_.sequence ? PictureCount() : 1;
-    const size_t share = std::max<size_t>(1000, kFramingPoints / count);
-    for (size_t picture = 0; picture < count; ++picture) {
+    // Of long sequences some pictures stand for all.
+    const size_t step = (count + kFramingPictures - 1) / kFramingPictures;
+    const size_t share = std::max<size_t>(1000, kFramingPoints / (count / step));
+    for (size_t picture = 0; picture < count; picture += step) {
         SetFrame(FrameAt(picture));
         for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
             CollectPoints(&model_.scene, i, share, &points_);
