@@ -3013,7 +3013,8 @@ QEX_API void QexModel_SetShaderProgram(QexModel* model, uint32_t nodeIndex, QexS
 
 /** Gives all mesh nodes a module. No GL context needed.
  *  @param staticModule   for meshes that follow no bones, or null: they keep theirs
- *  @param skinnedModule  for meshes that do, or null */
+ *  @param skinnedModule  for meshes that do, or null. With both, a model of an earlier start of the engine
+ * can be drawn again */
 QEX_API void QexModel_SetShaderProgramForAllNode(QexModel* model, QexShaderModule* staticModule,
                                                  QexShaderModule* skinnedModule);
 

@@ -251,6 +251,11 @@ void QexModel_SetShaderProgramForAllNode(QexModel* model, QexShaderModule* stati
             QexPODModel_MeshOf(&model->scene, i)->skinned == 1 ? skinnedModule : staticModule;
         if (module) model->scene.nodes[i].shader = module;
     }
+    // A model of an earlier start can be drawn again: none of its nodes has a module that is gone.
+    if (staticModule && skinnedModule && QexModel_IsOutdated(model)) {
+        model->flags |= QEX_MODEL_NO_SHADERS;
+        model->sharedGeneration = 0;
+    }
 }
 
 void QexModel_SetAnimatedUVUniform(QexModel*, float, float) {}

@@ -105,9 +105,15 @@ TEST_F(EngineTest, ModelsOfAnEarlierStart) {
     Clear();
     old->Draw();
     old->Draw();
-    old.reset();
-    fresh.Draw();
     EXPECT_EQ(Read().Pixel(4, kHeight - 4), (Rgba{0, 0, 0, 0}));
+    // With modules of the application's own it can be drawn again.
+    QexShaderModule* own = QexSimpleShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&old->model, own, own);
+    old->Draw();
+    EXPECT_EQ(Read().Pixel(4, kHeight - 4), (Rgba{255, 255, 255, 255}));
+    old.reset();
+    QexSimpleShader_Release(&own);
+    fresh.Draw();
     EXPECT_EQ(Read().Pixel(25, kHeight - 4), (Rgba{255, 255, 255, 255}));
     QexModel_Unload(&fresh.model);
     QexEngine_Shutdown(&runtime);
