@@ -67,6 +67,7 @@ void WriteEmitters(const std::string& folder) {
         QexParticleEmitter* e = QexParticleEmitter_Create();
         if (!e) exit(1);
         emitter.set(e);
+        e->currentRate = e->emissionRate[0];  // not one drawn by the time of the build
         if (QexParticleEmitter_WriteToBinFile(e, (folder + emitter.name).c_str()) != 0) exit(1);
         QexParticleEmitter_Release(e);
     }
