@@ -96,6 +96,7 @@ bool WriteOutput(const std::string& path, const std::vector<uint8_t>& bytes, std
 }
 
 std::string WhyNotOutput(const std::string& output, const std::vector<std::string>& inputs) {
+    if (output == "-") return "";  // no file of that name
     for (const std::string& input : inputs) {
         std::error_code error;
         if (input.empty() || !fs::equivalent(input, output, error) || error || IsStream(output)) continue;
