@@ -3,74 +3,61 @@
 #include <cstring>
 
 #include "QexDiagnostics.h"
+#include "QexTextureLoad.h"
 
 namespace {
 
 constexpr size_t kPathSize = 256;
 constexpr uint32_t kPVRFlipped = 0x10000;
 constexpr uint32_t kTGATopFirst = 0x20;  // in the header's last byte
+constexpr uint64_t kKTXSearched = 256;   // bytes of a KTX file in which its orientation is looked for
 
-// Where a container says which edge comes first.
-struct Header {
-    uint8_t bytes[256];
-    uint32_t size;
-    uint32_t Word(uint32_t at) const {
-        uint32_t word = 0;
-        for (uint32_t i = 0; i < 4; ++i) word |= static_cast<uint32_t>(bytes[at + i]) << (8 * i);
-        return word;
-    }
-};
-
-bool ReadHeader(Header* header, const char* path) {
-    QexResFile file;
-    memset(header, 0, sizeof *header);
-    const int32_t result = QexResFile_Create(&file, path);
-    const bool open = QexResFile_IsOpen(&file);
-    // What cannot even be opened was said.
-    if (!open && result == 0) QexError(QEX_TAG, "<QexPicture_Load> %s cannot be read", path);
-    if (open) {
-        const uint32_t size = QexResFile_GetSize(&file);
-        header->size = size < sizeof header->bytes ? size : static_cast<uint32_t>(sizeof header->bytes);
-        memcpy(header->bytes, QexResFile_DataPtr(&file), header->size);
-    }
-    QexResFile_Release(&file);
-    return open;
-}
-
-bool IsKTX(const Header& header) {
-    return memcmp(header.bytes, "\xABKTX 11\xBB\r\n\x1A\n", 12) == 0;
-}
-
-bool IsPVR(const Header& header) {
-    const uint32_t headerSize = header.Word(0);
+bool IsPVR(const QexTextureBytes& image) {
+    const uint32_t headerSize = image.size >= 4 ? QexTextureLoad_ReadLE32(image.bytes) : 0;
     return headerSize == 44 || headerSize == 52;
 }
 
 // KTX files that say nothing begin with the upper edge, as pictures do.
-bool SaysUp(const Header& header) {
+bool SaysUp(const QexTextureBytes& image) {
     static const char key[] = "KTXorientation\0S=r,T=u";
-    for (uint32_t at = 64; at + sizeof key <= sizeof header.bytes; ++at)
-        if (memcmp(header.bytes + at, key, sizeof key - 1) == 0) return true;
+    const uint64_t end = image.size < kKTXSearched ? image.size : kKTXSearched;
+    for (uint64_t at = 64; at + sizeof key <= end; ++at)
+        if (memcmp(image.bytes + at, key, sizeof key - 1) == 0) return true;
     return false;
 }
 
-bool IsTopFirst(const Header& header) {
-    if (IsKTX(header)) return !SaysUp(header);
-    if (IsPVR(header)) return !(header.Word(16) & kPVRFlipped);
-    return header.bytes[17] & kTGATopFirst;
+// Of an image that was loaded, so that its header is whole.
+bool IsTopFirst(const QexTextureBytes& image) {
+    if (QexTextureLoad_IsKTX(image)) return !SaysUp(image);
+    if (IsPVR(image)) return !(QexTextureLoad_ReadLE32(image.bytes + 16) & kPVRFlipped);
+    return image.bytes[17] & kTGATopFirst;
 }
 
-// Loads a file of any of the three kinds; true when there is a texture afterwards.
-bool Load(QexTexture* texture, const char* path, const Header& header) {
+// Loads an image of any of the three kinds; true when there is a texture afterwards.
+bool Load(QexTexture* texture, const QexTextureBytes& image) {
+    const uint32_t size = static_cast<uint32_t>(image.size);
     memset(texture, 0, sizeof *texture);
-    if (IsKTX(header) || IsPVR(header))
-        QexTexture_LoadPVRFromFile(texture, path, nullptr, 1, 0);
+    if (QexTextureLoad_IsKTX(image) || IsPVR(image))
+        QexTexture_LoadPVRFromMemSized(texture, image.bytes, size, nullptr, 1, 0, nullptr);
     else
-        QexTexture_CreateTGAFromFile(texture, 0, 0, QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, path);
+        QexTexture_CreateTGAFromMemSized(texture, 0, 0, QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, image.bytes, size);
     if (!texture->glName) return false;
     QexTexture_SetFilter(texture, QEX_FILTER_LINEAR);
     QexTexture_SetWrapping(texture, QEX_WRAP_CLAMP);
     return true;
+}
+
+// The same for a file; a line when there is none. `topFirst` may be null.
+bool LoadFile(QexTexture* texture, uint32_t* topFirst, const char* path) {
+    QexResFile file;
+    const bool opened = QexResFile_Create(&file, path) == 0;  // what cannot be opened was said
+    const QexTextureBytes image = {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)};
+    const bool loaded = QexResFile_IsOpen(&file) && Load(texture, image);
+    if (opened && !loaded) QexError(QEX_TAG, "<QexPicture_Load> %s is no picture that can be loaded", path);
+    if (!loaded) memset(texture, 0, sizeof *texture);
+    if (loaded && topFirst) *topFirst = IsTopFirst(image);
+    QexResFile_Release(&file);
+    return loaded;
 }
 
 // "_a" before the extension; false where it does not fit or there is no such file.
@@ -97,17 +84,10 @@ extern "C" {
 
 int32_t QexPicture_Load(QexPicture* picture, const char* path) {
     char alphaPath[kPathSize];
-    Header header;
     if (!picture || !path) return Refuse("QexPicture_Load", "no picture or no path");
     memset(picture, 0, sizeof *picture);
-    if (!ReadHeader(&header, path)) return -1;
-    if (!Load(&picture->texture, path, header)) {
-        QexError(QEX_TAG, "<QexPicture_Load> %s is no picture that can be loaded", path);
-        return -1;
-    }
-    picture->topFirst = IsTopFirst(header);
-    if (FindAlphaPath(alphaPath, path) && ReadHeader(&header, alphaPath))
-        Load(&picture->alpha, alphaPath, header);
+    if (!LoadFile(&picture->texture, &picture->topFirst, path)) return -1;
+    if (FindAlphaPath(alphaPath, path)) LoadFile(&picture->alpha, nullptr, alphaPath);
     return 0;
 }
 
