@@ -14,7 +14,7 @@
 
 #include <ETC1/etc1.h>
 
-#include "ImageFile.h"
+#include "common/ImageFile.h"
 #include "Qex.h"
 #include "Ratio.h"
 

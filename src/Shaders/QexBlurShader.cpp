@@ -1,7 +1,7 @@
 #include <cstring>
 
-#include "QexGLSL.h"
-#include "QexScreenShader.h"
+#include "Shaders/QexGLSL.h"
+#include "Shaders/QexScreenShader.h"
 
 #define QEX_MODULE (kType.path)
 

@@ -1,5 +1,5 @@
-#include "QexGLSL.h"
-#include "QexScreenShader.h"
+#include "Shaders/QexGLSL.h"
+#include "Shaders/QexScreenShader.h"
 
 #define QEX_MODULE (kType.path)
 

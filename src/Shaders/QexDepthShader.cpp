@@ -1,5 +1,5 @@
-#include "QexGLSL.h"
-#include "QexShaderModule.h"
+#include "Shaders/QexGLSL.h"
+#include "Shaders/QexShaderModule.h"
 
 #define QEX_MODULE (kType.path)
 

@@ -1,5 +1,5 @@
-#include "QexGLSL.h"
-#include "QexLitShader.h"
+#include "Shaders/QexGLSL.h"
+#include "Shaders/QexLitShader.h"
 
 namespace {
 

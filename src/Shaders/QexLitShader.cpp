@@ -1,4 +1,4 @@
-#include "QexLitShader.h"
+#include "Shaders/QexLitShader.h"
 
 #include <cstring>
 

@@ -7,7 +7,7 @@
 // shadowSpaceMatrix, biasValue, shadowIntensity and, when it fades, shadowFade.
 #pragma once
 
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 struct QexLitShaderType {
     QexShaderModuleType module;

@@ -1,4 +1,4 @@
-#include "QexScreenShader.h"
+#include "Shaders/QexScreenShader.h"
 
 #define QEX_MODULE (type->path)
 

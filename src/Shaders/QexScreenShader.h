@@ -3,7 +3,7 @@
 // are read afterwards.
 #pragma once
 
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 // The first slots of such a module. Its description leaves the names of the two attributes empty.
 enum { kScreenPosition, kScreenProjection, kScreenTexCoord, kScreenSlots };

@@ -1,10 +1,10 @@
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 #include <cstring>
 
-#include "../QexPODAnimation.h"
-#include "../QexPODModel.h"
-#include "../QexShader.h"
+#include "pod/Animation.h"
+#include "pod/Scene.h"
+#include "gl/Shader.h"
 
 #define QEX_MODULE (type->path)
 

@@ -10,7 +10,7 @@
 // function that has one.
 #pragma once
 
-#include "../QexGL.h"
+#include "gl/GL.h"
 #include "Qex.h"
 
 struct QexShaderAttribute {

@@ -1,4 +1,4 @@
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 #define QEX_MODULE (kType.path)
 

@@ -1,5 +1,5 @@
-#include "QexSkinningTextureShader.h"
-#include "QexTextureShader.h"
+#include "Shaders/QexSkinningTextureShader.h"
+#include "Shaders/QexTextureShader.h"
 
 namespace {
 

@@ -1,7 +1,7 @@
-#include "QexSkinningTextureShader.h"
+#include "Shaders/QexSkinningTextureShader.h"
 
-#include "QexGLSL.h"
-#include "QexTextureShader.h"
+#include "Shaders/QexGLSL.h"
+#include "Shaders/QexTextureShader.h"
 
 #define QEX_MODULE (draw.type->path)
 

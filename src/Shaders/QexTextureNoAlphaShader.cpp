@@ -1,4 +1,4 @@
-#include "QexTextureShader.h"
+#include "Shaders/QexTextureShader.h"
 
 const char* const kQexTextureNoAlphaFragmentSource = R"(
 uniform sampler2D sTexture;

@@ -1,4 +1,4 @@
-#include "QexTextureShader.h"
+#include "Shaders/QexTextureShader.h"
 
 #define QEX_MODULE (type->path)
 

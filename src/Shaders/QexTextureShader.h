@@ -2,7 +2,7 @@
 // set.
 #pragma once
 
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 extern const char* const kQexTextureVertexSource;
 

@@ -1,6 +1,6 @@
-#include "QexUVDisplacementShader.h"
+#include "Shaders/QexUVDisplacementShader.h"
 
-#include "QexTextureShader.h"
+#include "Shaders/QexTextureShader.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
-#include "QexUVDisplacementShader.h"
+#include "Shaders/QexUVDisplacementShader.h"
 
-#include "QexTextureShader.h"
+#include "Shaders/QexTextureShader.h"
 
 #define QEX_MODULE (draw.type->path)
 

@@ -1,7 +1,7 @@
 // What the two modules that shift texture coordinates have in common.
 #pragma once
 
-#include "QexShaderModule.h"
+#include "Shaders/QexShaderModule.h"
 
 extern const char* const kQexUVDisplacementVertexSource;
 

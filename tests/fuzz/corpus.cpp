@@ -6,7 +6,7 @@
 #include <iterator>
 #include <string>
 
-#include "loaders/ImageFiles.h"
+#include "support/ImageFiles.h"
 #include "support/Capture.h"
 #include "support/PodScenes.h"
 

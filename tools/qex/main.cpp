@@ -7,15 +7,15 @@
 #include <assimp/DefaultLogger.hpp>
 #include <CLI/CLI.hpp>
 
-#include "CommandLine.h"
-#include "ConvertCommand.h"
-#include "EmitterCommand.h"
-#include "InfoCommand.h"
-#include "Manual.h"
-#include "OutputFile.h"
-#include "RenderCommand.h"
-#include "SheetCommand.h"
-#include "TextureCommand.h"
+#include "common/CommandLine.h"
+#include "convert/Command.h"
+#include "emitter/Command.h"
+#include "info/Command.h"
+#include "common/Manual.h"
+#include "common/OutputFile.h"
+#include "render/Command.h"
+#include "sheet/Command.h"
+#include "texture/Command.h"
 
 namespace {
 

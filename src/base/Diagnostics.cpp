@@ -1,0 +1,112 @@
+#include "base/Diagnostics.h"
+
+#include <cstdarg>
+#include <cstdlib>
+#include <cstring>
+
+#include <strings.h>
+
+#include "base/AndroidLog.h"
+#include "base/Formatted.h"
+
+namespace {
+
+QexLogSink s_Sink;
+void* s_SinkUser;
+int32_t s_Level = QEX_LOG_INFO;
+// The program has asked for a level or a sink: what the engine prints goes to the log alone.
+bool s_LogAlone;
+
+int32_t Deliver(int32_t weight, int priority, const char* tag, const char* format, va_list arguments) {
+    if (!s_Sink) return __android_log_vprint(priority, tag, format, arguments);
+    QexFormatted text(format, arguments);
+    if (text.Failed()) return -1;
+    text.TrimNewline();
+    s_Sink(s_SinkUser, weight, tag ? tag : "", text.Text());
+    return 1;
+}
+
+// The weight of a printed line: loaders begin theirs with what they are.
+int32_t WeightOf(const char* format) {
+    if (strncasecmp(format, "error:", 6) == 0) return QEX_LOG_ERROR;
+    return strncasecmp(format, "warning:", 8) == 0 ? QEX_LOG_WARNING : QEX_LOG_INFO;
+}
+
+}  // namespace
+
+int32_t QexLog_SetLevel(int32_t level) {
+    const int32_t before = s_Level;
+    s_Level = level;
+    s_LogAlone = true;
+    return before;
+}
+
+void QexLog_SetSink(QexLogSink sink, void* user) {
+    s_Sink = sink;
+    s_SinkUser = user;
+    s_LogAlone = true;
+}
+
+int32_t QexLog(const char* tag, const char* format, ...) {
+    if (s_Level > QEX_LOG_INFO) return 0;
+    va_list arguments;
+    va_start(arguments, format);
+    const int32_t result = Deliver(QEX_LOG_INFO, ANDROID_LOG_INFO, tag, format, arguments);
+    va_end(arguments);
+    return result;
+}
+
+int32_t QexError(const char* tag, const char* format, ...) {
+    if (s_Level > QEX_LOG_ERROR) return 0;
+    va_list arguments;
+    va_start(arguments, format);
+    const int32_t result = Deliver(QEX_LOG_ERROR, ANDROID_LOG_ERROR, tag, format, arguments);
+    va_end(arguments);
+    return result;
+}
+
+int32_t QexSystem_Printf(const char* format, ...) {
+    const int32_t weight = WeightOf(format);
+    if (s_Level > weight) return 1;
+    va_list arguments, copy;
+    va_start(arguments, format);
+    if (!s_LogAlone) {
+        va_copy(copy, arguments);
+        vprintf(format, copy);
+        va_end(copy);
+    }
+    Deliver(weight, ANDROID_LOG_INFO, QEX_TAG, format, arguments);
+    va_end(arguments);
+    return 1;
+}
+
+void QexDiagnostics_Print(FILE* stream, const char* format, ...) {
+    va_list arguments;
+    va_start(arguments, format);
+    if (!s_LogAlone)
+        vfprintf(stream, format, arguments);
+    else if (s_Level <= QEX_LOG_INFO)
+        Deliver(QEX_LOG_INFO, ANDROID_LOG_INFO, QEX_TAG, format, arguments);
+    va_end(arguments);
+}
+
+static void DeliverError(const char* tag, const char* format, ...) {
+    va_list arguments;
+    va_start(arguments, format);
+    Deliver(QEX_LOG_ERROR, ANDROID_LOG_ERROR, tag, format, arguments);
+    va_end(arguments);
+}
+
+void QexDiagnostics_FatalGLError(uint32_t error, const char* module, const char* file, int line) {
+    // The folder of the engine and the file in it.
+    const char* name = file + strlen(file);
+    for (int slashes = 0; name > file && (slashes += name[-1] == '/') < 2;) --name;
+    DeliverError("QexEngine", "glGetError() = %i (0x%.8x) at %s:%i\n", static_cast<int>(error), error, module,
+                 line);
+    DeliverError("QexEngine", "in %s, line %i", name, line);
+    exit(-1);
+}
+
+void QexDiagnostics_OutOfMemory(const char* module, int line) {
+    QexSystem_Printf("Error: Out of memory at %s:%i\n", module, line);
+}

@@ -1,0 +1,117 @@
+#include <cstring>
+
+#include "base/Diagnostics.h"
+
+namespace {
+
+constexpr uint32_t kMaxWordMessages = 32;
+
+bool HostIsLittleEndian() {
+    return __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__;
+}
+
+uint32_t Remaining(const QexSourceStream* stream) {
+    return stream->file ? QexResFile_GetSize(stream->file) - stream->position : 0;
+}
+
+// Gives the stream an empty, closed file record. False, logged, when there is no memory.
+bool NewFile(QexSourceStream* stream, const char* function) {
+    stream->position = 0;
+    stream->file = static_cast<QexResFile*>(QexMemory_Alloc(sizeof(QexResFile)));
+    if (!stream->file) QexError(QEX_TAG, "<%s> out of memory", function);
+    return stream->file != nullptr;
+}
+
+// Reads all `count` words at once where memory holds them as the data does. False leaves the stream as it is.
+template <class Word>
+bool ReadBlock(QexSourceStream* stream, Word* destination, uint32_t count) {
+    if (!HostIsLittleEndian() || count > Remaining(stream) / sizeof(Word)) return false;
+    const uint32_t bytes = count * static_cast<uint32_t>(sizeof(Word));
+    return QexSourceStream_Read(stream, reinterpret_cast<uint8_t*>(destination), bytes) != 0;
+}
+
+}  // namespace
+
+int32_t QexSourceStream_Create(QexSourceStream* stream, const char* path) {
+    if (!NewFile(stream, "QexSourceStream_Create")) return 0;
+    QexResFile_Create(stream->file, path);
+    if (QexResFile_IsOpen(stream->file)) return 1;
+    QexSourceStream_Release(stream);
+    QexError(QEX_TAG, "<QexSourceStream_Create> open file %s failed", path ? path : "");
+    return 0;
+}
+
+int32_t QexSourceStream_CreateFromMemory(QexSourceStream* stream, const void* data, uint32_t size) {
+    if (!NewFile(stream, "QexSourceStream_CreateFromMemory")) return 0;
+    QexResFile_CreateFromMemory(stream->file, data, size);
+    if (QexResFile_IsOpen(stream->file)) return 1;
+    QexSourceStream_Release(stream);
+    QexError(QEX_TAG, "<QexSourceStream_CreateFromMemory> open failed");
+    return 0;
+}
+
+void QexSourceStream_Release(QexSourceStream* stream) {
+    if (!stream->file) return;
+    QexResFile_Release(stream->file);
+    QexMemory_Free(stream->file);
+    stream->file = nullptr;
+}
+
+int32_t QexSourceStream_Read(QexSourceStream* stream, uint8_t* destination, uint32_t count) {
+    if (!stream->file || count > Remaining(stream)) return 0;
+    if (count) memcpy(destination, QexResFile_DataPtr(stream->file) + stream->position, count);
+    stream->position += count;
+    return 1;
+}
+
+int32_t QexSourceStream_Read16(QexSourceStream* stream, uint16_t* destination) {
+    uint8_t bytes[2];
+    if (!QexSourceStream_Read(stream, bytes, sizeof bytes)) {
+        QexError(QEX_TAG, "<QexSourceStream_ReadMarker> read WORD fail");
+        return 0;
+    }
+    *destination = static_cast<uint16_t>(bytes[0] | bytes[1] << 8);
+    return 1;
+}
+
+int32_t QexSourceStream_Read32(QexSourceStream* stream, uint32_t* destination) {
+    uint8_t bytes[4];
+    if (!QexSourceStream_Read(stream, bytes, sizeof bytes)) return 0;
+    *destination = bytes[0] | uint32_t{bytes[1]} << 8 | uint32_t{bytes[2]} << 16 | uint32_t{bytes[3]} << 24;
+    return 1;
+}
+
+int32_t QexSourceStream_ReadArray16(QexSourceStream* stream, uint16_t* destination, uint32_t count) {
+    if (count == 0 || ReadBlock(stream, destination, count)) return 1;
+    // Every missing element is reported, but a count from a broken file may be in the billions.
+    uint32_t missing = 0;
+    for (uint32_t i = 0; i < count && missing < kMaxWordMessages; ++i)
+        missing += !QexSourceStream_Read16(stream, &destination[i]);
+    return missing == 0;
+}
+
+int32_t QexSourceStream_ReadArray32(QexSourceStream* stream, uint32_t* destination, uint32_t count) {
+    if (count == 0 || ReadBlock(stream, destination, count)) return 1;
+    for (uint32_t i = 0; i < count; ++i) {
+        if (QexSourceStream_Read32(stream, &destination[i])) continue;
+        QexError(QEX_TAG, "<QexSourceStream_Read> read array fail");
+        return 0;
+    }
+    return 1;
+}
+
+int32_t QexSourceStream_ReadMarker(QexSourceStream* stream, uint32_t* identifier, uint32_t* length) {
+    if (!QexSourceStream_Read32(stream, identifier)) return 0;
+    if (QexSourceStream_Read32(stream, length)) return 1;
+    QexError(QEX_TAG, "<QexSourceStream_ReadMarker> read marker fail");
+    return 0;
+}
+
+int32_t QexSourceStream_Skip(QexSourceStream* stream, uint32_t count) {
+    if (!stream->file || count > Remaining(stream)) {
+        QexLog(QEX_TAG, "<QexSourceStream_Skip> pass beyond end of stream");
+        return 0;
+    }
+    stream->position += count;
+    return 1;
+}

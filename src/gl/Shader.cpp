@@ -1,0 +1,168 @@
+#include "gl/Shader.h"
+
+#include <cstring>
+
+#include "gl/GL.h"
+#include "base/Memory.h"
+
+#define QEX_MODULE "src/QexShader"
+
+namespace {
+
+constexpr size_t kDefineBufferSize = 4096;
+
+// Define lines and source of the last shader that was compiled with defines.
+char QexDefineBuffer[kDefineBufferSize];
+
+// Appends text to the define buffer; false when it does not fit.
+bool Append(size_t* used, const char* text) {
+    const size_t length = strlen(text);
+    if (length >= kDefineBufferSize - *used) return false;
+    memcpy(QexDefineBuffer + *used, text, length + 1);
+    *used += length;
+    return true;
+}
+
+bool Assemble(const char* source, const char* const* defines, uint32_t defineCount) {
+    size_t used = 0;
+    QexDefineBuffer[0] = 0;
+    for (uint32_t i = 0; i < defineCount; ++i)
+        if (!Append(&used, "#define ") || !Append(&used, defines[i]) || !Append(&used, "\n")) return false;
+    return Append(&used, source);
+}
+
+// The log of a failed link, cut to fit the caller's buffer.
+void ReadLinkLog(uint32_t program, char* log) {
+    GLint length = 0;
+    QEX_GL(glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length));
+    QexScratch<char> text(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
+    if (!text) return;
+    text[0] = 0;
+    QEX_GL(glGetProgramInfoLog(program, length, nullptr, text.Get()));
+    text[static_cast<uint64_t>(length > 0 ? length : 0)] = 0;
+    if (!log) return;
+    strncpy(log, text.Get(), QEX_SHADER_LOG_SIZE - 1);
+    log[QEX_SHADER_LOG_SIZE - 1] = 0;
+}
+
+// A line with the GL's own words. No checks: the failure itself is what is told.
+void LogWords(const char* name, const char* what, GLint length, uint32_t object,
+              void (*read)(GLuint, GLsizei, GLsizei*, GLchar*)) {
+    QexScratch<char> text(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
+    if (!text) return;
+    text[0] = 0;
+    if (length > 0) read(object, length, nullptr, text.Get());
+    QexError(QEX_TAG, "<%s> %s: %s", name, what, text.Get());
+}
+
+void LogShader(const char* name, const char* what, uint32_t shader) {
+    GLint compiled = GL_TRUE, length = 0;
+    if (!shader) return;
+    glGetShaderiv(shader, GL_COMPILE_STATUS, &compiled);
+    if (compiled) return;
+    glGetShaderiv(shader, GL_INFO_LOG_LENGTH, &length);
+    LogWords(name, what, length, shader, glGetShaderInfoLog);
+}
+
+}  // namespace
+
+void QexShader_LogFailure(const char* name, uint32_t vertexShader, uint32_t fragmentShader,
+                          uint32_t program) {
+    GLint linked = GL_TRUE, length = 0;
+    LogShader(name, "the vertex shader does not compile", vertexShader);
+    LogShader(name, "the fragment shader does not compile", fragmentShader);
+    if (!program) return;
+    glGetProgramiv(program, GL_LINK_STATUS, &linked);
+    if (linked) return;
+    glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
+    LogWords(name, "the program does not link", length, program, glGetProgramInfoLog);
+}
+
+bool QexShader_BuildProgram(const char* name, uint32_t* program, uint32_t* vertexShader,
+                            uint32_t* fragmentShader, const char* vertexSource, const char* fragmentSource,
+                            const char* const* attributes, int32_t attributeCount) {
+    if (QexShader_Create(vertexShader, vertexSource, GL_VERTEX_SHADER) == 0 &&
+        QexShader_Create(fragmentShader, fragmentSource, GL_FRAGMENT_SHADER) == 0 &&
+        QexShader_CreateProgram(program, *vertexShader, *fragmentShader, attributes, attributeCount,
+                                nullptr) == 0)
+        return true;
+    QexShader_LogFailure(name, *vertexShader, *fragmentShader, *program);
+    QexShader_DeleteProgram(program, vertexShader, fragmentShader);
+    return false;
+}
+
+void QexShader_DeleteProgram(uint32_t* program, uint32_t* vertexShader, uint32_t* fragmentShader) {
+    QexRenderState_UseProgram(0);
+    if (*program) QEX_GL(glDeleteProgram(*program));
+    if (*vertexShader) QEX_GL(glDeleteShader(*vertexShader));
+    if (*fragmentShader) QEX_GL(glDeleteShader(*fragmentShader));
+    *program = *vertexShader = *fragmentShader = 0;
+}
+
+extern "C" {
+
+int32_t QexShader_Create(uint32_t* shader, const char* source, uint32_t type) {
+    GLint status = 0, length = 0;
+    *shader = glCreateShader(type);
+    QEX_GL(glShaderSource(*shader, 1, &source, nullptr));
+    QEX_GL(glCompileShader(*shader));
+    QEX_GL(glGetShaderiv(*shader, GL_COMPILE_STATUS, &status));
+    if (status == 1) return 0;
+    // The log is fetched, so that it can be seen in a debugger or a GL trace, but not printed.
+    QEX_GL(glGetShaderiv(*shader, GL_INFO_LOG_LENGTH, &length));
+    QexScratch<char> log(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
+    if (log) QEX_GL(glGetShaderInfoLog(*shader, length, nullptr, log.Get()));
+    return -1;
+}
+
+int32_t QexShader_CreateFromMemEx(uint32_t* shader, const char* source, uint32_t type,
+                                  const char* const* defines, uint32_t defineCount) {
+    if (Assemble(source, defines, defineCount)) return QexShader_Create(shader, QexDefineBuffer, type);
+    *shader = 0;
+    QexError(QEX_TAG, "<QexShader_CreateFromMemEx> defines and source exceed %zu bytes", kDefineBufferSize);
+    return -1;
+}
+
+int32_t QexShader_CreateFromFileEx(uint32_t* shader, const char* path, uint32_t type,
+                                   const char* const* defines, uint32_t defineCount) {
+    QexResFile file;
+    QexResFile_Create(&file, path);
+    if (!QexResFile_IsOpen(&file)) {
+        QexResFile_Release(&file);
+        *shader = 0;
+        QexSystem_Printf("ERROR:<QexShader_CreateFromFileEx> Read file %s failed!\n", path ? path : "");
+        return -1;
+    }
+    const int32_t result =
+        QexShader_CreateFromMemEx(shader, QexResFile_StringPtr(&file), type, defines, defineCount);
+    QexResFile_Close(&file);
+    return result;
+}
+
+int32_t QexShader_CreateWithBinary(uint32_t* shader, const void* binary, int32_t length, uint32_t format,
+                                   uint32_t type) {
+    *shader = glCreateShader(type);
+    QEX_GL(glShaderBinary(1, shader, format, binary, length));
+    return 0;
+}
+
+int32_t QexShader_CreateProgram(uint32_t* program, uint32_t vertexShader, uint32_t fragmentShader,
+                                const char* const* attributes, int32_t attributeCount, char* log) {
+    GLint status = 0;
+    *program = glCreateProgram();
+    if (log) log[0] = 0;
+    QEX_GL(glAttachShader(*program, fragmentShader));
+    QEX_GL(glAttachShader(*program, vertexShader));
+    for (int32_t i = 0; i < attributeCount; ++i)
+        QEX_GL(glBindAttribLocation(*program, static_cast<GLuint>(i), attributes[i]));
+    QEX_GL(glLinkProgram(*program));
+    QEX_GL(glGetProgramiv(*program, GL_LINK_STATUS, &status));
+    if (status == GL_TRUE) {
+        QexRenderState_UseProgram(*program);
+        return 0;
+    }
+    ReadLinkLog(*program, log);
+    return -1;
+}
+
+}  // extern "C"

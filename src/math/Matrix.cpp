@@ -1,0 +1,333 @@
+#include <cmath>
+#include <cstring>
+
+#include "math/Float4.h"
+
+const QexMatrix g_sMatIdentity = {{1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}};
+
+namespace {
+
+constexpr double kPi = 3.141592653589793;
+
+// m * (x, y, z, w) as the sum of the scaled columns.
+Float4 Combine(const QexMatrix* m, float x, float y, float z, float w) {
+    return Load4(m->m) * x + Load4(m->m + 4) * y + Load4(m->m + 8) * z + Load4(m->m + 12) * w;
+}
+
+struct SinCos {
+    float sin, cos;
+};
+
+SinCos SinCosDegrees(float degrees) {
+    const double radians = degrees * kPi / 180;
+    return {static_cast<float>(sin(radians)), static_cast<float>(cos(radians))};
+}
+
+float Degrees(double radians) {
+    return static_cast<float>(radians / kPi * 180);
+}
+
+// Between unit vectors. The arc cosine of the dot product alone would lose small angles.
+double AngleBetween(const QexVec3& a, const QexVec3& b) {
+    QexVec3 cross;
+    QexVec3_CrossProduct(&cross, &a, &b);
+    const double sine = sqrt(static_cast<double>(QexVec3_DotProduct(&cross, &cross)));
+    return atan2(sine, static_cast<double>(QexVec3_DotProduct(&a, &b)));
+}
+
+struct StridedVectors {
+    const char* in;
+    char* out;
+    uint32_t count, stride;
+};
+
+template <class Transform>
+void ForEachVector(const StridedVectors& vectors, Transform transform) {
+    for (uint32_t i = 0; i < vectors.count; ++i) {
+        const size_t offset = size_t{i} * vectors.stride;
+        QexVec3 v;
+        memcpy(&v, vectors.in + offset, sizeof v);
+        transform(&v);
+        memcpy(vectors.out + offset, &v, sizeof v);
+    }
+}
+
+}  // namespace
+
+QexMatrix* QexMatrix_Identity(QexMatrix* out) {
+    *out = g_sMatIdentity;
+    return out;
+}
+
+QexMatrix* QexMatrix_Translate(QexMatrix* out, float x, float y, float z) {
+    *out = {{1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, x, y, z, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrix_Scale(QexMatrix* out, float x, float y, float z) {
+    *out = {{x, 0, 0, 0, 0, y, 0, 0, 0, 0, z, 0, 0, 0, 0, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrixRotateX(QexMatrix* out, float degrees) {
+    const auto [s, c] = SinCosDegrees(degrees);
+    *out = {{1, 0, 0, 0, 0, c, s, 0, 0, -s, c, 0, 0, 0, 0, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrix_RotateY(QexMatrix* out, float degrees) {
+    const auto [s, c] = SinCosDegrees(degrees);
+    *out = {{c, 0, -s, 0, 0, 1, 0, 0, s, 0, c, 0, 0, 0, 0, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrixRotateZ(QexMatrix* out, float degrees) {
+    const auto [s, c] = SinCosDegrees(degrees);
+    *out = {{c, s, 0, 0, -s, c, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrix_RotateXYZ(QexMatrix* out, float x, float y, float z) {
+    QexMatrix rotateX, rotateY, rotateZ;
+    QexMatrixRotateX(&rotateX, x);
+    QexMatrix_RotateY(&rotateY, y);
+    QexMatrixRotateZ(&rotateZ, z);
+    QexMatrix_Multiply(out, &rotateY, &rotateX);
+    QexMatrix_Multiply(out, &rotateZ, out);
+    return out;
+}
+
+QexMatrix* QexMatrix_RotateAngelAxis(QexMatrix* out, float degrees, float x, float y, float z) {
+    const auto [s, c] = SinCosDegrees(degrees);
+    const float scale = static_cast<float>(1 / sqrt(static_cast<double>(x * x + y * y + z * z)));
+    x *= scale;
+    y *= scale;
+    z *= scale;
+    const float k = 1 - c;
+    // clang-format off
+    *out = {{k * x * x + c,     k * y * x + s * z, k * z * x - s * y, 0,
+             k * x * y - s * z, k * y * y + c,     k * z * y + s * x, 0,
+             k * x * z + s * y, k * y * z - s * x, k * z * z + c,     0,
+             0,                 0,                 0,                 1}};
+    // clang-format on
+    return out;
+}
+
+QexMatrix* QexMatrix_Perspective(QexMatrix* out, float fov, float aspect, float nearPlane, float farPlane) {
+    const float ratio = nearPlane / farPlane;
+    const float cotangent = static_cast<float>(1 / tan(fov * 0.5));
+    const float scale = cotangent / farPlane;
+    QexMatrix_Scale(out, scale, scale * aspect, (1 / farPlane) / (ratio - 1));
+    out->m[11] = -1 / farPlane;
+    out->m[14] = ratio / (ratio - 1);
+    out->m[15] = 0;
+    return out;
+}
+
+QexMatrix* QexMatrix_Orthographic(QexMatrix* out, float left, float right, float bottom, float top,
+                                  float nearPlane, float farPlane) {
+    QexMatrix_Scale(out, 2 / (right - left), 2 / (top - bottom), 2 / (farPlane - nearPlane));
+    out->m[12] = -(right + left) / (right - left);
+    out->m[13] = -(top + bottom) / (top - bottom);
+    out->m[14] = -(farPlane + nearPlane) / (farPlane - nearPlane);
+    return out;
+}
+
+QexMatrix* QexMatrix_LookUp(QexMatrix* out, const QexVec3* direction, const QexVec3* up) {
+    QexVec3 x, y, z;
+    QexVec3_Scale(&z, direction, -1);
+    QexVec3_Normalize(&z, &z);
+    QexVec3 along;
+    QexVec3_Scale(&along, &z, QexVec3_DotProduct(&z, up));
+    QexVec3_Subtract(&y, up, &along);
+    QexVec3_Normalize(&y, &y);
+    QexVec3_CrossProduct(&x, &y, &z);
+    *out = {{x.x, y.x, z.x, 0, x.y, y.y, z.y, 0, x.z, y.z, z.z, 0, 0, 0, 0, 1}};
+    return out;
+}
+
+QexMatrix* QexMatrix_LookAtRH(QexMatrix* out, const QexVec3* eye, const QexVec3* target, const QexVec3* up) {
+    QexVec3 direction;
+    QexVec3_Subtract(&direction, target, eye);
+    QexMatrix rotation, translation;
+    QexMatrix_LookUp(&rotation, &direction, up);
+    QexMatrix_Translate(&translation, -eye->x, -eye->y, -eye->z);
+    QexMatrix_Multiply(out, &rotation, &translation);
+    return out;
+}
+
+QexMatrix* QexMatrix_CreateReflectionMatrix(const QexVec3* planePoint, const QexVec3* planeNormal,
+                                            QexMatrix* out) {
+    const QexVec3 up = {0, 1, 0}, point = *planePoint;
+    QexVec3 normal, axis;
+    QexVec3_Normalize(&normal, planeNormal);
+    QexVec3_CrossProduct(&axis, &up, &normal);
+    // A normal along Y needs no turning, but the axis must have a length.
+    if (axis.x == 0 && axis.z == 0) axis = {0, 0, 1};
+    const float degrees = Degrees(AngleBetween(up, normal));
+
+    // Read from the right: plane to the origin, its normal onto +Y, mirror Y, and back again.
+    QexMatrix step;
+    QexMatrix_Translate(out, point.x, point.y, point.z);
+    QexMatrix_Multiply(out, out, QexMatrix_RotateAngelAxis(&step, degrees, axis.x, axis.y, axis.z));
+    QexMatrix_Multiply(out, out, QexMatrix_Scale(&step, 1, -1, 1));
+    QexMatrix_Multiply(out, out, QexMatrix_RotateAngelAxis(&step, -degrees, axis.x, axis.y, axis.z));
+    QexMatrix_Multiply(out, out, QexMatrix_Translate(&step, -point.x, -point.y, -point.z));
+    return out;
+}
+
+QexMatrix* QexMatrix_GetRotation(QexMatrix* out, const QexVec3* from, const QexVec3* to) {
+    QexVec3 a, b, axis;
+    QexVec3_Normalize(&a, from);
+    QexVec3_Normalize(&b, to);
+    const double angle = AngleBetween(b, a);
+    if (fabs(angle) < 0.01) return QexMatrix_Identity(out);
+
+    QexVec3_CrossProduct(&axis, &b, &a);
+    // Opposite directions: any axis perpendicular to them will do.
+    if (axis.x == 0 && axis.y == 0 && axis.z == 0) QexMatrix_GetPerpendicularVector(&axis, &a);
+    return QexMatrix_RotateAngelAxis(out, -Degrees(angle), axis.x, axis.y, axis.z);
+}
+
+void QexMatrix_Multiply(QexMatrix* out, const QexMatrix* a, const QexMatrix* b) {
+    const Float4 a0 = Load4(a->m), a1 = Load4(a->m + 4), a2 = Load4(a->m + 8), a3 = Load4(a->m + 12);
+    // A column of the product needs the same column of b only, so out may be b.
+    for (int c = 0; c < 16; c += 4) {
+        const Float4 column = Load4(b->m + c);
+        Store4(out->m + c, Combine3(a0, a1, a2, column) + a3 * Splat<3>(column));
+    }
+}
+
+void QexMatrix_Transpose(QexMatrix* m) {
+    const QexMatrix t = *m;
+    for (int c = 0; c < 4; ++c)
+        for (int r = 0; r < 4; ++r) m->m[4 * c + r] = t.m[4 * r + c];
+}
+
+QexMatrix* QexMatrix_Inverse(QexMatrix* out, const QexMatrix* m) {
+    // The axes, and their components turned by one and by two places. Nothing depends on the fourth lanes.
+    const Float4 a = Load4(m->m), b = Load4(m->m + 4), c = Load4(m->m + 8), t = Load4(m->m + 12);
+    const Float4 a1 = Shuffle<1, 2, 0, 3>(a), a2 = Shuffle<2, 0, 1, 3>(a);
+    const Float4 b1 = Shuffle<1, 2, 0, 3>(b), b2 = Shuffle<2, 0, 1, 3>(b);
+    const Float4 c1 = Shuffle<1, 2, 0, 3>(c), c2 = Shuffle<2, 0, 1, 3>(c);
+
+    // The six products of the determinant, three of either sign. In double those of a singular matrix cancel
+    // to within their last bits; the sum of their magnitudes is the scale that the determinant is judged by.
+    const Double4 wideA = __builtin_convertvector(a, Double4);
+    const Double4 plus = wideA * __builtin_convertvector(b1, Double4) * __builtin_convertvector(c2, Double4);
+    const Double4 minus = wideA * __builtin_convertvector(b2, Double4) * __builtin_convertvector(c1, Double4);
+    const double determinant = (plus[0] - minus[0]) + (plus[1] - minus[1]) + (plus[2] - minus[2]);
+    const double magnitude =
+        fabs(plus[0]) + fabs(plus[1]) + fabs(plus[2]) + fabs(minus[0]) + fabs(minus[1]) + fabs(minus[2]);
+    if (determinant == 0 || fabs(determinant) < 1e-15 * magnitude) return nullptr;
+
+    // The rows of the inverse are the cross products of the axes.
+    const float inverse = static_cast<float>(1 / determinant);
+    const Float4 row0 = (b1 * c2 - b2 * c1) * inverse;
+    const Float4 row1 = (c1 * a2 - c2 * a1) * inverse;
+    const Float4 row2 = (a1 * b2 - a2 * b1) * inverse;
+    const Float4 zero = {0, 0, 0, 0}, origin = {0, 0, 0, 1};
+    const Float4 low01 = Shuffle<0, 4, 1, 5>(row0, row1), high01 = Shuffle<2, 6, 3, 7>(row0, row1);
+    const Float4 low2 = Shuffle<0, 4, 1, 5>(row2, zero), high2 = Shuffle<2, 6, 3, 7>(row2, zero);
+    const Float4 o0 = Shuffle<0, 1, 4, 5>(low01, low2), o1 = Shuffle<2, 3, 6, 7>(low01, low2);
+    const Float4 o2 = Shuffle<0, 1, 4, 5>(high01, high2);
+    Store4(out->m, o0);
+    Store4(out->m + 4, o1);
+    Store4(out->m + 8, o2);
+    Store4(out->m + 12, origin - Combine3(o0, o1, o2, t));
+    return out;
+}
+
+QexMatrix* QexMatrix_InverseEx(QexMatrix* out, const QexMatrix* m) {
+    QexMatrix inverse;
+    for (int i = 0; i < 4; ++i) {
+        // Row i of the inverse times m is row i of the identity; transposed, four equations in four unknowns.
+        float system[4][5], solution[4];
+        float* rows[4];
+        for (int j = 0; j < 4; ++j) {
+            system[j][0] = i == j ? 1.0f : 0.0f;
+            memcpy(system[j] + 1, m->m + 4 * j, 4 * sizeof(float));
+            rows[j] = system[j];
+        }
+        QexMath_LinearEqSolve(solution, rows, 4);
+        for (int k = 0; k < 4; ++k) inverse.m[4 * k + i] = solution[k];
+    }
+    *out = inverse;
+    return out;
+}
+
+void QexMatrix3_ConstructorFromMatrix(QexMatrix3* out, const QexMatrix* m) {
+    const float* s = m->m;
+    *out = {{s[0], s[1], s[2], s[4], s[5], s[6], s[8], s[9], s[10]}};
+}
+
+void QexMatrix3_Transpose(QexMatrix3* out, const QexMatrix3* m) {
+    const float* s = m->m;
+    *out = {{s[0], s[3], s[6], s[1], s[4], s[7], s[2], s[5], s[8]}};
+}
+
+QexMatrix3* QexMatrix3_Inverse(QexMatrix3* out, const QexMatrix3* m) {
+    const float* s = m->m;
+    const float c0 = s[4] * s[8] - s[7] * s[5];
+    const float c1 = s[1] * s[8] - s[7] * s[2];
+    const float c2 = s[1] * s[5] - s[4] * s[2];
+    const float inverse = 1 / (s[0] * c0 - s[3] * c1 + s[6] * c2);
+    *out = {{c0 * inverse, -c1 * inverse, c2 * inverse,  //
+             -(s[3] * s[8] - s[6] * s[5]) * inverse, (s[0] * s[8] - s[6] * s[2]) * inverse,
+             -(s[0] * s[5] - s[3] * s[2]) * inverse,  //
+             (s[3] * s[7] - s[6] * s[4]) * inverse, -(s[0] * s[7] - s[6] * s[1]) * inverse,
+             (s[0] * s[4] - s[3] * s[1]) * inverse}};
+    return out;
+}
+
+void QexMatrixPrint(const QexMatrix* m) {
+    QexSystem_Printf("\n");
+    for (int r = 0; r < 4; ++r) {
+        QexSystem_Printf("%.1f\t%.1f\t%.1f\t%.1f\t\n", static_cast<double>(m->m[r]),
+                         static_cast<double>(m->m[4 + r]), static_cast<double>(m->m[8 + r]),
+                         static_cast<double>(m->m[12 + r]));
+    }
+    QexSystem_Printf("\n");
+}
+
+void QexMatrix_TransformVec4(const QexMatrix* m, const QexVec4* v, QexVec4* out) {
+    const Float4 product = Combine(m, v->x, v->y, v->z, v->w);
+    *out = {product[0], product[1], product[2], product[3]};
+}
+
+void QexMatrix_TransformVec4Raw(const QexMatrix* m, const QexVec4* v, QexVec4* out) {
+    const QexVec4 p = *v;
+    float result[4];
+    for (int i = 0; i < 4; ++i) {
+        const float* column = m->m + 4 * i;
+        result[i] = column[0] * p.x + column[1] * p.y + column[2] * p.z + column[3] * p.w;
+    }
+    *out = {result[0], result[1], result[2], result[3]};
+}
+
+void QexMatrix_TransformVec3(const QexMatrix3* m, const QexVec3* v, QexVec3* out) {
+    const float* s = m->m;
+    const QexVec3 p = *v;
+    *out = {s[0] * p.x + s[3] * p.y + s[6] * p.z, s[1] * p.x + s[4] * p.y + s[7] * p.z,
+            s[2] * p.x + s[5] * p.y + s[8] * p.z};
+}
+
+void QexMatrix_TransformHomoVec3(const QexMatrix* m, const QexVec3* v, QexVec3* out, float w) {
+    const Float4 product = Combine(m, v->x, v->y, v->z, w);
+    *out = {product[0] / product[3], product[1] / product[3], product[2] / product[3]};
+}
+
+void QexMatrix_TransformVec3Array(const QexMatrix* m, const void* in, void* out, float w, uint32_t count,
+                                  uint32_t stride) {
+    const StridedVectors vectors = {static_cast<const char*>(in), static_cast<char*>(out), count, stride};
+    ForEachVector(vectors, [m, w](QexVec3* v) {
+        const Float4 product = Combine(m, v->x, v->y, v->z, w);
+        *v = {product[0], product[1], product[2]};
+    });
+}
+
+void QexMatrix_TransformHomoVec3Array(const QexMatrix* m, const void* in, void* out, float /*ignored*/,
+                                      uint32_t count, uint32_t stride) {
+    const StridedVectors vectors = {static_cast<const char*>(in), static_cast<char*>(out), count, stride};
+    ForEachVector(vectors, [m](QexVec3* v) { QexMatrix_TransformHomoVec3(m, v, v, 1); });
+}

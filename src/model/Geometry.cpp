@@ -1,0 +1,284 @@
+#include <cstring>
+
+#include "gl/GL.h"
+#include "pod/Reader.h"
+#include "base/Memory.h"
+#include "model/Model.h"
+#include "pod/Scene.h"
+
+#define QEX_MODULE "src/QexModel"
+
+namespace {
+
+// How GL takes a POD data type. One without a GL type is converted to floats.
+struct GLType {
+    GLenum type;
+    bool normalised;
+};
+
+GLType ToGLType(uint32_t podType) {
+    static const GLType types[] = {
+        {0, false},                  // none
+        {GL_FLOAT, false},           // float
+        {0, false},                  // int
+        {GL_UNSIGNED_SHORT, false},  // unsigned short
+        {0, false},                  // RGBA
+        {0, false},                  // ARGB
+        {0, false},                  // D3DCOLOR
+        {GL_UNSIGNED_BYTE, false},   // four bytes
+        {0, false},                  // three 10-bit fields
+        {GL_FIXED, false},           // 16.16
+        {GL_UNSIGNED_BYTE, false},   // unsigned byte
+        {GL_SHORT, false},           // short
+        {GL_SHORT, true},            // short, normalised
+        {GL_BYTE, false},            // byte
+        {GL_BYTE, true},             // byte, normalised
+        {GL_UNSIGNED_BYTE, true},    // unsigned byte, normalised
+        {GL_UNSIGNED_SHORT, true},   // unsigned short, normalised
+        {0, false},                  // unsigned int
+    };
+    return podType < sizeof types / sizeof types[0] ? types[podType] : types[0];
+}
+
+struct Element {
+    const CPODData* data;
+    const uint8_t* source;  // of the first vertex
+    bool asFloats;          // converted at upload
+    uint32_t size;          // bytes a vertex in the upload
+};
+
+// The elements that are uploaded, in the order of QexVertexElement.
+struct Elements {
+    Element list[QEX_ELEMENT_COUNT];
+};
+
+Elements ListElements(const QexPODMesh& mesh) {
+    static const CPODData none = {};
+    const CPODData* const sources[QEX_ELEMENT_COUNT] = {&mesh.vertices,
+                                                        &mesh.normals,
+                                                        &mesh.tangents,
+                                                        &mesh.binormals,
+                                                        mesh.uvwChannelCount ? &mesh.uvws[0] : &none,
+                                                        &mesh.boneIndices,
+                                                        &mesh.boneWeights};
+    Elements elements;
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const CPODData* data = sources[i];
+        // Positions are always floats: the mesh's box comes from them, and its unpack matrix goes into them.
+        const bool asFloats =
+            i == QEX_ELEMENT_POSITION ? data->type != QEX_POD_FLOAT : !ToGLType(data->type).type;
+        const uint32_t bytes = asFloats ? QexPODData_Components(*data) * 4
+                                        : QexPODData_ElementSize(data->type, data->componentCount);
+        if (data->componentCount)
+            elements.list[i] = {data, QexPODMesh_ElementData(&mesh, *data), asFloats, (bytes + 3) / 4 * 4};
+        else
+            elements.list[i] = {data, nullptr, false, 0};
+    }
+    return elements;
+}
+
+bool IsIdentity(const QexMatrix& matrix) {
+    return memcmp(&matrix, &g_sMatIdentity, sizeof matrix) == 0;
+}
+
+// Whether the interleaved block can go to GL as it is: one stride, everything within it and aligned.
+bool UploadsAsIs(const QexPODMesh& mesh, const Elements& elements) {
+    const uint32_t stride = mesh.vertices.stride;
+    if (!mesh.interleaved || !mesh.vertices.componentCount || !IsIdentity(mesh.unpackMatrix)) return false;
+    if (uint64_t{stride} * mesh.vertexCount > mesh.interleavedBytes || stride > INT32_MAX) return false;
+    for (const Element& element : elements.list) {
+        const CPODData& data = *element.data;
+        if (!data.componentCount) continue;
+        const uint32_t unit = QexPODData_ComponentSize(data.type);
+        const uint64_t offset = reinterpret_cast<uintptr_t>(data.data);
+        if (element.asFloats || data.stride != stride || offset % unit || stride % unit) return false;
+        if (offset + QexPODData_ElementSize(data.type, data.componentCount) > stride) return false;
+    }
+    return true;
+}
+
+QexVertexAttribute Describe(QexVertexElement element, const CPODData& data, bool asFloats, uint32_t stride,
+                            uint32_t offset) {
+    GLType gl = asFloats ? GLType{GL_FLOAT, false} : ToGLType(data.type);
+    // Bone indices count, weights are shares of 1, whatever the file calls its bytes.
+    if (element == QEX_ELEMENT_BONE_INDEX) gl.normalised = false;
+    if (element == QEX_ELEMENT_BONE_WEIGHT) gl.normalised = gl.type != GL_FLOAT && gl.type != GL_FIXED;
+    if (!data.componentCount) return {};
+    const int32_t components = static_cast<int32_t>(QexPODData_Components(data));
+    return {components, gl.type, gl.normalised ? 1u : 0u, stride, offset};
+}
+
+// An element as floats; bytes are signed here, as GL takes them.
+void Decode(float* out, const uint8_t* source, const CPODData& data) {
+    QexPODVertex_ReadVec(out, source, data.type, static_cast<int32_t>(data.componentCount));
+    if (data.type != QEX_POD_BYTE && data.type != QEX_POD_BYTE_NORM) return;
+    for (uint32_t i = 0; i < data.componentCount; ++i)
+        if (source[i] > 127) out[i] -= data.type == QEX_POD_BYTE ? 256.0f : 256.0f / 127.0f;
+}
+
+void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position,
+                 uint32_t vertex) {
+    const CPODData& data = *element.data;
+    const uint8_t* source = element.source + uint64_t{vertex} * data.stride;
+    if (!element.asFloats && !position) {
+        memcpy(out, source, QexPODData_ElementSize(data.type, data.componentCount));
+        return;
+    }
+    QexVec4 value;
+    Decode(&value.x, source, data);
+    if (position) {
+        value.w = 1;
+        QexMatrix_TransformVec4(&mesh.unpackMatrix, &value, &value);
+    }
+    memcpy(out, &value, QexPODData_Components(data) * sizeof(float));
+}
+
+// Some exporters write tangents alone.
+bool LacksBinormals(const QexPODMesh& mesh) {
+    return mesh.tangents.componentCount >= 3 && mesh.normals.componentCount >= 3 &&
+           !mesh.binormals.componentCount && mesh.vertexCount;
+}
+
+QexVec4 ReadElement(const Element& element, uint32_t vertex) {
+    QexVec4 value;
+    Decode(&value.x, element.source + uint64_t{vertex} * element.data->stride, *element.data);
+    return value;
+}
+
+// Normal x tangent, turned round where the texture is mirrored: where its coordinates run clockwise around a
+// triangle.
+bool MakeBinormals(QexScratch<QexVec3>* out, const QexPODMesh& mesh, const Elements& elements) {
+    const uint64_t corners = uint64_t{QexPODMesh_CountTriangles(mesh)} * 3;
+    QexScratch<uint32_t> vertices;
+    if (!out->Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return false;
+    for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
+        const QexVec4 n = ReadElement(elements.list[QEX_ELEMENT_NORMAL], v);
+        const QexVec4 t = ReadElement(elements.list[QEX_ELEMENT_TANGENT], v);
+        (*out)[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+    }
+    const Element& uv = elements.list[QEX_ELEMENT_UV0];
+    if (!uv.size) return true;
+    QexScratch<uint8_t> turned;
+    if (!turned.Alloc(mesh.vertexCount)) return false;
+    memset(turned.Get(), 0, mesh.vertexCount);
+    QexPODMesh_ListCorners(mesh, vertices.Get());
+    for (uint64_t i = 0; i + 3 <= corners; i += 3) {
+        const QexVec4 a = ReadElement(uv, vertices[i]), b = ReadElement(uv, vertices[i + 1]);
+        const QexVec4 c = ReadElement(uv, vertices[i + 2]);
+        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
+        for (int corner = 0; mirrored && corner < 3; ++corner) turned[vertices[i + corner]] = 1;
+    }
+    for (uint32_t v = 0; v < mesh.vertexCount; ++v)
+        if (turned[v]) QexVec3_Scale(&(*out)[v], &(*out)[v], -1);
+    return true;
+}
+
+// Lays the vertices out anew, interleaved and aligned.
+bool Pack(QexMeshUpload* upload, QexPODMesh* mesh, const Elements& elements) {
+    uint32_t stride = 0;
+    for (const Element& element : elements.list) stride += element.size;
+    const uint64_t bytes = uint64_t{stride} * mesh->vertexCount;
+    upload->packedVertices =
+        bytes > INT32_MAX ? nullptr
+                          : static_cast<uint8_t*>(QexMemory_Alloc(static_cast<uint32_t>(bytes ? bytes : 1)));
+    if (!upload->packedVertices) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return false;
+    }
+    memset(upload->packedVertices, 0, static_cast<size_t>(bytes));
+    uint32_t offset = 0;
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const Element& element = elements.list[i];
+        mesh->attributes[i] =
+            Describe(static_cast<QexVertexElement>(i), *element.data, element.asFloats, stride, offset);
+        for (uint32_t v = 0; element.size && v < mesh->vertexCount; ++v)
+            PackElement(upload->packedVertices + uint64_t{v} * stride + offset, *mesh, element,
+                        i == QEX_ELEMENT_POSITION, v);
+        offset += element.size;
+    }
+    upload->vertices = upload->packedVertices;
+    upload->vertexBytes = static_cast<uint32_t>(bytes);
+    return true;
+}
+
+bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t meshIndex) {
+    if (!mesh.faces.data) return true;
+    upload->indexCount = QexPODModel_CountIndices(&mesh);
+    if (mesh.faces.type == QEX_POD_UNSIGNED_SHORT) {
+        upload->indices = reinterpret_cast<const uint16_t*>(mesh.faces.data);
+        return true;
+    }
+    if (mesh.vertexCount > 65536) {
+        QexError(QEX_TAG,
+                 "<QexModel_DownloadGeometry> mesh %u has %u vertices, more than 16-bit indices reach",
+                 meshIndex, mesh.vertexCount);
+        return false;
+    }
+    const uint32_t bytes = upload->indexCount * static_cast<uint32_t>(sizeof(uint16_t));
+    upload->packedIndices = static_cast<uint16_t*>(QexMemory_Alloc(bytes ? bytes : 1));
+    if (!upload->packedIndices) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return false;
+    }
+    const uint32_t* wide = reinterpret_cast<const uint32_t*>(mesh.faces.data);
+    for (uint32_t i = 0; i < upload->indexCount; ++i)
+        upload->packedIndices[i] = static_cast<uint16_t>(wide[i]);
+    upload->indices = upload->packedIndices;
+    return true;
+}
+
+// Gives the mesh batches that the shaders can hold, if it has larger ones.
+bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
+    int32_t most = 0;
+    for (int32_t i = 0; mesh->skinned && i < mesh->boneBatches.batchCount; ++i)
+        if (mesh->boneBatches.bonesPerBatch[i] > most) most = mesh->boneBatches.bonesPerBatch[i];
+    if (most <= QEX_MAX_BATCH_BONES) return true;
+    const char* fault = QexPODMesh_MakeBatches(mesh, QEX_MAX_BATCH_BONES);
+    if (!fault) return true;
+    QexError(QEX_TAG,
+             "<QexModel_DownloadGeometry> mesh %u has a bone batch of %d bones, at most %d are drawn, and "
+             "cannot be cut into smaller ones: %s",
+             meshIndex, most, QEX_MAX_BATCH_BONES, fault);
+    return false;
+}
+
+}  // namespace
+
+bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
+    memset(upload, 0, sizeof *upload);
+    if (!FitBatches(mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
+    Elements elements = ListElements(*mesh);
+    QexScratch<QexVec3> made;
+    const CPODData binormals = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
+    if (LacksBinormals(*mesh)) {
+        if (!MakeBinormals(&made, *mesh, elements)) {
+            QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+            return false;
+        }
+        elements.list[QEX_ELEMENT_BINORMAL] = {&binormals, reinterpret_cast<const uint8_t*>(made.Get()),
+                                               false, sizeof(QexVec3)};
+    }
+    if (!made && UploadsAsIs(*mesh, elements)) {
+        for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+            const CPODData& data = *elements.list[i].data;
+            mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), data, false, data.stride,
+                                           static_cast<uint32_t>(reinterpret_cast<uintptr_t>(data.data)));
+        }
+        upload->vertices = mesh->interleaved;
+        upload->vertexBytes = mesh->vertices.stride * mesh->vertexCount;
+    } else if (!Pack(upload, mesh, elements)) {
+        return false;
+    }
+    const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
+    const bool whole = position.componentCount >= 3;
+    QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload->vertices,
+                                      whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
+                                      position.stride);
+    return true;
+}
+
+void QexModelGeometry_Release(QexMeshUpload* upload) {
+    QexMemory_Free(upload->packedVertices);
+    QexMemory_Free(upload->packedIndices);
+    memset(upload, 0, sizeof *upload);
+}

@@ -1,0 +1,372 @@
+// Meshes that follow bones: what is sent for each batch, and where the vertices land.
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <fstream>
+#include <glm/gtc/quaternion.hpp>
+
+#include <unistd.h>
+
+#include "convert/Command.h"
+#include "support/RenderScenes.h"
+#include "support/Capture.h"
+
+namespace {
+
+class SkinningTest : public RenderTest {};
+
+glm::mat4 Place(glm::vec3 position, float angle) {
+    return glm::rotate(glm::translate(glm::mat4(1), position), angle, glm::vec3(0, 0, 1));
+}
+
+// Node 0 draws the mesh; nodes 1 to 4 are bones, the second a child of the first. Between frame 0, the bind
+// pose, and frame 1 all move.
+struct Skeleton {
+    struct Bone {
+        int32_t parent;
+        glm::vec3 position[2];
+        float angle[2];
+    };
+    static constexpr Bone kBones[] = {{-1, {{20, 20, 0}, {20, 20, 0}}, {0, 0.5f}},
+                                      {1, {{20, 0, 0}, {20, 3, 0}}, {0.2f, -0.7f}},
+                                      {-1, {{64, 48, 0}, {70, 56, 0}}, {0, 0}},
+                                      {-1, {{90, 30, 0}, {90, 30, 0}}, {0.1f, 0.6f}}};
+    glm::vec3 mesh = {10, 5, 0};
+
+    glm::mat4 World(int node, int frame) const {
+        const Bone& bone = kBones[node - 1];
+        const glm::mat4 local = Place(bone.position[frame], bone.angle[frame]);
+        return bone.parent < 0 ? local : World(bone.parent, frame) * local;
+    }
+    glm::mat4 Skinning(int node) const {
+        return World(node, 1) * glm::inverse(World(node, 0)) * glm::translate(glm::mat4(1), mesh);
+    }
+    pod::Scene Scene(const pod::Mesh& skinned) const {
+        pod::Scene scene = SceneOf(skinned, {{{mesh.x, mesh.y, mesh.z}}, {}, {}, {}});
+        for (const Bone& bone : kBones) {
+            pod::Transform t;
+            for (const int frame : {0, 1, 1}) {
+                const glm::vec3& p = bone.position[frame];
+                const float half = bone.angle[frame] / 2;
+                t.positions.push_back({p.x, p.y, p.z});
+                t.rotations.push_back({0, 0, std::sin(half), std::cos(half)});
+            }
+            scene.nodes.push_back(pod::BuildNode("bone", t, bone.parent));
+        }
+        scene.frameCount = 3;  // the last frame wraps to the first
+        return scene;
+    }
+};
+constexpr Skeleton::Bone Skeleton::kBones[];
+
+// 150 triangles in batches of 100 and 50, in pairs: squares of 6 x 6 pixels. Of each batch three show, every
+// one with its own texel of a palette, bones and weights; the others have no area.
+constexpr int kQuads = 75, kShown = 6, kFirstOfSecondBatch = 50;
+const glm::vec2 kCentres[kShown] = {{10, 20}, {30, 15}, {55, 20}, {80, 10}, {15, 50}, {65, 55}};
+constexpr int kBytesOfWeights[4][4] = {{255, 0, 0, 0}, {155, 100, 0, 0}, {100, 80, 75, 0}, {90, 70, 55, 40}};
+const std::vector<int> kBatches[] = {{1, 3, 2}, {4, 2}};  // scene nodes by index in the batch
+
+size_t BoneOf(int shown, uint32_t influence) {
+    return (static_cast<size_t>(shown) + influence) % kBatches[shown / 3].size();
+}
+
+pod::Mesh Squares(uint32_t influences, uint32_t weightType) {
+    std::vector<float> positions, uvs, floatWeights;
+    std::vector<double> bones, weights;
+    std::vector<uint32_t> indices;
+    for (int q = 0; q < kQuads; ++q) {
+        const int inBatch = q % kFirstOfSecondBatch, shown = inBatch % 3 + q / kFirstOfSecondBatch * 3;
+        const float half = inBatch < 3 ? 3 : 0;
+        for (int corner = 0; corner < 4; ++corner) {
+            positions.insert(positions.end(), {kCentres[shown].x + (corner % 2 ? half : -half),
+                                               kCentres[shown].y + (corner / 2 ? half : -half), 0});
+            uvs.insert(uvs.end(), {(static_cast<float>(shown) + 0.5f) / 8, 0.5f});
+            for (uint32_t i = 0; i < influences; ++i) {
+                bones.push_back(static_cast<double>(BoneOf(shown, i)));
+                weights.push_back(kBytesOfWeights[influences - 1][i]);
+                floatWeights.push_back(static_cast<float>(weights.back()) / 255);
+            }
+        }
+        for (const int i : {0, 1, 2, 2, 1, 3}) indices.push_back(static_cast<uint32_t>(4 * q + i));
+    }
+    pod::Mesh mesh;
+    mesh.vertexCount = kQuads * 4;
+    mesh.faceCount = kQuads * 2;
+    mesh.faces = pod::IndexElement(indices);
+    mesh.vertices = pod::FloatElement(positions.data(), positions.size(), 3);
+    mesh.uvw = {pod::FloatElement(uvs.data(), uvs.size(), 2)};
+    mesh.boneIndices = IntegerElement(pod::kUint8, influences, bones);
+    mesh.boneWeights = weightType == pod::kFloat32
+                           ? pod::FloatElement(floatWeights.data(), floatWeights.size(), influences)
+                           : IntegerElement(weightType, influences, weights);
+    mesh.batchBones = {1, 3, 2, 4, 2, 0};
+    mesh.bonesPerBatch = {3, 2};
+    mesh.batchOffsets = {0, 2 * kFirstOfSecondBatch};
+    mesh.batchBoneMax = 3;
+    mesh.batchCount = 2;
+    return mesh;
+}
+
+TEST_F(SkinningTest, EachBatchSendsItsBonesAndDrawsItsTriangles) {
+    const Skeleton skeleton;
+    LoadedModel model(skeleton.Scene(Squares(2, pod::kUint8Norm)));
+    ASSERT_EQ(model.log, "");
+    QexPODModel_SetFrame(&model.model.scene, 1);
+    const QexShaderModule* module = model.Node().shader;
+    ASSERT_EQ(module->render, QexSkinningTextureShader_Render);
+    const glm::mat4 extra = Place({3, 4, 5}, 0.25f);
+    const QexMatrix extraMatrix = ToQex(extra);
+    for (const bool placed : {false, true}) {
+        const GLCalls calls([&] { model.Draw(placed ? &extraMatrix : nullptr); });
+        const std::string count = "glUniform1i(" + std::to_string(module->slots[0].location) + ", 2)\n";
+        EXPECT_EQ(calls.Text({"glUniform1i", "glDrawElements"}),
+                  count + "glDrawElements(GL_TRIANGLES, 300, GL_UNSIGNED_SHORT, NULL)\n" + count +
+                      "glDrawElements(GL_TRIANGLES, 150, GL_UNSIGNED_SHORT, 0x258)\n");
+        const auto matrices = calls.Of({"glUniformMatrix4fv"});
+        ASSERT_EQ(matrices.size(), 3u);
+        EXPECT_EQ(matrices[0]->argument[0].i, module->slots[2].location);
+        EXPECT_TRUE(SameMatrix(matrices[0]->data, glm::make_mat4(PixelProjection().m)));
+        for (size_t batch = 0; batch < 2; ++batch) {
+            const gltapCall* call = matrices[batch + 1];
+            EXPECT_EQ(call->argument[0].i, module->slots[1].location);
+            ASSERT_EQ(call->argument[1].i, static_cast<int64_t>(kBatches[batch].size()));
+            for (size_t j = 0; j < kBatches[batch].size(); ++j) {
+                const glm::mat4 bone = skeleton.Skinning(kBatches[batch][j]);
+                EXPECT_TRUE(
+                    SameMatrix(static_cast<const float*>(call->data) + 16 * j, placed ? extra * bone : bone))
+                    << batch << " " << j;
+            }
+        }
+    }
+    // The box follows the first bone of the first batch, without the model matrix.
+    QexModel_UpdateMeshNodeBoundingBox(&model.model, 0, &extraMatrix);
+    const glm::vec4 farthest = skeleton.Skinning(1) * glm::vec4(83, 58, 0, 1);
+    const QexVec3& corner = model.model.nodeBoxes[0].corners[7];
+    EXPECT_LT(glm::distance(glm::vec3(corner.x, corner.y, corner.z), glm::vec3(farthest)), 1e-3f);
+    // What follows a bone that the scene does not have goes with the mesh node.
+    model.model.scene.meshes[0].boneBatches.boneTable[1] = -1;
+    const GLCalls calls([&] { model.Draw(); });
+    const float* second = static_cast<const float*>(calls.Of({"glUniformMatrix4fv"}).at(1)->data) + 16;
+    EXPECT_TRUE(SameMatrix(second, glm::translate(glm::mat4(1), skeleton.mesh)));
+    model.Node().stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
+    EXPECT_EQ(GLCalls([&] { model.Draw(); }).Size(), 0u);
+}
+
+// The mean place of the pixels of a colour, counted from the lower left corner, and their number.
+glm::vec3 FindSpot(const Picture& picture, Rgba colour) {
+    glm::vec3 sum(0);
+    for (int y = 0; y < kHeight; ++y)
+        for (int x = 0; x < kWidth; ++x)
+            if (picture.Pixel(x, y) == colour)
+                sum += glm::vec3(static_cast<float>(x) + 0.5f, static_cast<float>(kHeight - y) - 0.5f, 1);
+    return {glm::vec2(sum) / sum.z, sum.z};
+}
+
+TEST_F(SkinningTest, VerticesLandWhereTheirBonesCarryThem) {
+    const Skeleton skeleton;
+    std::vector<uint8_t> palette;
+    for (int i = 0; i < 8; ++i)
+        palette.insert(palette.end(), {uint8_t(30 * i + 20), uint8_t(200 - 20 * i), 90, 255});
+    ScopedTexture texture(8, 1, palette.data());
+    const glm::mat4 extra = Place({6, -4, 0}, 0.05f);
+    const QexMatrix extraMatrix = ToQex(extra);
+    for (uint32_t influences = 1; influences <= 4; ++influences)
+        for (const uint32_t type : {pod::kUint8, pod::kUint8Norm, pod::kFloat32}) {
+            LoadedModel model(skeleton.Scene(Squares(influences, type)));
+            ASSERT_EQ(model.log, "");
+            QexPODModel_SetFrame(&model.model.scene, 1);
+            model.model.textures[0] = &texture;
+            Clear();
+            model.Draw(type == pod::kUint8 ? nullptr : &extraMatrix);
+            const Picture picture = Read();
+            for (int q = 0; q < kShown; ++q) {
+                glm::mat4 blend(0);
+                for (uint32_t i = 0; i < influences; ++i)
+                    blend += skeleton.Skinning(kBatches[q / 3][BoneOf(q, i)]) *
+                             (static_cast<float>(kBytesOfWeights[influences - 1][i]) / 255);
+                if (type != pod::kUint8) blend = extra * blend;
+                const glm::vec2 expected = glm::vec2(blend * glm::vec4(kCentres[q], 0, 1));
+                const float area = 36 * std::fabs(glm::determinant(glm::mat2(blend)));
+                const glm::vec3 spot = FindSpot(picture, {30 * q + 20, 200 - 20 * q, 90, 255});
+                SCOPED_TRACE(testing::Message() << influences << " " << type << " " << q);
+                EXPECT_NEAR(spot.z, area, 9);
+                EXPECT_LT(glm::distance(glm::vec2(spot), expected), 0.5f);
+            }
+        }
+}
+
+glm::mat4 ReadMatrix(const QexPODNode& node, float frame, uint32_t last) {
+    const size_t key = std::min(static_cast<size_t>(frame), size_t{last});
+    const size_t next = std::min(key + 1, size_t{last});
+    const float t = frame - std::floor(frame);
+    const auto at = [&](const float* data, const uint32_t* index, uint32_t flag, size_t k, size_t floats) {
+        return data + (!(node.animationFlags & flag) ? 0 : index ? index[k] : k * floats);
+    };
+    glm::mat4 local(1);
+    if (node.position) {
+        float a[3], b[3];
+        memcpy(a, at(node.position, node.positionIndex, QEX_NODE_POSITION_ANIMATED, key, 3), sizeof a);
+        memcpy(b, at(node.position, node.positionIndex, QEX_NODE_POSITION_ANIMATED, next, 3), sizeof b);
+        local = glm::translate(local, glm::mix(glm::make_vec3(a), glm::make_vec3(b), t));
+    }
+    if (node.rotation) {
+        const float* a = at(node.rotation, node.rotationIndex, QEX_NODE_ROTATION_ANIMATED, key, 4);
+        const float* b = at(node.rotation, node.rotationIndex, QEX_NODE_ROTATION_ANIMATED, next, 4);
+        local *= glm::mat4_cast(glm::slerp(glm::make_quat(a), glm::make_quat(b), t));
+    }
+    return local;
+}
+
+glm::mat4 WorldOf(const QexPODModel& scene, int32_t node, float frame) {
+    if (node < 0) return glm::mat4(1);
+    return WorldOf(scene, scene.nodes[node].parentIndex, frame) *
+           ReadMatrix(scene.nodes[node], frame, scene.frameCount - 1);
+}
+
+// The vertices of the first mesh node's triangles.
+std::vector<glm::vec3> SkinnedVertices(QexPODModel* scene, float frame) {
+    const QexPODMesh& mesh = scene->meshes[0];
+    const QexBoneBatches& batches = mesh.boneBatches;
+    std::vector<glm::mat4> bones;
+    for (uint32_t node = 0; node < scene->nodeCount; ++node)
+        bones.push_back(WorldOf(*scene, static_cast<int32_t>(node), frame) *
+                        glm::inverse(WorldOf(*scene, static_cast<int32_t>(node), 0)) * WorldOf(*scene, 0, 0));
+    std::vector<glm::vec3> out;
+    int32_t batch = 0;
+    for (uint32_t i = 0; i < mesh.faceCount * 3; ++i) {
+        while (batch + 1 < batches.batchCount && i / 3 >= static_cast<uint32_t>(batches.offsets[batch + 1]))
+            ++batch;
+        uint16_t index;
+        float position[3];
+        memcpy(&index, mesh.faces.data + 2 * i, 2);
+        const uint8_t* vertex = mesh.interleaved + index * mesh.vertices.stride;
+        memcpy(position, vertex + reinterpret_cast<uintptr_t>(mesh.vertices.data), sizeof position);
+        const uint8_t* bone = vertex + reinterpret_cast<uintptr_t>(mesh.boneIndices.data);
+        const uint8_t* weight = vertex + reinterpret_cast<uintptr_t>(mesh.boneWeights.data);
+        glm::vec4 sum(0);
+        for (uint32_t k = 0; k < mesh.boneIndices.componentCount; ++k)
+            sum += bones[static_cast<size_t>(batches.boneTable[batch * batches.maxBones + bone[k]])] *
+                   glm::vec4(glm::make_vec3(position), 1) * (static_cast<float>(weight[k]) / 255);
+        out.emplace_back(sum);
+    }
+    return out;
+}
+
+const Rgba kBlue = {0, 0, 255, 255};  // the background
+
+// Whether something is drawn at most a pixel from here.
+bool ShowsNear(const Picture& picture, glm::vec2 at) {
+    for (int y = static_cast<int>(at.y) - 1; y <= static_cast<int>(at.y) + 1; ++y)
+        for (int x = static_cast<int>(at.x) - 1; x <= static_cast<int>(at.x) + 1; ++x)
+            if (x >= 0 && y >= 0 && x < kWidth && y < kHeight && picture.Pixel(x, y) != kBlue) return true;
+    return false;
+}
+
+// The squares as a file without batches has them: vertices name nodes.
+pod::Mesh WithoutBatches(uint32_t influences) {
+    pod::Mesh mesh = Squares(influences, pod::kUint8);
+    for (size_t v = 0; v < mesh.vertexCount; ++v)
+        for (size_t i = 0; i < influences; ++i) {
+            uint8_t& bone = mesh.boneIndices.data[v * influences + i];
+            bone = static_cast<uint8_t>(kBatches[v < 4 * kFirstOfSecondBatch ? 0 : 1][bone]);
+        }
+    mesh.batchBones = mesh.bonesPerBatch = mesh.batchOffsets = {};
+    mesh.batchBoneMax = mesh.batchCount = 0;
+    return mesh;
+}
+
+// One batch of 17 bones: the nodes in turn.
+pod::Mesh WithLargeBatch(uint32_t influences) {
+    pod::Mesh mesh = WithoutBatches(influences);
+    for (uint8_t& bone : mesh.boneIndices.data) bone = static_cast<uint8_t>(bone + 11);  // 12 to 15
+    for (int i = 0; i < 17; ++i) mesh.batchBones.push_back(1 + i % 4);
+    mesh.bonesPerBatch = {17};
+    mesh.batchOffsets = {0};
+    mesh.batchBoneMax = 17;
+    mesh.batchCount = 1;
+    return mesh;
+}
+
+TEST_F(SkinningTest, MeshesGetTheBatchesThatTheyLack) {
+    const Skeleton skeleton;
+    std::vector<uint8_t> palette;
+    for (int i = 0; i < 8; ++i)
+        palette.insert(palette.end(), {uint8_t(30 * i + 20), uint8_t(200 - 20 * i), 90, 255});
+    ScopedTexture texture(8, 1, palette.data());
+    const auto draw = [&](const pod::Mesh& mesh) {
+        LoadedModel model(skeleton.Scene(mesh));
+        EXPECT_EQ(model.log, "");
+        EXPECT_EQ(model.model.scene.meshes[0].boneBatches.batchCount, mesh.batchCount > 1 ? 2 : 1);
+        QexPODModel_SetFrame(&model.model.scene, 1);
+        model.model.textures[0] = &texture;
+        Clear();
+        model.Draw();
+        return Read();
+    };
+    for (uint32_t influences = 1; influences <= 4; ++influences) {
+        SCOPED_TRACE(influences);
+        const Picture expected = draw(Squares(influences, pod::kUint8));
+        EXPECT_TRUE(SamePicture(expected, draw(WithoutBatches(influences))));
+        EXPECT_TRUE(SamePicture(expected, draw(WithLargeBatch(influences))));
+        // Each square as a strip of two triangles; the second of them is turned over.
+        pod::Mesh strips = WithoutBatches(influences);
+        std::vector<uint32_t> indices;
+        for (uint32_t i = 0; i < strips.vertexCount; ++i) indices.push_back(i);
+        strips.faces = pod::IndexElement(indices, true);
+        strips.stripLengths.assign(kQuads, 2);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
+        EXPECT_TRUE(SamePicture(draw(WithoutBatches(influences)), draw(strips)));
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+    }
+}
+
+// A character as it comes out of the converter, at several frames: every vertex of its skin, worked out here
+// from keys, weights and bone lists, lies where the picture shows something, and nothing else is shown.
+TEST_F(SkinningTest, ConvertedCharacterIsWhereItsBonesAre) {
+    ConvertOptions options;
+    options.input = "/usr/share/assimp/models/X/Testwuson.X";
+    if (!std::ifstream(options.input)) GTEST_SKIP() << options.input << " is not installed";
+    options.output = OutputPath("character.pod");
+    options.quiet = true;
+    QexModel model;
+    QexModel_Create(&model);
+    {
+        Capture out(STDOUT_FILENO), errors(STDERR_FILENO);
+        ASSERT_EQ(RunConvert(options), 0);
+        ASSERT_EQ(QexModel_LoadContent(&model, OutputPath("").c_str(), "character.pod"), 0);
+    }
+    const QexPODMesh& mesh = model.scene.meshes[0];
+    ASSERT_GT(mesh.boneBatches.batchCount, 1);
+    ASSERT_GT(model.scene.frameCount, 21u);
+    const glm::mat4 projection = glm::ortho(-2.2f, 2.2f, -0.6f, 2.7f, -10.0f, 10.0f);
+    const glm::mat4 view = glm::rotate(glm::mat4(1), 1.2f, glm::vec3(0, 1, 0));
+    for (const float frame : {0.0f, 3.25f, 7.5f, 20.0f}) {
+        QexPODModel_SetFrame(&model.scene, frame);
+        Clear(0, 0, 1, 1);
+        const QexMatrix v = ToQex(view), p = ToQex(projection);
+        QexModel_RenderWithViewProjection(&model, nullptr, nullptr, &v, &p, 0);
+        const Picture picture = Read();
+        glm::vec2 low(1e9f), high(-1e9f);
+        int missing = 0;
+        for (const glm::vec3& vertex : SkinnedVertices(&model.scene, frame)) {
+            const glm::vec4 clip = projection * view * glm::vec4(vertex, 1);
+            const glm::vec2 at = {(clip.x + 1) / 2 * kWidth, (1 - clip.y) / 2 * kHeight};
+            low = glm::min(low, at);
+            high = glm::max(high, at);
+            missing += !ShowsNear(picture, at);
+        }
+        EXPECT_EQ(missing, 0) << frame;
+        glm::vec2 first(1e9f), last(-1e9f);
+        for (int y = 0; y < kHeight; ++y)
+            for (int x = 0; x < kWidth; ++x)
+                if (picture.Pixel(x, y) != kBlue) {
+                    first = glm::min(first, glm::vec2(x, y));
+                    last = glm::max(last, glm::vec2(x + 1, y + 1));
+                }
+        EXPECT_LT(glm::distance(first, low), 1.5f) << frame;
+        EXPECT_LT(glm::distance(last, high), 1.5f) << frame;
+    }
+    QexModel_Unload(&model);
+}
+
+}  // namespace

@@ -1,0 +1,276 @@
+// Shadows and planar reflection: what is in the map, what the pictures show, and the state left behind.
+#include <GLES2/gl2.h>
+
+#include "support/RenderScenes.h"
+
+namespace {
+
+// A floor at y = 0 from -20 to 20, and a square of side 8 at height 10 whose centre is `place`. Where it is
+// skinned, all of it follows nodes 2 to 5.
+struct Square {
+    pod::Vec3 place;
+    bool facesDown = false, skinned = false;
+};
+constexpr std::array<uint8_t, 4> kWeights = {100, 60, 80, 15};
+
+pod::Scene FloorAndSquare(const Square& wanted) {
+    const auto square = [](float half) {
+        pod::MeshArrays arrays;
+        arrays.positions = {{-half, 0, half}, {half, 0, half}, {-half, 0, -half}, {half, 0, -half}};
+        arrays.normals.assign(4, {0, 1, 0});
+        arrays.uvs = {{0, 0}, {1, 0}, {0, 1}, {1, 1}};
+        arrays.indices = {0, 1, 2, 2, 1, 3};
+        return arrays;
+    };
+    pod::MeshArrays caster = square(4);
+    if (wanted.facesDown) caster.indices = {0, 2, 1, 2, 3, 1};
+    if (wanted.skinned) caster.boneIndices.assign(4, {0, 1, 2, 3});
+    if (wanted.skinned) caster.boneWeights.assign(4, kWeights);
+    pod::Scene scene = SceneOf(pod::BuildMesh(square(20)));
+    scene.meshes.push_back(wanted.skinned ? SkinnedMesh(caster, 4, pod::kUint8Norm, {{2, 3, 4, 5}}, {0})
+                                          : pod::BuildMesh(caster));
+    scene.nodes.push_back(pod::BuildNode("square", {{wanted.place}, {}, {}, {}}, -1, 1, 0));
+    for (int i = 0; i < 4; ++i) scene.nodes.push_back(pod::BuildNode("bone", {}));
+    scene.meshNodeCount = 2;
+    return scene;
+}
+
+// Looks straight down from height 50 on the floor; north is -z. One unit is two pixels and more.
+QexCamera Above() {
+    QexCamera camera;
+    const QexVec3 eye = {0, 50, 0}, target = {0, 0, 0}, up = {0, 0, -1};
+    QexCamera_Create(&camera, 0);
+    QexCamera_LookAt(&camera, &eye, &target, &up);
+    QexCamera_Project(&camera, 0.8f, float{kWidth} / kHeight, 5, 60);
+    return camera;
+}
+
+// The pixel on which a world point falls.
+glm::ivec2 PixelOf(const QexCamera& camera, glm::vec3 point) {
+    const glm::vec4 clip =
+        glm::make_mat4(camera.projectionMatrix.m) * glm::make_mat4(camera.viewMatrix.m) * glm::vec4(point, 1);
+    return {int((clip.x / clip.w + 1) / 2 * kWidth), int((1 - clip.y / clip.w) / 2 * kHeight)};
+}
+
+class ShadowTest : public RenderTest {
+  protected:
+    void SetUp() override {
+        RenderTest::SetUp();
+        module_ = QexShaders_CreateShaderProgram(QEX_SHADER_GOURAUD_SHADOW);
+        camera_ = Above();
+    }
+    void TearDown() override {
+        QexShaders_ReleaseShaderProgram(module_, QEX_SHADER_GOURAUD_SHADOW);
+        RenderTest::TearDown();
+    }
+    // The floor in white light, its node alone, under the shadow of the nodes listed.
+    Picture Floor(LoadedModel& model, QexVec3 direction, std::vector<int32_t> casters) {
+        const QexShadowCaster request = {&model.model, 0, casters.data(),
+                                         static_cast<uint32_t>(casters.size())};
+        QexLightSet lights = {1, {{1, {direction.x, direction.y, direction.z}, {2, 2, 2, 1}}}};
+        QexModel_UpdateModelBoundingBox(&model.model, nullptr);
+        QexShadowInfo* info = QexModel_InitShadowInfo(&camera_, &direction, &request, 1, 0.25f, 0.01f);
+        drawn_ = info->casters[0].nodeCount;
+        QexModel_RenderShadow(&runtime_, nullptr, info);
+        model.model.bindTextureHook = nullptr;  // which is for the map alone
+        glDisable(GL_SCISSOR_TEST);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+        Clear();
+        model.Material().diffuse[0] = model.Material().diffuse[1] = model.Material().diffuse[2] = 1;
+        model.Material().ambient[0] = model.Material().ambient[1] = model.Material().ambient[2] = 0;
+        model.Node().shader = module_;
+        QexModel_RenderNodeFromViewPerspectiveWithShadow(
+            &model.model, 0, &lights, nullptr, &camera_.viewMatrix, &camera_.projectionMatrix, info);
+        QexModel_ReleaseShadowInfo(info);
+        return Read();
+    }
+    Rgba At(const Picture& picture, glm::vec3 point) const {
+        const glm::ivec2 p = PixelOf(camera_, point);
+        return picture.Pixel(p.x, p.y);
+    }
+
+    QexShaderModule* module_;
+    QexCamera camera_;
+    uint32_t drawn_ = 0;
+};
+
+const Rgba kLit = {255, 255, 255, 255};
+
+// Light straight down, and light that moves a shadow of height 10 by 5 to the east.
+TEST_F(ShadowTest, FallsWhereTheGeometrySays) {
+    const glm::vec3 moves[] = {{6, 0, 3}, {-8, 0, 1}, {5, 0, -9}, {99, 0, 99}};  // of the bones
+    const struct {
+        QexVec3 direction;
+        Square square;
+        glm::vec3 centre;
+    } cases[] = {
+        {{0, -1, 0}, {{0, 10, 0}}, {0, 0, 0}},
+        {{1, -2, 0}, {{0, 10, 0}}, {5, 0, 0}},
+        {{0, -2, 1}, {{-6, 10, -4}}, {-6, 0, 1}},
+        // Above the camera, between the light and the view.
+        {{0, -1, 0}, {{5, 70, 3}}, {5, 0, 3}},
+        // Only the first three bones of a vertex count.
+        {{0, -1, 0},
+         {{1, 10, 2}, false, true},
+         glm::vec3(1, 0, 2) + (100.0f * moves[0] + 60.0f * moves[1] + 80.0f * moves[2]) / 240.0f},
+    };
+    for (const auto& c : cases) {
+        LoadedModel model(FloorAndSquare(c.square));
+        ASSERT_EQ(model.log, "");
+        for (uint32_t i = 0; i < 4; ++i)
+            QexModel_SetNodePosition(&model.model, 2 + i, moves[i].x, moves[i].y, moves[i].z);
+        const Picture picture = Floor(model, c.direction, {0, 1});
+        EXPECT_EQ(drawn_, 2u);
+        const float light =
+            2 * -c.direction.y / glm::length(glm::vec3(c.direction.x, c.direction.y, c.direction.z));
+        const int grey = std::min(255, static_cast<int>(light * 0.25f * 255 + 0.5f));
+        for (const float x : {-3.0f, 0.0f, 3.0f})
+            for (const float z : {-3.0f, 0.0f, 3.0f}) {
+                EXPECT_TRUE(Near(At(picture, c.centre + glm::vec3(x, 0, z)), {grey, grey, grey, 255}, 2))
+                    << x << z;
+                const glm::vec3 outside = c.centre + glm::vec3(x < 0 ? -5 : 5, 0, z);
+                EXPECT_EQ(At(picture, outside), kLit);
+            }
+    }
+}
+
+TEST_F(ShadowTest, WithoutCastersNothingIsDark) {
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
+    const Picture plain = Floor(model, {0, -1, 0}, {0});
+    EXPECT_EQ(At(plain, {0, 0, 0}), kLit) << "a surface does not shade itself";
+    for (const auto& list : std::vector<std::vector<int32_t>>{{}, {7, -1}}) {
+        EXPECT_TRUE(SamePicture(Floor(model, {0, -1, 0}, list), plain));
+        EXPECT_EQ(drawn_, 0u);
+    }
+    // Out of the view to the side, and switched off.
+    LoadedModel aside(FloorAndSquare({{400, 10, 0}}));
+    EXPECT_TRUE(SamePicture(Floor(aside, {0, -1, 0}, {1}), plain));
+    EXPECT_EQ(drawn_, 0u);
+    model.Node(1).stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
+    EXPECT_TRUE(SamePicture(Floor(model, {0, -1, 0}, {0, 1}), plain));
+}
+
+QexTexture* g_halfHole;
+int32_t BindHole(QexModel*, uint32_t) {
+    QexTexture_Set(g_halfHole, 3);
+    return 0;
+}
+
+TEST_F(ShadowTest, TheHookLeavesHoles) {
+    const uint8_t texels[] = {255, 0, 0, 255, 0, 0, 0, 255};
+    ScopedTexture half(2, 1, texels);
+    g_halfHole = &half;
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
+    model.model.bindTextureHook = BindHole;
+    const Picture picture = Floor(model, {0, -1, 0}, {1});
+    EXPECT_EQ(At(picture, {2, 0, 0}), kLit);
+    EXPECT_TRUE(Near(At(picture, {-2, 0, 0}), {128, 128, 128, 255}, 1));
+}
+
+TEST_F(ShadowTest, CallsAndStateOfThePass) {
+    LoadedModel model(FloorAndSquare({{0, 10, 0}}));
+    QexModel_UpdateModelBoundingBox(&model.model, nullptr);
+    const QexShadowCaster all = {&model.model, 1, nullptr, 0};
+    const QexVec3 down = {0, -1, 0};
+    QexShadowInfo* info = QexModel_InitShadowInfo(&camera_, &down, &all, 1, 0.5f, 0);
+    ASSERT_EQ(info->casters[0].nodeCount, 2u);
+    glViewport(3, 4, 5, 6);
+    glDisable(GL_SCISSOR_TEST);
+    const GLCalls calls([&] { QexModel_RenderShadow(&runtime_, nullptr, info); });
+    GLint viewport[4];
+    glGetIntegerv(GL_VIEWPORT, viewport);
+    EXPECT_TRUE(glIsEnabled(GL_SCISSOR_TEST) && viewport[0] == 0 && viewport[2] == kWidth &&
+                viewport[3] == kHeight);
+    // Set-up; per caster a matrix, two binds of a texture, two of buffers, two arrays switched on, pointed,
+    // off, the draw and two unbinds, with the first the unit; then what the pass puts back.
+    EXPECT_EQ(calls.Size() - calls.Of({"glGetError"}).size(), 11u + 15 + 14 + 5);
+    EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 2u);
+    EXPECT_EQ(calls.Of({"glBindFramebuffer"})[1]->argument[1].i, 0) << "the surface is bound again";
+    EXPECT_EQ(GLCalls([&] { QexModel_RenderShadow(&runtime_, nullptr, nullptr); }).Size(), 0u);
+    // A square of the world's floor lies between 0 and 1 of the map, the nearer caster at less depth.
+    const glm::mat4 space = glm::make_mat4(info->shadowSpaceMatrix.m);
+    const glm::vec4 high = space * glm::vec4(0, 10, 0, 1), low = space * glm::vec4(0, 0, 0, 1);
+    EXPECT_TRUE(high.z < low.z && high.z >= -1e-5f && low.z <= 1 + 1e-5f && high.x > 0 && high.x < 1);
+    QexModel_ReleaseShadowInfo(info);
+    QexModel_ReleaseShadowInfo(nullptr);
+    glDisable(GL_SCISSOR_TEST);
+}
+
+// ---- Reflection ----
+
+class ReflectionTest : public RenderTest {
+  protected:
+    // The camera stands low and looks north over the floor.
+    void SetUp() override {
+        RenderTest::SetUp();
+        const QexVec3 eye = {0, 24, 80}, target = {0, 0, 0}, up = {0, 1, 0};
+        QexCamera_Create(&camera_, 0);
+        QexCamera_LookAt(&camera_, &eye, &target, &up);
+        QexCamera_Project(&camera_, 0.8f, float{kWidth} / kHeight, 1, 200);
+    }
+    void Begin() {
+        glClearStencil(0);
+        glClear(GL_STENCIL_BUFFER_BIT);
+        Clear(0, 0, 1, 1);
+        QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    }
+
+    QexCamera camera_;
+};
+
+// The square hangs over the middle of the floor, and so far aside that its image lies partly beside the
+// floor.
+TEST_F(ReflectionTest, ShowsTheMirroredSceneWithinThePlane) {
+    ScopedTexture green({0, 255, 0, 255});
+    const glm::mat4 mirror = glm::scale(glm::mat4(1), {1, -1, 1});
+    const QexMatrix mirrored = ToQex(mirror);
+    int32_t square = 1;
+    for (const bool aside : {false, true}) {
+        LoadedModel model(FloorAndSquare({{aside ? 24.0f : 0, 6, 0}, true}));
+        EXPECT_EQ(model.log, "");
+        model.model.textures[0] = &green;
+        const QexShadowCaster all = {&model.model, 1, nullptr, 0}, listed = {&model.model, 0, &square, 1};
+        const auto drawn = [&](uint32_t node, const QexMatrix* matrix) {
+            Begin();
+            QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+            QexModel_RenderNodeWithViewProjection(&model.model, node, nullptr, matrix, &camera_.viewMatrix,
+                                                  &camera_.projectionMatrix);
+            return Read();
+        };
+        const Picture floor = drawn(0, nullptr), image = drawn(1, &mirrored);
+        Picture within;
+        int inside = 0, outside = 0;
+        for (int i = 0; i < kWidth * kHeight; ++i) {
+            const int x = i % kWidth, y = i / kWidth;
+            const bool onFloor = floor.Pixel(x, y)[1] == 255;
+            within.Fill(x, y, x + 1, y + 1, onFloor ? image.Pixel(x, y) : Rgba{0, 0, 255, 255});
+            if (image.Pixel(x, y)[1] == 255) ++(onFloor ? inside : outside);
+        }
+        EXPECT_GT(inside, 20);
+        EXPECT_EQ(outside > 20, aside);
+        // The plane itself stays unseen here, so that the picture is that of the mirrored square alone.
+        model.Node(0).shader = nullptr;
+        for (const bool stencil : {false, true}) {
+            QexReflection* reflection =
+                QexReflection_InitReflectionInfo(&model.model, 0, aside ? &listed : &all, 1, stencil);
+            ASSERT_TRUE(reflection);
+            EXPECT_TRUE(SameMatrix(reflection->reflectionMatrix.m, mirror));
+            Begin();
+            QexReflection_RenderReflection(reflection, nullptr, &camera_);
+            EXPECT_TRUE(SamePicture(Read(), stencil ? within : image)) << aside;
+            EXPECT_FALSE(model.Node(0).stateFlags & QEX_NODE_RENDERING_ENABLED);
+            EXPECT_FALSE(glIsEnabled(GL_STENCIL_TEST));
+            QexReflection_Release(reflection);
+        }
+        const QexVec3 up = {0, 1, 0}, origin = {0, 0, 0};
+        QexReflection* endless = QexReflection_InitReflectionInfoInfinite(nullptr, &up, &origin, &listed, 1);
+        EXPECT_TRUE(SameMatrix(endless->reflectionMatrix.m, mirror));
+        Begin();
+        QexReflection_RenderReflection(endless, nullptr, &camera_);
+        EXPECT_TRUE(SamePicture(Read(), image)) << "there is no plane node";
+        QexReflection_Release(endless);
+    }
+    QexReflection_Release(nullptr);
+}
+
+}  // namespace

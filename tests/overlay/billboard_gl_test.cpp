@@ -1,0 +1,144 @@
+#include <GLES2/gl2.h>
+
+#include <cmath>
+
+#include "support/RenderFixture.h"
+#include "support/RenderScenes.h"
+
+namespace {
+
+const double kPi = 3.141592653589793;
+
+// One unit is one pixel, the origin in the middle of the surface.
+QexCamera PixelCamera() {
+    QexCamera camera;
+    QexCamera_Create(&camera, 0);
+    camera.viewMatrix = ToQex(glm::translate(glm::mat4(1), {kWidth / 2, kHeight / 2, 0}));
+    camera.projectionMatrix = PixelProjection();
+    return camera;
+}
+
+glm::dmat4 Turn(double degrees, glm::dvec3 axis) {
+    return glm::rotate(glm::dmat4(1), degrees * kPi / 180, axis);
+}
+
+// The model-view matrix as the modes are described, with arc tangents in place of arc cosines.
+glm::dmat4 ModelView(const QexBillboard& b, const glm::dvec3& eye, const glm::dmat4& view) {
+    const glm::dvec3 x(1, 0, 0), y(0, 1, 0), z(0, 0, 1), at(b.position.x, b.position.y, b.position.z);
+    const glm::dvec3 d = eye - at;
+    const glm::dvec2 size(b.width * b.scale.x, b.height * b.scale.y);
+    // 3.14 for pi: angles come out a little too large.
+    const double yaw = std::atan2(d.x, d.z) * 180 / 3.14;
+    const double pitch = std::atan2(d.y, std::hypot(d.x, d.z)) * 180 / 3.14;
+    glm::dmat4 rotation = Turn(b.rotation.z, z) * Turn(b.rotation.y, y) * Turn(b.rotation.x, x);
+    if (b.mode == 3 || b.mode == 4) rotation = Turn(yaw, y) * Turn(b.rotation.z, z);
+    if (b.mode == 3) rotation = Turn(pitch, x) * rotation;
+    glm::dmat4 m =
+        view * glm::translate(glm::dmat4(1), at) * rotation * glm::scale(glm::dmat4(1), glm::dvec3(size, 1));
+    if (b.mode == 1) m[1] = {0, size.y, 0, m[1].w};
+    if (b.mode == 1 || b.mode == 2) {
+        m[0] = {size.x, 0, 0, m[0].w};
+        m[2] = {0, 0, 1, m[2].w};
+    }
+    return m;
+}
+
+class BillboardTest : public RenderTest {};
+
+TEST_F(BillboardTest, ModesTurnAsDescribed) {
+    ScopedTexture texture({255, 255, 255, 255});
+    QexBillboard* billboard = QexBillboard_Create(&texture);
+    *billboard = {&texture, 64, 32, 1, {0.5f, 2, 7}, {20, -50, 70}, {3, -4, 5}, 1, 1};
+    // About the billboard: in front, to the sides, behind, above and below.
+    const QexVec3 offsets[] = {
+        {0, 0, 9},   {0, 10, 10}, {8, 0, 0},  {-8, 0, 0}, {5, -6, 7}, {5, 6, 7},
+        {-5, 6, -7}, {-1, -9, 2}, {3, 1, -8}, {0, 9, 0},  {0, -9, 0}};  // from above and below there is no
+                                                                        // yaw
+    for (const QexVec3& offset : offsets) {
+        QexCamera camera;
+        QexCamera_Create(&camera, 0);
+        QexVec3 eye;
+        QexVec3_Add(&eye, &offset, &billboard->position);
+        const QexVec3 target = {1, 2, 0.5f};
+        QexCamera_LookAt(&camera, &eye, &target, nullptr);
+        QexCamera_Project(&camera, 1, 1.5f, 1, 50);
+        // A view with perspective of its own: its bottom row stays.
+        camera.viewMatrix.m[3] = 0.25f;
+        for (const float bottom : {0.25f, 0.0f}) {
+            camera.viewMatrix.m[3] = bottom;
+            const glm::dmat4 view = glm::make_mat4(camera.viewMatrix.m),
+                             projection = glm::make_mat4(camera.projectionMatrix.m);
+            for (const int32_t mode : {1, 2, 3, 4, 0, 5}) {
+                billboard->mode = mode;
+                const GLCalls calls([&] { QexBillboard_Draw(billboard, &camera); });
+                const glm::dmat4 expected = projection * ModelView(*billboard, {eye.x, eye.y, eye.z}, view);
+                EXPECT_TRUE(SameMatrix(calls.Of({"glUniformMatrix4fv"}).at(0)->data, glm::mat4(expected)))
+                    << "mode " << mode << ", eye at " << offset.x << ", " << offset.y << ", " << offset.z;
+            }
+        }
+    }
+    QexBillboard_Release(billboard);
+}
+
+TEST_F(BillboardTest, CoversItsTexels) {
+    const Rgba texels[] = {{255, 0, 0, 255}, {0, 255, 0, 200}, {0, 0, 255, 100}, {255, 255, 0, 0}};
+    uint8_t bytes[16];
+    for (size_t i = 0; i < 16; ++i) bytes[i] = static_cast<uint8_t>(texels[i / 4][i % 4]);
+    ScopedTexture texture(2, 2, bytes);
+    const QexCamera camera = PixelCamera();
+    QexBillboard* billboard = QexBillboard_Create(&texture);
+    billboard->scale = {32, 16, 1};
+    billboard->rotation = {30, 40, 50};
+    billboard->position = {-4, 8, 2};
+    billboard->opacity = 0.5f;
+    Clear(0.2f, 0.4f, 0.6f, 1);
+    QexBillboard_Draw(billboard, &camera);
+    Picture expected;
+    expected.Fill(0, 0, kWidth, kHeight, {51, 102, 153, 255});
+    for (int i = 0; i < 4; ++i) {
+        // The first row of texels is the lower one.
+        Rgba colour = texels[i];
+        colour[3] /= 2;
+        const int left = 60 - 32 + i % 2 * 32, top = 40 - i / 2 * 16;
+        expected.Fill(left, top, left + 32, top + 16, colour);
+    }
+    EXPECT_TRUE(SamePicture(Read(), expected, 1));
+    QexBillboard_Release(billboard);
+}
+
+TEST_F(BillboardTest, LifeAndStateLeftBehind) {
+    const std::string before = LiveObjects();
+    const QexCamera camera = PixelCamera();
+    QexBillboard_Release(nullptr);
+    QexBillboard_SetTexture(nullptr, nullptr);
+    QexBillboard_Draw(nullptr, &camera);
+    for (int round = 0; round < 2; ++round) {
+        QexBillboard* first = QexBillboard_Create(nullptr);
+        QexBillboard* second = QexBillboard_Create(nullptr);
+        ASSERT_TRUE(first && second);
+        EXPECT_EQ(g_BillboardCount, 2);
+        EXPECT_EQ(g_VecUp.y, 1);
+        EXPECT_EQ(g_VecNormal.z, 1);
+        // Without a texture it shows the default one.
+        EXPECT_EQ(first->texture, Qextexture_GetDefault());
+        EXPECT_EQ(first->width, 64);
+        QexBillboard_Draw(first, nullptr);
+        QexBillboard_Draw(first, &camera);
+        const std::string program = std::to_string(g_BillboardShaderProgramID);
+        QexRenderState_UseProgram(0);
+        QexRenderState_ActiveTexture(GL_TEXTURE2);
+        QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
+        EXPECT_EQ(StateChange([&] { QexBillboard_Draw(second, &camera); }),
+                  "program: 0 -> " + program + "\nactiveUnit: 2 -> 0\ncullFace: 0 -> 1\n");
+        const GLCalls calls([&] {
+            QexBillboard_Release(first);
+            EXPECT_EQ(g_BillboardShaderProgramID, std::stoul(program));
+            QexBillboard_Release(second);
+        });
+        EXPECT_EQ(calls.Text({"glDeleteProgram"}), "glDeleteProgram(" + program + ")\n");
+        EXPECT_EQ(g_BillboardShaderProgramID, 0u);
+        EXPECT_EQ(LiveObjects(), before);
+    }
+}
+
+}  // namespace

@@ -1,0 +1,154 @@
+// Textures on the screen, and pictures drawn into textures.
+#include <GLES2/gl2.h>
+
+#include "support/RenderScenes.h"
+#include "support/Capture.h"
+
+namespace {
+
+class QuadTest : public RenderTest {};
+
+// What a call has sent: x, y and texture coordinates of the four vertices, from the arrays.
+struct SentQuad {
+    const float* positions;
+    const float* texCoords;
+};
+
+SentQuad Sent(const GLCalls& calls) {
+    const auto pointers = calls.Of({"glVertexAttribPointer"});
+    EXPECT_EQ(pointers.size(), 3u);
+    return {static_cast<const float*>(pointers[0]->argument[5].p),
+            static_cast<const float*>(pointers[2]->argument[5].p)};
+}
+
+void ExpectQuad(const GLCalls& calls, std::array<float, 4> box, std::array<float, 4> uv) {
+    const SentQuad sent = Sent(calls);
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_FLOAT_EQ(sent.positions[3 * i], box[i & 1 ? 1 : 0]);
+        EXPECT_FLOAT_EQ(sent.positions[3 * i + 1], box[i > 1 ? 3 : 2]);
+        EXPECT_FLOAT_EQ(sent.texCoords[2 * i], uv[i & 1 ? 1 : 0]);
+        EXPECT_FLOAT_EQ(sent.texCoords[2 * i + 1], uv[i > 1 ? 3 : 2]);
+    }
+    EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 1u);
+    EXPECT_EQ(calls.Of({"glEnable", "glDisable", "glDepthFunc", "glBlendFunc"}).size(), 0u);
+}
+
+// A surface 480 high; left, right, upper and lower edge, then s and t of them.
+TEST_F(QuadTest, VerticesOfTextureRectangleAndNothing) {
+    QexRuntimeContext screen = {};
+    screen.width = 640;
+    screen.height = 480;
+    std::vector<uint8_t> pixels(128 * 64 * 4, 255);
+    ScopedTexture texture(128, 64, pixels.data());
+    const QexRect part = {0, 0, 31, 15};
+    for (const bool two : {false, true}) {
+        const auto draw = [&](QexTexture* t, const QexRect* rectangle, float sx, float sy) {
+            return GLCalls([&, rectangle, sx, sy] {
+                const int32_t result =
+                    two ? QexTexture_Draw2(&screen, t, nullptr, 10, 20, rectangle, sx, sy, 0xFFFFFFFF)
+                        : QexTexture_Draw(&screen, t, 10, 20, rectangle, sx, sy, 0xFFFFFFFF);
+                EXPECT_EQ(result, 0);
+            });
+        };
+        ExpectQuad(draw(&texture, nullptr, 1, 1), {10, 139, 460, 395}, {0, 1, 1, 0});
+        ExpectQuad(draw(&texture, &part, 1, 1), {10, 42, 460, 444}, {0, 31.0f / 128, 1, 49.0f / 64});
+        ExpectQuad(draw(&texture, &part, 2, 3), {10, 74, 460, 412}, {0, 31.0f / 128, 1, 49.0f / 64});
+        ExpectQuad(draw(nullptr, nullptr, 64, 64), {10, 75, 460, 395}, {0, 1, 1, 0});
+        ExpectQuad(draw(nullptr, &part, 64, 64), {10, 75, 460, 395}, {0, 1, 1, 0});
+    }
+}
+
+// Rows of a texture's data count from below, so the last row is the upper one.
+TEST_F(QuadTest, ColourAndAlphaOfThePixels) {
+    const uint8_t rows[] = {255, 0, 0, 255, 255, 0, 0, 255, 0, 255, 0, 255, 0, 255, 0, 255};
+    ScopedTexture texture(2, 2, rows), half({128, 0, 0, 255});
+    QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
+    Clear(0, 0, 1, 1);
+    QexTexture_Draw(&runtime_, &texture, 20, 10, nullptr, 10, 10, 0xFFFFFFFF);
+    QexTexture_Draw2(&runtime_, &texture, &half, 60, 10, nullptr, 10, 10, 0x80FF80FF);
+    QexTexture_Draw(&runtime_, nullptr, 100, 10, nullptr, 8, 8, 0xFF102030);
+    const Picture picture = Read();
+    EXPECT_EQ(picture.Pixel(30, 12), (Rgba{0, 255, 0, 255}));
+    EXPECT_EQ(picture.Pixel(30, 38), (Rgba{255, 0, 0, 255}));
+    EXPECT_EQ(picture.Pixel(30, 41), (Rgba{0, 0, 255, 255})) << "below";
+    EXPECT_EQ(picture.Pixel(19, 20), (Rgba{0, 0, 255, 255})) << "beside";
+    // Half alpha of half: a quarter of the texel in the colour, over blue.
+    EXPECT_TRUE(Near(picture.Pixel(75, 12), {0, 32, 191, 207}, 2));
+    EXPECT_EQ(picture.Pixel(104, 14), (Rgba{0x10, 0x20, 0x30, 255}));
+}
+
+TEST_F(QuadTest, TheFontIsMadeWhenItIsMissing) {
+    QexFont_Release();
+    ScopedTexture texture({1, 2, 3, 255});
+    Capture log(STDERR_FILENO);
+    EXPECT_EQ(QexTexture_Draw2(&runtime_, &texture, nullptr, 0, 0, nullptr, 8, 8, 0xFFFFFFFF), 0);
+    EXPECT_EQ(QexTexture_Draw(&runtime_, &texture, 0, 0, nullptr, 8, 8, 0xFFFFFFFF), 0);
+    const std::string text = log.Text();
+    EXPECT_NE(text.find("<QexTexture_Draw2> Call texture draw before font created!"), std::string::npos);
+    EXPECT_EQ(text.find("<QexTexture_Draw> Call"), std::string::npos) << "it is there by then";
+    EXPECT_EQ(Read().Pixel(3, 3), (Rgba{1, 2, 3, 255}));
+}
+
+TEST_F(QuadTest, TargetsNestAndComeBack) {
+    const std::string before = LiveObjects();
+    QexRenderTarget outer, inner;
+    QexTexture_Set(nullptr, 0);
+    glScissor(0, 0, kWidth, kHeight);
+    EXPECT_EQ(StateChange([&] {
+                  QexRenderTarget_Create(&outer, 64, 32, 0);
+                  QexTexture_Set(nullptr, 0);
+                  glBindRenderbuffer(GL_RENDERBUFFER, 0);
+              }),
+              "");
+    glBindFramebuffer(GL_FRAMEBUFFER, outer.framebuffer);
+    QexRenderTarget_Create(&inner, 16, 16, 0);
+    GLint bound;
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
+    EXPECT_EQ(static_cast<uint32_t>(bound), outer.framebuffer) << "creating leaves it bound";
+    EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum(GL_FRAMEBUFFER_COMPLETE));
+    glBindFramebuffer(GL_FRAMEBUFFER, 0);
+    EXPECT_EQ(inner.colorTexture.format, uint32_t{GL_RGBA});
+    EXPECT_EQ(inner.colorTexture.flags, 1u);
+
+    glDisable(GL_SCISSOR_TEST);
+    glViewport(3, 4, 50, 60);
+    EXPECT_EQ(StateChange([&] {
+                  QexRenderTarget_BeginScene(&outer);
+                  Clear(1, 0, 0, 1);
+                  QexRenderTarget_BeginScene(&inner);
+                  Clear(0, 1, 0, 1);
+                  QexRenderTarget_EndScene(&inner);
+                  // The upper half of the outer one.
+                  glEnable(GL_SCISSOR_TEST);
+                  glScissor(0, 16, 64, 16);
+                  Clear(0, 0, 1, 1);
+                  glDisable(GL_SCISSOR_TEST);
+                  glScissor(0, 0, kWidth, kHeight);
+                  QexRenderTarget_EndScene(&outer);
+                  Clear();
+              }),
+              "");
+    glViewport(0, 0, kWidth, kHeight);
+    QexTexture_Draw(&runtime_, &outer.colorTexture, 10, 10, nullptr, 1, 1, 0xFFFFFFFF);
+    QexTexture_Draw(&runtime_, &inner.colorTexture, 100, 10, nullptr, 1, 1, 0xFFFFFFFF);
+    const Picture picture = Read();
+    EXPECT_EQ(picture.Pixel(20, 14), (Rgba{0, 0, 255, 255})) << "the upper half is above";
+    EXPECT_EQ(picture.Pixel(20, 38), (Rgba{255, 0, 0, 255}));
+    EXPECT_EQ(picture.Pixel(108, 18), (Rgba{0, 255, 0, 255}));
+
+    QexRenderTarget_SetRenderTarget(&runtime_, &inner);
+    gltapState state;
+    gltapGetState(&state);
+    EXPECT_TRUE(state.framebuffer == inner.framebuffer && state.viewport[2] == 16);
+    QexRenderTarget_SetRenderTarget(&runtime_, nullptr);
+    gltapGetState(&state);
+    EXPECT_TRUE(state.framebuffer == 0 && state.viewport[2] == kWidth && state.viewport[3] == kHeight);
+    EXPECT_EQ(QexRenderTarget_CreateFromTexture(nullptr, nullptr), 0);
+    for (int twice = 0; twice < 2; ++twice)
+        for (QexRenderTarget* target : {&outer, &inner, static_cast<QexRenderTarget*>(nullptr)})
+            QexRenderTarget_Release(target);
+    EXPECT_EQ(LiveObjects(), before);
+}
+
+}  // namespace

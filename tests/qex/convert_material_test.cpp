@@ -1,0 +1,230 @@
+#include <cmath>
+#include <csignal>
+#include <new>
+
+#include "convert/Process.h"
+#include "qex/ConvertSupport.h"
+
+namespace {
+
+using Colour = std::array<float, 4>;
+
+class ConvertMaterial : public ConvertTest {
+  protected:
+    // Two triangles that make a square, corner by corner in the colours given, in linear light.
+    QexPODModel& ConvertSquare(const std::string& material, const std::vector<Colour>& colours = {}) {
+        std::vector<float> data = {0, 0, 0, 1, 0, 0, 1, 1, 0, 0, 0, 0, 1, 1, 0, 0, 1, 0};
+        for (const Colour& c : colours) data.insert(data.end(), c.begin(), c.end());
+        Bytes bin(data.size() * 4);
+        std::memcpy(bin.data(), data.data(), bin.size());
+        WriteBytes(Path("s.bin"), bin);
+        const std::string bytes = std::to_string(bin.size());
+        WriteText(Path("s.gltf"),
+                  R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0]}],"nodes":[{"mesh":0}],
+ "meshes":[{"primitives":[{"material":0,"attributes":{"POSITION":0)" +
+                      std::string(colours.empty() ? "" : ",\"COLOR_0\":1") +
+                      R"(}}]}],"materials":[{"name":"m",)" + material + R"(}],
+ "images":[{"uri":"pic.tga"}],"textures":[{"source":0}],
+ "accessors":[{"bufferView":0,"componentType":5126,"count":6,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
+  {"bufferView":0,"byteOffset":)" +
+                      (colours.empty() ? "0" : "72") + R"(,"componentType":5126,"count":)" +
+                      (colours.empty() ? "4" : "6") +
+                      R"(,"type":"VEC4"}],
+ "bufferViews":[{"buffer":0,"byteLength":)" +
+                      bytes + R"(}],"buffers":[{"uri":"s.bin","byteLength":)" + bytes + "}]}");
+        return Convert(Path("s.gltf"));
+    }
+    // Red, green and blue of a texture without mipmaps, filtered.
+    std::array<int, 3> Sample(const std::string& name, float u, float v) const {
+        const Bytes file = ReadBytes(Path(name));
+        uint32_t height, width;
+        std::memcpy(&height, &file.at(4), 4);
+        std::memcpy(&width, &file.at(8), 4);
+        EXPECT_EQ(file.size(), 52 + 3u * width * height) << name;
+        const float x = u * float(width) - 0.5f, y = v * float(height) - 0.5f;
+        const float left = std::floor(x), low = std::floor(y);
+        std::array<int, 3> mixed;
+        for (size_t c = 0; c < 3; ++c) {
+            const auto texel = [&](float dx, float dy) {
+                const size_t column = size_t(left + dx) % width, row = size_t(low + dy) % height;
+                return float(file.at(52 + 3 * (row * width + column) + c));
+            };
+            const float lower = texel(0, 0) + (texel(1, 0) - texel(0, 0)) * (x - left);
+            const float upper = texel(0, 1) + (texel(1, 1) - texel(0, 1)) * (x - left);
+            mixed[c] = int(std::lround(lower + (upper - lower) * (y - low)));
+        }
+        return mixed;
+    }
+    static void ExpectNear(const float* actual, const std::array<float, 3>& expected) {
+        for (size_t i = 0; i < 3; ++i) EXPECT_NEAR(actual[i], expected[i], 1e-3f) << i;
+    }
+};
+
+// Linear 0.5 is 0.7354 as monitors have it, 0.25 is 0.5371, 0.002 is 0.0258.
+TEST_F(ConvertMaterial, LinearColoursAreEncoded) {
+    const auto pbr = [](const char* factor) {
+        return std::string(R"("pbrMetallicRoughness":{"baseColorFactor":)") + factor + "}";
+    };
+    const QexPODMaterial* m = &ConvertSquare(pbr("[0.5,0.25,0.002,0.75]")).materials[0];
+    ExpectNear(m->diffuse, {0.7354f, 0.5371f, 0.0258f});
+    EXPECT_FLOAT_EQ(m->opacity, 0.75f);
+    EXPECT_EQ(m->diffuseTexture, -1);
+    EXPECT_EQ(said_, "");
+    ConvertSquare(pbr("[1,1,1,0.5]"));
+    EXPECT_TRUE(Contains(said_, "1 material of an opacity up to 0.5: not drawn")) << said_;
+    // Glow in one colour: a texel of all the light there can be, and shares of it.
+    m = &ConvertSquare(pbr("[0.25,0,0.25,1]") + R"(,"emissiveFactor":[0.25,0.5,0])").materials[0];
+    ASSERT_EQ(m->diffuseTexture, 0);
+    EXPECT_EQ(Sample("m.pvr", 0.5f, 0.5f), (std::array<int, 3>{255, 188, 137}));
+    ExpectNear(m->diffuse, {0.5371f, 0, 1});
+    ExpectNear(m->ambient, {1.2f * 0.5371f, 1, 0.2f});
+    EXPECT_EQ(said_, "");
+    // With a texture of its own the colour goes into the ambient one.
+    WriteTga("pic.tga", 1, 1, {{9, 9, 9, 255}});
+    const std::string textured = R"("pbrMetallicRoughness":{"baseColorTexture":{"index":0}})";
+    m = &ConvertSquare(textured + R"(,"emissiveFactor":[0.5,0,0])").materials[0];
+    ExpectNear(m->ambient, {0.9354f, 0.2f, 0.2f});
+    // A texture that glows is drawn where there is no other.
+    const std::string glowing = R"("emissiveFactor":[1,1,1],"emissiveTexture":{"index":0})";
+    m = &ConvertSquare(pbr("[0,0,0,1]") + "," + glowing).materials[0];
+    EXPECT_EQ(m->diffuseTexture, 0);
+    ExpectNear(m->ambient, {1, 1, 1});
+    EXPECT_EQ(said_, "");
+    ConvertSquare(pbr("[1,0,0,1]") + "," + glowing);
+    EXPECT_TRUE(Contains(said_, "the emissive texture of material m is not drawn")) << said_;
+}
+
+TEST_F(ConvertMaterial, VerticesKeepTheirColoursInATexture) {
+    // In linear light; of 255: 100, 120 and 140 on the first triangle, blue on the second.
+    const float a = 0.12744f, b = 0.18782f, c = 0.26225f;
+    const std::vector<Colour> colours = {{a, b, 1, 1}, {b, b, 1, 1}, {c, a, 1, 1},
+                                         {0, 0, 1, 1}, {0, 0, 1, 1}, {0, 0, 1, 1}};
+    for (const int blue : {255, 128}) {
+        const std::string factor = blue == 255 ? "[1,1,1,1]" : "[1,1,0.2159,1]";
+        const QexPODModel& s =
+            ConvertSquare(R"("pbrMetallicRoughness":{"baseColorFactor":)" + factor + "}", colours);
+        EXPECT_EQ(said_, "");
+        EXPECT_STREQ(s.textures[0].name, "colours.pvr");
+        ExpectNear(s.materials[0].diffuse, {1, 1, 1});
+        const QexPODMesh& mesh = s.meshes[0];
+        EXPECT_EQ(mesh.colours.componentCount, 0u);
+        for (uint32_t triangle = 0; triangle < 6; triangle += 3) {
+            QexVec4 middle = {};
+            bool first = false;
+            for (uint32_t i = triangle; i < triangle + 3; ++i) {
+                const uint32_t vertex = VertexOfCorner(mesh, i);
+                const QexVec4 at = VertexValue(mesh, mesh.vertices, vertex),
+                              uv = VertexValue(mesh, mesh.uvws[0], vertex);
+                middle.x += uv.x / 3;
+                middle.y += uv.y / 3;
+                first |= at.x > at.y;
+                if (at.x > at.y) {
+                    EXPECT_EQ(Sample("colours.pvr", uv.x, uv.y), (std::array<int, 3>{120, 120, blue}));
+                }
+                if (at.x < at.y) {
+                    EXPECT_EQ(Sample("colours.pvr", uv.x, uv.y), (std::array<int, 3>{0, 0, blue}));
+                }
+            }
+            const std::array<int, 3> mean = {120, 113, blue}, plain = {0, 0, blue};
+            EXPECT_EQ(Sample("colours.pvr", middle.x, middle.y), first ? mean : plain);
+        }
+    }
+    WriteTga("pic.tga", 1, 1, {{9, 9, 9, 255}});
+    ConvertSquare(R"("pbrMetallicRoughness":{"baseColorTexture":{"index":0}})", colours);
+    EXPECT_TRUE(Contains(said_, "vertex colours of 1 mesh part with textures are not drawn")) << said_;
+    // Where colours are not linear they are kept, and stand in the place of the material's, unless all are
+    // black.
+    for (const std::string colour : {" 1 0.5 0\n", " 0 0 0\n"}) {
+        WriteText(Path("c.obj"), "v 0 0 0" + colour + "v 1 0 0" + colour + "v 0 1 0" + colour + "f 1 2 3\n");
+        EXPECT_EQ(Convert(Path("c.obj")).textureCount, colour[1] == '1' ? 1u : 0u);
+    }
+    EXPECT_EQ(Sample("colours.pvr", 0.5f, 0.5f), (std::array<int, 3>{255, 128, 0}));
+}
+
+TEST_F(ConvertMaterial, TexturesOfOnesChoice) {
+    WriteText(Path("q.obj"), "mtllib m.mtl\nusemtl m\nv 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    WriteText(Path("m.mtl"), "newmtl m\nmap_Kd gone.tga\n");
+    WriteTga("mine.tga", 1, 1, {{10, 20, 30, 255}});
+    ConvertOptions options = Options(Path("q.obj"));
+    options.textures = {"m=" + Path("mine.tga")};
+    EXPECT_EQ(Run(options), 0);
+    EXPECT_EQ(said_, "");
+    EXPECT_STREQ(Read().textures[0].name, "mine.pvr");
+    EXPECT_EQ(PvrBytes("mine.pvr", 0, 3), (Bytes{10, 20, 30}));
+    options.textures = {"x=" + Path("mine.tga")};
+    EXPECT_EQ(Run(options), 2);
+    EXPECT_TRUE(Contains(said_, "no material 'x'; the scene has ") && Contains(said_, "m\n")) << said_;
+}
+
+TEST(RunInProcess, TellsHowTheImporterEnded) {
+    const struct {
+        int (*work)();
+        int status;
+        const char* says;
+    } rows[] = {
+        {[] { return fprintf(stderr, "qex convert: f: bad\nnoise\n") ? 1 : 0; }, 1, "f: bad\n"},
+        {[] { return fprintf(stderr, "noise\nqex convert: f: warning: x\n") ? 0 : 1; }, 0, "f: warning: x\n"},
+        {[]() -> int {
+             fprintf(stderr, "heap is corrupt\n");
+             abort();
+         },
+         1, "f: cannot be converted: the importer crashed, Aborted (heap is corrupt)\n"},
+        {[] { return raise(SIGSEGV); }, 1,
+         "f: cannot be converted: the importer crashed, Segmentation fault\n"},
+        {[]() -> int {
+             fprintf(stderr, "qex convert: f: warning: x\n");
+             _exit(3);
+         },
+         1,
+         "f: warning: x\nqex convert: f: cannot be converted: the importer ended the process with status "
+         "3\n"},
+        {[]() noexcept -> int {
+             static void* volatile block = ::operator new(SIZE_MAX / 2);
+             return block ? 0 : 1;
+         },
+         1, "f: needs more than 100 MB of memory; --memory"},
+    };
+    for (const auto& row : rows) {
+        testing::internal::CaptureStderr();
+        EXPECT_EQ(RunInProcess("f", 100, row.work), row.status) << row.says;
+        const std::string said = testing::internal::GetCapturedStderr();
+#ifndef __SANITIZE_ADDRESS__  // whose reports are passed on
+        EXPECT_EQ(said.rfind(std::string("qex convert: ") + row.says, 0), 0u) << said;
+        EXPECT_EQ(CountLines(said), 1 + Contains(row.says, "x\nqex")) << said;
+#endif
+    }
+}
+
+TEST_F(ConvertTest, MemoryIsLimited) {
+#ifdef __SANITIZE_ADDRESS__
+    GTEST_SKIP() << "the sanitizer takes more memory than a limit could allow";
+#endif
+    std::string obj;
+    for (int i = 0; i < 2000000; ++i) obj += "v 0 1 0\n";
+    WriteText(Path("big.obj"), obj + "v 1 0 0\nv 0 0 1\nf -1 -2 -3\n");
+    ConvertOptions options = Options(Path("big.obj"));
+    options.memory = 64;
+    EXPECT_EQ(Run(options), 1);
+    EXPECT_TRUE(Contains(said_, "big.obj: needs more than 64 MB of memory; --memory allows more")) << said_;
+    EXPECT_EQ(CountLines(said_), 1) << said_;
+    options.memory = 4096;
+    EXPECT_EQ(Run(options), 0) << said_;
+}
+
+TEST_F(ConvertTest, MotionWithoutAMeshIsAWarning) {
+    WriteText(Path("m.bvh"),
+              "HIERARCHY\nROOT a\n{\nOFFSET 0 0 0\nCHANNELS 0\nEnd Site\n{\nOFFSET 0 1 0\n}\n}\n"
+              "MOTION\nFrames: 1\nFrame Time: 0.1\n\n");
+    Convert(Path("m.bvh"));
+    EXPECT_TRUE(Contains(said_, "the file has no meshes; pointed bodies")) << said_;
+}
+
+TEST_F(ConvertTest, SaysThatThereAreNoClips) {
+    WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    ConvertOptions options = Options(Path("q.obj"));
+    options.listClips = true;
+    EXPECT_EQ(Run(options), 0);
+    EXPECT_EQ(said_, "qex convert: " + Path("q.obj") + ": has no animations\n");
+}
+
+}  // namespace

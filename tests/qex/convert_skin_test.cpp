@@ -1,0 +1,500 @@
+#include <assimp/postprocess.h>
+#include <assimp/scene.h>
+#include <Qex.h>
+
+#include <algorithm>
+#include <assimp/Importer.hpp>
+#include <cmath>
+#include <limits>
+#include <map>
+#include <random>
+#include <set>
+
+#include "convert/Meshes.h"
+#include "convert/Scene.h"
+#include "qex/ConvertSupport.h"
+
+namespace {
+
+// ---- Batches ----
+
+VertexBones Follow(std::vector<uint32_t> bones) {
+    VertexBones vertex;
+    for (size_t i = 0; i < bones.size(); ++i) {
+        vertex.bones[i] = bones[i];
+        vertex.weights[i] = uint8_t(i ? 10 : 255 - 10 * (bones.size() - 1));
+    }
+    return vertex;
+}
+
+using Triangle = std::array<uint32_t, 3>;
+
+// That every triangle of the input comes out once, in a batch that has its bones; returns the number of
+// batches.
+size_t ExpectSameTriangles(const std::vector<VertexBones>& vertices, const std::vector<uint32_t>& indices,
+                           int maxBones, uint32_t maxVertices) {
+    std::multiset<Triangle> in, out;
+    for (size_t i = 0; i < indices.size(); i += 3) in.insert({indices[i], indices[i + 1], indices[i + 2]});
+    size_t batches = 0;
+    for (const SkinPiece& piece : BatchSkin(vertices, indices, maxBones, maxVertices)) {
+        EXPECT_LE(piece.sources.size(), maxVertices);
+        EXPECT_EQ(piece.batchOffsets.at(0), 0);
+        batches += piece.batchBones.size();
+        std::set<std::pair<uint32_t, std::array<uint8_t, 4>>> different;
+        for (size_t v = 0; v < piece.sources.size(); ++v)
+            EXPECT_TRUE(different.insert({piece.sources[v], piece.boneIndices.at(v)}).second);
+        size_t next = 0;  // the batch behind that of the triangle
+        Triangle triangle;
+        for (size_t i = 0; i < piece.indices.size(); ++i) {
+            if (next < piece.batchBones.size() && i == 3 * size_t(piece.batchOffsets[next])) ++next;
+            const std::vector<int32_t>& bones = piece.batchBones.at(next - 1);
+            EXPECT_LE(bones.size(), size_t(maxBones));
+            const uint32_t vertex = piece.indices[i];
+            const VertexBones& source = vertices[triangle[i % 3] = piece.sources.at(vertex)];
+            for (size_t k = 0; k < 4; ++k) {
+                const uint8_t local = piece.boneIndices[vertex][k];
+                if (source.weights[k])
+                    EXPECT_EQ(uint32_t(bones.at(local)), source.bones[k]);
+                else
+                    EXPECT_EQ(local, 0);
+            }
+            if (i % 3 == 2) out.insert(triangle);
+        }
+        EXPECT_EQ(next, piece.batchBones.size()) << "a batch without triangles";
+    }
+    EXPECT_EQ(in, out);
+    return batches;
+}
+
+TEST(BatchSkin, JoinsBatchesAsFarAsTheirBonesFit) {
+    // Three pairs of bones, a vertex in common. With three bones a batch one will do.
+    const std::vector<VertexBones> fan = {
+        Follow({7}), Follow({7, 900}), Follow({900, 8}), Follow({8, 7}), {}};
+    const std::vector<uint32_t> indices = {0, 1, 1, 2, 2, 2, 3, 0, 3};
+    EXPECT_EQ(ExpectSameTriangles(fan, indices, 3, 100), 1u);
+    EXPECT_EQ(BatchSkin(fan, indices, 3, 100)[0].sources.size(), 4u);
+    EXPECT_EQ(ExpectSameTriangles(fan, indices, 2, 100), 3u);
+    EXPECT_EQ(MostBonesOfATriangle(fan, indices), 2);
+    EXPECT_EQ(MostBonesOfATriangle(fan, {0, 1, 2}), 3);
+}
+
+TEST(BatchSkin, LosesNoTriangleOfALargeMesh) {
+    // More different sets of bones than the engine's list of 512 batches holds, and pieces of 50 vertices.
+    std::mt19937 random(3);
+    std::vector<VertexBones> vertices;
+    std::vector<uint32_t> indices;
+    for (int i = 0; i < 3000; ++i) {
+        const uint32_t bone = random() % 100;
+        vertices.push_back(
+            Follow({bone, bone + 1 + uint32_t(random()) % 3, bone + 4 + uint32_t(random()) % 30}));
+    }
+    for (int i = 0; i < 6000; ++i) indices.push_back(uint32_t(random() % 3000));
+    ASSERT_LE(MostBonesOfATriangle(vertices, indices), 12);
+    const size_t whole = ExpectSameTriangles(vertices, indices, 16, 65535);
+    EXPECT_GT(ExpectSameTriangles(vertices, indices, 16, 50), whole);
+    EXPECT_GT(ExpectSameTriangles(vertices, indices, 12, 65535), whole);
+}
+
+// ---- Skinning ----
+
+aiMatrix4x4 LocalAt(const aiNode& node, const aiAnimation* clip, double seconds) {
+    for (unsigned i = 0; clip && i < clip->mNumChannels; ++i) {
+        const aiNodeAnim& c = *clip->mChannels[i];
+        if (c.mNodeName != node.mName) continue;
+        const double ticks = seconds * (clip->mTicksPerSecond > 0 ? clip->mTicksPerSecond : 25);
+        const auto sample = [&](auto* keys, unsigned count, auto blend) {
+            unsigned k = 0;
+            while (k + 1 < count && keys[k + 1].mTime <= ticks) ++k;
+            if (k + 1 == count || ticks <= keys[k].mTime) return keys[k].mValue;
+            const double share = (ticks - keys[k].mTime) / (keys[k + 1].mTime - keys[k].mTime);
+            return blend(keys[k].mValue, keys[k + 1].mValue, ai_real(share));
+        };
+        const auto lerp = [](aiVector3D a, aiVector3D b, ai_real t) { return a * (1 - t) + b * t; };
+        const auto slerp = [](aiQuaternion a, aiQuaternion b, ai_real t) {
+            aiQuaternion q;
+            aiQuaternion::Interpolate(q, a, b, t);
+            return q;
+        };
+        // Files round their quaternions; only one of length 1 is a rotation.
+        return aiMatrix4x4(sample(c.mScalingKeys, c.mNumScalingKeys, lerp),
+                           sample(c.mRotationKeys, c.mNumRotationKeys, slerp).Normalize(),
+                           sample(c.mPositionKeys, c.mNumPositionKeys, lerp));
+    }
+    return node.mTransformation;
+}
+
+aiMatrix4x4 WorldAt(const aiNode* node, const aiAnimation* clip, double seconds) {
+    aiMatrix4x4 world;
+    for (; node; node = node->mParent) world = LocalAt(*node, clip, seconds) * world;
+    return world;
+}
+
+const aiNode* HolderOf(const aiNode* node, unsigned mesh) {
+    if (std::count(node->mMeshes, node->mMeshes + node->mNumMeshes, mesh)) return node;
+    for (unsigned i = 0; i < node->mNumChildren; ++i)
+        if (const aiNode* found = HolderOf(node->mChildren[i], mesh)) return found;
+    return nullptr;
+}
+
+struct Skinned {
+    aiVector3D position;
+    float tolerance;  // what weights rounded to bytes may move it
+};
+using Place = std::array<float, 3>;
+
+// Where each vertex is at a time, by its place in the file; there may be several in one place.
+std::multimap<Place, Skinned> SkinAt(const aiScene& scene, const aiAnimation* clip, double seconds) {
+    std::multimap<Place, Skinned> out;
+    for (unsigned m = 0; m < scene.mNumMeshes; ++m) {
+        const aiMesh& mesh = *scene.mMeshes[m];
+        std::vector<std::vector<std::pair<float, aiVector3D>>> moved(mesh.mNumVertices);
+        for (unsigned b = 0; b < mesh.mNumBones; ++b) {
+            const aiNode* node = scene.mRootNode->FindNode(mesh.mBones[b]->mName);
+            if (!node || mesh.mBones[b]->mOffsetMatrix.Determinant() == 0) continue;
+            const aiMatrix4x4 bone = WorldAt(node, clip, seconds) * mesh.mBones[b]->mOffsetMatrix;
+            for (unsigned k = 0; k < mesh.mBones[b]->mNumWeights; ++k) {
+                const aiVertexWeight& w = mesh.mBones[b]->mWeights[k];
+                if (w.mWeight > 0)
+                    moved[w.mVertexId].push_back({w.mWeight, bone * mesh.mVertices[w.mVertexId]});
+            }
+        }
+        for (unsigned v = 0; v < mesh.mNumVertices; ++v) {
+            auto& list = moved[v];
+            std::stable_sort(list.begin(), list.end(),
+                             [](const auto& a, const auto& b) { return a.first > b.first; });
+            if (list.size() > 4) list.resize(4);
+            if (list.empty())
+                list.push_back(
+                    {1.0f, WorldAt(HolderOf(scene.mRootNode, m), clip, seconds) * mesh.mVertices[v]});
+            float sum = 0;
+            for (const auto& [weight, position] : list) sum += weight;
+            Skinned skinned = {{}, 0};
+            for (const auto& [weight, position] : list) {
+                skinned.position += position * (weight / sum);
+                skinned.tolerance += (position - list[0].second).Length() / 255;
+            }
+            const aiVector3D& p = mesh.mVertices[v];
+            out.insert({{p.x, p.y, p.z}, skinned});
+        }
+    }
+    return out;
+}
+
+// Where the engine's bone matrices carry a vertex of a batch with these bones.
+aiVector3D Move(QexPODModel* scene, QexPODNode* node, const int32_t* bones, uint32_t vertex) {
+    const QexPODMesh& mesh = scene->meshes[node->objectIndex];
+    const QexVec4 position = VertexValue(mesh, mesh.vertices, vertex),
+                  index = VertexValue(mesh, mesh.boneIndices, vertex),
+                  weight = VertexValue(mesh, mesh.boneWeights, vertex);
+    EXPECT_NEAR(weight.x + weight.y + weight.z + weight.w, 1, 1e-6);
+    aiVector3D sum;
+    for (int k = 0; k < 4; ++k) {
+        QexMatrix matrix;
+        QexVec4 moved;
+        QexPODModel_GetBoneWorldMatrix(scene, &matrix, node, &scene->nodes[bones[int((&index.x)[k])]]);
+        QexMatrix_TransformVec4(&matrix, &position, &moved);
+        sum += aiVector3D(moved.x, moved.y, moved.z) * (&weight.x)[k];
+    }
+    return sum;
+}
+
+// Compares every vertex of every skinned mesh at a frame with those of `expected`; returns their number.
+size_t ExpectSkinned(QexPODModel* scene, float frame, const std::multimap<Place, Skinned>& expected,
+                     float precision) {
+    size_t count = 0;
+    QexPODModel_SetFrame(scene, frame);
+    for (uint32_t n = 0; n < scene->meshNodeCount; ++n) {
+        QexPODNode* node = &scene->nodes[n];
+        const QexPODMesh& mesh = scene->meshes[node->objectIndex];
+        const QexBoneBatches& batches = mesh.boneBatches;
+        EXPECT_TRUE(mesh.skinned);
+        for (uint32_t i = 0; i < 3 * mesh.faceCount; ++i, ++count) {
+            const uint32_t vertex = VertexOfCorner(mesh, i);
+            const int32_t* bones = &batches.boneTable[BatchOfTriangle(batches, i / 3) * batches.maxBones];
+            const aiVector3D moved = Move(scene, node, bones, vertex);
+            const QexVec4 place = VertexValue(mesh, mesh.vertices, vertex);
+            const auto [begin, end] = expected.equal_range({place.x, place.y, place.z});
+            if (std::any_of(begin, end, [&, &at = moved](const auto& e) {
+                    return (at - e.second.position).Length() <= e.second.tolerance + precision;
+                }))
+                continue;
+            ADD_FAILURE() << "node " << n << " vertex " << vertex << " frame " << frame << ": " << moved.x
+                          << " " << moved.y << " " << moved.z;
+            return 0;
+        }
+    }
+    return count;
+}
+
+class ConvertSkin : public ConvertTest {
+  protected:
+    // Converts a scene made in the test.
+    ExitStatus ConvertMade(const aiScene& scene, const SceneSettings& settings) {
+        ConvertLog log("made");
+        TextureSet textures(&scene, Path("made"), folder_.string(), TextureFormat::kEtc1, &log);
+        pod::Scene out;
+        testing::internal::CaptureStderr();
+        const ExitStatus status = ConvertScene(scene, settings, &textures, &log, &out, &error_);
+        said_ = testing::internal::GetCapturedStderr();
+        WriteBytes(Path("out.pod"), pod::WritePod(out));
+        return status;
+    }
+
+    std::string error_;
+};
+
+// Characters of the system's packages against the importer's own matrices. The clip starts at frame 1.
+TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
+    const std::string models = "/usr/share/assimp/models/";
+    const struct {
+        const char *file, *clip;
+        size_t triangles, nodes;
+        float size;  // of the scene, about
+    } rows[] = {{"X/Testwuson.X", "Wuson_Walk", 3732, 39, 3},
+                {"X/Testwuson.X", "0", 3732, 39, 3},
+                {"X/BCN_Epileptic.X", "", 5126, 57, 2},
+                {"FBX/animation_with_skeleton.fbx", "", 2112, 20, 7000},
+                {"glTF2/simple_skin/simple_skin.gltf", "", 8, 3, 2}};
+    for (const auto& row : rows) {
+        const std::string file = models + row.file;
+        if (!std::filesystem::exists(file)) GTEST_SKIP() << file << " is not installed";
+        Assimp::Importer importer;
+        const aiScene* scene = importer.ReadFile(file, aiProcess_Triangulate);
+        ASSERT_TRUE(scene);
+        const aiAnimation* clip = scene->mAnimations[std::string(row.clip) == "Wuson_Walk" ? 1 : 0];
+        QexPODModel& pod = Convert(file, "etc1", 30, row.clip);
+        ASSERT_GT(pod.frameCount, 20u);
+        EXPECT_EQ(pod.nodeCount, row.nodes) << file;  // the bones are nodes of the file
+        std::set<float> seen;
+        for (const uint32_t frame : {1u, 2u, 9u, pod.frameCount / 2, pod.frameCount - 2}) {
+            const auto expected = SkinAt(*scene, clip, (frame - 1) / 30.0);
+            EXPECT_EQ(ExpectSkinned(&pod, float(frame), expected, 2e-5f * row.size), 3 * row.triangles)
+                << file;
+            seen.insert(expected.rbegin()->second.position.x + expected.begin()->second.position.y);
+        }
+        EXPECT_GE(seen.size(), 2u) << file << " does not move";
+    }
+}
+
+// Two triangles with an edge in common, which follow two bones; six vertices in the file.
+TEST_F(ConvertSkin, JoinsVerticesThatFollowTheSameBones) {
+    struct {
+        float vertices[6][3] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}};
+        QexMatrix matrices[2] = {g_sMatIdentity, g_sMatIdentity};
+        float weights[6][4] = {{1}, {1}, {1}, {1}, {1}, {1}};
+        uint8_t joints[6][4] = {};
+    } data;
+    static_assert(sizeof data == 320);
+    for (const uint8_t joint : {1, 0}) {
+        for (int v = 3; v < 6; ++v) data.joints[v][0] = joint;
+        Bytes bin(sizeof data);
+        std::memcpy(bin.data(), &data, sizeof data);
+        WriteBytes(Path("s.bin"), bin);
+        WriteText(Path("s.gltf"), R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0,1,2]}],
+ "nodes":[{"mesh":0,"skin":0},{"name":"j0"},{"name":"j1"}],"skins":[{"joints":[1,2],"inverseBindMatrices":1}],
+ "meshes":[{"primitives":[{"attributes":{"POSITION":0,"WEIGHTS_0":2,"JOINTS_0":3}}]}],
+ "accessors":[{"bufferView":0,"componentType":5126,"count":6,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
+  {"bufferView":0,"byteOffset":72,"componentType":5126,"count":2,"type":"MAT4"},
+  {"bufferView":0,"byteOffset":200,"componentType":5126,"count":6,"type":"VEC4"},
+  {"bufferView":0,"byteOffset":296,"componentType":5121,"count":6,"type":"VEC4"}],
+ "bufferViews":[{"buffer":0,"byteLength":320}],"buffers":[{"byteLength":320,"uri":"s.bin"}]})");
+        const QexPODMesh& mesh = Convert(Path("s.gltf")).meshes[0];
+        EXPECT_EQ(mesh.vertexCount, joint ? 6u : 4u);
+        EXPECT_EQ(mesh.faceCount, 2u);
+        EXPECT_EQ(mesh.boneBatches.maxBones, joint ? 2 : 1);
+    }
+}
+
+// A root with nodes "a" and "b", b below a, and one mesh node of a triangle for each list of bones.
+struct MadeBone {
+    const char* node;
+    aiMatrix4x4 offset;
+    std::vector<std::pair<unsigned, float>> weights;
+};
+
+// The scene's records own arrays that they delete themselves.
+template <class T>
+T* Array(const std::vector<T>& values) {
+    T* array = new T[values.size()];
+    std::copy(values.begin(), values.end(), array);
+    return array;
+}
+
+std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& meshes) {
+    auto scene = std::make_unique<aiScene>();
+    const aiVector3D one(1, 1, 1);
+    const auto node = [](const char* name, aiNode* parent, const aiMatrix4x4& matrix) {
+        aiNode* n = new aiNode(name);
+        n->mTransformation = matrix;
+        if (parent) parent->addChildren(1, &n);
+        return n;
+    };
+    const aiQuaternion tilt(aiVector3D(1, 2, 3).Normalize(), 0.4f);
+    scene->mRootNode = node("root", nullptr, aiMatrix4x4({2, 1, 1}, tilt, {5, 0, 0}));
+    aiNode* a = node("a", scene->mRootNode, aiMatrix4x4(one, tilt, {0, 1, 0}));
+    node("b", a, aiMatrix4x4(one, tilt, {0, 2, 0}));
+    scene->mNumMeshes = unsigned(meshes.size());
+    scene->mMeshes = new aiMesh*[meshes.size()];
+    for (unsigned m = 0; m < meshes.size(); ++m) {
+        aiMesh* mesh = scene->mMeshes[m] = new aiMesh;
+        mesh->mName = "mesh" + std::to_string(m);
+        mesh->mPrimitiveTypes = aiPrimitiveType_TRIANGLE;
+        mesh->mNumVertices = 3;
+        const float size = 1 + float(m);
+        mesh->mVertices = Array<aiVector3D>({{size, 0, 0}, {0, size, 0}, {0, 0, size}});
+        mesh->mNumFaces = 1;
+        mesh->mFaces = new aiFace[1];
+        mesh->mFaces[0].mNumIndices = 3;
+        mesh->mFaces[0].mIndices = Array<unsigned>({0, 1, 2});
+        std::vector<aiBone*> bones;
+        for (const MadeBone& from : meshes[m]) {
+            std::vector<aiVertexWeight> weights;
+            for (const auto& [vertex, weight] : from.weights) weights.emplace_back(vertex, weight);
+            bones.push_back(new aiBone);
+            bones.back()->mName = from.node;
+            bones.back()->mOffsetMatrix = from.offset;
+            bones.back()->mNumWeights = unsigned(weights.size());
+            bones.back()->mWeights = Array(weights);
+        }
+        mesh->mNumBones = unsigned(bones.size());
+        mesh->mBones = Array(bones);
+        aiNode* holder =
+            node(mesh->mName.C_Str(), scene->mRootNode, aiMatrix4x4(one, tilt, {0, 0, float(m)}));
+        holder->mNumMeshes = 1;
+        holder->mMeshes = Array<unsigned>({m});
+    }
+    // Over two seconds "a" turns and "b" moves.
+    scene->mNumAnimations = 1;
+    scene->mAnimations = new aiAnimation* [1] { new aiAnimation };
+    aiAnimation* clip = scene->mAnimations[0];
+    clip->mTicksPerSecond = 1;
+    clip->mDuration = 2;
+    clip->mNumChannels = 2;
+    clip->mChannels = new aiNodeAnim*[2];
+    for (unsigned i = 0; i < 2; ++i) {
+        aiNodeAnim* c = clip->mChannels[i] = new aiNodeAnim;
+        c->mNodeName = i ? "b" : "a";
+        c->mNumPositionKeys = c->mNumRotationKeys = c->mNumScalingKeys = 2;
+        c->mPositionKeys = new aiVectorKey[2]{{0, {0, 1, 0}}, {2, {i ? 3.0f : 0.0f, 1, 0}}};
+        c->mRotationKeys = new aiQuatKey[2]{{0, aiQuaternion()}, {2, i ? aiQuaternion() : tilt}};
+        c->mScalingKeys = new aiVectorKey[2]{{0, one}, {2, one}};
+    }
+    return scene;
+}
+
+// Bind poses that one skeleton cannot hold: two meshes put the same bone in two places, a bone shears in its
+// parent, and its own pose is far from all of them.
+TEST_F(ConvertSkin, BindPosesThatDoNotAgreeAreAllKept) {
+    const aiMatrix4x4 moved({1, 1, 1}, aiQuaternion(aiVector3D(0, 0, 1), 0.7f), {3, 4, 5});
+    aiMatrix4x4 sheared;
+    sheared.a2 = 0.5f;
+    const auto scene =
+        MakeScene({{{"a", moved, {{0, 1}, {1, 0.5f}}}, {"b", {}, {{1, 0.5f}, {2, 1}}}},
+                   {{"a", moved, {{0, 1}, {1, 0.3f}}}, {"b", moved * moved, {{1, 0.7f}, {2, 1}}}},
+                   {{"b", sheared, {{0, 1}, {1, 1}, {2, 0.2f}}}, {"a", {}, {{2, 0.8f}}}}});
+    for (const bool still : {false, true}) {
+        if (still) scene->mAnimations[0]->mNumChannels = 0;
+        SceneSettings settings;
+        settings.fps = 10;
+        ASSERT_EQ(ConvertMade(*scene, settings), kDone) << error_;
+        EXPECT_EQ(said_, "");
+        QexPODModel& pod = Read();
+        EXPECT_EQ(pod.frameCount, 22u);
+        for (const uint32_t frame : {1u, 8u, 20u}) {
+            const auto expected = SkinAt(*scene, scene->mAnimations[0], (frame - 1) / 10.0);
+            EXPECT_EQ(ExpectSkinned(&pod, float(frame), expected, 1e-4f), 9u);
+        }
+        scene->mAnimations[0]->mNumChannels = 2;
+    }
+}
+
+TEST_F(ConvertSkin, BadWeightsAndBonesAreDefinedAndTold) {
+    const float nan = std::numeric_limits<float>::quiet_NaN(), inf = std::numeric_limits<float>::infinity();
+    std::vector<MadeBone> bones;
+    // Six bones of vertex 0, different by their offsets; the two least of them fall away.
+    for (int i = 0; i < 6; ++i) {
+        aiMatrix4x4 offset;
+        offset.a4 = float(i);
+        bones.push_back({i % 2 ? "a" : "b", offset, {{0, 0.1f + 0.1f * float(i)}}});
+    }
+    bones.push_back(
+        {"a", {}, {{1, nan}, {1, inf}, {1, -1.0f}, {99, 1}}});     // vertex 1 is left without a weight
+    bones.push_back({"b", {}, {{2, 1e38f}, {2, 3e38f}, {2, 0}}});  // and 2 has the same bone twice
+    bones.push_back({"gone", {}, {{1, 1}}});
+    bones.push_back({"a", aiMatrix4x4({0, 1, 1}, aiQuaternion(), {}), {{1, 1}}});
+    auto scene = MakeScene({bones});
+    SceneSettings settings;
+    ASSERT_EQ(ConvertMade(*scene, settings), kDone) << error_;
+    EXPECT_EQ(CountLines(said_), 4) << said_;
+    for (const char* line :
+         {": 2 bones without a node", ": 4 bone weights", ": 1 vertex of more than four bones",
+          ": 1 vertex of skinned meshes without weights"})
+        EXPECT_TRUE(Contains(said_, line)) << said_;
+
+    // The reference takes no weights that are not numbers, either.
+    aiBone* bad = scene->mMeshes[0]->mBones[6];
+    bad->mNumWeights = 0;
+    scene->mMeshes[0]->mBones[7]->mNumWeights = 1;
+    QexPODModel& pod = Read();
+    for (const uint32_t frame : {1u, 30u}) {
+        const auto expected = SkinAt(*scene, scene->mAnimations[0], (frame - 1) / 30.0);
+        EXPECT_EQ(ExpectSkinned(&pod, float(frame), expected, 1e-4f), 3u);
+    }
+
+    // A mesh that keeps none of its bones stands still.
+    scene = MakeScene({{{"gone", {}, {{0, 1}}}}});
+    ASSERT_EQ(ConvertMade(*scene, settings), kDone);
+    const QexPODModel& still = Read();
+    EXPECT_FALSE(still.meshes[0].skinned);
+    EXPECT_EQ(still.nodes[0].parentIndex, 1);
+}
+
+TEST_F(ConvertSkin, MaxBonesHasToHoldATriangle) {
+    const auto scene = MakeScene({{{"a", {}, {{0, 1}, {1, 1}}}, {"b", {}, {{1, 1}, {2, 1}}}}});
+    SceneSettings settings;
+    settings.maxBones = 1;
+    EXPECT_EQ(ConvertMade(*scene, settings), kBadArgument);
+    EXPECT_EQ(error_, "a triangle of mesh 'mesh0' follows 2 bones; --max-bones 2 or more is expected");
+}
+
+TEST_F(ConvertSkin, KeepsTheTangentsOfANormalMap) {
+    const auto scene = MakeScene({{{"a", {}, {{0, 1}, {1, 1}, {2, 1}}}}});
+    aiMesh& mesh = *scene->mMeshes[0];
+    mesh.mTangents = new aiVector3D[3]{{1, 0, 0}, {0, 1, 0}, {0, 0, 1}};
+    mesh.mBitangents = new aiVector3D[3]{{0, 1, 0}, {0, 0, 1}, {1, 0, 0}};
+    MeshContent content;
+    content.tangents = true;
+    std::string error;
+    // Vertex 1 in front, so that the order of the vertices changes.
+    std::swap(mesh.mFaces[0].mIndices[0], mesh.mFaces[0].mIndices[1]);
+    const auto made = ConvertSkinnedMesh(mesh, content, {3, Follow({0})}, 16, &error);
+    ASSERT_EQ(made.size(), 1u);
+    const pod::Mesh& m = made[0];
+    ASSERT_EQ(m.tangents.components + m.binormals.components, 6u);
+    float values[9];
+    std::memcpy(values, m.vertexBlock.data(), sizeof values);
+    EXPECT_EQ(std::vector<float>(values, values + 9), (std::vector<float>{0, 1, 0, 0, 1, 0, 0, 0, 1}));
+}
+
+TEST_F(ConvertSkin, ClipsAreListedAndChosen) {
+    auto scene = MakeScene({{{"a", {}, {{0, 1}}}}});
+    aiAnimation* first = scene->mAnimations[0];
+    delete[] scene->mAnimations;
+    scene->mAnimations = new aiAnimation* [3] { first, new aiAnimation, new aiAnimation };
+    scene->mNumAnimations = 3;
+    scene->mAnimations[0]->mName = "walk\n";
+    scene->mAnimations[1]->mName = "2";
+    testing::internal::CaptureStdout();
+    ListClips(*scene);
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "0\twalk?\t2.000\t2\n1\t2\t0.000\t0\n2\t\t0.000\t0\n");
+    std::string error;
+    const std::pair<const char*, int> rows[] = {{"walk\n", 0}, {"0", 0}, {"1", 1}, {"2", 1}};
+    for (const auto& [wanted, index] : rows) EXPECT_EQ(FindClip(*scene, wanted, &error), index) << wanted;
+    EXPECT_EQ(error, "");
+    for (const char* wanted : {"3", "Walk", "01", "-1"}) {
+        EXPECT_EQ(FindClip(*scene, wanted, &error), -1);
+        EXPECT_EQ(error, std::string("no animation '") + wanted + "'; expected one of: 0 walk?, 1 2, 2");
+    }
+}
+
+}  // namespace

@@ -1,0 +1,101 @@
+// Where textures come from: what qex render finds for the names in a scene, and which way up it lays them.
+#include "common/ImageFile.h"
+#include "qex/QexCommandTest.h"
+
+namespace {
+
+// The picture: green above blue. A scene's quad that shows it covers the rows 30 to 49 of 100.
+constexpr char kUpright[] = "green above blue", kTurned[] = "blue above green", kPlain[] = "red";
+
+class QexLookup : public QexCommandTest {
+  protected:
+    void WritePicture(const std::string& name) const {
+        std::filesystem::create_directories(std::filesystem::path(Path(name)).parent_path());
+        std::vector<uint8_t> pixels;
+        std::string error;
+        for (int i = 0; i < 64; ++i)
+            pixels.insert(pixels.end(), {0, uint8_t(i < 32 ? 255 : 0), uint8_t(i < 32 ? 0 : 255), 255});
+        ASSERT_TRUE(SavePng(Path(name), 8, 8, pixels.data(), &error)) << error;
+    }
+    std::string Draw(const std::vector<std::string>& more = {}, bool piped = false) const {
+        std::vector<std::string> arguments = {
+            "render", piped ? "-" : Path("s.pod"), "-o", Path("out.png"), "--size", "200x100", "--shader",
+            "texture"};
+        arguments.insert(arguments.end(), more.begin(), more.end());
+        const CommandResult result = Run(arguments, piped ? Path("s.pod") : "/dev/null");
+        Image image;
+        std::string error = result.err;
+        if (result.status || !LoadImage(Path("out.png"), &image, &error)) return error;
+        const auto at = [&](int y) -> std::string {
+            const uint8_t* p = image.Pixel(120, y);
+            return p[0] > 200 ? "red" : p[1] > 200 ? "green" : p[2] > 200 ? "blue" : "background";
+        };
+        return at(34) == at(45) ? at(34) : at(34) + " above " + at(45);
+    }
+    void WriteQuad(const std::string& texture, const std::string& options = "") const {
+        pod::Scene scene = QuadScene();
+        scene.exportOptions = options;
+        if (!texture.empty()) {
+            TextureQuad(&scene, texture);
+            scene.materials[0].diffuse = {1, 1, 1};
+        }
+        WriteScene(Path("s.pod"), scene);
+    }
+};
+
+}  // namespace
+
+TEST_F(QexLookup, FollowsTheExportOptionThatTurnsVOver) {
+    WritePicture("tex.png");
+    const struct {
+        const char* options;
+        std::vector<std::string> arguments;
+        const char *drawn, *info;
+    } rows[] = {{"", {}, kUpright, nullptr},
+                {"bIndexed=1\nbFlipTextureV=0\n", {}, kUpright, "V runs up"},
+                {"bFlipTextureV=1\nbIndexed=1\n", {}, kTurned, "V runs down"},
+                {"bFlipTextureV=1", {"--flip-textures", "No"}, kUpright, "V runs down"},
+                {"", {"--flip-textures", "yes"}, kTurned, nullptr}};
+    for (const auto& row : rows) {
+        WriteQuad("tex.png", row.options);
+        EXPECT_EQ(Draw(row.arguments), row.drawn) << row.options;
+        const std::string text = Run({"info", Path("s.pod")}).out;
+        EXPECT_TRUE(row.info ? Contains(text, row.info) : !Contains(text, "V runs")) << text;
+    }
+    WriteQuad("", "bFlipTextureV=1");
+    EXPECT_EQ(Draw({"--texture", "paint=" + Path("tex.png")}, true), kTurned);
+}
+
+TEST_F(QexLookup, NamesMayDifferInCaseAndFolder) {
+    WritePicture("Maps/Wood.PNG");
+    WritePicture("stone.png");
+    WriteBytes(Path("Grass.PVR"), UniformPvr(pod::kPvrRgb565, 8, {0x00, 0xF8}));
+    const struct {
+        const char *name, *drawn;
+    } rows[] = {{"maps/wood.png", kUpright},
+                {"MAPS\\WOOD.tga", kUpright},
+                {"C:\\old\\Stone.bmp", kUpright},
+                {"../x/STONE.png", kUpright},
+                {"textures/grass.png", kPlain}};
+    for (const auto& row : rows) {
+        WriteQuad(row.name);
+        EXPECT_EQ(Draw(), row.drawn) << row.name;
+        EXPECT_FALSE(Contains(Run({"info", Path("s.pod")}).out, "is missing")) << row.name;
+    }
+}
+
+TEST_F(QexLookup, MaterialsTakeTexturesOfOnesChoice) {
+    WritePicture("mine.png");
+    WriteBytes(Path("mine.pvr"), UniformPvr(pod::kPvrRgb565, 8, {0x1F, 0x00}));
+    for (const char* own : {"", "gone.png"}) {
+        WriteQuad(own);
+        EXPECT_EQ(Draw({"--texture", "paint=" + Path("mine.png")}), kUpright);
+        EXPECT_EQ(Draw({"--texture", "x=" + Path("mine.png"), "--texture", "paint=" + Path("mine.png")}),
+                  "qex render: " + Path("s.pod") + ": no material 'x'; the scene has paint\n");
+    }
+    EXPECT_EQ(Draw({"--texture", "paint=" + Path("mine.pvr")}), "blue");
+    ExpectRefused({"render", Path("s.pod"), "-o", Path("o.png"), "--texture", "paint=" + Path("none.png")}, 2,
+                  "none.png: no such file");
+    ExpectRefused({"render", Path("s.pod"), "-o", Path("o.png"), "--texture", "paint"}, 2,
+                  "expected MATERIAL=FILE");
+}

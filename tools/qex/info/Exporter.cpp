@@ -1,0 +1,43 @@
+#include "info/Exporter.h"
+
+#include <cstdio>
+#include <filesystem>
+#include <memory>
+#include <sstream>
+#include <vector>
+
+#include "texture/Container.h"
+
+namespace {
+
+constexpr uint32_t kSceneBlock = 1001, kOptionsBlock = 1002, kHistoryBlock = 1003;
+
+}  // namespace
+
+std::optional<bool> ExporterText::FlipsTextureV() const {
+    const std::string name = "bFlipTextureV=";
+    std::istringstream lines(options.value_or(""));
+    for (std::string line; std::getline(lines, line);)
+        if (line.compare(0, name.size(), name) == 0) return line[name.size()] != '0';
+    return {};
+}
+
+ExporterText ReadExporterText(const std::string& path) {
+    ExporterText found;
+    const std::unique_ptr<FILE, int (*)(FILE*)> file(fopen(path.c_str(), "rb"), fclose);
+    std::error_code error;
+    const uint64_t size = std::filesystem::file_size(path, error);
+    std::vector<uint8_t> marker(8);
+    while (file && !error && fread(marker.data(), 1, 8, file.get()) == 8) {
+        const uint32_t id = ReadLE32(marker, 0), length = ReadLE32(marker, 4);
+        if (id == kSceneBlock || length > size) break;
+        if (id != kOptionsBlock && id != kHistoryBlock) {
+            if (fseek(file.get(), static_cast<long>(length), SEEK_CUR) != 0) break;
+            continue;
+        }
+        std::string text(length, '\0');
+        if (fread(&text[0], 1, length, file.get()) != length) break;
+        (id == kHistoryBlock ? found.history : found.options) = text.substr(0, text.find('\0'));
+    }
+    return found;
+}

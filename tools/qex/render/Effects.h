@@ -1,0 +1,67 @@
+// What qex render can do with a scene beyond drawing it as it is: moved nodes, shadow, mirror, stereo,
+// picking.
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "Qex.h"
+#include "render/Emitters.h"
+
+struct NodeChange {
+    std::string node;
+    std::string what;  // hide, move, rotate or face
+    QexVec3 value;     // a place, or degrees
+};
+
+struct DepthOfField {
+    float focus, range;  // as QexPostProcessing_DrawDOF takes them
+    float sigma = 5, samples = 9;
+};
+
+struct EffectOptions {
+    std::string shader;            // a name of ShaderNames, or empty: the default look
+    std::vector<QexLight> lights;  // instead of the scene's own
+    std::vector<NodeChange> nodes;
+    std::vector<QexVec2> picks;  // pixels
+    bool shadow = false;
+    std::optional<float> mirror;  // height of the plane
+    std::optional<float> floor;   // its height
+    std::string mirrorNode;
+    uint32_t stereo = 0;  // QexRenderer_EnableStereo3D's mode
+    float separation = 0;
+    std::optional<DepthOfField> depthOfField;
+    std::vector<std::string> sky;  // one picture or six, see Sky
+    std::optional<float> water;    // its height
+    EmitterScene emitters;
+    bool fullBlur = false;  // depth of field blurs at full resolution, not at half
+};
+
+// Carries the changes out. Returns a line that says which node there is not, or nothing.
+std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes);
+
+// The index of a node of that name; when there is none it is -1 and `problem` names those that there are.
+int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem);
+
+// Draws all nodes of a floor, which may be null, and of the model. Those with shadow-receiving modules show
+// the shadows of the model's nodes.
+void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model, const QexLightSet& lights,
+                    const QexCamera& camera);
+
+// Draws the scene's mirror image in the plane that the options name.
+void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightSet& lights,
+                  const QexCamera& camera);
+
+// Draws a scene with the depth of field of the options, which there is, in a picture that is `scale` times as
+// large as it will be shown. `draw` clears and draws it: once with null, once with the modules that show
+// depth, on white. Between QexPostProcessing_Initialize and ..._Finalize.
+using DrawPass = std::function<void(QexShaderModule* module, QexShaderModule* skinned)>;
+void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, int scale,
+                          const DrawPass& draw);
+
+// Prints the mesh nodes under each point of a picture that was drawn `scale` times as large, one line a
+// point.
+void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera, int scale,
+                 const std::vector<QexVec2>& points);

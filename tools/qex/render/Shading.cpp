@@ -1,0 +1,151 @@
+#include "render/Shading.h"
+
+namespace {
+
+// Of the default look: what of a surface's colour shows where no light falls, and what a white light adds
+// where it falls straight. Together they are the whole colour.
+constexpr float kAmbient = 0.3f, kDirect = 1 - kAmbient;
+
+using Create = QexShaderModule* (*)(void);
+using ReleaseModule = void (*)(QexShaderModule**);
+using SetParameters = void (*)(QexShaderModule*, float, float);
+
+// Modules by their short names. What has no skinned sister leaves skinned nodes to the engine's choice.
+struct ShaderRow {
+    const char* name;
+    Create create;
+    ReleaseModule release;
+    Create createSkinned;
+    ReleaseModule releaseSkinned;
+    SetParameters setDepth, setSkinnedDepth;
+    bool lit;  // its colours are those of the material times those of the texture
+};
+
+#define PAIR(Name, Skinned) Name##_CreateProgram, Name##_Release, Skinned##_CreateProgram, Skinned##_Release
+
+const ShaderRow kShaders[] = {
+    {"texture", PAIR(QexTextureShader, QexSkinningTextureShader), nullptr, nullptr, false},
+    {"texture-noalpha", PAIR(QexTextureNoAlphaShader, QexSkinningTextureNoAlphaShader), nullptr, nullptr,
+     false},
+    {"gouraud", PAIR(QexGouraudShader, QexSkinningGouraudShader), nullptr, nullptr, true},
+    {"specular", PAIR(QexGouraudSpecularShader, QexSkinningGouraudSpecularShader), nullptr, nullptr, true},
+    {"normalmap", PAIR(QexGouraudNormalMapShader, QexSkinningGouraudNormalMapShader), nullptr, nullptr, true},
+    {"shadow", PAIR(QexGouraudShadowShader, QexSkinningGouraudShader), nullptr, nullptr, true},
+    {"shadow-ext", PAIR(QexGouraudShadowExtShader, QexSkinningGouraudShader), nullptr, nullptr, true},
+    {"uv", PAIR(QexUVDisplacementShader, QexSkinningTextureShader), nullptr, nullptr, false},
+    {"simple", QexSimpleShader_CreateProgram, QexSimpleShader_Release, nullptr, nullptr, nullptr, nullptr,
+     false},
+    {"depth", PAIR(QexDepthShader, QexSkinningDepthShader), QexDepthShader_SetParameters,
+     QexSkinningDepthShader_SetParameters, false},
+};
+
+const ShaderRow* FindShader(const std::string& name) {
+    for (const ShaderRow& row : kShaders)
+        if (name == row.name) return &row;
+    return nullptr;
+}
+
+bool HasNormals(const QexPODModel& scene, uint32_t meshNode) {
+    return scene.meshes[scene.nodes[meshNode].objectIndex].attributes[QEX_ELEMENT_NORMAL].componentCount != 0;
+}
+
+bool IsLit(const QexPODModel& scene, uint32_t meshNode, const std::vector<bool>& lit) {
+    const int32_t material = scene.nodes[meshNode].materialIndex;
+    return material < 0 ? HasNormals(scene, meshNode) : lit[static_cast<size_t>(material)];
+}
+
+bool Shines(const QexLightSet& set) {
+    for (uint32_t i = 0; i < set.count; ++i)
+        for (int c = 0; c < 3; ++c)
+            if (set.lights[i].colour[c] > 0) return true;
+    return false;
+}
+
+}  // namespace
+
+std::string ShaderNames() {
+    std::string names;
+    for (const ShaderRow& row : kShaders) names += (names.empty() ? "" : ", ") + std::string(row.name);
+    return names;
+}
+
+std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shader) {
+    const ShaderRow* row = FindShader(shader);
+    std::vector<bool> lit(scene.materialCount, !row || row->lit);
+    if (row) return lit;
+    for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
+        const int32_t material = scene.nodes[i].materialIndex;
+        if (material >= 0 && !HasNormals(scene, i)) lit[static_cast<size_t>(material)] = false;
+    }
+    return lit;
+}
+
+bool IsShaderName(const std::string& name) {
+    return FindShader(name) != nullptr;
+}
+
+void SceneShaders::Use(QexModel* model, const std::string& name, const std::vector<bool>& lit) {
+    const ShaderRow* row = FindShader(name);
+    if (!row) return;
+    Release();
+    row_ = static_cast<size_t>(row - kShaders);
+    static_ = row->create();
+    if (row->createSkinned) skinned_ = row->createSkinned();
+    const std::pair<SetParameters, QexShaderModule*> modules[] = {{row->setDepth, static_},
+                                                                  {row->setSkinnedDepth, skinned_}};
+    for (const auto& [set, module] : modules) {
+        if (!set || !module) continue;
+        QexRenderState_UseProgram(module->program);
+        set(module, kNearDepth, kFarDepth);
+    }
+    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
+        QexPODNode& node = model->scene.nodes[i];
+        QexShaderModule* module = model->scene.meshes[node.objectIndex].skinned == 1 ? skinned_ : static_;
+        if (module && (!row->lit || IsLit(model->scene, i, lit))) node.shader = module;
+    }
+}
+
+void SceneShaders::UseDefault(QexModel* model, bool shadow, const std::vector<bool>& lit) {
+    Use(model, shadow ? "shadow" : "gouraud", lit);
+    for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
+        QexPODMaterial& material = model->scene.materials[i];
+        float* d = material.diffuse;
+        // Exporters leave it black where a texture takes its place.
+        if (material.diffuseTexture >= 0 && d[0] + d[1] + d[2] == 0) d[0] = d[1] = d[2] = 1;
+        for (int c = 0; c < 3; ++c) material.ambient[c] = kAmbient * material.diffuse[c];
+    }
+}
+
+void SceneShaders::Release() {
+    if (static_) kShaders[row_].release(&static_);
+    if (skinned_) kShaders[row_].releaseSkinned(&skinned_);
+}
+
+ShaderOverride::ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned)
+    : model_(model) {
+    if (!model) return;
+    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) own_.push_back(model->scene.nodes[i].shader);
+    QexModel_SetShaderProgramForAllNode(model, module, skinned);
+}
+
+ShaderOverride::~ShaderOverride() {
+    for (size_t i = 0; i < own_.size(); ++i) model_->scene.nodes[i].shader = own_[i];
+}
+
+QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera) {
+    QexLightSet set = {};
+    for (const QexLight& light : options.lights)
+        if (set.count < QEX_MAX_LIGHTS) set.lights[set.count++] = light;
+    if (!set.count) QexModel_GetLight(model, &set);
+    if (!set.count || (options.lights.empty() && !Shines(set))) {
+        QexVec3 d;
+        QexVec3_Subtract(&d, &camera.target, &camera.eye);
+        set.count = 2;
+        set.lights[0] = {QEX_LIGHT_DIRECTIONAL, {d.x, d.y, d.z}, {1, 1, 1, 1}};
+        // The sides of open surfaces that their normals point away from are lit like the others.
+        set.lights[1] = {QEX_LIGHT_DIRECTIONAL, {-d.x, -d.y, -d.z}, {1, 1, 1, 1}};
+    }
+    for (uint32_t i = 0; options.shader.empty() && i < set.count; ++i)
+        for (int c = 0; c < 3; ++c) set.lights[i].colour[c] *= kDirect;
+    return set;
+}

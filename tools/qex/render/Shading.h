@@ -1,0 +1,58 @@
+// How qex render shades a scene: the modules that draw its nodes, and the lights.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "Qex.h"
+#include "render/Effects.h"
+
+// The clip-space z of a camera's near and far plane.
+constexpr float kNearDepth = 0, kFarDepth = 1;
+
+// The names of the shader modules, ", " between them.
+std::string ShaderNames();
+bool IsShaderName(const std::string& name);
+
+// By material, whether the modules of that name multiply its colour with that of the texture. In the default
+// look, which has no name, those are lit whose meshes all have normals.
+std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shader);
+
+// The modules that draw a model instead of the engine's choice.
+class SceneShaders {
+  public:
+    SceneShaders() = default;
+    ~SceneShaders() { Release(); }
+    SceneShaders(const SceneShaders&) = delete;
+    SceneShaders& operator=(const SceneShaders&) = delete;
+
+    // Gives the modules of that name to the nodes, static or skinned to match; lit ones where the material,
+    // or without one the mesh, is lit.
+    void Use(QexModel* model, const std::string& name, const std::vector<bool>& lit);
+    // Lit from the scene's lights or the camera; what files say about ambient light, which is rarely meant,
+    // is replaced by a share of the colour.
+    void UseDefault(QexModel* model, bool shadow, const std::vector<bool>& lit);
+    void Release();
+
+  private:
+    size_t row_ = 0;
+    QexShaderModule* static_ = nullptr;
+    QexShaderModule* skinned_ = nullptr;
+};
+
+// Gives all nodes of a model, which may be null, other modules for as long as it lives.
+class ShaderOverride {
+  public:
+    ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned);
+    ~ShaderOverride();
+    ShaderOverride(const ShaderOverride&) = delete;
+    ShaderOverride& operator=(const ShaderOverride&) = delete;
+
+  private:
+    QexModel* model_;
+    std::vector<QexShaderModule*> own_;
+};
+
+// The lights of the options, else the scene's own, else one that shines from the camera; dimmed in the
+// default look, which has ambient light.
+QexLightSet ChooseLights(QexModel* model, const EffectOptions& options, const QexCamera& camera);

@@ -1,0 +1,45 @@
+// Textures of the models that qex render draws: found beside the scene under several names and formats.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "common/ImageFile.h"
+#include "Qex.h"
+
+namespace CLI {
+class App;
+}
+
+// What the command line says about textures.
+struct TextureChoices {
+    std::vector<std::string> overrides;  // MATERIAL=FILE, see TextureOverrides.h
+    std::optional<bool> flipped;         // V runs down the pictures; as the scene's export options say
+};
+
+void SetUpTextureChoices(CLI::App* app, TextureChoices* choices);
+
+// Puts the texture hook into a model that will be loaded from `scenePath`, its textures from `directory`. For
+// NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other picture formats of that name (see
+// FindTexture); pictures are decoded here, with their alpha channel as the alpha texture.
+void SetTextureHook(QexModel* model, const std::string& directory, const std::string& scenePath,
+                    const TextureChoices& choices);
+
+// After loading: a line about the first material with a texture of its choice that the scene lacks; else
+// empty.
+std::string CheckTextureChoices(const QexModel* model);
+
+// A texture of a picture whose first row is its lower edge, with mipmaps. A model that gets it frees it.
+QexTexture* NewPictureTexture(const Image& image, const std::string& name);
+
+// After loading: the textures that are chosen, for materials without a texture one of their diffuse colour,
+// white for those that are `lit`, as light brings the colour,
+// for KTX textures a filter that needs no mipmaps; nodes with an alpha texture leave the opaque pass. Returns
+// a line for each texture that is missing or could not be read.
+std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<bool>& lit);
+
+// Loads the materials' bump textures and has them bound for the normal-mapped modules. Returns what is wrong
+// with them, one line each.
+std::vector<std::string> LoadNormalMaps(QexModel* model);
+void ReleaseNormalMaps();
