@@ -2,9 +2,9 @@
 
 #include <cstring>
 
+#include "gl/Shader.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
-#include "gl/Shader.h"
 
 #define QEX_MODULE (type->path)
 

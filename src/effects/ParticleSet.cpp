@@ -1,5 +1,5 @@
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "gl/Shader.h"
 
 #define QEX_MODULE "src/QexParticle"

@@ -4,9 +4,9 @@
 #include <cmath>
 #include <cstdio>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
 #include "effects/SkyPrograms.h"
+#include "gl/GL.h"
 
 #define QEX_MODULE "src/QexSkyBox"
 

@@ -2,8 +2,8 @@
 
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 
 #define QEX_MODULE "src/QexShader"
 

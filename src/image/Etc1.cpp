@@ -1,6 +1,6 @@
-#include "Qex.h"
 #include "base/Memory.h"
 #include "image/Lanes.h"
+#include "Qex.h"
 
 namespace {
 

@@ -2,8 +2,8 @@
 // colours stand at the words' centres and are interpolated between them; a pixel is a mixture of both by its
 // weight. So the image is decoded in cells between the centres of four words: a cell begins half a word right
 // of and below the upper left one, and takes a quarter of the weights of each.
-#include "Qex.h"
 #include "image/Lanes.h"
+#include "Qex.h"
 
 namespace {
 

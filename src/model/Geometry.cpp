@@ -1,9 +1,9 @@
 #include <cstring>
 
-#include "gl/GL.h"
-#include "pod/Reader.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "model/Model.h"
+#include "pod/Reader.h"
 #include "pod/Scene.h"
 
 #define QEX_MODULE "src/QexModel"

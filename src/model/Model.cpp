@@ -3,8 +3,8 @@
 #include <cstdio>
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 
 #define QEX_MODULE "src/QexModel"
 

@@ -2,8 +2,8 @@
 // them.
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "model/Model.h"
 
 #define QEX_MODULE "src/QexModel"

@@ -1,6 +1,6 @@
 // The shadow pass: what casts a shadow into the camera's view, and its depth as the light sees it.
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "model/Model.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"

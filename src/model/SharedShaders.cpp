@@ -1,9 +1,9 @@
 #include <cstring>
 
 #include "gl/GL.h"
-#include "model/Model.h"
 #include "gl/RenderTarget.h"
 #include "gl/Shader.h"
+#include "model/Model.h"
 
 #define QEX_MODULE "src/QexModel"
 

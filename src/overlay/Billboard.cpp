@@ -1,9 +1,9 @@
 #include <cmath>
 
-#include "gl/GL.h"
-#include "math/Float4.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "gl/Shader.h"
+#include "math/Float4.h"
 
 #define QEX_MODULE "src/QexBillboard"
 

@@ -5,10 +5,10 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "overlay/FontLatin.h"
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "gl/Shader.h"
+#include "overlay/FontLatin.h"
 
 #define QEX_MODULE "src/QexFont"
 

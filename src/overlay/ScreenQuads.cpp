@@ -1,6 +1,6 @@
 // Textures on the screen, drawn with the font's program.
-#include "overlay/Font.h"
 #include "gl/GL.h"
+#include "overlay/Font.h"
 
 #define QEX_MODULE "src/QexFont"
 

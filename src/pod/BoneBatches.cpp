@@ -5,8 +5,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
-#include "pod/Reader.h"
 #include "base/Memory.h"
+#include "pod/Reader.h"
 
 #define QEX_MODULE "src/QexBoneBatches"
 

@@ -3,8 +3,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
-#include "pod/Reader.h"
 #include "base/Memory.h"
+#include "pod/Reader.h"
 #include "pod/Scene.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

@@ -2,9 +2,9 @@
 // the shaders hold.
 #include <cstddef>
 
+#include "base/Memory.h"
 #include "pod/BoneBatches.h"
 #include "pod/Reader.h"
-#include "base/Memory.h"
 #include "pod/Scene.h"
 
 namespace {

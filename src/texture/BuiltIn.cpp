@@ -1,8 +1,8 @@
 #include <cmath>
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "texture/Texture.h"
 
 #define QEX_MODULE "src/QexTexture"

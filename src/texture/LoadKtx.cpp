@@ -2,8 +2,8 @@
 // is sound is uploaded, natively or decoded, and made complete.
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

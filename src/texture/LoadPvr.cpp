@@ -1,7 +1,7 @@
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

@@ -3,9 +3,9 @@
 #include <cstdio>
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
 #include "data/ResFile.h"
+#include "gl/GL.h"
 
 #define QEX_MODULE "src/QexTexture"
 

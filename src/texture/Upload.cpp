@@ -4,8 +4,8 @@
 #include <cstdio>
 #include <cstring>
 
-#include "gl/GL.h"
 #include "base/Memory.h"
+#include "gl/GL.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 

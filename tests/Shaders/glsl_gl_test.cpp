@@ -6,8 +6,8 @@
 #include <map>
 #include <sstream>
 
-#include "support/RenderFixture.h"
 #include "support/Capture.h"
+#include "support/RenderFixture.h"
 
 namespace {
 

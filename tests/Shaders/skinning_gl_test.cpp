@@ -8,8 +8,8 @@
 #include <unistd.h>
 
 #include "convert/Command.h"
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

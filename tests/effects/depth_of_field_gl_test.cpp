@@ -5,8 +5,8 @@
 #include <cmath>
 #include <random>
 
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

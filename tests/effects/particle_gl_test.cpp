@@ -6,9 +6,9 @@
 #include <cstring>
 #include <sstream>
 
+#include "support/Capture.h"
 #include "support/RenderFixture.h"
 #include "support/RenderScenes.h"
-#include "support/Capture.h"
 
 namespace {
 

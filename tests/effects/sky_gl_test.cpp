@@ -3,9 +3,9 @@
 #include <dlfcn.h>
 #include <GLES2/gl2.h>
 
-#include "support/RenderScenes.h"
 #include "scenes/Scenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 static int s_linkToFail;   // counts down; 0: all programs link
 static bool s_incomplete;  // no framebuffer is complete

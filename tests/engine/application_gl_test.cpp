@@ -6,8 +6,8 @@
 
 #include "KtxWriter.h"
 #include "PvrWriter.h"
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

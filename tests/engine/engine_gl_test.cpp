@@ -1,7 +1,7 @@
 #include <cstring>
 
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

@@ -6,8 +6,8 @@
 #include <iterator>
 #include <string>
 
-#include "support/ImageFiles.h"
 #include "support/Capture.h"
+#include "support/ImageFiles.h"
 #include "support/PodScenes.h"
 
 namespace {

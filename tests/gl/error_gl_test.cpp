@@ -4,8 +4,8 @@
 
 #include <climits>
 
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

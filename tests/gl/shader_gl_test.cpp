@@ -3,8 +3,8 @@
 #include <cstring>
 #include <fstream>
 
-#include "support/RenderFixture.h"
 #include "support/Capture.h"
+#include "support/RenderFixture.h"
 
 namespace {
 

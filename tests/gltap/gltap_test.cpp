@@ -9,8 +9,8 @@
 #include <memory>
 #include <set>
 
-#include "support/FolderTest.h"
 #include "Headless.h"
+#include "support/FolderTest.h"
 
 namespace {
 

@@ -4,9 +4,9 @@
 #include <filesystem>
 
 #include "PvrWriter.h"
-#include "support/RenderScenes.h"
 #include "scenes/Scenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

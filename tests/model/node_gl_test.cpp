@@ -1,7 +1,7 @@
 // A model's nodes by index and by name: moving, aiming, switching, and where they are on the screen.
-#include "support/RenderScenes.h"
 #include "support/Glm.h"
 #include "support/PodScenes.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
 // The scene-node tree: its links, its matrices, and walks over wide and deep trees.
-#include "support/RenderScenes.h"
 #include "support/Glm.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

@@ -1,8 +1,8 @@
 // Textures on the screen, and pictures drawn into textures.
 #include <GLES2/gl2.h>
 
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/RenderScenes.h"
 
 namespace {
 

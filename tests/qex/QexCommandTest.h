@@ -8,10 +8,10 @@
 
 #include <cmath>
 
-#include "support/FolderTest.h"
-#include "support/ImageFiles.h"
 #include "PodBuild.h"
 #include "PvrWriter.h"
+#include "support/FolderTest.h"
+#include "support/ImageFiles.h"
 #include "support/RealFiles.h"
 
 struct CommandResult {

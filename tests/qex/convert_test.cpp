@@ -1,9 +1,9 @@
 #include <cmath>
 #include <map>
 
+#include "common/SceneBounds.h"
 #include "convert/Meshes.h"
 #include "qex/ConvertSupport.h"
-#include "common/SceneBounds.h"
 
 namespace {
 

@@ -1,7 +1,7 @@
 #include <set>
 
-#include "qex/ConvertSupport.h"
 #include "convert/Textures.h"
+#include "qex/ConvertSupport.h"
 
 namespace {
 

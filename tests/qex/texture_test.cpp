@@ -1,6 +1,6 @@
 // qex texture writes what it was given, bit by bit where the format keeps it, and reads what others wrote.
-#include "Headless.h"
 #include "common/ImageFile.h"
+#include "Headless.h"
 #include "Qex.h"
 #include "qex/QexCommandTest.h"
 #include "support/Capture.h"

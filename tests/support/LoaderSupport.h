@@ -12,8 +12,8 @@
 
 #include "gltap.h"
 #include "Headless.h"
-#include "support/ImageFiles.h"
 #include "Qex.h"
+#include "support/ImageFiles.h"
 #include "support/PodScenes.h"
 
 struct Upload {

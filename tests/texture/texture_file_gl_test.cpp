@@ -4,10 +4,10 @@
 
 #include <fstream>
 
-#include "support/ImageFiles.h"
-#include "support/RenderScenes.h"
 #include "support/Capture.h"
+#include "support/ImageFiles.h"
 #include "support/RealFiles.h"
+#include "support/RenderScenes.h"
 #include "texture/Container.h"
 
 namespace {

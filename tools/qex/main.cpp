@@ -8,11 +8,11 @@
 #include <CLI/CLI.hpp>
 
 #include "common/CommandLine.h"
+#include "common/Manual.h"
+#include "common/OutputFile.h"
 #include "convert/Command.h"
 #include "emitter/Command.h"
 #include "info/Command.h"
-#include "common/Manual.h"
-#include "common/OutputFile.h"
 #include "render/Command.h"
 #include "sheet/Command.h"
 #include "texture/Command.h"

@@ -11,6 +11,7 @@
 #include <exception>
 #include <filesystem>
 
+#include "common/OutputFile.h"
 #include "convert/Animation.h"
 #include "convert/Gltf.h"
 #include "convert/Log.h"
@@ -18,7 +19,6 @@
 #include "convert/Process.h"
 #include "convert/Scene.h"
 #include "convert/Textures.h"
-#include "common/OutputFile.h"
 #include "PodWriter.h"
 #include "texture/Overrides.h"
 

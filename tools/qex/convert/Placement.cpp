@@ -7,10 +7,10 @@
 #include <cstdio>
 #include <cstring>
 
-#include "convert/Animation.h"
 #include "common/EngineOutput.h"
 #include "common/SceneBounds.h"
 #include "common/TextureFiles.h"
+#include "convert/Animation.h"
 
 namespace {
 

@@ -14,8 +14,8 @@
 #include <cstring>
 
 #include "common/CommandLine.h"
-#include "convert/Log.h"
 #include "common/OutputFile.h"
+#include "convert/Log.h"
 
 namespace {
 

@@ -7,8 +7,8 @@
 #include <iterator>
 
 #include "common/OutputFile.h"
-#include "PodWriter.h"
 #include "common/TextureFiles.h"
+#include "PodWriter.h"
 #include "texture/Write.h"
 
 namespace fs = std::filesystem;

@@ -6,8 +6,8 @@
 #include <string>
 #include <vector>
 
-#include "convert/Log.h"
 #include "common/ImageFile.h"
+#include "convert/Log.h"
 
 struct aiScene;
 

@@ -6,10 +6,10 @@
 #include <CLI/CLI.hpp>
 
 #include "common/CommandLine.h"
-#include "emitter/Description.h"
 #include "common/EngineOutput.h"
 #include "common/OutputFile.h"
 #include "common/TextureFiles.h"
+#include "emitter/Description.h"
 
 namespace {
 

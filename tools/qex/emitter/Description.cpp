@@ -9,8 +9,8 @@
 #include <vector>
 
 #include "common/EngineOutput.h"
-#include "info/Info.h"
 #include "common/TextureFiles.h"
+#include "info/Info.h"
 
 namespace {
 

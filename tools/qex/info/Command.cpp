@@ -6,10 +6,10 @@
 #include <CLI/CLI.hpp>
 
 #include "common/CommandLine.h"
-#include "info/Info.h"
 #include "common/OutputFile.h"
-#include "render/Diagnosis.h"
 #include "common/TextureFiles.h"
+#include "info/Info.h"
+#include "render/Diagnosis.h"
 
 namespace {
 

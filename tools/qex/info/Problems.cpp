@@ -3,8 +3,8 @@
 #include <cstdio>
 #include <map>
 
-#include "info/Info.h"
 #include "common/SceneBounds.h"
+#include "info/Info.h"
 
 namespace {
 

@@ -7,10 +7,10 @@
 #include <set>
 
 #include "common/ImageFile.h"
-#include "info/Info.h"
-#include "info/Exporter.h"
 #include "common/SceneBounds.h"
 #include "common/TextureFiles.h"
+#include "info/Exporter.h"
+#include "info/Info.h"
 
 namespace {
 

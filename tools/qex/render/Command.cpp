@@ -9,13 +9,13 @@
 #include <vector>
 
 #include "common/EngineOutput.h"
-#include "gltap.h"
 #include "common/ImageFile.h"
+#include "common/TextureFiles.h"
+#include "gltap.h"
 #include "render/Diagnosis.h"
 #include "render/Renderer.h"
 #include "render/Report.h"
 #include "render/Textures.h"
-#include "common/TextureFiles.h"
 #include "texture/Overrides.h"
 
 namespace {

@@ -5,8 +5,8 @@
 #include <GLES2/gl2.h>
 
 #include "common/ImageFile.h"
-#include "render/Renderer.h"
 #include "common/SceneBounds.h"
+#include "render/Renderer.h"
 
 namespace {
 

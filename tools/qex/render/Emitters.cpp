@@ -6,11 +6,11 @@
 #include <optional>
 #include <vector>
 
-#include "emitter/Description.h"
 #include "common/EngineOutput.h"
+#include "common/TextureFiles.h"
+#include "emitter/Description.h"
 #include "render/Textures.h"
 #include "Scenes.h"
-#include "common/TextureFiles.h"
 #include "texture/Write.h"
 
 namespace {

@@ -4,8 +4,8 @@
 
 #include <GLES2/gl2.h>
 
-#include "render/Textures.h"
 #include "common/SceneBounds.h"
+#include "render/Textures.h"
 #include "Scenes.h"
 
 namespace {

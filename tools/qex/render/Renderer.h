@@ -7,8 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "Headless.h"
 #include "common/OutputFile.h"
+#include "Headless.h"
 #include "render/Command.h"
 #include "render/Floor.h"
 #include "render/Shading.h"

@@ -6,8 +6,8 @@
 #include <GLES2/gl2.h>
 #include <CLI/CLI.hpp>
 
-#include "info/Exporter.h"
 #include "common/TextureFiles.h"
+#include "info/Exporter.h"
 #include "texture/Overrides.h"
 #include "texture/Write.h"
 

@@ -9,8 +9,8 @@
 #include "common/CommandLine.h"
 #include "common/ImageFile.h"
 #include "common/OutputFile.h"
-#include "texture/Container.h"
 #include "common/TextureFiles.h"
+#include "texture/Container.h"
 #include "texture/Formats.h"
 #include "texture/Write.h"
 
