@@ -1,0 +1,241 @@
+/* Render state, renderer settings, shaders and programs. */
+#ifndef QEX_SHADERS_H
+#define QEX_SHADERS_H
+
+#include "Qex/pod.h"
+
+QEX_BEGIN
+
+/* ======================================================================================================
+ * Render state and renderer settings
+ *
+ * Every program change and every choice of a texture unit goes through a small cache, so that one that
+ * changes nothing reaches no GL. An application that calls glUseProgram or glActiveTexture itself must use
+ * the functions here instead, or call QexRenderState_Reset afterwards. Needs a current GL context.
+ * ====================================================================================================== */
+
+/** The cache. */
+typedef struct QexRenderState {
+    uint32_t boundTexture;  /* 0 after reset, all bits set after a change of the unit; binds are not cached */
+    uint32_t activeTexture; /* GL_TEXTURE0 + n, or all bits set: unknown */
+    uint32_t currentProgram; /* GL program, or all bits set: unknown */
+} QexRenderState;
+
+/** The process-wide cache. */
+QEX_API extern QexRenderState g_QexCachedRenderStates;
+/** Multiplies the opacity of everything that the shader modules draw; 1.0 at first. Set it with
+ *  QexRenderer_SetGlobalAlpha. */
+QEX_API extern float g_fQexGlobalAlpha;
+#ifdef QEX_UNPREFIXED_NAMES
+/** Alpha-test reference for the application; 0.95 at first. The engine does not read it. */
+QEX_API extern float g_fAlphaTestCmpValue;
+/** Specular switch for the application; 0 at first. The engine does not read it. */
+QEX_API extern uint32_t g_bSpecularOn;
+#endif
+
+/** Forgets what is cached, so that the next choices reach GL.
+ *  @param context  not read, may be null */
+QEX_API void QexRenderState_Reset(QexRuntimeContext* context);
+
+/** Makes a GL program current unless it is. @param program  GL name, 0 for none */
+QEX_API void QexRenderState_UseProgram(uint32_t program);
+
+/** Makes a texture unit active unless it is. @param unit  GL_TEXTURE0 + n */
+QEX_API void QexRenderState_ActiveTexture(uint32_t unit);
+
+/** Binds a texture on the active unit; always reaches GL.
+ *  @param target  GL_TEXTURE_2D or GL_TEXTURE_CUBE_MAP
+ *  @param name    GL name, 0 for none */
+QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
+
+/** Depth functions: how a pixel's depth has to compare with the one that is there for it to be drawn. */
+#define QEX_DEPTH_NEVER 0
+#define QEX_DEPTH_LESS 1
+#define QEX_DEPTH_EQUAL 2
+#define QEX_DEPTH_LESS_EQUAL 3 /* what scenes want */
+#define QEX_DEPTH_GREATER 4
+#define QEX_DEPTH_NOT_EQUAL 5
+#define QEX_DEPTH_GREATER_EQUAL 6
+#define QEX_DEPTH_ALWAYS 7 /* what text and pictures over a scene want */
+
+/** Culling modes: the faces that are left out. The corners of a front face run counter-clockwise. */
+#define QEX_CULL_NONE 0
+#define QEX_CULL_BACK 1
+#define QEX_CULL_FRONT 2
+#define QEX_CULL_BOTH 3
+
+/** Blending modes: what becomes of the colour that is there. */
+#define QEX_BLEND_NONE 0      /* replaced */
+#define QEX_BLEND_ALPHA 1     /* covered as far as the new one's alpha says */
+#define QEX_BLEND_ADD_ALPHA 2 /* the new one times its alpha is added */
+#define QEX_BLEND_ADD 3       /* the new one is added */
+
+/** As alphaMode of QexRenderer_SetAlphaBlendModeSeparate: the alpha that is there stays. */
+#define QEX_BLEND_KEEP_ALPHA 0
+
+/** Blend factors of QexRenderer_SetBlendFactor, GL's own. */
+#define QEX_FACTOR_ZERO 0x0000u
+#define QEX_FACTOR_ONE 0x0001u
+#define QEX_FACTOR_SRC_COLOR 0x0300u
+#define QEX_FACTOR_ONE_MINUS_SRC_COLOR 0x0301u
+#define QEX_FACTOR_SRC_ALPHA 0x0302u
+#define QEX_FACTOR_ONE_MINUS_SRC_ALPHA 0x0303u
+#define QEX_FACTOR_DST_ALPHA 0x0304u
+#define QEX_FACTOR_ONE_MINUS_DST_ALPHA 0x0305u
+#define QEX_FACTOR_DST_COLOR 0x0306u
+#define QEX_FACTOR_ONE_MINUS_DST_COLOR 0x0307u
+#define QEX_FACTOR_SRC_ALPHA_SATURATE 0x0308u
+
+/** Enables the depth test and sets its function.
+ *  @param mode  QEX_DEPTH_...; any other keeps the function */
+QEX_API void QexRenderer_SetZTestFunc(uint32_t mode);
+
+/** Switches depth writes. @param flag  0 off, any other on */
+QEX_API void QexRenderer_SetZWrite(int32_t flag);
+
+/** Sets face culling. @param mode  QEX_CULL_...; any other is ignored */
+QEX_API void QexRenderer_SetBackFaceCulling(int32_t mode);
+
+/** Sets GL's blend factors without enabling blending. @param source, destination  QEX_FACTOR_... */
+QEX_API void QexRenderer_SetBlendFactor(uint32_t source, uint32_t destination);
+
+/** Sets blending. @param mode  QEX_BLEND_NONE to QEX_BLEND_ADD; any other is ignored */
+QEX_API void QexRenderer_SetAlphaBlendMode(int32_t mode);
+
+/** Sets blending apart for colour and alpha.
+ *  @param mode       as QexRenderer_SetAlphaBlendMode
+ *  @param alphaMode  QEX_BLEND_ALPHA to QEX_BLEND_ADD likewise for the alpha channel; any other is
+ *                    QEX_BLEND_KEEP_ALPHA */
+QEX_API void QexRenderer_SetAlphaBlendModeSeparate(int32_t mode, uint32_t alphaMode);
+
+/** Sets g_fQexGlobalAlpha. @return the value before. No GL context needed. */
+QEX_API float QexRenderer_SetGlobalAlpha(float alpha);
+
+/** Sets g_fAlphaTestCmpValue. No GL context needed. */
+QEX_API void QexRenderer_SetAlphaTestCmpValue(float value);
+
+/** Sets g_bSpecularOn. No GL context needed. */
+QEX_API void QexRenderer_EnableSpecular(uint32_t flag);
+
+/** Draws triangles from the bound element array buffer of 16-bit indices, from its start.
+ *  @param ignored  not read
+ *  @param count    indices */
+QEX_API void QexRenderer_Draw(uint32_t ignored, int32_t count);
+
+/* ======================================================================================================
+ * Shaders and programs
+ *
+ * From GLSL ES 1.00 text to a linked program. Needs a current GL context.
+ * ====================================================================================================== */
+
+/** Compiles a shader.
+ *  @param shader  out, the GL shader object, which exists even when compiling fails
+ *  @param source  GLSL ES text
+ *  @param type    GL_VERTEX_SHADER or GL_FRAGMENT_SHADER
+ *  @return 0, or -1 when it does not compile (nothing is printed). */
+QEX_API int32_t QexShader_Create(uint32_t* shader, const char* source, uint32_t type);
+
+/** Compiles a shader with "#define NAME" lines in front.
+ *  @param defines      the names, may be null when there are none
+ *  @param defineCount  their number
+ *  @return as QexShader_Create; -1, with a line in the log and no shader object (0), when lines, text and the
+ *  closing NUL exceed 4,096 bytes. */
+QEX_API int32_t QexShader_CreateFromMemEx(uint32_t* shader, const char* source, uint32_t type,
+                                          const char* const* defines, uint32_t defineCount);
+
+/** QexShader_CreateFromMemEx on the contents of a file.
+ *  @return as that, or -1 (with a line printed) when the file cannot be read. */
+QEX_API int32_t QexShader_CreateFromFileEx(uint32_t* shader, const char* path, uint32_t type,
+                                           const char* const* defines, uint32_t defineCount);
+
+/** Loads a precompiled shader with glShaderBinary; a GL error is fatal.
+ *  @param length  bytes of binary
+ *  @param format  GL binary format
+ *  @return 0. */
+QEX_API int32_t QexShader_CreateWithBinary(uint32_t* shader, const void* binary, int32_t length,
+                                           uint32_t format, uint32_t type);
+
+/** Size of the log buffer of QexShader_CreateProgram, in bytes. */
+#define QEX_SHADER_LOG_SIZE 256
+
+/** Links a program and makes it current.
+ *  @param program         out, the GL program object, which exists even when linking fails
+ *  @param attributes      names bound to the attribute indices 0, 1, ...; may be null when the count is 0
+ *  @param attributeCount  their number; 0 or less binds none
+ *  @param log             QEX_SHADER_LOG_SIZE bytes that receive the link log (cut to fit, empty when linking
+ *                         succeeds), or null
+ *  @return 0, or -1 when linking fails. */
+QEX_API int32_t QexShader_CreateProgram(uint32_t* program, uint32_t vertexShader, uint32_t fragmentShader,
+                                        const char* const* attributes, int32_t attributeCount, char* log);
+
+/** Types of QexShaderProgram. */
+#define QEX_PROGRAM_TEXTURE_COLOUR 1 /* attributes 0 inVertex, 1 inNormal, 2 inColor, 3 inTexCoord */
+#define QEX_PROGRAM_TEXTURE_LIGHT 2  /* attributes 0 inVertex, 1 inNormal, 2 inTexCoord */
+
+/** A ready-made program for geometry that the application draws itself: textured and vertex-coloured, or
+ *  textured and lit by one directional light. Its texture is on unit 0; the application sets the uniforms. */
+typedef struct QexShaderProgram {
+    uint32_t type;             /* QEX_PROGRAM_..., as given to create */
+    uint32_t program;          /* GL program */
+    int32_t mvpMatrixLoc;      /* "MVPMatrix", mat4 */
+    int32_t lightDirectionLoc; /* "LightDirection", vec3 in object space (QEX_PROGRAM_TEXTURE_LIGHT) */
+    int32_t lightColorLoc;     /* "LightColor", vec3 (QEX_PROGRAM_TEXTURE_LIGHT) */
+    int32_t globalAlphaLoc;    /* "GlobalAlpha", float (QEX_PROGRAM_TEXTURE_LIGHT) */
+} QexShaderProgram;
+
+/** Creates a ready-made program.
+ *  @param record  out; its type is stored even when it is not one
+ *  @param type    QEX_PROGRAM_TEXTURE_COLOUR or QEX_PROGRAM_TEXTURE_LIGHT
+ *  @return 0, or -1 for another type. The shaders of the last created record belong to all of them: releasing
+ *  any record deletes them, which harms no linked program. */
+QEX_API int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type);
+
+/** Makes the record's program current, or none. @param record  may be null: program 0 */
+QEX_API void QexShaderProgram_Apply(const QexShaderProgram* record);
+
+/** Deletes the record's program, then the shaders of the last created one. The record keeps its values. */
+QEX_API void QexShaderProgram_Release(QexShaderProgram* record);
+
+/** Numbers of the built-in shader modules. */
+typedef enum QexShaderKind {
+    QEX_SHADER_TEXTURE = 1,
+    QEX_SHADER_TEXTURE_NOALPHA = 2,
+    QEX_SHADER_UV_DISPLACEMENT = 3,
+    QEX_SHADER_GOURAUD = 7,
+    QEX_SHADER_GOURAUD_SHADOW = 8,
+    QEX_SHADER_GOURAUD_NORMALMAP = 9,
+    QEX_SHADER_GOURAUD_SPECULAR = 10,
+    QEX_SHADER_SKINNING_TEXTURE = 11,
+    QEX_SHADER_SKINNING_GOURAUD = 12,
+    QEX_SHADER_SKINNING_GOURAUD_NORMALMAP = 13,
+    QEX_SHADER_SKINNING_GOURAUD_SPECULAR = 14,
+    QEX_SHADER_SKINNING_TEXTURE_NOALPHA = 16,
+    QEX_SHADER_GOURAUD_SHADOW_EXT = 17
+} QexShaderKind;
+
+/** Creates a built-in shader module by number.
+ *  @param kind  a QexShaderKind
+ *  @return the module, owned by the caller until QexShaders_ReleaseShaderProgram; null when there is none of
+ *  that number in this build. */
+QEX_API QexShaderModule* QexShaders_CreateShaderProgram(uint32_t kind);
+
+/** Releases a module by number. The caller's pointer is not cleared.
+ *  @param module  may be null: nothing happens
+ *  @param kind    the number it was created with; another value does nothing */
+QEX_API void QexShaders_ReleaseShaderProgram(QexShaderModule* module, uint32_t kind);
+
+/** @return the module's alpha threshold, 0.0 for a null module or an unknown number. */
+QEX_API float QexShaders_GetShaderAlphaThreshold(QexShaderModule* module, uint32_t kind);
+
+/** Sets the module's alpha threshold; ignored for a null module or an unknown number. */
+QEX_API void QexShaders_SetShaderAlphaThreshold(QexShaderModule* module, uint32_t kind, float threshold);
+
+/** Reads the texture-coordinate shift of a QEX_SHADER_UV_DISPLACEMENT module; other kinds write nothing. */
+QEX_API void QexShaders_GetShaderUVDisplacement(QexShaderModule* module, uint32_t kind, float* u, float* v);
+
+/** Sets the texture-coordinate shift of a QEX_SHADER_UV_DISPLACEMENT module; other kinds are ignored. */
+QEX_API void QexShaders_SetShaderUVDisplacement(QexShaderModule* module, uint32_t kind, float u, float v);
+
+QEX_END
+
+#endif
