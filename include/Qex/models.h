@@ -3,8 +3,8 @@
 #define QEX_MODELS_H
 
 #include "Qex/pod_animation.h"
-#include "Qex/textures.h"
 #include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 QEX_BEGIN
 

@@ -39,6 +39,9 @@ typedef union QexShaderSlot {
 
 #define QEX_SHADER_SLOTS 28
 
+/** Most bones in a batch that the skinned modules draw. */
+#define QEX_MAX_BATCH_BONES 16
+
 /** A module. The slots hold the uniform locations in the module's own order, then its parameters. */
 struct QexShaderModule {
     QexShaderRenderFn render; /* draws a node */
@@ -48,434 +51,286 @@ struct QexShaderModule {
     QexShaderSlot slots[QEX_SHADER_SLOTS];
 };
 
-/* QexTextureShader (QEX_SHADER_TEXTURE): unlit, diffuse texture, alpha from the red of the alpha texture. It
- * takes a node whose material has an alpha texture out of the opaque pass.
- * Slots: mvpMatrix, opacity, alphaThreshold locations; the threshold. */
+/* Every module that draws nodes has these functions; NAME is the module's, such as QexGouraudShader:
+ * - NAME_CreateProgram() creates the module, threshold 0.5. It returns it, owned by the caller, or null when
+ *   memory runs out.
+ * - NAME_SetupProgram(module) compiles and links into a module's record, in place of what it holds;
+ *   CreateProgram calls it. It returns 0.
+ * - NAME_Release(module) deletes the module's GL objects, frees it and sets the caller's pointer to null. A
+ *   null module is fine.
+ * - NAME_SetAlphaThreshold(module, threshold) and NAME_GetAlphaThreshold(module) are about the alpha
+ *   threshold, used from the next Render on; in modules that have one.
+ * - NAME_DrawMesh(module, model, nodeIndex) draws a node's geometry; the module's program is current and its
+ *   uniforms set. It returns 0. Skinned modules draw the node's bone batches and take a modelMatrix as well,
+ *   applied in front of the bone matrices; it may be null.
+ * - NAME_Render(...) draws a node, see QexShaderRenderFn.
+ *
+ * What a module adds or leaves out is said at its name, with its number, by which
+ * QexShaders_CreateShaderProgram makes it. "Slots" are what the record's slots hold, in order: locations of
+ * the uniforms, then the parameters. */
 
-/** Creates the unlit texture module, threshold 0.5. @return the module, owned by the caller; null when memory
- *  runs out. */
+/** QexTextureShader (QEX_SHADER_TEXTURE): unlit, diffuse texture, alpha from the red of the alpha texture. It
+ *  takes a node whose material has an alpha texture out of the opaque pass. Slots: mvpMatrix, opacity,
+ *  alphaThreshold locations; the threshold. */
 QEX_API QexShaderModule* QexTextureShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexTextureShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexTextureShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexTextureShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexTextureShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexTextureShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexTextureShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                      const QexLightSet* lights, const QexMatrix* modelMatrix,
                                      const QexMatrix* view, const QexMatrix* projection,
                                      const QexShadowInfo* shadow);
 
-/* QexTextureNoAlphaShader (QEX_SHADER_TEXTURE_NOALPHA): unlit, alpha from the diffuse texture's own alpha. It
- * never changes a node's pass; a node without a material keeps what is bound on unit 0.
- * Slots: mvpMatrix, opacity, alphaThreshold locations; the threshold. */
-
-/** Creates the unlit module without alpha texture, threshold 0.5. @return as QexTextureShader_CreateProgram.
- */
+/** QexTextureNoAlphaShader (QEX_SHADER_TEXTURE_NOALPHA): unlit, alpha from the diffuse texture's own alpha.
+ *  It never changes a node's pass; a node without a material keeps what is bound on unit 0. Slots: mvpMatrix,
+ *  opacity, alphaThreshold locations; the threshold. */
 QEX_API QexShaderModule* QexTextureNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexTextureNoAlphaShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexTextureNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexTextureNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                  uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                             const QexLightSet* lights, const QexMatrix* modelMatrix,
                                             const QexMatrix* view, const QexMatrix* projection,
                                             const QexShadowInfo* shadow);
 
-/* QexSkinningTextureShader (QEX_SHADER_SKINNING_TEXTURE): as QexTextureShader for meshes that follow bones,
- * one draw a bone batch, up to 16 bones a batch and 4 a vertex; other meshes are not drawn. It leaves the
- * node's pass alone. Slots: boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations;
- * the threshold. */
-
-/** Most bones in a batch that the skinned modules draw. */
-#define QEX_MAX_BATCH_BONES 16
-
-/** Creates the unlit skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexSkinningTextureShader (QEX_SHADER_SKINNING_TEXTURE): as QexTextureShader for meshes that follow bones,
+ *  one draw a bone batch, up to 16 bones a batch and 4 a vertex; other meshes are not drawn. It leaves the
+ *  node's pass alone. Slots: boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations;
+ *  the threshold. */
 QEX_API QexShaderModule* QexSkinningTextureShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningTextureShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningTextureShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningTextureShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningTextureShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's batches; the module's program is current and its uniforms set.
- *  @param modelMatrix  applied in front of the bone matrices, or null
- *  @return 0. */
 QEX_API int32_t QexSkinningTextureShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                   uint32_t nodeIndex, const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningTextureShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
                                              const QexMatrix* view, const QexMatrix* projection,
                                              const QexShadowInfo* shadow);
 
-/* QexSimpleShader: flat white, a mask; no textures, no threshold. Slots: mvpMatrix location. */
-
-/** Creates the flat white module. @return as QexTextureShader_CreateProgram. */
+/** QexSimpleShader: flat white, a mask; no textures, no threshold. Slots: mvpMatrix location. */
 QEX_API QexShaderModule* QexSimpleShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSimpleShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSimpleShader_Release(QexShaderModule** module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexSimpleShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSimpleShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                     const QexLightSet* lights, const QexMatrix* modelMatrix,
                                     const QexMatrix* view, const QexMatrix* projection,
                                     const QexShadowInfo* shadow);
 
-/* QexUVDisplacementShader (QEX_SHADER_UV_DISPLACEMENT): as QexTextureShader with the texture coordinates
- * shifted by an amount that may change from frame to frame. Slots: displacement, mvpMatrix, opacity,
- * alphaThreshold locations; shift u, shift v, threshold. */
-
-/** Creates the unlit module with shifted texture coordinates, threshold 0.5, shift (0, 0). @return as
- * QexTextureShader_CreateProgram. */
+/** QexUVDisplacementShader (QEX_SHADER_UV_DISPLACEMENT): as QexTextureShader with the texture coordinates
+ *  shifted by an amount that may change from frame to frame. The shift is in texture widths and heights,
+ *  (0, 0) at first. Slots: displacement, mvpMatrix, opacity, alphaThreshold locations; shift u, shift v,
+ *  threshold. */
 QEX_API QexShaderModule* QexUVDisplacementShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexUVDisplacementShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexUVDisplacementShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexUVDisplacementShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexUVDisplacementShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Sets the shift, in texture widths and heights, used from the next Render on. */
 QEX_API void QexUVDisplacementShader_SetDisplacement(QexShaderModule* module, float u, float v);
-/** Returns the shift through u and v. */
 QEX_API void QexUVDisplacementShader_GetDisplacement(const QexShaderModule* module, float* u, float* v);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexUVDisplacementShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                  uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexUVDisplacementShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                             const QexLightSet* lights, const QexMatrix* modelMatrix,
                                             const QexMatrix* view, const QexMatrix* projection,
                                             const QexShadowInfo* shadow);
 
-/* QexUVDisplacementNoAlphaShader (no kind): as QexTextureNoAlphaShader with shifted texture coordinates.
- * Slots as QexUVDisplacementShader. */
-
-/** Creates the unlit module with shifted texture coordinates and without alpha texture, threshold 0.5, shift
- * (0, 0). @return as QexTextureShader_CreateProgram. */
+/** QexUVDisplacementNoAlphaShader (no kind): as QexTextureNoAlphaShader with shifted texture coordinates.
+ *  Slots as QexUVDisplacementShader. */
 QEX_API QexShaderModule* QexUVDisplacementNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexUVDisplacementNoAlphaShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexUVDisplacementNoAlphaShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexUVDisplacementNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexUVDisplacementNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Sets the shift, in texture widths and heights, used from the next Render on. */
 QEX_API void QexUVDisplacementNoAlphaShader_SetDisplacement(QexShaderModule* module, float u, float v);
-/** Returns the shift through u and v. */
 QEX_API void QexUVDisplacementNoAlphaShader_GetDisplacement(const QexShaderModule* module, float* u,
                                                             float* v);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexUVDisplacementNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                         uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexUVDisplacementNoAlphaShader_Render(QexShaderModule* module, QexModel* model,
                                                    uint32_t nodeIndex, const QexLightSet* lights,
                                                    const QexMatrix* modelMatrix, const QexMatrix* view,
                                                    const QexMatrix* projection, const QexShadowInfo* shadow);
 
-/* QexGouraudShader (QEX_SHADER_GOURAUD): lit per vertex: texture times (diffuse light times the material's
- * diffuse colour, plus its ambient colour). Diffuse light is the sum over the first three lights of max(0, N
- * . L) times the light's colour; it does not fall off with distance. Like all lit modules it takes a node
- * whose material has an alpha texture out of the opaque pass; a null light set is an empty one. Slots:
- * transMatrix, normalMatrix, mvpMatrix, lightCount, lightType, lightPosDir, lightColor, sceneAmbient,
- * sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
-
-/** Creates the module lit per vertex, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexGouraudShader (QEX_SHADER_GOURAUD): lit per vertex: texture times (diffuse light times the material's
+ *  diffuse colour, plus its ambient colour). Diffuse light is the sum over the first three lights of max(0, N
+ *  . L) times the light's colour; it does not fall off with distance. Like all lit modules it takes a node
+ *  whose material has an alpha texture out of the opaque pass; a null light set is an empty one. Slots:
+ *  transMatrix, normalMatrix, mvpMatrix, lightCount, lightType, lightPosDir, lightColor, sceneAmbient,
+ *  sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
 QEX_API QexShaderModule* QexGouraudShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexGouraudShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexGouraudShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexGouraudShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexGouraudShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexGouraudShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                      const QexLightSet* lights, const QexMatrix* modelMatrix,
                                      const QexMatrix* view, const QexMatrix* projection,
                                      const QexShadowInfo* shadow);
 
-/* QexGouraudSpecularShader (QEX_SHADER_GOURAUD_SPECULAR): as QexGouraudShader plus highlights per fragment:
- * the material's specular colour times the sum over three lights of pow(N . H, 256 * shininess) times the
- * light's colour, H halfway between light and camera. The camera is taken to stand at the negated translation
- * of the view matrix. Slots: as QexGouraudShader, with cameraPos before lightCount, sceneSpecular and
- * shininess before opacity. */
-
-/** Creates the lit module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexGouraudSpecularShader (QEX_SHADER_GOURAUD_SPECULAR): as QexGouraudShader plus highlights per fragment:
+ *  the material's specular colour times the sum over three lights of pow(N . H, 256 * shininess) times the
+ *  light's colour, H halfway between light and camera. The camera is taken to stand at the negated
+ *  translation of the view matrix. Slots: as QexGouraudShader, with cameraPos before lightCount,
+ *  sceneSpecular and shininess before opacity. */
 QEX_API QexShaderModule* QexGouraudSpecularShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexGouraudSpecularShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudSpecularShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexGouraudSpecularShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexGouraudSpecularShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexGouraudSpecularShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                   uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexGouraudSpecularShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
                                              const QexMatrix* view, const QexMatrix* projection,
                                              const QexShadowInfo* shadow);
 
-/* QexGouraudNormalMapShader (QEX_SHADER_GOURAUD_NORMALMAP): as QexGouraudShader, lit per fragment with a
- * tangent-space normal map on unit 1, whose texels hold the normal's x in green, y in red, z in blue, from -1
- * to 1 as 0 to 1. The module binds the blank map; a real one comes from the model's bindTextureHook. Meshes
- * need tangents; where they have those and normals, but no binormals, QexModel_DownloadGeometry makes them.
- * Slots as QexGouraudShader. */
-
-/** Creates the normal-mapped module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexGouraudNormalMapShader (QEX_SHADER_GOURAUD_NORMALMAP): as QexGouraudShader, lit per fragment with a
+ *  tangent-space normal map on unit 1, whose texels hold the normal's x in green, y in red, z in blue, from
+ *  -1 to 1 as 0 to 1. The module binds the blank map; a real one comes from the model's bindTextureHook.
+ *  Meshes need tangents; where they have those and normals, but no binormals, QexModel_DownloadGeometry makes
+ *  them. Slots as QexGouraudShader. */
 QEX_API QexShaderModule* QexGouraudNormalMapShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudNormalMapShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexGouraudNormalMapShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexGouraudNormalMapShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexGouraudNormalMapShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                    uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexGouraudNormalMapShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                               const QexLightSet* lights, const QexMatrix* modelMatrix,
                                               const QexMatrix* view, const QexMatrix* projection,
                                               const QexShadowInfo* shadow);
 
-/* QexGouraudShadowShader (QEX_SHADER_GOURAUD_SHADOW): as QexGouraudShader, with the diffuse part of shadowed
- * fragments times the shadow intensity. A fragment is in shadow when it faces the shadow light, lies within
- * the shadow map, and the map holds a depth below its own less the bias. Null shadow parameters mean no
- * shadow. Slots: as QexGouraudShader, then shadowLightDir, shadowSpaceMatrix, biasValue, shadowIntensity; the
- * threshold. */
-
-/** Creates the shadow-receiving module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexGouraudShadowShader (QEX_SHADER_GOURAUD_SHADOW): as QexGouraudShader, with the diffuse part of shadowed
+ *  fragments times the shadow intensity. A fragment is in shadow when it faces the shadow light, lies within
+ *  the shadow map, and the map holds a depth below its own less the bias. Null shadow parameters mean no
+ *  shadow. Slots: as QexGouraudShader, then shadowLightDir, shadowSpaceMatrix, biasValue, shadowIntensity;
+ *  the threshold. */
 QEX_API QexShaderModule* QexGouraudShadowShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexGouraudShadowShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShadowShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexGouraudShadowShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexGouraudShadowShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexGouraudShadowShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexGouraudShadowShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                            const QexLightSet* lights, const QexMatrix* modelMatrix,
                                            const QexMatrix* view, const QexMatrix* projection,
                                            const QexShadowInfo* shadow);
 
-/* QexGouraudShadowExtShader (QEX_SHADER_GOURAUD_SHADOW_EXT): as QexGouraudShadowShader, with shadows that
- * lighten with the distance between what casts and what receives them: intensity + depth difference * fade,
- * from 0 to 1. Slots: as QexGouraudShadowShader to shadowIntensity (14), then the location of shadowFade
- * (15), the threshold (16) and the fade (17). */
-
-/** Creates the module that receives fading shadows, threshold 0.5, fade 1. @return as
- * QexTextureShader_CreateProgram. */
+/** QexGouraudShadowExtShader (QEX_SHADER_GOURAUD_SHADOW_EXT): as QexGouraudShadowShader, with shadows that
+ *  lighten with the distance between what casts and what receives them: intensity + depth difference * fade,
+ *  from 0 to 1. The fade, 1 at first, is in brightness per unit of shadow-map depth. Slots: as
+ *  QexGouraudShadowShader to shadowIntensity (14), then the location of shadowFade (15), the threshold (16)
+ *  and the fade (17). */
 QEX_API QexShaderModule* QexGouraudShadowExtShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexGouraudShadowExtShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexGouraudShadowExtShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexGouraudShadowExtShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexGouraudShadowExtShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Sets how fast shadows lighten, in brightness per unit of shadow-map depth, used from the next Render on.
- */
 QEX_API void QexGouraudShadowExtShader_SetShadowFade(QexShaderModule* module, float fade);
-/** @return the fade. */
 QEX_API float QexGouraudShadowExtShader_GetShadowFade(const QexShaderModule* module);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexGouraudShadowExtShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                    uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexGouraudShadowExtShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                               const QexLightSet* lights, const QexMatrix* modelMatrix,
                                               const QexMatrix* view, const QexMatrix* projection,
                                               const QexShadowInfo* shadow);
 
-/* QexSkinningTextureNoAlphaShader (QEX_SHADER_SKINNING_TEXTURE_NOALPHA): as QexTextureNoAlphaShader for
- * meshes that follow bones; the model's bindTextureHook is not asked. Slots as QexSkinningTextureShader. */
-
-/** Creates the unlit skinned module without alpha texture, threshold 0.5. @return as
- * QexTextureShader_CreateProgram. */
+/** QexSkinningTextureNoAlphaShader (QEX_SHADER_SKINNING_TEXTURE_NOALPHA): as QexTextureNoAlphaShader for
+ *  meshes that follow bones; the model's bindTextureHook is not asked. Slots as QexSkinningTextureShader. */
 QEX_API QexShaderModule* QexSkinningTextureNoAlphaShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningTextureNoAlphaShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningTextureNoAlphaShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningTextureNoAlphaShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningTextureNoAlphaShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
 QEX_API int32_t QexSkinningTextureNoAlphaShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                          uint32_t nodeIndex, const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningTextureNoAlphaShader_Render(QexShaderModule* module, QexModel* model,
                                                     uint32_t nodeIndex, const QexLightSet* lights,
                                                     const QexMatrix* modelMatrix, const QexMatrix* view,
                                                     const QexMatrix* projection, const QexShadowInfo* shadow);
 
-/* QexSkinningGouraudShader (QEX_SHADER_SKINNING_GOURAUD): as QexGouraudShader for meshes that follow bones.
- * Slots: viewProjMatrix, boneCount, boneMatrixArray, boneVecMatrixArray, lightCount, lightType, lightPosDir,
- * lightColor, sceneAmbient, sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
-
-/** Creates the lit skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexSkinningGouraudShader (QEX_SHADER_SKINNING_GOURAUD): as QexGouraudShader for meshes that follow bones.
+ *  Slots: viewProjMatrix, boneCount, boneMatrixArray, boneVecMatrixArray, lightCount, lightType, lightPosDir,
+ *  lightColor, sceneAmbient, sceneDiffuse, opacity, alphaThreshold locations; the threshold. */
 QEX_API QexShaderModule* QexSkinningGouraudShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningGouraudShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningGouraudShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningGouraudShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
 QEX_API int32_t QexSkinningGouraudShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                   uint32_t nodeIndex, const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningGouraudShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                              const QexLightSet* lights, const QexMatrix* modelMatrix,
                                              const QexMatrix* view, const QexMatrix* projection,
                                              const QexShadowInfo* shadow);
 
-/* QexSkinningGouraudSpecularShader (QEX_SHADER_SKINNING_GOURAUD_SPECULAR): highlights on meshes that follow
- * bones: all four lights count, and the highlight is multiplied by the texture. Slots: as
- * QexSkinningGouraudShader, with cameraPos before lightCount, sceneSpecular and shininess before opacity. */
-
-/** Creates the skinned module with highlights, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexSkinningGouraudSpecularShader (QEX_SHADER_SKINNING_GOURAUD_SPECULAR): highlights on meshes that follow
+ *  bones: all four lights count, and the highlight is multiplied by the texture. Slots: as
+ *  QexSkinningGouraudShader, with cameraPos before lightCount, sceneSpecular and shininess before opacity. */
 QEX_API QexShaderModule* QexSkinningGouraudSpecularShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningGouraudSpecularShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudSpecularShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningGouraudSpecularShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningGouraudSpecularShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
 QEX_API int32_t QexSkinningGouraudSpecularShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                           uint32_t nodeIndex, const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningGouraudSpecularShader_Render(QexShaderModule* module, QexModel* model,
                                                      uint32_t nodeIndex, const QexLightSet* lights,
                                                      const QexMatrix* modelMatrix, const QexMatrix* view,
                                                      const QexMatrix* projection,
                                                      const QexShadowInfo* shadow);
 
-/* QexSkinningGouraudNormalMapShader (QEX_SHADER_SKINNING_GOURAUD_NORMALMAP): as QexGouraudNormalMapShader for
- * meshes that follow bones; all four lights count. Slots as QexSkinningGouraudShader. */
-
-/** Creates the normal-mapped skinned module, threshold 0.5. @return as QexTextureShader_CreateProgram. */
+/** QexSkinningGouraudNormalMapShader (QEX_SHADER_SKINNING_GOURAUD_NORMALMAP): as QexGouraudNormalMapShader
+ *  for meshes that follow bones; all four lights count. Slots as QexSkinningGouraudShader. */
 QEX_API QexShaderModule* QexSkinningGouraudNormalMapShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningGouraudNormalMapShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningGouraudNormalMapShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningGouraudNormalMapShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningGouraudNormalMapShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
 QEX_API int32_t QexSkinningGouraudNormalMapShader_DrawMesh(QexShaderModule* module, QexModel* model,
                                                            uint32_t nodeIndex, const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningGouraudNormalMapShader_Render(QexShaderModule* module, QexModel* model,
                                                       uint32_t nodeIndex, const QexLightSet* lights,
                                                       const QexMatrix* modelMatrix, const QexMatrix* view,
                                                       const QexMatrix* projection,
                                                       const QexShadowInfo* shadow);
 
-/* QexDepthShader (no kind): depth as a grey level: 0 nearer than near, 1 beyond far, z / (far - near)
- * between, z being the clip-space z. No threshold; textures are bound and a node's pass changes as by
- * QexTextureShader. Slots: near, far, mvpMatrix locations. */
-
-/** Creates the depth module; near and far are not set yet. @return as QexTextureShader_CreateProgram. */
+/** QexDepthShader (no kind): depth as a grey level: 0 nearer than near, 1 beyond far, z / (far - near)
+ *  between, z being the clip-space z. No threshold; textures are bound and a node's pass changes as by
+ *  QexTextureShader. near and far are not set at first; SetParameters sets them, far above near, for the
+ *  module's program, which must be current. Slots: near, far, mvpMatrix locations. */
 QEX_API QexShaderModule* QexDepthShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexDepthShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexDepthShader_Release(QexShaderModule** module);
-/** Sets near and far, in clip-space z, for the module's program, which must be current. far above near. */
 QEX_API void QexDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar);
-/** Draws a node's geometry; the module's program is current and its uniforms set. @return 0. */
 QEX_API int32_t QexDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                    const QexLightSet* lights, const QexMatrix* modelMatrix,
                                    const QexMatrix* view, const QexMatrix* projection,
                                    const QexShadowInfo* shadow);
 
-/* QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha 0 where it is
- * for QexSkinningTextureShader, else 1; it leaves the node's pass alone. Slots: near, far, boneCount,
- * boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the threshold. */
-
-/** Creates the skinned depth module, threshold 0.5; near and far are not set yet. @return as
- * QexTextureShader_CreateProgram. */
+/** QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha 0 where it is for
+ *  QexSkinningTextureShader, else 1; it leaves the node's pass alone. near and far as in QexDepthShader.
+ *  Slots: near, far, boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the
+ *  threshold. */
 QEX_API QexShaderModule* QexSkinningDepthShader_CreateProgram(void);
-/** Compiles and links into a module's record, in place of what it holds; CreateProgram calls it. @return 0.
- */
 QEX_API int32_t QexSkinningDepthShader_SetupProgram(QexShaderModule* module);
-/** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexSkinningDepthShader_Release(QexShaderModule** module);
-/** Sets the alpha threshold, used from the next Render on. */
 QEX_API void QexSkinningDepthShader_SetAlphaThreshold(QexShaderModule* module, float threshold);
-/** @return the alpha threshold. */
 QEX_API float QexSkinningDepthShader_GetAlphaThreshold(const QexShaderModule* module);
-/** Sets near and far, in clip-space z, for the module's program, which must be current. far above near. */
 QEX_API void QexSkinningDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar);
-/** Draws a node's batches; as QexSkinningTextureShader_DrawMesh. @return 0. */
 QEX_API int32_t QexSkinningDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                                 const QexMatrix* modelMatrix);
-/** Draws a node, see QexShaderRenderFn. */
 QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,
                                            const QexLightSet* lights, const QexMatrix* modelMatrix,
                                            const QexMatrix* view, const QexMatrix* projection,
@@ -492,7 +347,7 @@ QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* mo
 /** Creates the blur module with sigma 5, 9 samples, steps of a pixel of the screen, for the upper left
  *  quarter of the screen.
  *  @param context  its size is the screen's, 1 and more
- *  @return as QexTextureShader_CreateProgram. */
+ *  @return the module, owned by the caller; null when memory runs out. */
 QEX_API QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context);
 /** Compiles and links into a module's record, whose projection is set; CreateProgram calls it. @return 0. */
 QEX_API int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module,
@@ -516,7 +371,7 @@ QEX_API void QexBlurShader_SetParameters(QexShaderModule* module, const void* ig
 
 /** Creates the depth-of-field module; focus and range are not set yet. Its projection shows the whole screen.
  *  @param context  its size is the screen's, 1 and more
- *  @return as QexTextureShader_CreateProgram. */
+ *  @return the module, owned by the caller; null when memory runs out. */
 QEX_API QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context);
 /** Compiles and links into a module's record, with the projection of the module created last; CreateProgram
  *  calls it. @param context  not read  @return 0. */
