@@ -2,7 +2,7 @@
 
 #include <cstring>
 
-#include "gl/Shader.h"
+#include "gl/Program.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
 

@@ -3,7 +3,7 @@
 // two depth modules; the copy program, which shows a target as it is, is made here.
 #include "gl/GL.h"
 #include "gl/RenderTarget.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 

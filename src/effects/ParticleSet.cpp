@@ -1,6 +1,6 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 
 #define QEX_MODULE "src/QexParticle"
 

@@ -1,6 +1,6 @@
 #include "effects/SkyPrograms.h"
 
-#include "gl/Shader.h"
+#include "gl/Program.h"
 
 #define QEX_MODULE "src/QexSkyBox"
 

@@ -1,4 +1,4 @@
-#include "gl/Shader.h"
+#include "gl/Program.h"
 
 #include <cstring>
 

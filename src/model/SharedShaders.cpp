@@ -2,7 +2,7 @@
 
 #include "gl/GL.h"
 #include "gl/RenderTarget.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 #include "model/Model.h"
 
 #define QEX_MODULE "src/QexModel"

@@ -2,7 +2,7 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 #include "math/Float4.h"
 
 #define QEX_MODULE "src/QexBillboard"

@@ -7,7 +7,7 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 #include "overlay/FontLatin.h"
 
 #define QEX_MODULE "src/QexFont"

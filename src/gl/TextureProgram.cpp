@@ -1,5 +1,5 @@
 #include "gl/GL.h"
-#include "gl/Shader.h"
+#include "gl/Program.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
 
