@@ -2,12 +2,11 @@
 #include <cstring>
 
 #include "math/Float4.h"
+#include "math/Pi.h"
 
 const QexMatrix g_sMatIdentity = {{1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}};
 
 namespace {
-
-constexpr double kPi = 3.141592653589793;
 
 // m * (x, y, z, w) as the sum of the scaled columns.
 Float4 Combine(const QexMatrix* m, float x, float y, float z, float w) {
@@ -19,12 +18,12 @@ struct SinCos {
 };
 
 SinCos SinCosDegrees(float degrees) {
-    const double radians = degrees * kPi / 180;
+    const double radians = degrees * kQexPi / 180;
     return {static_cast<float>(sin(radians)), static_cast<float>(cos(radians))};
 }
 
 float Degrees(double radians) {
-    return static_cast<float>(radians / kPi * 180);
+    return static_cast<float>(radians / kQexPi * 180);
 }
 
 // Between unit vectors. The arc cosine of the dot product alone would lose small angles.

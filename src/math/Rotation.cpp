@@ -1,6 +1,7 @@
 #include <cmath>
 
 #include "math/Float4.h"
+#include "math/Pi.h"
 
 namespace {
 
@@ -22,8 +23,6 @@ inline float SineRatio(float x) {
     return low + (2.75252698e-6f - 2.38892177e-8f * x) * (x2 * x2);
 }
 
-constexpr double kPi = 3.141592653589793;
-
 struct Euler {
     double x, y, z;
 };
@@ -33,9 +32,9 @@ double SquaredSum(const Euler& e) {
 }
 
 void StoreDegrees(float* out, const Euler& e) {
-    out[0] = static_cast<float>(e.x * 180 / kPi);
-    out[1] = static_cast<float>(e.y * 180 / kPi);
-    out[2] = static_cast<float>(e.z * 180 / kPi);
+    out[0] = static_cast<float>(e.x * 180 / kQexPi);
+    out[1] = static_cast<float>(e.y * 180 / kQexPi);
+    out[2] = static_cast<float>(e.z * 180 / kQexPi);
 }
 
 float ColumnLength(const float* column) {
@@ -143,9 +142,9 @@ void QexMatrix_ToEulerAnglesXYZ(const QexMatrix* m, float* out) {
     const float* e = m->m;
     const double y = -asin(Clamped(e[2]));
     Euler angles = {0, y, 0};
-    if (y >= kPi / 2) {
+    if (y >= kQexPi / 2) {
         angles.x = -Atan2(e[4], e[5]);
-    } else if (y > -kPi / 2) {
+    } else if (y > -kQexPi / 2) {
         angles.x = -Atan2(-e[6], e[10]);
         angles.z = -Atan2(-e[1], e[0]);
     } else {
@@ -161,13 +160,13 @@ int32_t GetRotationXYZFromRotationMatrix(const QexMatrix* m, float* out1, float*
     const float* e = m->m;
     Euler first, second;
     if (e[2] <= -1) {
-        first = second = {Atan2(e[4], e[8]), kPi / 2, 0};
+        first = second = {Atan2(e[4], e[8]), kQexPi / 2, 0};
     } else if (e[2] >= 1) {
-        first = second = {Atan2(-e[4], -e[8]), -kPi / 2, 0};
+        first = second = {Atan2(-e[4], -e[8]), -kQexPi / 2, 0};
     } else {
         const double y = -asin(static_cast<double>(e[2]));
         first = SolveEuler(e, y);
-        second = SolveEuler(e, kPi - y);
+        second = SolveEuler(e, kQexPi - y);
     }
     const int32_t nearer = SquaredSum(first) < SquaredSum(second) ? 1 : 2;
     StoreDegrees(out1, first);

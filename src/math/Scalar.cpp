@@ -1,11 +1,13 @@
 #include <cfloat>
 #include <cmath>
 
+#include "math/Pi.h"
 #include "Qex.h"
 
 namespace {
 
-constexpr float kPi = 3.1415927f, kTwoPi = 6.2831855f, kHalfPi = 1.5707964f, kSixthPi = 0.5235988f;
+constexpr float kPi = static_cast<float>(kQexPi), kTwoPi = static_cast<float>(2 * kQexPi);
+constexpr float kHalfPi = static_cast<float>(kQexPi / 2), kSixthPi = static_cast<float>(kQexPi / 6);
 constexpr float kSqrt3 = 1.7320508f;
 
 // Arc tangent of t >= 0: folded into 0..tan(15 degrees), where `terms` terms of the series are enough.

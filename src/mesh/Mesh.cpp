@@ -7,12 +7,13 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "math/Pi.h"
 
 #define QEX_MODULE "src/QexMesh"
 
 namespace {
 
-constexpr float kPi = 3.1415927f;
+constexpr float kPi = static_cast<float>(kQexPi);
 
 // Writes a shape's vertices and triangles one after the other.
 class Builder {

@@ -1,12 +1,12 @@
 #include <cmath>
 
+#include "math/Pi.h"
 #include "Qex.h"
 
 namespace {
 
 constexpr int32_t kUnknownName = -1;
 constexpr int32_t kIndexOutOfRange = -12;
-constexpr double kPi = 3.141592653589793;
 
 // A name's index, beyond all nodes when no node has it.
 uint32_t IndexOf(const QexModel* model, const char* name) {
@@ -133,11 +133,11 @@ void QexModel_SetNodeFaceTo(QexModel* model, uint32_t nodeIndex, const QexVec3* 
     // Along the Z axis, or as near as floats tell, any axis across it will do.
     if (sine < 1e-6) axis = {0, 1, 0};
     QexMatrix rotation;
-    QexMatrix_RotateAngelAxis(&rotation, static_cast<float>(-angle / kPi * 180), axis.x, axis.y, axis.z);
+    QexMatrix_RotateAngelAxis(&rotation, static_cast<float>(-angle / kQexPi * 180), axis.x, axis.y, axis.z);
 
     float radians[3], degrees[3];
     QexMatrix_ToEulerAnglesXYZ(&rotation, radians);
-    for (int i = 0; i < 3; ++i) degrees[i] = static_cast<float>(radians[i] * 180.0 / kPi);
+    for (int i = 0; i < 3; ++i) degrees[i] = static_cast<float>(radians[i] * 180.0 / kQexPi);
     QexModel_SetNodeRotation(model, nodeIndex, degrees[0], degrees[1], degrees[2]);
 }
 
