@@ -1,3 +1,4 @@
+// One direction of a Gaussian blur over the screen.
 #include <cstring>
 
 #include "Shaders/QexGLSL.h"
@@ -47,8 +48,9 @@ const QexShaderModuleType kType = {
     kFragmentSource,
     nullptr,
     {},
-    {"", "u_m4Projection", "", "u_s2dTexture", "sigma", "blurSize", "horizontal_or_vertical", "samples"},
-    {{"u_s2dTexture", kDiffuseUnit}},
+    QexShaderList_Of(kUniform_none, kUniform_u_m4Projection, kUniform_none, kUniform_u_s2dTexture,
+                     kUniform_sigma, kUniform_blurSize, kUniform_horizontal_or_vertical, kUniform_samples),
+    {},
     false,
     0,
 };
@@ -81,14 +83,14 @@ QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context) {
 int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module, float sigma,
                                    float samples) {
     const QexMatrix projection = ProjectionOf(module);
-    QexScreenShader_Setup(&kType, module, &projection);
+    QexScreenShader_Setup(&kType, module, &projection, 1);
     QexBlurShader_SetParameters(module, nullptr, 0, sigma, samples,
                                 1.0f / static_cast<float>(context->width));
     return 0;
 }
 
 void QexBlurShader_Release(QexShaderModule** module) {
-    QexShaderModule_Release(&kType, module);
+    QexShaderModule_Release(module);
 }
 
 void QexBlurShader_SetParameters(QexShaderModule* module, const void*, float direction, float sigma,

@@ -1,3 +1,4 @@
+// The mix of a sharp and a blurred picture by depth.
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 
@@ -29,8 +30,9 @@ const QexShaderModuleType kType = {
     kFragmentSource,
     nullptr,
     {},
-    {"", "u_m4Projection", "", "u_s2dNormal", "u_s2dDepth", "u_s2dBlur", "focus", "range"},
-    {{"u_s2dNormal", 0}, {"u_s2dDepth", 1}, {"u_s2dBlur", 2}},
+    QexShaderList_Of(kUniform_none, kUniform_u_m4Projection, kUniform_none, kUniform_u_s2dNormal,
+                     kUniform_u_s2dDepth, kUniform_u_s2dBlur, kUniform_focus, kUniform_range),
+    {},
     false,
     0,
 };
@@ -52,12 +54,12 @@ QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context) {
 }
 
 int32_t QexDOFShader_SetupProgram(const QexRuntimeContext*, QexShaderModule* module) {
-    QexScreenShader_Setup(&kType, module, &s_Projection);
+    QexScreenShader_Setup(&kType, module, &s_Projection, 3);
     return 0;
 }
 
 void QexDOFShader_Release(QexShaderModule** module) {
-    QexShaderModule_Release(&kType, module);
+    QexShaderModule_Release(module);
 }
 
 void QexDOFShader_SetParameters(QexShaderModule* module, float focus, float range) {

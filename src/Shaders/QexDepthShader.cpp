@@ -1,3 +1,4 @@
+// Depth as a grey level.
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexShaderModule.h"
 
@@ -29,8 +30,8 @@ const QexShaderModuleType kType = {
     kVertexSource,
     kFragmentSource,
     QexDepthShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inNormal", QEX_ELEMENT_NORMAL}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {"near", "far", "mvpMatrix"},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_NORMAL, QEX_ELEMENT_UV0),
+    QexShaderList_Of(kUniform_near, kUniform_far, kUniform_mvpMatrix),
     {},
     false,
     0,

@@ -1,9 +1,10 @@
+// Light per vertex.
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexLitShader.h"
 
 namespace {
 
-const char* const kVertexSource =
+constexpr const char* kVertexSource =
     QEX_GLSL_STATIC_VERTEX QEX_GLSL_NORMAL("highp") QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
 varying mediump vec3 fDiffuse;
 void main() {
@@ -12,22 +13,10 @@ void main() {
 }
 )";
 
-const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
+constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
 
-const QexLitShaderType kType = {
-    {"src/Shaders/QexGouraudShader",
-     kVertexSource,
-     kFragmentSource,
-     QexGouraudShader_Render,
-     {{"inVertex", QEX_ELEMENT_POSITION}, {"inNormal", QEX_ELEMENT_NORMAL}, {"inTexCoord", QEX_ELEMENT_UV0}},
-     {QEX_STATIC_UNIFORMS, QEX_LIGHT_UNIFORMS, "opacity", "alphaThreshold"},
-     {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
-     true,
-     11},
-    false,
-    false,
-    false,
-    false};
+constexpr QexLitShaderType kType = QexLitShader_Describe(
+    "src/Shaders/QexGouraudShader", kVertexSource, kFragmentSource, QexGouraudShader_Render, kLitStatic);
 
 }  // namespace
 

@@ -1,3 +1,4 @@
+// Lights, material and shadow as the lit modules' uniforms take them.
 #include "Shaders/QexLitShader.h"
 
 #include <cstring>
@@ -28,53 +29,62 @@ LightArrays ToArrays(const QexLightSet* lights) {
     return arrays;
 }
 
-// Sets everything from `slot` on that has to do with lights and material; returns the slot behind.
-uint32_t SetSurface(const QexShaderDraw& draw, uint32_t slot, bool specular, const QexLightSet* lights,
-                    const QexMatrix* view) {
-    const QexShaderSlot* slots = draw.module->slots;
-    const QexPODMaterial& material = *draw.material;
-    const LightArrays set = ToArrays(lights);
-    if (specular) QEX_GL(glUniform3f(slots[slot++].location, -view->m[12], -view->m[13], -view->m[14]));
-    QEX_GL(glUniform1i(slots[slot++].location, set.count));
-    QEX_GL(glUniform1iv(slots[slot++].location, QEX_MAX_LIGHTS, set.types));
-    QEX_GL(glUniform3fv(slots[slot++].location, QEX_MAX_LIGHTS, set.vectors[0]));
-    QEX_GL(glUniform4fv(slots[slot++].location, QEX_MAX_LIGHTS, set.colours[0]));
-    QEX_GL(glUniform3fv(slots[slot++].location, 1, material.ambient));
-    QEX_GL(glUniform3fv(slots[slot++].location, 1, material.diffuse));
-    if (specular) {
-        QEX_GL(glUniform3fv(slots[slot++].location, 1, material.specular));
-        QEX_GL(glUniform1f(slots[slot++].location, material.shininess * 256.0f));
-    }
-    QEX_GL(glUniform1f(slots[slot++].location, QexShaderModule_Opacity(draw)));
-    QEX_GL(glUniform1f(slots[slot++].location, slots[draw.type->thresholdSlot].value));
-    return slot;
+int32_t Location(const QexShaderDraw& draw, const QexLitShaderType* type, QexShaderUniform uniform) {
+    return QexShaderModule_Location(draw.module, type->slots[uniform]);
 }
 
-void SetMatrices(const QexShaderDraw& draw, const QexMatrix& world, const QexMatrix* view,
-                 const QexMatrix* projection) {
-    const QexShaderSlot* slots = draw.module->slots;
+// A parameter's value: the threshold's, or the one behind it.
+float Parameter(const QexShaderDraw& draw, uint32_t number) {
+    return draw.module->slots[draw.type->thresholdSlot + number].value;
+}
+
+// Sets what has to do with lights and material.
+void SetSurface(const QexShaderDraw& draw, const QexLitShaderType* type, const QexLightSet* lights,
+                const QexMatrix* view) {
+    const QexPODMaterial& material = *draw.material;
+    const LightArrays set = ToArrays(lights);
+    const bool specular = type->features & kLitSpecular;
+    if (specular)
+        QEX_GL(
+            glUniform3f(Location(draw, type, kUniform_cameraPos), -view->m[12], -view->m[13], -view->m[14]));
+    QEX_GL(glUniform1i(Location(draw, type, kUniform_lightCount), set.count));
+    QEX_GL(glUniform1iv(Location(draw, type, kUniform_lightType), QEX_MAX_LIGHTS, set.types));
+    QEX_GL(glUniform3fv(Location(draw, type, kUniform_lightPosDir), QEX_MAX_LIGHTS, set.vectors[0]));
+    QEX_GL(glUniform4fv(Location(draw, type, kUniform_lightColor), QEX_MAX_LIGHTS, set.colours[0]));
+    QEX_GL(glUniform3fv(Location(draw, type, kUniform_sceneAmbient), 1, material.ambient));
+    QEX_GL(glUniform3fv(Location(draw, type, kUniform_sceneDiffuse), 1, material.diffuse));
+    if (specular) {
+        QEX_GL(glUniform3fv(Location(draw, type, kUniform_sceneSpecular), 1, material.specular));
+        QEX_GL(glUniform1f(Location(draw, type, kUniform_shininess), material.shininess * 256.0f));
+    }
+    QEX_GL(glUniform1f(Location(draw, type, kUniform_opacity), QexShaderModule_Opacity(draw)));
+    QEX_GL(glUniform1f(Location(draw, type, kUniform_alphaThreshold), Parameter(draw, 0)));
+}
+
+void SetMatrices(const QexShaderDraw& draw, const QexLitShaderType* type, const QexMatrix& world,
+                 const QexMatrix* view, const QexMatrix* projection) {
     QexMatrix mvp;
     QexMatrix3 normal;
     QexShaderModule_NormalMatrix(&normal, &world);
     QexMatrix_Multiply(&mvp, projection, view);
     QexMatrix_Multiply(&mvp, &mvp, &world);
-    QEX_GL(glUniformMatrix4fv(slots[kTransMatrix].location, 1, GL_FALSE, world.m));
-    QEX_GL(glUniformMatrix3fv(slots[kNormalMatrix].location, 1, GL_FALSE, normal.m));
-    QEX_GL(glUniformMatrix4fv(slots[kMvpMatrix].location, 1, GL_FALSE, mvp.m));
+    QEX_GL(glUniformMatrix4fv(Location(draw, type, kUniform_transMatrix), 1, GL_FALSE, world.m));
+    QEX_GL(glUniformMatrix3fv(Location(draw, type, kUniform_normalMatrix), 1, GL_FALSE, normal.m));
+    QEX_GL(glUniformMatrix4fv(Location(draw, type, kUniform_mvpMatrix), 1, GL_FALSE, mvp.m));
 }
 
 // Without shadow parameters nothing is in shadow: an empty map holds 1 everywhere.
-void SetShadow(const QexShaderDraw& draw, uint32_t slot, bool fade, const QexMatrix& world,
+void SetShadow(const QexShaderDraw& draw, const QexLitShaderType* type, const QexMatrix& world,
                const QexShadowInfo* shadow) {
-    const QexShaderSlot* slots = draw.module->slots;
     if (shadow) {
         QexMatrix space;
         QexMatrix_Multiply(&space, &shadow->shadowSpaceMatrix, &world);
-        QEX_GL(glUniform3fv(slots[slot].location, 1, &shadow->lightDir.x));
-        QEX_GL(glUniformMatrix4fv(slots[slot + 1].location, 1, GL_FALSE, space.m));
-        QEX_GL(glUniform1f(slots[slot + 3].location, shadow->shadowIntensity));
-        QEX_GL(glUniform1f(slots[slot + 2].location, shadow->biasValue));
-        if (fade) QEX_GL(glUniform1f(slots[slot + 4].location, slots[draw.type->thresholdSlot + 1].value));
+        QEX_GL(glUniform3fv(Location(draw, type, kUniform_shadowLightDir), 1, &shadow->lightDir.x));
+        QEX_GL(glUniformMatrix4fv(Location(draw, type, kUniform_shadowSpaceMatrix), 1, GL_FALSE, space.m));
+        QEX_GL(glUniform1f(Location(draw, type, kUniform_shadowIntensity), shadow->shadowIntensity));
+        QEX_GL(glUniform1f(Location(draw, type, kUniform_biasValue), shadow->biasValue));
+        if (type->features & kLitShadowFade)
+            QEX_GL(glUniform1f(Location(draw, type, kUniform_shadowFade), Parameter(draw, 1)));
     }
     QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
     QexRenderState_Bind(GL_TEXTURE_2D, shadow && shadow->shadowTexture ? shadow->shadowTexture
@@ -82,7 +92,7 @@ void SetShadow(const QexShaderDraw& draw, uint32_t slot, bool fade, const QexMat
 }
 
 void BindTextures(const QexShaderDraw& draw, const QexLitShaderType* type) {
-    if (type->normalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
+    if (type->features & kLitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
     QexShaderModule_BindMaterial(draw);
 }
 
@@ -95,9 +105,9 @@ void QexLitShader_Render(const QexLitShaderType* type, QexShaderModule* module, 
     QexMatrix world;
     if (!QexShaderModule_Begin(&draw, &type->module, module, model, nodeIndex)) return;
     QexShaderModule_World(draw, &world, modelMatrix);
-    const uint32_t slot = SetSurface(draw, kFirstStaticLight, type->specular, lights, view);
-    SetMatrices(draw, world, view, projection);
-    if (type->shadow) SetShadow(draw, slot, type->shadowFade, world, shadow);
+    SetSurface(draw, type, lights, view);
+    SetMatrices(draw, type, world, view, projection);
+    if (type->features & kLitShadow) SetShadow(draw, type, world, shadow);
     BindTextures(draw, type);
     QexShaderModule_DrawMesh(&type->module, model, nodeIndex);
 }
@@ -108,17 +118,19 @@ void QexLitShader_RenderSkinned(const QexLitShaderType* type, QexShaderModule* m
     QexShaderDraw draw;
     QexMatrix viewProjection;
     if (!QexShaderModule_Begin(&draw, &type->module, module, model, nodeIndex)) return;
-    SetSurface(draw, kFirstSkinnedLight, type->specular, lights, view);
+    SetSurface(draw, type, lights, view);
     QexMatrix_Multiply(&viewProjection, projection, view);
-    QEX_GL(glUniformMatrix4fv(module->slots[kViewProjMatrix].location, 1, GL_FALSE, viewProjection.m));
+    QEX_GL(glUniformMatrix4fv(Location(draw, type, kUniform_viewProjMatrix), 1, GL_FALSE, viewProjection.m));
     BindTextures(draw, type);
     QexLitShader_DrawSkinnedMesh(type, module, model, nodeIndex, modelMatrix);
 }
 
 int32_t QexLitShader_DrawSkinnedMesh(const QexLitShaderType* type, QexShaderModule* module, QexModel* model,
                                      uint32_t nodeIndex, const QexMatrix* modelMatrix) {
-    const QexShaderBones bones = {module->slots[kBoneCount].location,
-                                  module->slots[kBoneMatrixArray].location, true,
-                                  module->slots[kBoneVecMatrixArray].location, modelMatrix};
+    const uint8_t* slots = type->slots;
+    const QexShaderBones bones = {QexShaderModule_Location(module, slots[kUniform_boneCount]),
+                                  QexShaderModule_Location(module, slots[kUniform_boneMatrixArray]), true,
+                                  QexShaderModule_Location(module, slots[kUniform_boneVecMatrixArray]),
+                                  modelMatrix};
     return QexShaderModule_DrawSkinnedMesh(&type->module, model, nodeIndex, bones);
 }

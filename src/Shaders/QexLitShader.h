@@ -1,30 +1,87 @@
-// What the lit modules have in common: how their uniforms are ordered and set, and their whole Render.
-//
-// A static module's slots begin with transMatrix, normalMatrix and mvpMatrix, a skinned one's with
-// viewProjMatrix, boneCount, boneMatrixArray and boneVecMatrixArray. From `firstLight` on both go on with
-// cameraPos (specular modules), the light set, sceneAmbient, sceneDiffuse, sceneSpecular and shininess
-// (specular modules), opacity and alphaThreshold; modules that receive shadows end with shadowLightDir,
-// shadowSpaceMatrix, biasValue, shadowIntensity and, when it fades, shadowFade.
+// What the lit modules have in common: how they are described, how their uniforms are set, and their whole
+// Render.
 #pragma once
 
 #include "Shaders/QexShaderModule.h"
 
-struct QexLitShaderType {
-    QexShaderModuleType module;
-    bool specular;
-    bool normalMap;
-    bool shadow;
-    bool shadowFade;  // the fade's value is in the slot behind the threshold
+// What a module has beside diffuse light.
+enum QexLitFeature : uint32_t {
+    kLit = 0,  // that alone
+    kLitSkinned = 1,
+    kLitStatic = 2,
+    kLitNormalMap = 4,
+    kLitSpecular = 8,
+    kLitShadow = 16,
+    kLitShadowFade = 32  // the fade's value is in the slot behind the threshold
 };
 
-enum { kTransMatrix, kNormalMatrix, kMvpMatrix, kFirstStaticLight };
-enum { kViewProjMatrix, kBoneCount, kBoneMatrixArray, kBoneVecMatrixArray, kFirstSkinnedLight };
+struct QexLitShaderType {
+    QexShaderModuleType module;
+    uint32_t features;               // kLit...
+    uint8_t slots[kShaderUniforms];  // of the uniforms that the module has
+};
 
-#define QEX_LIGHT_UNIFORMS \
-    "lightCount", "lightType", "lightPosDir", "lightColor", "sceneAmbient", "sceneDiffuse"
-#define QEX_STATIC_UNIFORMS "transMatrix", "normalMatrix", "mvpMatrix"
-#define QEX_SKINNED_UNIFORMS "viewProjMatrix", "boneCount", "boneMatrixArray", "boneVecMatrixArray"
-#define QEX_SHADOW_UNIFORMS "shadowLightDir", "shadowSpaceMatrix", "biasValue", "shadowIntensity"
+// A module from its sources and features. Threshold and fade, 0.5 and 1 at first, follow the uniforms.
+constexpr QexLitShaderType QexLitShader_Describe(const char* path, const char* vertexSource,
+                                                 const char* fragmentSource, QexShaderRenderFn render,
+                                                 uint32_t features) {
+    constexpr struct {
+        uint8_t item;
+        uint32_t feature;
+    } uniforms[] = {{kUniform_transMatrix, kLitStatic},
+                    {kUniform_normalMatrix, kLitStatic},
+                    {kUniform_mvpMatrix, kLitStatic},
+                    {kUniform_viewProjMatrix, kLitSkinned},
+                    {kUniform_boneCount, kLitSkinned},
+                    {kUniform_boneMatrixArray, kLitSkinned},
+                    {kUniform_boneVecMatrixArray, kLitSkinned},
+                    {kUniform_cameraPos, kLitSpecular},
+                    {kUniform_lightCount, kLit},
+                    {kUniform_lightType, kLit},
+                    {kUniform_lightPosDir, kLit},
+                    {kUniform_lightColor, kLit},
+                    {kUniform_sceneAmbient, kLit},
+                    {kUniform_sceneDiffuse, kLit},
+                    {kUniform_sceneSpecular, kLitSpecular},
+                    {kUniform_shininess, kLitSpecular},
+                    {kUniform_opacity, kLit},
+                    {kUniform_alphaThreshold, kLit},
+                    {kUniform_shadowLightDir, kLitShadow},
+                    {kUniform_shadowSpaceMatrix, kLitShadow},
+                    {kUniform_biasValue, kLitShadow},
+                    {kUniform_shadowIntensity, kLitShadow},
+                    {kUniform_shadowFade, kLitShadowFade}},
+      attributes[] = {{QEX_ELEMENT_POSITION, kLit},
+                      {QEX_ELEMENT_TANGENT, kLitNormalMap},
+                      {QEX_ELEMENT_BINORMAL, kLitNormalMap},
+                      {QEX_ELEMENT_NORMAL, kLit},
+                      {QEX_ELEMENT_UV0, kLit},
+                      {QEX_ELEMENT_BONE_INDEX, kLitSkinned},
+                      {QEX_ELEMENT_BONE_WEIGHT, kLitSkinned}},
+      units[] = {{kDiffuseUnit, kLit},
+                 {kNormalMapUnit, kLitNormalMap},
+                 {kShadowMapUnit, kLitShadow},
+                 {kAlphaUnit, kLit}};
+    QexLitShaderType type = {};
+    type.module.path = path;
+    type.module.vertexSource = vertexSource;
+    type.module.fragmentSource = fragmentSource;
+    type.module.render = render;
+    type.features = features;
+    for (const auto& row : uniforms) {
+        if ((features & row.feature) != row.feature) continue;
+        type.slots[row.item] = type.module.uniforms.count;
+        type.module.uniforms.Add(row.item);
+    }
+    for (const auto& row : attributes)
+        if ((features & row.feature) == row.feature) type.module.attributes.Add(row.item);
+    for (const auto& row : units)
+        if ((features & row.feature) == row.feature) type.module.units.Add(row.item);
+    type.module.hasThreshold = true;
+    type.module.thresholdSlot = type.module.uniforms.count;
+    type.module.secondDefault = features & kLitShadowFade ? 1.0f : 0.0f;
+    return type;
+}
 
 void QexLitShader_Render(const QexLitShaderType* type, QexShaderModule* module, QexModel* model,
                          uint32_t nodeIndex, const QexLightSet* lights, const QexMatrix* modelMatrix,

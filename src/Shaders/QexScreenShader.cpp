@@ -1,12 +1,16 @@
+// Set-up of the modules that draw over the screen.
 #include "Shaders/QexScreenShader.h"
 
 #define QEX_MODULE (type->path)
 
 void QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
-                           const QexMatrix* projection) {
+                           const QexMatrix* projection, int32_t samplers) {
     QexShaderModule_Setup(type, module);
     QexShaderSlot* slots = module->slots;
-    QEX_GL(slots[kScreenPosition].location = glGetAttribLocation(module->program, "a_v4Position"));
-    QEX_GL(slots[kScreenTexCoord].location = glGetAttribLocation(module->program, "a_v2TexCoord"));
+    for (int32_t unit = 0; unit < samplers; ++unit)
+        QEX_GL(glUniform1i(slots[kScreenSlots + unit].location, unit));
+    const QexProgramLookup lookup = {type->path, module->program};
+    slots[kScreenPosition].location = lookup.Attribute("a_v4Position");
+    slots[kScreenTexCoord].location = lookup.Attribute("a_v2TexCoord");
     QEX_GL(glUniformMatrix4fv(slots[kScreenProjection].location, 1, GL_FALSE, projection->m));
 }

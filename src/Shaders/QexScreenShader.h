@@ -8,9 +8,10 @@
 // The first slots of such a module. Its description leaves the names of the two attributes empty.
 enum { kScreenPosition, kScreenProjection, kScreenTexCoord, kScreenSlots };
 
-// Compiles, links, fills the slots and sets the projection; the program stays current.
+// Compiles, links, fills the slots and sets the projection; the program stays current. The module's samplers
+// come first behind the first slots, for the units 0, 1, ...
 void QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
-                           const QexMatrix* projection);
+                           const QexMatrix* projection, int32_t samplers);
 
 // What QexBlurShader_SetParameters uploads from now on.
 void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* projection);

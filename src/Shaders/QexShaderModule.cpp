@@ -1,23 +1,41 @@
+// Modules from their descriptions: programs, materials, meshes.
 #include "Shaders/QexShaderModule.h"
 
 #include <cstring>
 
-#include "gl/Program.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
 
 #define QEX_MODULE (type->path)
 
 // The meshes of the pass from the light are set up without checks.
-#define QEX_GL_UNLESS_CASTER(call)           \
-    do {                                     \
-        call;                                \
-        if (!type->isCaster) QEX_GL_CHECK(); \
-    } while (0)
+#define QEX_GL_UNLESS_CASTER(call) QEX_GL_IF(!type->isCaster, call)
 
 namespace {
 
 constexpr float kDefaultThreshold = 0.5f;
+
+const char* const kUniformNames[kShaderUniforms] = {"",
+#define QEX_SHADER_UNIFORM_NAME(name) #name,
+                                                    QEX_SHADER_UNIFORMS(QEX_SHADER_UNIFORM_NAME)
+#undef QEX_SHADER_UNIFORM_NAME
+};
+
+// The attribute that each vertex element feeds.
+const char* AttributeName(uint8_t element) {
+    switch (element) {
+        case QEX_ELEMENT_POSITION: return "inVertex";
+        case QEX_ELEMENT_NORMAL: return "inNormal";
+        case QEX_ELEMENT_TANGENT: return "inTangent";
+        case QEX_ELEMENT_BINORMAL: return "inBiNormal";
+        case QEX_ELEMENT_BONE_INDEX: return "inBoneIndex";
+        case QEX_ELEMENT_BONE_WEIGHT: return "inBoneWeight";
+        default: return "inTexCoord";
+    }
+}
+
+// The samplers of the texture units.
+const char* const kSamplerNames[] = {"sTexture", "sNormalMap", "shadowTexture", "alphaTexture"};
 
 constexpr QexPODMaterial MakeWhite() {
     QexPODMaterial material = {};
@@ -59,11 +77,8 @@ void DrawRange(const QexShaderModuleType* type, bool indexed, GLenum mode, uint3
         QEX_GL(glDrawArrays(mode, static_cast<GLint>(first), static_cast<GLsizei>(count)));
 }
 
-void DeleteObjects(const QexShaderModuleType* type, const QexShaderModule* module) {
-    QexRenderState_UseProgram(0);
-    QEX_GL(glDeleteProgram(module->program));
-    QEX_GL(glDeleteShader(module->vertexShader));
-    QEX_GL(glDeleteShader(module->fragmentShader));
+QexProgramNames NamesOf(QexShaderModule* module) {
+    return {&module->program, &module->vertexShader, &module->fragmentShader};
 }
 
 }  // namespace
@@ -92,33 +107,25 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
 }
 
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
-    if (module->program) DeleteObjects(type, module);
-    const char* names[kMaxShaderAttributes];
-    int32_t attributeCount = 0;
-    while (type->attributes[attributeCount].name) {
-        names[attributeCount] = type->attributes[attributeCount].name;
-        ++attributeCount;
+    if (module->program) QexProgram_Delete(NamesOf(module));
+    const char* names[sizeof type->attributes.items];
+    for (uint8_t i = 0; i < type->attributes.count; ++i) names[i] = AttributeName(type->attributes.items[i]);
+    QexProgram_Compile({type->path, type->vertexSource, type->fragmentSource, names, type->attributes.count},
+                       NamesOf(module));
+    const QexProgramLookup lookup = {type->path, module->program, false};
+    QexShaderSlot* slot = module->slots;
+    for (const uint8_t uniform : type->uniforms) {
+        if (uniform != kUniform_none) slot->location = lookup.Uniform(kUniformNames[uniform]);
+        ++slot;
     }
-    QexShader_Create(&module->vertexShader, type->vertexSource, GL_VERTEX_SHADER);
-    QexShader_Create(&module->fragmentShader, type->fragmentSource, GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(&module->program, module->vertexShader, module->fragmentShader, names,
-                                attributeCount, nullptr) != 0)
-        QexShader_LogFailure(type->path, module->vertexShader, module->fragmentShader, module->program);
-    for (uint32_t i = 0; type->uniforms[i]; ++i) {
-        if (!*type->uniforms[i]) continue;
-        module->slots[i].location = glGetUniformLocation(module->program, type->uniforms[i]);
-    }
-    for (const QexShaderSampler* sampler = type->samplers; sampler->name; ++sampler) {
-        const GLint location = glGetUniformLocation(module->program, sampler->name);
-        QEX_GL(glUniform1i(location, sampler->unit));
-    }
+    for (const uint8_t unit : type->units) lookup.SetSampler({kSamplerNames[unit], unit});
     return 0;
 }
 
-void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {
+void QexShaderModule_Release(QexShaderModule** module) {
     QexShaderModule* m = *module;
     if (!m) return;
-    DeleteObjects(type, m);
+    QexProgram_Delete(NamesOf(m));
     QexMemory_Free(m);
     *module = nullptr;
 }
@@ -189,14 +196,15 @@ void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* 
     const QexPODMesh& mesh = model->scene.meshes[meshIndex];
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[meshIndex]));
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[meshIndex]));
-    for (GLuint i = 0; type->attributes[i].name; ++i) {
-        if (mesh.attributes[type->attributes[i].element].componentCount)
+    const QexShaderList& elements = type->attributes;
+    for (GLuint i = 0; i < elements.count; ++i) {
+        if (mesh.attributes[elements.items[i]].componentCount)
             QEX_GL_UNLESS_CASTER(glEnableVertexAttribArray(i));
         else
             QEX_GL(glVertexAttrib4f(i, 0, 0, 0, 1));
     }
-    for (GLuint i = 0; type->attributes[i].name; ++i) {
-        const QexVertexAttribute& a = mesh.attributes[type->attributes[i].element];
+    for (GLuint i = 0; i < elements.count; ++i) {
+        const QexVertexAttribute& a = mesh.attributes[elements.items[i]];
         if (a.componentCount)
             QEX_GL(glVertexAttribPointer(i, a.componentCount, a.glType, a.normalised ? GL_TRUE : GL_FALSE,
                                          static_cast<GLsizei>(a.stride), BufferOffset(a.offset)));
@@ -205,9 +213,8 @@ void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* 
 
 void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
     const QexPODMesh& mesh = model->scene.meshes[meshIndex];
-    for (GLuint i = 0; type->attributes[i].name; ++i)
-        if (mesh.attributes[type->attributes[i].element].componentCount)
-            QEX_GL(glDisableVertexAttribArray(i));
+    for (GLuint i = 0; i < type->attributes.count; ++i)
+        if (mesh.attributes[type->attributes.items[i]].componentCount) QEX_GL(glDisableVertexAttribArray(i));
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ARRAY_BUFFER, 0));
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
 }

@@ -11,31 +11,79 @@
 #pragma once
 
 #include "gl/GL.h"
+#include "gl/Program.h"
 #include "Qex.h"
 
-struct QexShaderAttribute {
-    const char* name;
-    QexVertexElement element;  // what feeds it
+// The uniforms of all modules: one list that gives names and numbers.
+#define QEX_SHADER_UNIFORMS(X) \
+    X(displacement)            \
+    X(near)                    \
+    X(far)                     \
+    X(transMatrix)             \
+    X(normalMatrix)            \
+    X(mvpMatrix)               \
+    X(viewProjMatrix)          \
+    X(boneCount)               \
+    X(boneMatrixArray)         \
+    X(boneVecMatrixArray)      \
+    X(cameraPos)               \
+    X(lightCount)              \
+    X(lightType)               \
+    X(lightPosDir)             \
+    X(lightColor)              \
+    X(sceneAmbient)            \
+    X(sceneDiffuse)            \
+    X(sceneSpecular)           \
+    X(shininess)               \
+    X(opacity)                 \
+    X(alphaThreshold)          \
+    X(shadowLightDir)          \
+    X(shadowSpaceMatrix)       \
+    X(biasValue)               \
+    X(shadowIntensity)         \
+    X(shadowFade)              \
+    X(u_m4Projection)          \
+    X(u_s2dTexture)            \
+    X(u_s2dNormal)             \
+    X(u_s2dDepth)              \
+    X(u_s2dBlur)               \
+    X(sigma)                   \
+    X(blurSize)                \
+    X(horizontal_or_vertical)  \
+    X(samples)                 \
+    X(focus)                   \
+    X(range)
+
+enum QexShaderUniform : uint8_t {
+    kUniform_none,  // leaves its slot to the module
+#define QEX_SHADER_UNIFORM_NUMBER(name) kUniform_##name,
+    QEX_SHADER_UNIFORMS(QEX_SHADER_UNIFORM_NUMBER)
+#undef QEX_SHADER_UNIFORM_NUMBER
+        kShaderUniforms
 };
 
-struct QexShaderSampler {
-    const char* name;
-    int32_t unit;
+// A short list of numbers.
+struct QexShaderList {
+    uint8_t count;
+    uint8_t items[20];
+
+    constexpr void Add(uint8_t item) { items[count++] = item; }
+    const uint8_t* begin() const { return items; }
+    const uint8_t* end() const { return items + count; }
 };
+template <class... Items>
+constexpr QexShaderList QexShaderList_Of(Items... items) {
+    return {sizeof...(items), {static_cast<uint8_t>(items)...}};
+}
 
-constexpr uint32_t kMaxShaderAttributes = 7;
-constexpr uint32_t kMaxShaderUniforms = 20;
-constexpr uint32_t kMaxShaderSamplers = 4;
-
-// Lists end at the first entry without a name. A uniform whose name is empty leaves its slot to the module.
 struct QexShaderModuleType {
     const char* path;  // of the module's source, without extension
     const char* vertexSource;
     const char* fragmentSource;
     QexShaderRenderFn render;
-    QexShaderAttribute attributes[kMaxShaderAttributes + 1];
-    const char* uniforms[kMaxShaderUniforms + 1];
-    QexShaderSampler samplers[kMaxShaderSamplers + 1];
+    QexShaderList attributes;  // QEX_ELEMENT_..., what feeds each; the names go by the element
+    QexShaderList uniforms;    // kUniform_..., in the order of the slots
+    QexShaderList units;       // k...Unit, whose samplers the module has; the names go by the unit
     bool hasThreshold;
     uint32_t thresholdSlot;
     float secondDefault = 0;  // of the slot behind the threshold, in modules that have a parameter there
@@ -46,7 +94,7 @@ struct QexShaderModuleType {
 QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type);
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type);
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module);
-void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module);
+void QexShaderModule_Release(QexShaderModule** module);
 
 inline int32_t QexShaderModule_Location(const QexShaderModule* module, uint32_t uniform) {
     return module->slots[uniform].location;
@@ -122,7 +170,7 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
         return QexShaderModule_Setup(type, module);        \
     }                                                      \
     void Name##_Release(QexShaderModule** module) {        \
-        QexShaderModule_Release(type, module);             \
+        QexShaderModule_Release(module);                   \
     }
 
 #define QEX_SHADER_MODULE_THRESHOLD(Name, slot)                               \

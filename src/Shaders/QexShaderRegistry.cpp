@@ -1,3 +1,4 @@
+// Modules by number.
 #include "Qex.h"
 
 namespace {

@@ -1,3 +1,4 @@
+// Flat white: a mask.
 #include "Shaders/QexShaderModule.h"
 
 #define QEX_MODULE (kType.path)
@@ -25,8 +26,8 @@ const QexShaderModuleType kType = {
     kVertexSource,
     kFragmentSource,
     QexSimpleShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}},
-    {"mvpMatrix"},
+    QexShaderList_Of(QEX_ELEMENT_POSITION),
+    QexShaderList_Of(kUniform_mvpMatrix),
     {},
     false,
     0,

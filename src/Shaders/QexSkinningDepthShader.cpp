@@ -1,3 +1,4 @@
+// Depth as a grey level, on bones.
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexShaderModule.h"
 
@@ -27,12 +28,10 @@ const QexShaderModuleType kType = {
     kVertexSource,
     kFragmentSource,
     QexSkinningDepthShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION},
-     {"inTexCoord", QEX_ELEMENT_UV0},
-     {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
-     {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
-    {"near", "far", "boneCount", "boneMatrixArray", "viewProjMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0, QEX_ELEMENT_BONE_INDEX, QEX_ELEMENT_BONE_WEIGHT),
+    QexShaderList_Of(kUniform_near, kUniform_far, kUniform_boneCount, kUniform_boneMatrixArray,
+                     kUniform_viewProjMatrix, kUniform_opacity, kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kThreshold,
 };

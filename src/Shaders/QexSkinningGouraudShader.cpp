@@ -1,10 +1,12 @@
+// Light per vertex, on bones.
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexLitShader.h"
 
 namespace {
 
-const char* const kVertexSource = QEX_GLSL_SKINNED_VERTEX QEX_GLSL_SKINNED_VECTOR QEX_GLSL_NORMAL("mediump")
-    QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
+constexpr const char* kVertexSource =
+    QEX_GLSL_SKINNED_VERTEX QEX_GLSL_SKINNED_VECTOR QEX_GLSL_NORMAL("mediump")
+        QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
 varying mediump vec3 fDiffuse;
 void main() {
     highp vec3 point = placeVertex();
@@ -12,25 +14,11 @@ void main() {
 }
 )";
 
-const char* const kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
+constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
 
-const QexLitShaderType kType = {{"src/Shaders/QexSkinningGouraudShader",
-                                 kVertexSource,
-                                 kFragmentSource,
-                                 QexSkinningGouraudShader_Render,
-                                 {{"inVertex", QEX_ELEMENT_POSITION},
-                                  {"inNormal", QEX_ELEMENT_NORMAL},
-                                  {"inTexCoord", QEX_ELEMENT_UV0},
-                                  {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
-                                  {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
-                                 {QEX_SKINNED_UNIFORMS, QEX_LIGHT_UNIFORMS, "opacity", "alphaThreshold"},
-                                 {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
-                                 true,
-                                 12},
-                                false,
-                                false,
-                                false,
-                                false};
+constexpr QexLitShaderType kType =
+    QexLitShader_Describe("src/Shaders/QexSkinningGouraudShader", kVertexSource, kFragmentSource,
+                          QexSkinningGouraudShader_Render, kLitSkinned);
 
 }  // namespace
 

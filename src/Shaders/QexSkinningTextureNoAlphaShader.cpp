@@ -1,3 +1,4 @@
+// Unlit, alpha from the texture, on bones.
 #include "Shaders/QexSkinningTextureShader.h"
 #include "Shaders/QexTextureShader.h"
 
@@ -8,12 +9,10 @@ const QexShaderModuleType kType = {
     kQexSkinningVertexSource,
     kQexTextureNoAlphaFragmentSource,
     QexSkinningTextureNoAlphaShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION},
-     {"inTexCoord", QEX_ELEMENT_UV0},
-     {"inBoneIndex", QEX_ELEMENT_BONE_INDEX},
-     {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT}},
-    {"boneCount", "boneMatrixArray", "viewProjMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0, QEX_ELEMENT_BONE_INDEX, QEX_ELEMENT_BONE_WEIGHT),
+    QexShaderList_Of(kUniform_boneCount, kUniform_boneMatrixArray, kUniform_viewProjMatrix, kUniform_opacity,
+                     kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit),
     true,
     kSkinningThreshold,
 };

@@ -1,3 +1,4 @@
+// Unlit, alpha from the texture.
 #include "Shaders/QexTextureShader.h"
 
 const char* const kQexTextureNoAlphaFragmentSource = R"(
@@ -20,9 +21,9 @@ const QexShaderModuleType kType = {
     kQexTextureVertexSource,
     kQexTextureNoAlphaFragmentSource,
     QexTextureNoAlphaShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {"mvpMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0),
+    QexShaderList_Of(kUniform_mvpMatrix, kUniform_opacity, kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit),
     true,
     kTextureThreshold,
 };

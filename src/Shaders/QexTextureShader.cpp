@@ -1,3 +1,4 @@
+// Unlit, alpha from the alpha texture.
 #include "Shaders/QexTextureShader.h"
 
 #define QEX_MODULE (type->path)
@@ -33,9 +34,9 @@ const QexShaderModuleType kType = {
     kQexTextureVertexSource,
     kQexTextureFragmentSource,
     QexTextureShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {"mvpMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0),
+    QexShaderList_Of(kUniform_mvpMatrix, kUniform_opacity, kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kTextureThreshold,
 };

@@ -1,3 +1,4 @@
+// Unlit, alpha from the texture, with shifted texture coordinates.
 #include "Shaders/QexUVDisplacementShader.h"
 
 #include "Shaders/QexTextureShader.h"
@@ -9,9 +10,9 @@ const QexShaderModuleType kType = {
     kQexUVDisplacementVertexSource,
     kQexTextureNoAlphaFragmentSource,
     QexUVDisplacementNoAlphaShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {"displacement", "mvpMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0),
+    QexShaderList_Of(kUniform_displacement, kUniform_mvpMatrix, kUniform_opacity, kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit),
     true,
     kDisplacementThreshold,
 };

@@ -1,3 +1,4 @@
+// Unlit, alpha from the alpha texture, with shifted texture coordinates.
 #include "Shaders/QexUVDisplacementShader.h"
 
 #include "Shaders/QexTextureShader.h"
@@ -24,9 +25,9 @@ const QexShaderModuleType kType = {
     kQexUVDisplacementVertexSource,
     kQexTextureFragmentSource,
     QexUVDisplacementShader_Render,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {"displacement", "mvpMatrix", "opacity", "alphaThreshold"},
-    {{"sTexture", kDiffuseUnit}, {"alphaTexture", kAlphaUnit}},
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0),
+    QexShaderList_Of(kUniform_displacement, kUniform_mvpMatrix, kUniform_opacity, kUniform_alphaThreshold),
+    QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kDisplacementThreshold,
 };

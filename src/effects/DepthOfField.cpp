@@ -2,8 +2,9 @@
 // third, and a mix of the three on the screen. The modules are Shaders/QexBlurShader, QexDOFShader and the
 // two depth modules; the copy program, which shows a target as it is, is made here.
 #include "gl/GL.h"
-#include "gl/RenderTarget.h"
 #include "gl/Program.h"
+#include "gl/Quad.h"
+#include "gl/RenderTarget.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 
@@ -16,12 +17,10 @@ constexpr int32_t kFailed = -1, kNullArgument = -9, kWrongSize = -10;
 // The first blur pass writes one of each pair, the second the other. The depth pass takes kFullFirst over.
 enum { kHalfFirst, kHalfBlurred, kSharp, kFullFirst, kFullBlurred, kDepth = kFullFirst };
 
-// A strip of vertices upper left, upper right, lower left, lower right.
 struct Quad {
     float positions[4][3];
     float texCoords[4][2];
 };
-const uint8_t kIndices[4] = {0, 2, 1, 3};
 
 // Of the size of the screen.
 Quad s_ScreenQuad;
@@ -29,6 +28,7 @@ Quad s_ScreenQuad;
 // The copy program's other names.
 GLuint s_VertexShader, s_FragmentShader;
 GLint s_Position, s_TexCoord;
+const QexProgramNames kProgramNames = {&m_iProgNamePP, &s_VertexShader, &s_FragmentShader};
 
 // What a scene may have left switched on that would cut into a quad.
 const GLenum kSwitches[] = {GL_DEPTH_TEST, GL_BLEND, GL_CULL_FACE};
@@ -57,21 +57,14 @@ Quad MakeQuad(float screenHeight, float width, float height, float s, float t) {
     return quad;
 }
 
-void DrawQuad(GLint positionLocation, GLint texCoordLocation, const Quad& quad) {
-    const GLuint position = static_cast<GLuint>(positionLocation);
-    const GLuint texCoord = static_cast<GLuint>(texCoordLocation);
+void DrawQuad(GLint position, GLint texCoord, const Quad& quad) {
     GLboolean wasOn[kSwitchCount];
     for (int i = 0; i < kSwitchCount; ++i) {
         QEX_GL(wasOn[i] = glIsEnabled(kSwitches[i]));
         if (wasOn[i]) QEX_GL(glDisable(kSwitches[i]));
     }
-    QEX_GL(glEnableVertexAttribArray(position));
-    QEX_GL(glEnableVertexAttribArray(texCoord));
-    QEX_GL(glVertexAttribPointer(position, 3, GL_FLOAT, GL_FALSE, 0, quad.positions));
-    QEX_GL(glVertexAttribPointer(texCoord, 2, GL_FLOAT, GL_FALSE, 0, quad.texCoords));
-    QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, 4, GL_UNSIGNED_BYTE, kIndices));
-    QEX_GL(glDisableVertexAttribArray(position));
-    QEX_GL(glDisableVertexAttribArray(texCoord));
+    const QexQuadArray arrays[] = {{position, 3, quad.positions[0]}, {texCoord, 2, quad.texCoords[0]}};
+    QexQuad_Draw(QEX_MODULE, arrays);
     for (int i = 0; i < kSwitchCount; ++i)
         if (wasOn[i]) QEX_GL(glEnable(kSwitches[i]));
 }
@@ -170,24 +163,20 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     QexMatrix projection;
     QexMatrix_Orthographic(&projection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
     QexPP_ReleaseShader();
-    if (!QexShader_BuildProgram("QexPP_CreateShader", &m_iProgNamePP, &s_VertexShader, &s_FragmentShader,
-                                pVertexShaderPP, pFragmentShaderPP, nullptr, 0))
+    if (!QexProgram_Build({"QexPP_CreateShader", pVertexShaderPP, pFragmentShaderPP, nullptr, 0},
+                          kProgramNames))
         return kFailed;
-    GLint location;
-    QEX_GL(s_Position = glGetAttribLocation(m_iProgNamePP, "a_v4Position"));
-    QEX_GL(s_TexCoord = glGetAttribLocation(m_iProgNamePP, "a_v2TexCoord"));
-    QEX_GL(location = glGetUniformLocation(m_iProgNamePP, "u_m4Projection"));
-    QEX_GL(glUniformMatrix4fv(location, 1, GL_FALSE, projection.m));
-    QEX_GL(location = glGetUniformLocation(m_iProgNamePP, "u_s2dTexture"));
-    QEX_GL(glUniform1i(location, kDiffuseUnit));
+    const QexProgramLookup lookup = {QEX_MODULE, m_iProgNamePP};
+    lookup.Attributes({{&s_Position, "a_v4Position"}, {&s_TexCoord, "a_v2TexCoord"}});
+    QEX_GL(glUniformMatrix4fv(lookup.Uniform("u_m4Projection"), 1, GL_FALSE, projection.m));
+    lookup.SetSampler({"u_s2dTexture", kDiffuseUnit});
     // For sources that an application puts in; the engine's own have no such sampler.
-    QEX_GL(location = glGetUniformLocation(m_iProgNamePP, "u_s2dAlpha"));
-    QEX_GL(glUniform1i(location, kAlphaUnit));
+    lookup.SetSampler({"u_s2dAlpha", kAlphaUnit});
     return 0;
 }
 
 void QexPP_ReleaseShader(void) {
-    QexShader_DeleteProgram(&m_iProgNamePP, &s_VertexShader, &s_FragmentShader);
+    QexProgram_Delete(kProgramNames);
 }
 
 QexRenderTarget* QexPP_GetRenderTarget(uint32_t index) {

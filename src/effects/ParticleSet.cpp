@@ -49,37 +49,35 @@ struct {
     GLint time, centerPosition, pointSize, startColor, endColor, texture, alphaTexture, mvpMatrix;
 } s_Program;
 
-const struct {
-    GLint* location;
-    const char* name;
-} kAttributes[] = {{&s_Program.lifetime, "a_lifetime"},
-                   {&s_Program.startPosition, "a_startPosition"},
-                   {&s_Program.endPosition, "a_endPosition"}},
-  kUniforms[] = {{&s_Program.time, "u_time"},
-                 {&s_Program.centerPosition, "u_centerPosition"},
-                 {&s_Program.pointSize, "fPSize"},
-                 {&s_Program.startColor, "u_StartColor"},
-                 {&s_Program.endColor, "u_EndColor"},
-                 {&s_Program.texture, "s_texture"},
-                 {&s_Program.alphaTexture, "alphaTexture"},
-                 {&s_Program.mvpMatrix, "MVPMatrix"}};
+const QexProgramLocation kAttributes[] = {{&s_Program.lifetime, "a_lifetime"},
+                                          {&s_Program.startPosition, "a_startPosition"},
+                                          {&s_Program.endPosition, "a_endPosition"}},
+                         kUniforms[] = {{&s_Program.time, "u_time"},
+                                        {&s_Program.centerPosition, "u_centerPosition"},
+                                        {&s_Program.pointSize, "fPSize"},
+                                        {&s_Program.startColor, "u_StartColor"},
+                                        {&s_Program.endColor, "u_EndColor"},
+                                        {&s_Program.texture, "s_texture"},
+                                        {&s_Program.alphaTexture, "alphaTexture"},
+                                        {&s_Program.mvpMatrix, "MVPMatrix"}};
+
+const QexProgramNames kProgramNames = {&s_Program.program, &s_Program.vertexShader,
+                                       &s_Program.fragmentShader};
 
 bool CreateProgram() {
-    if (!QexShader_BuildProgram("QexParticleSet_Create", &s_Program.program, &s_Program.vertexShader,
-                                &s_Program.fragmentShader, kVertexSource, kFragmentSource, nullptr, 0)) {
+    if (!QexProgram_Build({"QexParticleSet_Create", kVertexSource, kFragmentSource, nullptr, 0},
+                          kProgramNames)) {
         QexError(QEX_TAG, "<QexParticleSet_Create> the particle sets' program cannot be built");
         return false;
     }
-    for (const auto& attribute : kAttributes)
-        *attribute.location = glGetAttribLocation(s_Program.program, attribute.name);
-    for (const auto& uniform : kUniforms)
-        *uniform.location = glGetUniformLocation(s_Program.program, uniform.name);
+    const QexProgramLookup lookup = {QEX_MODULE, s_Program.program, false};
+    lookup.Attributes(kAttributes);
+    lookup.Uniforms(kUniforms);
     return true;
 }
 
 void ReleaseProgram() {
-    if (--s_Program.users == 0)
-        QexShader_DeleteProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader);
+    if (--s_Program.users == 0) QexProgram_Delete(kProgramNames);
 }
 
 bool IsRunning(const QexParticleSet* set) {

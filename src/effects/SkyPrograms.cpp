@@ -125,47 +125,38 @@ struct {
     GLuint vertex, fragment;
 } s_Shaders[kPairs];
 
-GLint Location(GLuint program, const char* name) {
-    GLint location;
-    QEX_GL(location = glGetUniformLocation(program, name));
-    return location;
-}
-
-void SetSampler(GLuint program, const char* name, GLint unit) {
-    QEX_GL(glUniform1i(Location(program, name), unit));
-}
-
-void SetUpWater(GLuint program) {
+void SetUpWater(const QexProgramLookup& lookup) {
     static const char* const samplers[] = {"NormalTex", "ReflectionTex", "RefractionTex",
                                            "NormalisationCubeMap"};
-    for (GLint unit = 0; unit < 4; ++unit) SetSampler(program, samplers[unit], unit);
+    for (GLint unit = 0; unit < 4; ++unit) lookup.SetSampler({samplers[unit], unit});
     QexWaterProgram& w = g_QexWaterProgram;
-    const struct {
-        GLint* location;
-        const char* name;
-    } uniforms[] = {{&w.modelViewMatrix, "ModelViewMatrix"}, {&w.mvpMatrix, "MVPMatrix"},
-                    {&w.eyePosition, "EyePosition"},         {&w.bumpTranslation[0], "BumpTranslation0"},
-                    {&w.bumpScale[0], "BumpScale0"},         {&w.bumpTranslation[1], "BumpTranslation1"},
-                    {&w.bumpScale[1], "BumpScale1"},         {&w.waterColour, "WaterColour"},
-                    {&w.waveDistortion, "WaveDistortion"},   {&w.rcpWindowSize, "RcpWindowSize"}};
-    for (const auto& uniform : uniforms) *uniform.location = Location(program, uniform.name);
+    lookup.Uniforms({{&w.modelViewMatrix, "ModelViewMatrix"},
+                     {&w.mvpMatrix, "MVPMatrix"},
+                     {&w.eyePosition, "EyePosition"},
+                     {&w.bumpTranslation[0], "BumpTranslation0"},
+                     {&w.bumpScale[0], "BumpScale0"},
+                     {&w.bumpTranslation[1], "BumpTranslation1"},
+                     {&w.bumpScale[1], "BumpScale1"},
+                     {&w.waterColour, "WaterColour"},
+                     {&w.waveDistortion, "WaveDistortion"},
+                     {&w.rcpWindowSize, "RcpWindowSize"}});
 }
 
-void SetUpSky(GLuint program) {
-    SetSampler(program, "CubeMap", 0);
-    g_QexSkyProgram.mvpMatrix = Location(program, "MVPMatrix");
-    g_QexSkyProgram.modelMatrix = Location(program, "ModelMatrix");
+void SetUpSky(const QexProgramLookup& lookup) {
+    lookup.SetSampler({"CubeMap", 0});
+    lookup.Uniforms(
+        {{&g_QexSkyProgram.mvpMatrix, "MVPMatrix"}, {&g_QexSkyProgram.modelMatrix, "ModelMatrix"}});
 }
 
-void SetUpTex2D(GLuint program) {
-    SetSampler(program, "Texture", 0);
-    m_Tex2DShader.mvpMatrixLoc = Location(program, "MVPMatrix");
+void SetUpTex2D(const QexProgramLookup& lookup) {
+    lookup.SetSampler({"Texture", 0});
+    m_Tex2DShader.mvpMatrixLoc = lookup.Uniform("MVPMatrix");
 }
 
-void SetUpPlaneTex(GLuint program) {
-    SetSampler(program, "Texture", 0);
-    m_PlaneTexShader.mvpMatrixLoc = Location(program, "MVPMatrix");
-    m_PlaneTexShader.rcpWindowSizeLoc = Location(program, "RcpWindowSize");
+void SetUpPlaneTex(const QexProgramLookup& lookup) {
+    lookup.SetSampler({"Texture", 0});
+    lookup.Uniforms({{&m_PlaneTexShader.mvpMatrixLoc, "MVPMatrix"},
+                     {&m_PlaneTexShader.rcpWindowSizeLoc, "RcpWindowSize"}});
 }
 
 // Programs in the order in which they are linked.
@@ -175,7 +166,7 @@ const struct {
     GLuint* program;
     int pair;
     int32_t attributeCount;
-    void (*setUp)(GLuint program);
+    void (*setUp)(const QexProgramLookup& lookup);
     const char* error;
 } kPrograms[] = {{&g_QexWaterProgram.program, kWater, 1, SetUpWater, kWaterError},
                  {&g_QexSkyProgram.program, kSky, 1, SetUpSky, kError},
@@ -207,13 +198,13 @@ bool QexSkyBox_CreatePrograms() {
         if (QexShader_CreateProgram(row.program, s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
                                     kAttributes, row.attributeCount, log) != 0) {
             QexSystem_Printf(row.error, log);
-            QexShader_LogFailure("QexSkyBox_Create", s_Shaders[row.pair].vertex, s_Shaders[row.pair].fragment,
-                                 0);
+            QexProgram_LogFailure("QexSkyBox_Create", s_Shaders[row.pair].vertex,
+                                  s_Shaders[row.pair].fragment, 0);
             QEX_GL(glDeleteProgram(*row.program));
             *row.program = 0;
             return false;
         }
-        row.setUp(*row.program);
+        row.setUp({QEX_MODULE, *row.program});
     }
     return true;
 }
@@ -221,6 +212,6 @@ bool QexSkyBox_CreatePrograms() {
 void QexSkyBox_ReleasePrograms() {
     GLuint none = 0;
     for (const auto& row : kPrograms)
-        QexShader_DeleteProgram(row.program, &s_Shaders[row.pair].vertex, &s_Shaders[row.pair].fragment);
-    QexShader_DeleteProgram(&none, &s_Shaders[kPlainWater].vertex, &s_Shaders[kPlainWater].fragment);
+        QexProgram_Delete({row.program, &s_Shaders[row.pair].vertex, &s_Shaders[row.pair].fragment});
+    QexProgram_Delete({&none, &s_Shaders[kPlainWater].vertex, &s_Shaders[kPlainWater].fragment});
 }

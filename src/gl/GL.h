@@ -25,6 +25,13 @@
         QEX_GL_CHECK(); \
     } while (0)
 
+// The same where errors are not always looked for.
+#define QEX_GL_IF(checked, call)     \
+    do {                             \
+        call;                        \
+        if (checked) QEX_GL_CHECK(); \
+    } while (0)
+
 // A surface size as the GL takes it: what an application gave below 0 counts as 0.
 inline GLsizei QexGL_Size(int32_t pixels) {
     return pixels > 0 ? pixels : 0;

@@ -1,17 +1,70 @@
-// Programs with the two shaders that each is made of. Names are 0 where there is no object.
+// Programs with the two shaders that each is made of: how they are compiled, linked, looked up and deleted.
+// Names are 0 where there is no object.
 #pragma once
 
 #include "Qex.h"
 
+// What a program is made of.
+struct QexProgramSource {
+    const char* name;  // in the lines that say why the program is not to be had
+    const char* vertex;
+    const char* fragment;
+    const char* const* attributes;  // at locations 0, 1, ...; null: where the linker puts them
+    int32_t attributeCount;
+};
+
+// Where the GL names of a program and its shaders are kept.
+struct QexProgramNames {
+    uint32_t* program;
+    uint32_t* vertexShader;
+    uint32_t* fragmentShader;
+};
+
+// Compiles, links and makes the program current. When a step fails it says so, and the objects that there are
+// stay.
+bool QexProgram_Compile(const QexProgramSource& source, const QexProgramNames& names);
+
+// The same, but nothing is left when a step fails.
+bool QexProgram_Build(const QexProgramSource& source, const QexProgramNames& names);
+
+// Deletes what there is of them and makes the names 0. No program is in use afterwards. Where not `checked`,
+// no errors are looked for.
+void QexProgram_Delete(const QexProgramNames& names, bool checked = true);
+
 // Logs why a program is not to be had: what the GL says of each shader that does not compile, and of the
 // link. `name` is the program's in these lines.
-void QexShader_LogFailure(const char* name, uint32_t vertexShader, uint32_t fragmentShader, uint32_t program);
+void QexProgram_LogFailure(const char* name, uint32_t vertexShader, uint32_t fragmentShader,
+                           uint32_t program);
 
-// Compiles both sources and links them; when one step fails it says so and nothing is left. See
-// QexShader_CreateProgram for the attributes.
-bool QexShader_BuildProgram(const char* name, uint32_t* program, uint32_t* vertexShader,
-                            uint32_t* fragmentShader, const char* vertexSource, const char* fragmentSource,
-                            const char* const* attributes, int32_t attributeCount);
+// A location to be looked up, and where it goes.
+struct QexProgramLocation {
+    int32_t* location;
+    const char* name;
+};
 
-// Deletes what there is of them and makes the names 0. No program is in use afterwards.
-void QexShader_DeleteProgram(uint32_t* program, uint32_t* vertexShader, uint32_t* fragmentShader);
+struct QexProgramSampler {
+    const char* name;
+    int32_t unit;
+};
+
+// Looks a program up for a module, under which GL errors are reported.
+struct QexProgramLookup {
+    const char* module;
+    uint32_t program;
+    bool checked = true;  // whether looking up is followed by a look for errors
+
+    int32_t Uniform(const char* name) const;
+    int32_t Attribute(const char* name) const;
+    // The program is current.
+    void SetSampler(const QexProgramSampler& sampler) const;
+
+    template <size_t count>
+    void Uniforms(const QexProgramLocation (&uniforms)[count]) const {
+        for (const QexProgramLocation& uniform : uniforms) *uniform.location = Uniform(uniform.name);
+    }
+    template <size_t count>
+    void Attributes(const QexProgramLocation (&attributes)[count]) const {
+        for (const QexProgramLocation& attribute : attributes)
+            *attribute.location = Attribute(attribute.name);
+    }
+};

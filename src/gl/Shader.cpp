@@ -1,5 +1,4 @@
-#include "gl/Program.h"
-
+// Shader and program objects as applications make them.
 #include <cstring>
 
 #include "base/Memory.h"
@@ -45,59 +44,7 @@ void ReadLinkLog(uint32_t program, char* log) {
     log[QEX_SHADER_LOG_SIZE - 1] = 0;
 }
 
-// A line with the GL's own words. No checks: the failure itself is what is told.
-void LogWords(const char* name, const char* what, GLint length, uint32_t object,
-              void (*read)(GLuint, GLsizei, GLsizei*, GLchar*)) {
-    QexScratch<char> text(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
-    if (!text) return;
-    text[0] = 0;
-    if (length > 0) read(object, length, nullptr, text.Get());
-    QexError(QEX_TAG, "<%s> %s: %s", name, what, text.Get());
-}
-
-void LogShader(const char* name, const char* what, uint32_t shader) {
-    GLint compiled = GL_TRUE, length = 0;
-    if (!shader) return;
-    glGetShaderiv(shader, GL_COMPILE_STATUS, &compiled);
-    if (compiled) return;
-    glGetShaderiv(shader, GL_INFO_LOG_LENGTH, &length);
-    LogWords(name, what, length, shader, glGetShaderInfoLog);
-}
-
 }  // namespace
-
-void QexShader_LogFailure(const char* name, uint32_t vertexShader, uint32_t fragmentShader,
-                          uint32_t program) {
-    GLint linked = GL_TRUE, length = 0;
-    LogShader(name, "the vertex shader does not compile", vertexShader);
-    LogShader(name, "the fragment shader does not compile", fragmentShader);
-    if (!program) return;
-    glGetProgramiv(program, GL_LINK_STATUS, &linked);
-    if (linked) return;
-    glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
-    LogWords(name, "the program does not link", length, program, glGetProgramInfoLog);
-}
-
-bool QexShader_BuildProgram(const char* name, uint32_t* program, uint32_t* vertexShader,
-                            uint32_t* fragmentShader, const char* vertexSource, const char* fragmentSource,
-                            const char* const* attributes, int32_t attributeCount) {
-    if (QexShader_Create(vertexShader, vertexSource, GL_VERTEX_SHADER) == 0 &&
-        QexShader_Create(fragmentShader, fragmentSource, GL_FRAGMENT_SHADER) == 0 &&
-        QexShader_CreateProgram(program, *vertexShader, *fragmentShader, attributes, attributeCount,
-                                nullptr) == 0)
-        return true;
-    QexShader_LogFailure(name, *vertexShader, *fragmentShader, *program);
-    QexShader_DeleteProgram(program, vertexShader, fragmentShader);
-    return false;
-}
-
-void QexShader_DeleteProgram(uint32_t* program, uint32_t* vertexShader, uint32_t* fragmentShader) {
-    QexRenderState_UseProgram(0);
-    if (*program) QEX_GL(glDeleteProgram(*program));
-    if (*vertexShader) QEX_GL(glDeleteShader(*vertexShader));
-    if (*fragmentShader) QEX_GL(glDeleteShader(*fragmentShader));
-    *program = *vertexShader = *fragmentShader = 0;
-}
 
 extern "C" {
 

@@ -1,3 +1,4 @@
+// The two programs that applications draw their own meshes with: textured with vertex colours, or lit.
 #include "gl/GL.h"
 #include "gl/Program.h"
 
@@ -59,15 +60,13 @@ void main() {
 const char* const kColourAttributes[] = {"inVertex", "inNormal", "inColor", "inTexCoord"};
 const char* const kLightAttributes[] = {"inVertex", "inNormal", "inTexCoord"};
 
+const QexProgramSource kSources[] = {
+    {"QexShaderProgram_Create", kColourVertexSource, kColourFragmentSource, kColourAttributes, 4},
+    {"QexShaderProgram_Create", kLightVertexSource, kLightFragmentSource, kLightAttributes, 3}};
+
 // The shaders of the program created last.
 GLuint s_VertexShader;
 GLuint s_FragmentShader;
-
-int32_t Location(const QexShaderProgram* record, const char* name) {
-    int32_t location;
-    QEX_GL(location = glGetUniformLocation(record->program, name));
-    return location;
-}
 
 // A linked program keeps working without them.
 void DeleteShaders() {
@@ -85,19 +84,14 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
     const bool lit = type == QEX_PROGRAM_TEXTURE_LIGHT;
     if (!lit && type != QEX_PROGRAM_TEXTURE_COLOUR) return -1;
     DeleteShaders();
-    QexShader_Create(&s_VertexShader, lit ? kLightVertexSource : kColourVertexSource, GL_VERTEX_SHADER);
-    QexShader_Create(&s_FragmentShader, lit ? kLightFragmentSource : kColourFragmentSource,
-                     GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(&record->program, s_VertexShader, s_FragmentShader,
-                                lit ? kLightAttributes : kColourAttributes, lit ? 3 : 4, nullptr) != 0)
-        QexShader_LogFailure("QexShaderProgram_Create", s_VertexShader, s_FragmentShader, record->program);
-    record->mvpMatrixLoc = Location(record, "MVPMatrix");
-    if (lit) {
-        record->lightDirectionLoc = Location(record, "LightDirection");
-        record->lightColorLoc = Location(record, "LightColor");
-        record->globalAlphaLoc = Location(record, "GlobalAlpha");
-    }
-    QEX_GL(glUniform1i(Location(record, "sTexture"), 0));
+    QexProgram_Compile(kSources[lit], {&record->program, &s_VertexShader, &s_FragmentShader});
+    const QexProgramLookup lookup = {QEX_MODULE, record->program};
+    record->mvpMatrixLoc = lookup.Uniform("MVPMatrix");
+    if (lit)
+        lookup.Uniforms({{&record->lightDirectionLoc, "LightDirection"},
+                         {&record->lightColorLoc, "LightColor"},
+                         {&record->globalAlphaLoc, "GlobalAlpha"}});
+    lookup.SetSampler({"sTexture", kDiffuseUnit});
     return 0;
 }
 

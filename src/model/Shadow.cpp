@@ -11,32 +11,17 @@
 namespace {
 
 // The vertex elements that the depth programs read; both draw through what the shader modules share.
-const QexShaderModuleType kStaticCaster = {
-    QEX_MODULE,
-    nullptr,
-    nullptr,
-    nullptr,
-    {{"inVertex", QEX_ELEMENT_POSITION}, {"inTexCoord", QEX_ELEMENT_UV0}},
-    {},
-    {},
-    false,
-    0,
-    0,
-    true};
-const QexShaderModuleType kSkinnedCaster = {QEX_MODULE,
-                                            nullptr,
-                                            nullptr,
-                                            nullptr,
-                                            {{"inVertex", QEX_ELEMENT_POSITION},
-                                             {"inTexCoord", QEX_ELEMENT_UV0},
-                                             {"inBoneWeight", QEX_ELEMENT_BONE_WEIGHT},
-                                             {"inBoneIndex", QEX_ELEMENT_BONE_INDEX}},
-                                            {},
-                                            {},
-                                            false,
-                                            0,
-                                            0,
-                                            true};
+constexpr QexShaderModuleType MakeCaster(const QexShaderList& attributes) {
+    QexShaderModuleType type = {};
+    type.path = QEX_MODULE;
+    type.attributes = attributes;
+    type.isCaster = true;
+    return type;
+}
+constexpr QexShaderModuleType kStaticCaster =
+    MakeCaster(QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0));
+constexpr QexShaderModuleType kSkinnedCaster = MakeCaster(
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0, QEX_ELEMENT_BONE_WEIGHT, QEX_ELEMENT_BONE_INDEX));
 
 // The axis-aligned box of a box seen through a matrix.
 QexAABB TransformedBox(const QexMatrix* matrix, const QexBoundingBox* box) {

@@ -1,8 +1,9 @@
+// The shader modules and the shadow pass that all models share: made with the first, gone with the last.
 #include <cstring>
 
 #include "gl/GL.h"
-#include "gl/RenderTarget.h"
 #include "gl/Program.h"
+#include "gl/RenderTarget.h"
 #include "model/Model.h"
 
 #define QEX_MODULE "src/QexModel"
@@ -10,6 +11,7 @@
 namespace {
 
 constexpr int32_t kDefaultShadowSize = 512;
+constexpr char kName[] = "QexModel_CreateDefaultShader";
 
 // What lies before the near plane is drawn at it: it stands between the light and the view, and casts.
 const char* const kSkinShadowVertexSource = R"(
@@ -80,21 +82,23 @@ int32_t s_ReferenceCount;
 uint32_t s_Generation = 1;  // counts the shared sets that there were, from 1
 QexShaderModule* s_Lit;
 
-int32_t Location(GLuint program, const char* name) {
-    int32_t location;
-    QEX_GL(location = glGetUniformLocation(program, name));
-    return location;
-}
-
-// Compiles and links a shadow program and puts its alpha texture on its unit.
-void CreateShadowProgram(uint32_t* program, ShadowShaders* shaders, const char* vertexSource,
-                         const char* const* attributes, int32_t attributeCount) {
-    QexShader_Create(&shaders->vertex, vertexSource, GL_VERTEX_SHADER);
-    QexShader_Create(&shaders->fragment, kShadowFragmentSource, GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(program, shaders->vertex, shaders->fragment, attributes, attributeCount,
-                                nullptr) != 0)
-        QexShader_LogFailure("QexModel_CreateDefaultShader", shaders->vertex, shaders->fragment, *program);
-    QEX_GL(glUniform1i(Location(*program, "alphaTexture"), kAlphaUnit));
+// The shadow programs, each with its alpha texture on its unit.
+void CreateShadowPrograms() {
+    QexSkinShadowProgram& skin = m_SkinShadowShaderProgram;
+    QexModelShadowProgram& model = m_uModelShadowShaderProgram;
+    const QexProgramSampler alpha = {"alphaTexture", kAlphaUnit};
+    QexProgram_Compile({kName, kSkinShadowVertexSource, kShadowFragmentSource, kSkinShadowAttributes, 4},
+                       {&skin.program, &s_SkinShadowShaders.vertex, &s_SkinShadowShaders.fragment});
+    const QexProgramLookup skinLookup = {QEX_MODULE, skin.program};
+    skinLookup.SetSampler(alpha);
+    skinLookup.Uniforms({{&skin.viewProjMatrixLoc, "viewProjMatrix"},
+                         {&skin.boneCountLoc, "boneCount"},
+                         {&skin.boneMatrixArrayLoc, "boneMatrixArray"}});
+    QexProgram_Compile({kName, kShadowVertexSource, kShadowFragmentSource, kShadowAttributes, 2},
+                       {&model.program, &s_ModelShadowShaders.vertex, &s_ModelShadowShaders.fragment});
+    const QexProgramLookup modelLookup = {QEX_MODULE, model.program};
+    modelLookup.SetSampler(alpha);
+    model.mvpMatrixLoc = modelLookup.Uniform("mvpMatrix");
 }
 
 void CreateShadowTarget() {
@@ -161,16 +165,7 @@ int32_t QexModel_CreateDefaultShader(void) {
     s_Shared.texture = QexTextureShader_CreateProgram();
     s_Shared.skinning = QexSkinningTextureShader_CreateProgram();
     s_Shared.simple = QexSimpleShader_CreateProgram();
-    CreateShadowProgram(&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders, kSkinShadowVertexSource,
-                        kSkinShadowAttributes, 4);
-    m_SkinShadowShaderProgram.viewProjMatrixLoc =
-        Location(m_SkinShadowShaderProgram.program, "viewProjMatrix");
-    m_SkinShadowShaderProgram.boneCountLoc = Location(m_SkinShadowShaderProgram.program, "boneCount");
-    m_SkinShadowShaderProgram.boneMatrixArrayLoc =
-        Location(m_SkinShadowShaderProgram.program, "boneMatrixArray");
-    CreateShadowProgram(&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders, kShadowVertexSource,
-                        kShadowAttributes, 2);
-    m_uModelShadowShaderProgram.mvpMatrixLoc = Location(m_uModelShadowShaderProgram.program, "mvpMatrix");
+    CreateShadowPrograms();
     CreateShadowTarget();
     return 0;
 }
@@ -178,10 +173,10 @@ int32_t QexModel_CreateDefaultShader(void) {
 void QexModel_ReleaseShader(int32_t force) {
     if (s_ReferenceCount > 0 && --s_ReferenceCount > 0 && force != 1) return;
     DeleteShadowTarget();
-    QexShader_DeleteProgram(&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders.vertex,
-                            &s_SkinShadowShaders.fragment);
-    QexShader_DeleteProgram(&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders.vertex,
-                            &s_ModelShadowShaders.fragment);
+    QexProgram_Delete(
+        {&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders.vertex, &s_SkinShadowShaders.fragment});
+    QexProgram_Delete(
+        {&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders.vertex, &s_ModelShadowShaders.fragment});
     QexTextureShader_Release(&s_Shared.texture);
     QexSkinningTextureShader_Release(&s_Shared.skinning);
     QexSimpleShader_Release(&s_Shared.simple);

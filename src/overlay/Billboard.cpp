@@ -3,6 +3,7 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "gl/Program.h"
+#include "gl/Quad.h"
 #include "math/Float4.h"
 
 #define QEX_MODULE "src/QexBillboard"
@@ -39,31 +40,23 @@ void main() {
 
 const char* const kAttributes[] = {"inVertex", "inTexCoord"};
 
+const QexProgramNames kProgramNames = {&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader};
+
 bool CreateProgram() {
-    if (!QexShader_BuildProgram("QexBillboard_Create", &g_BillboardShaderProgramID, &g_BillboardVShader,
-                                &g_BillboardFShader, kVertexSource, kFragmentSource, kAttributes, 2)) {
+    if (!QexProgram_Build({"QexBillboard_Create", kVertexSource, kFragmentSource, kAttributes, 2},
+                          kProgramNames)) {
         QexError(QEX_TAG, "<QexBillboard_Create> the billboards' program cannot be built");
         return false;
     }
-    const GLuint program = g_BillboardShaderProgramID;
-    g_BillboardInPosLoc = glGetAttribLocation(program, "inVertex");
-    g_BillboardUVLoc = glGetAttribLocation(program, "inTexCoord");
-    g_BillboardMvpMatrixLoc = glGetUniformLocation(program, "mvpMatrix");
-    g_BillboardOpacityLoc = glGetUniformLocation(program, "opacity");
-    g_BillboardAlphaThresholdLoc = glGetUniformLocation(program, "alphaThreshold");
-    g_BillboardTextureLoc = glGetUniformLocation(program, "sTexture");
+    const QexProgramLookup lookup = {QEX_MODULE, g_BillboardShaderProgramID, false};
+    lookup.Attributes({{&g_BillboardInPosLoc, "inVertex"}, {&g_BillboardUVLoc, "inTexCoord"}});
+    lookup.Uniforms({{&g_BillboardMvpMatrixLoc, "mvpMatrix"},
+                     {&g_BillboardOpacityLoc, "opacity"},
+                     {&g_BillboardAlphaThresholdLoc, "alphaThreshold"},
+                     {&g_BillboardTextureLoc, "sTexture"}});
     QexVec3_Set(&g_VecUp, 0, 1, 0);
     QexVec3_Set(&g_VecNormal, 0, 0, 1);
     return true;
-}
-
-// As all of drawing a billboard, without error checks.
-void DeleteProgram() {
-    QexRenderState_UseProgram(0);
-    if (g_BillboardShaderProgramID) glDeleteProgram(g_BillboardShaderProgramID);
-    if (g_BillboardVShader) glDeleteShader(g_BillboardVShader);
-    if (g_BillboardFShader) glDeleteShader(g_BillboardFShader);
-    g_BillboardShaderProgramID = g_BillboardVShader = g_BillboardFShader = 0;
 }
 
 // The angle of that cosine in degrees, with 3.14 for pi as ever: a quarter turn comes to 90.05 degrees. 0
@@ -179,8 +172,6 @@ void QexBillboard_SetTexture(QexBillboard* billboard, QexTexture* texture) {
 // Without error checks: a particle system draws hundreds of these.
 void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
     if (!billboard || !camera) return;
-    const GLuint position = static_cast<GLuint>(g_BillboardInPosLoc);
-    const GLuint texCoord = static_cast<GLuint>(g_BillboardUVLoc);
     QexMatrix mvp;
     const bool simple = billboard->mode == QEX_BILLBOARD_SCREEN && !HasPerspective(camera->viewMatrix);
     (simple ? BuildScreenMVP : BuildMVP)(&mvp, *billboard, *camera);
@@ -190,21 +181,16 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
     glUniformMatrix4fv(g_BillboardMvpMatrixLoc, 1, GL_FALSE, mvp.m);
     glUniform1i(g_BillboardTextureLoc, kDiffuseUnit);
     QexTexture_Set(billboard->texture, kDiffuseUnit);
-    glEnableVertexAttribArray(position);
-    glEnableVertexAttribArray(texCoord);
-    glVertexAttribPointer(position, 3, GL_FLOAT, GL_FALSE, 3 * sizeof(float), g_BB_Vertices);
-    glVertexAttribPointer(texCoord, 2, GL_FLOAT, GL_FALSE, 2 * sizeof(float), g_BB_UVs);
+    const QexQuadArray arrays[] = {{g_BillboardInPosLoc, 3, g_BB_Vertices}, {g_BillboardUVLoc, 2, g_BB_UVs}};
     glDisable(GL_CULL_FACE);
-    glDrawElements(GL_TRIANGLE_STRIP, 4, GL_UNSIGNED_BYTE, g_BB_indices);
+    QexQuad_Draw(nullptr, arrays);
     glEnable(GL_CULL_FACE);
-    glDisableVertexAttribArray(position);
-    glDisableVertexAttribArray(texCoord);
 }
 
 void QexBillboard_Release(QexBillboard* billboard) {
     if (!billboard) return;
     QexMemory_Free(billboard);
-    if (--g_BillboardCount == 0) DeleteProgram();
+    if (--g_BillboardCount == 0) QexProgram_Delete(kProgramNames, false);
 }
 
 }  // extern "C"

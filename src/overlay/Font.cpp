@@ -350,25 +350,23 @@ int32_t QexFont_CreateShader(void) {
     QexFontProgram& p = s_Program;
     if (p.program) QexFont_ReleaseShader(1);
     ReleaseSheets();
-    if (!QexShader_BuildProgram("QexFont_CreateShader", &p.program, &p.vertexShader, &p.fragmentShader,
-                                kVertexSource, kFragmentSource, nullptr, 0))
+    if (!QexProgram_Build({"QexFont_CreateShader", kVertexSource, kFragmentSource, nullptr, 0},
+                          {&p.program, &p.vertexShader, &p.fragmentShader}))
         return -1;
     s_ToldNoProgram = false;
-    QEX_GL(p.position = glGetAttribLocation(p.program, "a_v4Position"));
-    QEX_GL(p.colour = glGetAttribLocation(p.program, "a_v4FontColor"));
-    QEX_GL(p.texCoord = glGetAttribLocation(p.program, "a_v2TexCoord"));
-    QEX_GL(p.projectionLocation = glGetUniformLocation(p.program, "u_m4Projection"));
+    const QexProgramLookup lookup = {QEX_MODULE, p.program};
+    lookup.Attributes(
+        {{&p.position, "a_v4Position"}, {&p.colour, "a_v4FontColor"}, {&p.texCoord, "a_v2TexCoord"}});
+    p.projectionLocation = lookup.Uniform("u_m4Projection");
     QEX_GL(glUniformMatrix4fv(p.projectionLocation, 1, GL_FALSE, s_Projection.m));
-    QEX_GL(p.textureLocation = glGetUniformLocation(p.program, "u_s2dTexture"));
-    QEX_GL(glUniform1i(p.textureLocation, kDiffuseUnit));
-    QEX_GL(p.alphaLocation = glGetUniformLocation(p.program, "u_s2dAlpha"));
-    QEX_GL(glUniform1i(p.alphaLocation, kAlphaUnit));
+    lookup.SetSampler({"u_s2dTexture", kDiffuseUnit});
+    lookup.SetSampler({"u_s2dAlpha", kAlphaUnit});
     CreateSheet(kPlainSheet, fontdata);
     return 0;
 }
 
 void QexFont_ReleaseShader(int32_t) {
-    QexShader_DeleteProgram(&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader);
+    QexProgram_Delete({&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader});
 }
 
 int32_t QexFont_Release(void) {

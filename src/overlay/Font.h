@@ -12,9 +12,7 @@ struct QexFontProgram {
     int32_t position;  // attribute locations
     int32_t colour;
     int32_t texCoord;
-    int32_t projectionLocation;  // uniform locations
-    int32_t textureLocation;
-    int32_t alphaLocation;
+    int32_t projectionLocation;  // of the uniform
 };
 
 const QexFontProgram* QexFont_GetProgram();

@@ -1,5 +1,6 @@
 // Textures on the screen, drawn with the font's program.
 #include "gl/GL.h"
+#include "gl/Quad.h"
 #include "overlay/Font.h"
 
 #define QEX_MODULE "src/QexFont"
@@ -8,11 +9,10 @@ namespace {
 
 constexpr float kNoTextureSize = 64;
 
-// One quad, written anew by each call: a strip of vertices upper left, upper right, lower left, lower right.
+// One quad, written anew by each call.
 float s_Positions[4][3];
 float s_TexCoords[4][2];
 float s_Colours[4][4];
-const uint8_t kIndices[4] = {0, 2, 1, 3};
 
 // The part of a texture that is shown, in texture coordinates, and the size of its picture in texels.
 struct Span {
@@ -62,14 +62,10 @@ bool NeedFont(const QexRuntimeContext* context, const char* function, int32_t* r
 
 void DrawQuad() {
     const QexFontProgram& program = *QexFont_GetProgram();
-    const GLuint arrays[3] = {static_cast<GLuint>(program.position), static_cast<GLuint>(program.colour),
-                              static_cast<GLuint>(program.texCoord)};
-    for (const GLuint array : arrays) QEX_GL(glEnableVertexAttribArray(array));
-    QEX_GL(glVertexAttribPointer(arrays[0], 3, GL_FLOAT, GL_FALSE, 0, s_Positions));
-    QEX_GL(glVertexAttribPointer(arrays[1], 4, GL_FLOAT, GL_FALSE, 0, s_Colours));
-    QEX_GL(glVertexAttribPointer(arrays[2], 2, GL_FLOAT, GL_FALSE, 0, s_TexCoords));
-    QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, 4, GL_UNSIGNED_BYTE, kIndices));
-    for (const GLuint array : arrays) QEX_GL(glDisableVertexAttribArray(array));
+    const QexQuadArray arrays[] = {{program.position, 3, s_Positions[0]},
+                                   {program.colour, 4, s_Colours[0]},
+                                   {program.texCoord, 2, s_TexCoords[0]}};
+    QexQuad_Draw(QEX_MODULE, arrays);
 }
 
 }  // namespace

@@ -1,0 +1,85 @@
+#include "gl/Program.h"
+
+#include "base/Memory.h"
+#include "gl/GL.h"
+
+#define QEX_MODULE "src/QexShader"
+
+namespace {
+
+// A line with the GL's own words. No checks: the failure itself is what is told.
+void LogWords(const char* name, const char* what, GLint length, uint32_t object,
+              void (*read)(GLuint, GLsizei, GLsizei*, GLchar*)) {
+    QexScratch<char> text(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
+    if (!text) return;
+    text[0] = 0;
+    if (length > 0) read(object, length, nullptr, text.Get());
+    QexError(QEX_TAG, "<%s> %s: %s", name, what, text.Get());
+}
+
+void LogShader(const char* name, const char* what, uint32_t shader) {
+    GLint compiled = GL_TRUE, length = 0;
+    if (!shader) return;
+    glGetShaderiv(shader, GL_COMPILE_STATUS, &compiled);
+    if (compiled) return;
+    glGetShaderiv(shader, GL_INFO_LOG_LENGTH, &length);
+    LogWords(name, what, length, shader, glGetShaderInfoLog);
+}
+
+}  // namespace
+
+void QexProgram_LogFailure(const char* name, uint32_t vertexShader, uint32_t fragmentShader,
+                           uint32_t program) {
+    GLint linked = GL_TRUE, length = 0;
+    LogShader(name, "the vertex shader does not compile", vertexShader);
+    LogShader(name, "the fragment shader does not compile", fragmentShader);
+    if (!program) return;
+    glGetProgramiv(program, GL_LINK_STATUS, &linked);
+    if (linked) return;
+    glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
+    LogWords(name, "the program does not link", length, program, glGetProgramInfoLog);
+}
+
+bool QexProgram_Compile(const QexProgramSource& source, const QexProgramNames& names) {
+    const bool vertex = QexShader_Create(names.vertexShader, source.vertex, GL_VERTEX_SHADER) == 0;
+    const bool fragment = QexShader_Create(names.fragmentShader, source.fragment, GL_FRAGMENT_SHADER) == 0;
+    if (QexShader_CreateProgram(names.program, *names.vertexShader, *names.fragmentShader, source.attributes,
+                                source.attributeCount, nullptr) == 0 &&
+        vertex && fragment)
+        return true;
+    QexProgram_LogFailure(source.name, *names.vertexShader, *names.fragmentShader, *names.program);
+    return false;
+}
+
+bool QexProgram_Build(const QexProgramSource& source, const QexProgramNames& names) {
+    if (QexProgram_Compile(source, names)) return true;
+    QexProgram_Delete(names);
+    return false;
+}
+
+void QexProgram_Delete(const QexProgramNames& names, bool checked) {
+    QexRenderState_UseProgram(0);
+    if (*names.program) QEX_GL_IF(checked, glDeleteProgram(*names.program));
+    if (*names.vertexShader) QEX_GL_IF(checked, glDeleteShader(*names.vertexShader));
+    if (*names.fragmentShader) QEX_GL_IF(checked, glDeleteShader(*names.fragmentShader));
+    *names.program = *names.vertexShader = *names.fragmentShader = 0;
+}
+
+#undef QEX_MODULE
+#define QEX_MODULE module
+
+int32_t QexProgramLookup::Uniform(const char* name) const {
+    int32_t location;
+    QEX_GL_IF(checked, location = glGetUniformLocation(program, name));
+    return location;
+}
+
+int32_t QexProgramLookup::Attribute(const char* name) const {
+    int32_t location;
+    QEX_GL_IF(checked, location = glGetAttribLocation(program, name));
+    return location;
+}
+
+void QexProgramLookup::SetSampler(const QexProgramSampler& sampler) const {
+    QEX_GL(glUniform1i(Uniform(sampler.name), sampler.unit));
+}
