@@ -1,3 +1,4 @@
+// The log of hosts that are not Android: lines on standard error.
 #include "base/AndroidLog.h"
 
 #if !defined(__ANDROID__)

@@ -1,3 +1,4 @@
+// The log, its level and its sink, and the two reports that name a place in the source.
 #include "base/Diagnostics.h"
 
 #include <cstdarg>

@@ -1,3 +1,4 @@
+// The process heap, and the pool whose statistics alone are kept.
 #include "base/Memory.h"
 
 #include <cstdlib>

@@ -1,3 +1,4 @@
+// The millisecond clock, the frame-rate meter, and animations of a few floats.
 #include <sys/time.h>
 
 #include <cmath>

@@ -1,3 +1,4 @@
+// Particle emitters: what is drawn at random, how particles move, and how they are drawn.
 #include <cmath>
 
 #include "base/Diagnostics.h"

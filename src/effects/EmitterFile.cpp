@@ -1,3 +1,4 @@
+// Emitter files: written and read as one record of words, with a check of what was read.
 #include <cmath>
 #include <cstdio>
 #include <cstring>

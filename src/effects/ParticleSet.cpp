@@ -1,3 +1,4 @@
+// Particle sets: points that the vertex shader moves, drawn in one call.
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "gl/Program.h"

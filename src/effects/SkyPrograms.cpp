@@ -1,3 +1,4 @@
+// The shaders of sky and water.
 #include "effects/SkyPrograms.h"
 
 #include "gl/Program.h"

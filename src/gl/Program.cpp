@@ -1,3 +1,4 @@
+// Compiling, linking, looking up and deleting programs, with the reason when one is not to be had.
 #include "gl/Program.h"
 
 #include "base/Memory.h"

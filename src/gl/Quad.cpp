@@ -1,3 +1,4 @@
+// The one quad drawer.
 #include "gl/Quad.h"
 
 #include "gl/GL.h"

@@ -1,3 +1,4 @@
+// Framebuffers that a scene is drawn into, with a colour texture and a depth buffer.
 #include <cstring>
 
 #include "gl/GL.h"

@@ -1,3 +1,4 @@
+// The state cache, and the renderer's settings.
 #include "gl/GL.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"

@@ -1,3 +1,4 @@
+// Two pictures in one: colour masks or halves of the screen.
 #include "gl/GL.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"

@@ -1,3 +1,4 @@
+// Boxes and axis-aligned boxes: extents, unions, intersections, overlaps.
 #include <cfloat>
 #include <initializer_list>
 

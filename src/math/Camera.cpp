@@ -1,3 +1,4 @@
+// The camera record: its view, its projection, its frustum.
 #include <cmath>
 #include <initializer_list>
 

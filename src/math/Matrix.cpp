@@ -1,3 +1,4 @@
+// 3x3 and 4x4 matrices.
 #include <cmath>
 #include <cstring>
 

@@ -1,3 +1,4 @@
+// Planes and the water's part of a frustum, systems of equations, random numbers.
 #include <cmath>
 #include <cstdlib>
 #include <cstring>

@@ -1,3 +1,4 @@
+// Quaternions, Euler angles, decomposition.
 #include <cmath>
 
 #include "math/Float4.h"

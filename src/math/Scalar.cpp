@@ -1,3 +1,4 @@
+// Square root, arc functions from series, and small helpers.
 #include <cfloat>
 #include <cmath>
 

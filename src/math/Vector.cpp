@@ -1,3 +1,4 @@
+// Vectors of two, three and four floats.
 #include <cmath>
 
 #include "Qex.h"

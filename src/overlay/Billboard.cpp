@@ -1,3 +1,4 @@
+// Billboards: textured quads in space that face the camera in one of several ways.
 #include <cmath>
 
 #include "base/Memory.h"
