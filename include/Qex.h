@@ -11,15 +11,17 @@
  *   Qex/resources.h        whole files in memory, the bounded reading cursor, caches
  *   Qex/pod.h              POD scenes: records, reading, vertex access
  *   Qex/pod_animation.h    POD scenes that move: bone batching, animation and world matrices
- *   Qex/shaders.h          render state, renderer settings, shaders and programs
+ *   Qex/meshes.h           meshes of plain arrays
+ *   Qex/decoders.h         decoders of compressed pixels
+ *   Qex/renderer.h         the context record, render state, renderer settings, stereo, shaders and programs
  *   Qex/textures.h         textures and render targets
- *   Qex/shader_modules.h   the built-in shader modules
+ *   Qex/shader_modules.h   the built-in shader modules, and the records that they draw
  *   Qex/models.h           models: loading, from arrays, rendering
  *   Qex/shadows.h          shadows and planar reflection of models
  *   Qex/scene_nodes.h      nodes of a model, picking, and the tree of scene nodes
  *   Qex/overlay.h          text, textures and pictures on the screen, billboards
  *   Qex/effects.h          sky box and water, particles, post-processing
- *   Qex/engine.h           the engine: start and end, stereo
+ *   Qex/engine.h           the engine: start and end
  *
  * Conventions that hold throughout:
  * - One thread. Every call comes from the thread that owns the GL context; nothing is locked. Functions
@@ -41,18 +43,20 @@
 #define QEX_H
 
 #include "Qex/base.h"
+#include "Qex/decoders.h"
 #include "Qex/effects.h"
 #include "Qex/engine.h"
 #include "Qex/geometry.h"
 #include "Qex/math.h"
+#include "Qex/meshes.h"
 #include "Qex/models.h"
 #include "Qex/overlay.h"
 #include "Qex/pod.h"
 #include "Qex/pod_animation.h"
+#include "Qex/renderer.h"
 #include "Qex/resources.h"
 #include "Qex/scene_nodes.h"
 #include "Qex/shader_modules.h"
-#include "Qex/shaders.h"
 #include "Qex/shadows.h"
 #include "Qex/textures.h"
 

@@ -2,7 +2,11 @@
 #ifndef QEX_EFFECTS_H
 #define QEX_EFFECTS_H
 
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 #include "Qex/overlay.h"
+#include "Qex/textures.h"
 
 QEX_BEGIN
 

@@ -1,17 +1,14 @@
-/* The engine: start and end, stereo. */
+/* The engine: start and end.
+ *
+ * The application owns window, surface and GL context; it makes the context current, initialises the engine
+ * once, draws any number of frames, swaps buffers itself, and shuts the engine down.
+ */
 #ifndef QEX_ENGINE_H
 #define QEX_ENGINE_H
 
 #include "Qex/base.h"
 
 QEX_BEGIN
-
-/* ======================================================================================================
- * Engine: start and end
- *
- * The application owns window, surface and GL context; it makes the context current, initialises the engine
- * once, draws any number of frames, swaps buffers itself, and shuts the engine down.
- * ====================================================================================================== */
 
 /** Size of QexEngineConfig on 32-bit targets. Both init functions take this and sizeof(QexEngineConfig). */
 #define QEX_ENGINE_CONFIG_SIZE 44u
@@ -30,25 +27,6 @@ typedef struct QexEngineConfig {
     void* memory;        /* block lent for the memory pool until shutdown, may be null */
     uint32_t memorySize; /* its bytes */
 } QexEngineConfig;
-
-/** The engine's context; the application allocates it, initialisation fills it. */
-struct QexRuntimeContext {
-    uint32_t startTime; /* what QexTime_Init returned */
-    uint32_t windowWord1;
-    uint32_t windowWord2;
-    uint32_t windowWord3;
-    uint32_t windowWord4;
-    int32_t width; /* of the drawing surface, pixels */
-    int32_t height;
-    uint32_t windowWord7;
-    uint32_t windowWord8;
-    uint32_t reserved[2];   /* 0 */
-    void* poolBlock;        /* the lent block as given */
-    void* poolBase;         /* the same, rounded up to a multiple of 4 */
-    uint32_t poolSize;      /* bytes from poolBase on */
-    float stereoSeparation; /* pixels, see QexRenderer_EnableStereo3D */
-    uint32_t stereoMode;    /* QEX_STEREO_... */
-};
 
 /** Initialises the engine and sets the engine flag.
  *  @param context     filled
@@ -104,45 +82,6 @@ QEX_API int32_t createWindow(void);
 /** Does nothing. @return 0. */
 QEX_API int32_t destroyWindow(void);
 #endif
-
-/* ======================================================================================================
- * Stereo
- *
- * A frame for two eyes: QexRenderer_PrepareLeft, draw, QexRenderer_PrepareRight, draw again (from a camera
- * moved aside, if the application likes), QexRenderer_FinishStereo3D. Either both eyes use the whole surface,
- * kept apart by colour and shifted by the separation, or each has one half. Clears obey the depth mask: leave
- * writing of depth on. These three functions need a current GL context, the settings do not.
- * ====================================================================================================== */
-
-/** Stereo modes; in another, as in QEX_STEREO_OFF, the eyes are not told apart. */
-#define QEX_STEREO_OFF 0
-#define QEX_STEREO_RED_BLUE 1     /* left eye red, right eye blue */
-#define QEX_STEREO_RED_CYAN 2     /* left eye red, right eye green and blue */
-#define QEX_STEREO_SIDE_BY_SIDE 3 /* left eye on the left half, right eye on the right */
-
-/** Sets mode and separation; they stay until changed.
- *  @param mode        QEX_STEREO_...
- *  @param separation  pixels by which the left eye's picture moves to the left and the right eye's to the
- * right, in the colour modes; cut towards 0 to whole pixels; what is no number, or 65536 and more, counts as
- * 0
- *  @return 0. */
-QEX_API int32_t QexRenderer_EnableStereo3D(QexRuntimeContext* context, uint32_t mode, float separation);
-
-/** Sets the separation alone; see QexRenderer_EnableStereo3D. */
-QEX_API void QexRenderer_SetDepthSeperation(QexRuntimeContext* context, float separation);
-
-/** Sets the mode QEX_STEREO_OFF. */
-QEX_API void QexRenderer_DisableStereo3D(QexRuntimeContext* context);
-
-/** Clears colour and depth, in every mode, and sets colour mask and viewport for the left eye. Of a surface
- *  of an odd width, the last column belongs to neither half. */
-QEX_API void QexRenderer_PrepareLeft(const QexRuntimeContext* context);
-
-/** Clears the depth and sets colour mask and viewport for the right eye; does nothing in QEX_STEREO_OFF. */
-QEX_API void QexRenderer_PrepareRight(const QexRuntimeContext* context);
-
-/** Sets the whole colour mask and the viewport of the whole surface, in every mode. */
-QEX_API void QexRenderer_FinishStereo3D(const QexRuntimeContext* context);
 
 QEX_END
 

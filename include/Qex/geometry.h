@@ -2,6 +2,7 @@
 #ifndef QEX_GEOMETRY_H
 #define QEX_GEOMETRY_H
 
+#include "Qex/base.h"
 #include "Qex/math.h"
 
 QEX_BEGIN

@@ -2,9 +2,12 @@
 #ifndef QEX_MODELS_H
 #define QEX_MODELS_H
 
-#include "Qex/pod_animation.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/meshes.h"
+#include "Qex/resources.h"
 #include "Qex/shader_modules.h"
-#include "Qex/textures.h"
 
 QEX_BEGIN
 
@@ -15,83 +18,6 @@ QEX_BEGIN
  * which stays in place from QexModel_Create to QexModel_Unload. Needs a current GL context, except where a
  * function says not.
  * ====================================================================================================== */
-
-/** Bit of QexModel.flags: the model loaded its textures from files and owns them. */
-#define QEX_MODEL_OWNS_TEXTURES 0x01u
-/** Bit of QexModel.flags: the model holds no share of the default shaders (its load failed, or it was
- *  unloaded), so that unloading it gives none back. */
-#define QEX_MODEL_NO_SHADERS 0x02u
-
-/** Called before a node's diffuse texture is bound. @return non-zero: the hook bound a texture itself. */
-typedef int32_t (*QexBindTextureHook)(QexModel* model, uint32_t nodeIndex);
-/** Called before a material's texture is loaded.
- *  @param path      directory and texture name; may be rewritten, which the alpha texture's does not follow
- *  @param capacity  characters that path holds, besides the NUL
- *  @return 0: the engine loads `path`. Non-zero: the hook dealt with it; the material's record (the last
- *  non-null entry of model->textures) is zeroed, and the hook may fill it with a texture of its own, which
- * the model then owns. QexModel_LoadTextureFromCache makes no record: there the material's entries stay null.
- */
-typedef int32_t (*QexLoadTextureHook)(QexModel* model, char* path, int32_t capacity);
-/** Called once for each mesh node near the end of loading; the default modules are set after it. @return not
- *  read. */
-typedef int32_t (*QexMeshNodeLoadedHook)(QexModel* model, QexPODMesh* mesh, uint32_t meshNodeIndex);
-
-struct QexModel {
-    uint32_t flags; /* QEX_MODEL_... */
-    QexPODModel scene;
-    QexTexture** textures;              /* diffuse texture of each material, null where none */
-    QexTexture** alphaTextures;         /* alpha texture of each material, null where none */
-    QexBoundingBox* nodeBoxes;          /* box of each mesh node in the world: its corners, as of
-                                           QexModel_UpdateModelBoundingBox, 0 before */
-    QexBoundingBox* screenBoxes;        /* box of each mesh node on screen, see QexModel_CalcScreenBBox */
-    uint32_t* vertexBuffers;            /* GL buffer of each mesh */
-    uint32_t* indexBuffers;             /* GL buffer of each mesh, 0 for one without indices */
-    float currentFrame;                 /* animation position in frames */
-    QexBindTextureHook bindTextureHook; /* the three hooks: optional, set between */
-    QexLoadTextureHook loadTextureHook; /* QexModel_Create and loading */
-    QexMeshNodeLoadedHook meshNodeLoadedHook;
-    uint32_t
-        sharedGeneration; /* the engine's: which set of shared shaders its nodes were given, 0 for none */
-};
-
-/** Light types of QexLight. */
-#define QEX_LIGHT_POINT 0
-#define QEX_LIGHT_DIRECTIONAL 1
-
-/** One light of a light set. */
-typedef struct QexLight {
-    int32_t type;    /* QEX_LIGHT_POINT: vector is its position; otherwise the direction in which it shines */
-    float vector[3]; /* world space */
-    float colour[4]; /* red, green, blue, 1 */
-} QexLight;
-
-#define QEX_MAX_LIGHTS 4
-
-/** The lights that a render call hands to the modules. */
-struct QexLightSet {
-    uint32_t count; /* 0 to QEX_MAX_LIGHTS */
-    QexLight lights[QEX_MAX_LIGHTS];
-};
-
-/** A model that may cast shadows. */
-typedef struct QexShadowCaster {
-    QexModel* model;
-    uint8_t allMeshNodes; /* non-zero: every mesh node; zero: those listed */
-    int32_t* nodeIndices; /* mesh nodes */
-    uint32_t nodeCount;   /* length of nodeIndices */
-} QexShadowCaster;
-
-/** What a shadow pass hands to the shadow-receiving modules. */
-struct QexShadowInfo {
-    QexVec3 lightDir;
-    QexMatrix lightViewProj;     /* world to the light's clip space */
-    QexMatrix shadowSpaceMatrix; /* world to shadow-map coordinates, 0..1 */
-    QexShadowCaster* casters;
-    uint32_t casterCount;
-    uint32_t shadowTexture; /* GL texture */
-    float shadowIntensity;  /* brightness factor of shadowed pixels */
-    float biasValue;        /* depth bias */
-};
 
 /** The skinned shadow program that all models share. */
 typedef struct QexSkinShadowProgram {
@@ -205,59 +131,10 @@ QEX_API uint32_t QexModel_GetNumMeshNodes(const QexModel* model);
 /* ======================================================================================================
  * Models from arrays
  *
- * Geometry that the application makes: a mesh of plain arrays becomes a model in one call. Boxes, spheres,
- * cylinders and planes are there to begin with. Their textures stand upright where the first row is the lower
+ * Geometry that the application makes: a mesh of plain arrays (Qex/meshes.h) becomes a model in one call. Its
+ * textures stand upright where the first row is the lower
  * edge, as `qex convert` and `qex texture --flip` write them. Front faces are counter-clockwise.
  * ====================================================================================================== */
-
-/** What 16-bit indices reach. */
-#define QEX_MESH_MAX_VERTICES 65536u
-
-/** A mesh. Zero it and set what there is; the arrays stay the application's. */
-typedef struct QexMesh {
-    uint32_t vertexCount;     /* 1 to QEX_MESH_MAX_VERTICES */
-    const QexVec3* positions; /* not null */
-    const QexVec3* normals;   /* of unit length; null: the model is drawn unlit */
-    const QexVec2* uvs;       /* texture coordinates; null: none */
-    const uint32_t* colours;  /* 0xAARRGGBB a vertex; null: white */
-    uint32_t indexCount;      /* three a triangle; 0: each three vertices are one */
-    const uint16_t* indices;  /* null where the count is 0 */
-    void* memory;             /* arrays that QexMesh_Create... made, else null */
-} QexMesh;
-
-/** Makes the mesh of a box around the origin: 24 vertices, on each face the whole texture.
- *  @param mesh  out; what it held is overwritten, not released. Release with QexMesh_Release
- *  @param width, height, depth  along x, y and z, > 0
- *  @return 0; -1, with a line in the log and an empty mesh, for sizes that are not above 0 or when memory
- *  runs out; -1 for null. No GL context needed. */
-QEX_API int32_t QexMesh_CreateBox(QexMesh* mesh, float width, float height, float depth);
-
-/** Makes the mesh of a sphere around the origin: the texture once around from west to east, seen from
- *  outside, its lower edge at the pole -Y and its middle in the direction +Z.
- *  @param radius    > 0
- *  @param segments  3 to 128 from pole to pole, twice as many around
- *  @return as QexMesh_CreateBox, which says the rest; -1 also for other segments. */
-QEX_API int32_t QexMesh_CreateSphere(QexMesh* mesh, float radius, uint32_t segments);
-
-/** Makes the mesh of a cylinder about the y axis, its middle in the origin, closed by two discs: the texture
- *  once around its side, and its inscribed circle on each disc.
- *  @param radius, height  > 0
- *  @param segments        around, 3 to 4096
- *  @return as QexMesh_CreateSphere. */
-QEX_API int32_t QexMesh_CreateCylinder(QexMesh* mesh, float radius, float height, uint32_t segments);
-
-/** Makes the mesh of a rectangle at y = 0 around the origin that is seen from above, the texture's lower edge
- *  towards +Z.
- *  @param width, depth  along x and z, > 0
- *  @param segments      cells along each side, 1 to 255; vertex lighting gets finer with them
- *  @param repeat        how often the texture goes along each side; above 1 it has to wrap with
- *                       QEX_WRAP_REPEAT
- *  @return as QexMesh_CreateSphere. */
-QEX_API int32_t QexMesh_CreatePlane(QexMesh* mesh, float width, float depth, uint32_t segments, float repeat);
-
-/** Frees what QexMesh_Create... made and empties the mesh; the application's own arrays are left alone.
- *  @param mesh  null does nothing. No GL context needed. */
-QEX_API void QexMesh_Release(QexMesh* mesh);
 
 /** Makes a model of a mesh: one mesh node, "mesh", with a white material of ambient 0.2 and diffuse 0.8. It
  * is drawn, moved, picked and unloaded like any other. With normals its module is lit (an even 0.2 where no

@@ -2,6 +2,9 @@
 #ifndef QEX_OVERLAY_H
 #define QEX_OVERLAY_H
 
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 #include "Qex/textures.h"
 
 QEX_BEGIN

@@ -7,7 +7,9 @@
 #ifndef QEX_POD_H
 #define QEX_POD_H
 
+#include "Qex/base.h"
 #include "Qex/geometry.h"
+#include "Qex/math.h"
 #include "Qex/resources.h"
 
 QEX_BEGIN

@@ -2,6 +2,8 @@
 #ifndef QEX_POD_ANIMATION_H
 #define QEX_POD_ANIMATION_H
 
+#include "Qex/base.h"
+#include "Qex/math.h"
 #include "Qex/pod.h"
 
 QEX_BEGIN
@@ -14,6 +16,9 @@ QEX_BEGIN
  * make them for other data, and export the small containers that the work uses. No pointer may be null except
  * where a function says so. No GL context needed.
  * ====================================================================================================== */
+
+/** Most bones in a batch that the skinned modules draw. */
+#define QEX_MAX_BATCH_BONES 16
 
 /** A set of bone indices with a fixed capacity. */
 typedef struct CBatch {

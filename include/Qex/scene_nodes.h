@@ -2,7 +2,10 @@
 #ifndef QEX_SCENE_NODES_H
 #define QEX_SCENE_NODES_H
 
-#include "Qex/models.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
 
 QEX_BEGIN
 

@@ -1,4 +1,4 @@
-/* The built-in shader modules.
+/* The built-in shader modules, and the records that they draw: model, lights, shadow.
  *
  * A module draws one mesh node of a model with one pair of GLSL ES shaders. All share one record and one
  * contract: CreateProgram makes a module, its `render` draws nodes, Release ends it; one module serves any
@@ -12,10 +12,89 @@
 #ifndef QEX_SHADER_MODULES_H
 #define QEX_SHADER_MODULES_H
 
+#include "Qex/base.h"
+#include "Qex/geometry.h"
 #include "Qex/math.h"
-#include "Qex/shaders.h"
+#include "Qex/pod.h"
 
 QEX_BEGIN
+
+/** Bit of QexModel.flags: the model loaded its textures from files and owns them. */
+#define QEX_MODEL_OWNS_TEXTURES 0x01u
+/** Bit of QexModel.flags: the model holds no share of the default shaders (its load failed, or it was
+ *  unloaded), so that unloading it gives none back. */
+#define QEX_MODEL_NO_SHADERS 0x02u
+
+/** Called before a node's diffuse texture is bound. @return non-zero: the hook bound a texture itself. */
+typedef int32_t (*QexBindTextureHook)(QexModel* model, uint32_t nodeIndex);
+/** Called before a material's texture is loaded.
+ *  @param path      directory and texture name; may be rewritten, which the alpha texture's does not follow
+ *  @param capacity  characters that path holds, besides the NUL
+ *  @return 0: the engine loads `path`. Non-zero: the hook dealt with it; the material's record (the last
+ *  non-null entry of model->textures) is zeroed, and the hook may fill it with a texture of its own, which
+ * the model then owns. QexModel_LoadTextureFromCache makes no record: there the material's entries stay null.
+ */
+typedef int32_t (*QexLoadTextureHook)(QexModel* model, char* path, int32_t capacity);
+/** Called once for each mesh node near the end of loading; the default modules are set after it. @return not
+ *  read. */
+typedef int32_t (*QexMeshNodeLoadedHook)(QexModel* model, QexPODMesh* mesh, uint32_t meshNodeIndex);
+
+struct QexModel {
+    uint32_t flags; /* QEX_MODEL_... */
+    QexPODModel scene;
+    QexTexture** textures;              /* diffuse texture of each material, null where none */
+    QexTexture** alphaTextures;         /* alpha texture of each material, null where none */
+    QexBoundingBox* nodeBoxes;          /* box of each mesh node in the world: its corners, as of
+                                           QexModel_UpdateModelBoundingBox, 0 before */
+    QexBoundingBox* screenBoxes;        /* box of each mesh node on screen, see QexModel_CalcScreenBBox */
+    uint32_t* vertexBuffers;            /* GL buffer of each mesh */
+    uint32_t* indexBuffers;             /* GL buffer of each mesh, 0 for one without indices */
+    float currentFrame;                 /* animation position in frames */
+    QexBindTextureHook bindTextureHook; /* the three hooks: optional, set between */
+    QexLoadTextureHook loadTextureHook; /* QexModel_Create and loading */
+    QexMeshNodeLoadedHook meshNodeLoadedHook;
+    uint32_t
+        sharedGeneration; /* the engine's: which set of shared shaders its nodes were given, 0 for none */
+};
+
+/** Light types of QexLight. */
+#define QEX_LIGHT_POINT 0
+#define QEX_LIGHT_DIRECTIONAL 1
+
+/** One light of a light set. */
+typedef struct QexLight {
+    int32_t type;    /* QEX_LIGHT_POINT: vector is its position; otherwise the direction in which it shines */
+    float vector[3]; /* world space */
+    float colour[4]; /* red, green, blue, 1 */
+} QexLight;
+
+#define QEX_MAX_LIGHTS 4
+
+/** The lights that a render call hands to the modules. */
+struct QexLightSet {
+    uint32_t count; /* 0 to QEX_MAX_LIGHTS */
+    QexLight lights[QEX_MAX_LIGHTS];
+};
+
+/** A model that may cast shadows. */
+typedef struct QexShadowCaster {
+    QexModel* model;
+    uint8_t allMeshNodes; /* non-zero: every mesh node; zero: those listed */
+    int32_t* nodeIndices; /* mesh nodes */
+    uint32_t nodeCount;   /* length of nodeIndices */
+} QexShadowCaster;
+
+/** What a shadow pass hands to the shadow-receiving modules. */
+struct QexShadowInfo {
+    QexVec3 lightDir;
+    QexMatrix lightViewProj;     /* world to the light's clip space */
+    QexMatrix shadowSpaceMatrix; /* world to shadow-map coordinates, 0..1 */
+    QexShadowCaster* casters;
+    uint32_t casterCount;
+    uint32_t shadowTexture; /* GL texture */
+    float shadowIntensity;  /* brightness factor of shadowed pixels */
+    float biasValue;        /* depth bias */
+};
 
 /** Draws one node.
  *  @param module       the instance whose `render` is called
@@ -38,9 +117,6 @@ typedef union QexShaderSlot {
 } QexShaderSlot;
 
 #define QEX_SHADER_SLOTS 28
-
-/** Most bones in a batch that the skinned modules draw. */
-#define QEX_MAX_BATCH_BONES 16
 
 /** A module. The slots hold the uniform locations in the module's own order, then its parameters. */
 struct QexShaderModule {

@@ -2,7 +2,10 @@
 #ifndef QEX_SHADOWS_H
 #define QEX_SHADOWS_H
 
-#include "Qex/models.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/shader_modules.h"
 
 QEX_BEGIN
 

@@ -4,7 +4,7 @@
 #include "gl/GL.h"
 #include "gl/Program.h"
 #include "gl/Quad.h"
-#include "gl/RenderTarget.h"
+#include "texture/RenderTarget.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 

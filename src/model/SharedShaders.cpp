@@ -3,7 +3,7 @@
 
 #include "gl/GL.h"
 #include "gl/Program.h"
-#include "gl/RenderTarget.h"
+#include "texture/RenderTarget.h"
 #include "model/Model.h"
 
 #define QEX_MODULE "src/QexModel"

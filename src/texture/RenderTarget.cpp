@@ -2,7 +2,7 @@
 #include <cstring>
 
 #include "gl/GL.h"
-#include "gl/RenderTarget.h"
+#include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexRenderTarget"
 
