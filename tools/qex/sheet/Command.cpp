@@ -31,8 +31,8 @@ void SetUpSheet(CLI::App* app, SheetOptions* options) {
     app->add_option("PICTURES", options->inputs, "pictures, row by row; - is standard input")->required();
     app->add_option("-o,--output", options->output, "PNG, JPEG, BMP or TGA file, by its extension")
         ->required();
-    app->add_option("--columns", options->columns, "pictures in a row (4)")->check(NumberFrom(1, 1000));
-    app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(NumberFrom(0, 1000));
+    app->add_option("--columns", options->columns, "pictures in a row (4)")->check(WholeNumberFrom(1, 1000));
+    app->add_option("--gap", options->gap, "pixels between pictures (4)")->check(WholeNumberFrom(0, 1000));
 }
 
 int RunSheet(const SheetOptions& options) {
