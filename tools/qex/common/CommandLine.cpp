@@ -12,8 +12,6 @@
 
 namespace {
 
-constexpr int kMostTexts = 1000;
-
 // What CLI11 knows an option by that is read here: one text each time that it is given.
 CLI::Option* OneText(CLI::Option* option, int most) {
     return option->type_size(1)->expected(1, most)->allow_extra_args(false);
@@ -117,7 +115,7 @@ CLI::Option* AddChoice(CLI::App* app, const std::string& name, const std::string
 
 CLI::Option* AddTexts(CLI::App* app, const std::string& name, std::vector<std::string>* texts,
                       const std::string& help) {
-    return OneText(app->add_option(name, *texts, help), kMostTexts);
+    return OneText(app->add_option(name, *texts, help), kMostRepeats);
 }
 
 std::string Alternatives(const std::vector<std::string>& names) {

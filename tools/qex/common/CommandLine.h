@@ -20,6 +20,8 @@ struct Talk {
 };
 Talk& GetTalk();
 
+constexpr int kMostRepeats = 1000;  // of an option that may be given several times
+
 using Numbers = std::vector<double>;
 
 struct NumberRange {

@@ -13,7 +13,6 @@
 
 namespace {
 
-constexpr int kMostRepeats = 1000;
 constexpr double kAboveZero = 1e-300;
 constexpr NumberRange kAny = {}, kColour = {NumberRange::kColour}, kSide = {NumberRange::kWhole, 1, 8192};
 

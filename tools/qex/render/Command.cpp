@@ -16,7 +16,6 @@
 #include "render/Renderer.h"
 #include "render/Report.h"
 #include "render/Textures.h"
-#include "texture/Overrides.h"
 
 namespace {
 
@@ -161,7 +160,7 @@ std::string Renderer::WrongOutput() const {
     std::vector<std::string> inputs = {options_.input};
     for (const auto* more : {&effects.sky, &effects.emitters.emitters, &effects.emitters.textures})
         inputs.insert(inputs.end(), more->begin(), more->end());
-    for (const auto& [material, file] : SplitOverrides(options_.textures.overrides)) inputs.push_back(file);
+    for (const auto& [material, file] : options_.textures.overrides) inputs.push_back(file);
     for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
         if (model_.scene.textures[i].name)
             inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);
