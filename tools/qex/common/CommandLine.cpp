@@ -57,6 +57,15 @@ Talk& GetTalk() {
     return talk;
 }
 
+void Say(const std::string& verb, const std::string& text) {
+    fprintf(stderr, "qex %s: %s\n", verb.c_str(), text.c_str());
+}
+
+int Fail(const std::string& verb, const std::string& text, int status) {
+    Say(verb, text);
+    return status;
+}
+
 std::string ReadNumbers(const std::string& text, const NumberShape& shape, Numbers* numbers) {
     const std::vector<std::string> parts = Split(text, shape.separator);
     bool good = parts.size() == shape.needed || parts.size() == shape.ranges.size();

@@ -22,6 +22,10 @@ Talk& GetTalk();
 
 constexpr int kMostRepeats = 1000;  // of an option that may be given several times
 
+// "qex VERB: TEXT" on standard error. Fail returns the status.
+void Say(const std::string& verb, const std::string& text);
+int Fail(const std::string& verb, const std::string& text, int status);
+
 using Numbers = std::vector<double>;
 
 struct NumberRange {

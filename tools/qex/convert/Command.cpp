@@ -57,8 +57,7 @@ SceneSettings SettingsFor(const ConvertOptions& options) {
 }
 
 int BadArgument(const std::string& subject, const std::string& text) {
-    std::fprintf(stderr, "qex convert: %s: %s\n", subject.c_str(), text.c_str());
-    return kBadArgument;
+    return Fail("convert", subject + ": " + text, kBadArgument);
 }
 
 std::string OutputDirectory(const ConvertOptions& options) {
@@ -182,10 +181,7 @@ int ConvertFile(const ConvertOptions& options) {
         log.Error(error);
         return status;
     }
-    if (!textures.WriteError().empty()) {
-        std::fprintf(stderr, "qex convert: %s\n", textures.WriteError().c_str());
-        return kBadArgument;
-    }
+    if (!textures.WriteError().empty()) return Fail("convert", textures.WriteError(), kBadArgument);
     if (!PlaceScene(options.placement, &scene)) log.Warn("has no size that could be made to fit");
     if (!WriteOutput(options.output, pod::WritePod(scene), &error)) return BadArgument(options.output, error);
     if (!options.quiet) PrintSummary(options, scene, textures, log);

@@ -1,3 +1,4 @@
+// Pictures are looked up beside the scene or within it, made fit for the GL, and written once.
 #include "convert/Textures.h"
 
 #include <assimp/scene.h>

@@ -14,11 +14,6 @@
 
 namespace {
 
-int Fail(const std::string& text, int status) {
-    fprintf(stderr, "qex emitter: %s\n", text.c_str());
-    return status;
-}
-
 // The engine writes emitters to files alone.
 bool EncodeEmitter(const QexParticleEmitter* emitter, std::vector<uint8_t>* bytes) {
     EngineOutput quiet;
@@ -55,14 +50,13 @@ int RunEmitter(const EmitterOptions& options) {
     const std::string extension = Extension(options.output);
     std::string problem = WhyNotOutput(options.output, {options.input});
     if (extension == "txt") problem = "is no emitter file; a description is JSON, and its name ends in .json";
-    if (!problem.empty()) return Fail(options.output + ": " + problem, 2);
+    if (!problem.empty()) return Fail("emitter", options.output + ": " + problem, 2);
     const InputFile input(options.input);
     QexParticleEmitter* loaded = options.input.empty() ? NewEmitter() : LoadEmitter(input.Path(), &problem);
-    if (!loaded) return Fail(input.Name() + ": " + problem, 1);
+    if (!loaded) return Fail("emitter", input.Name() + ": " + problem, 1);
     const std::unique_ptr<QexParticleEmitter, void (*)(QexParticleEmitter*)> emitter(
         loaded, QexParticleEmitter_Release);
-    if (!problem.empty())
-        fprintf(stderr, "qex emitter: warning: %s: %s\n", input.Name().c_str(), problem.c_str());
+    if (!problem.empty()) Say("emitter", "warning: " + input.Name() + ": " + problem);
     for (const FieldValues& setting : options.settings) setting.Apply(loaded);
     const std::string text = DescribeEmitter(*loaded);
     if (options.output.empty()) {
@@ -71,7 +65,7 @@ int RunEmitter(const EmitterOptions& options) {
     }
     std::vector<uint8_t> bytes(text.begin(), text.end());
     if (extension != "json" && !EncodeEmitter(loaded, &bytes))
-        return Fail(options.output + ": cannot be written: no room for a temporary file", 2);
+        return Fail("emitter", options.output + ": cannot be written: no room for a temporary file", 2);
     if (WriteOutput(options.output, bytes, &problem)) return 0;
-    return Fail(options.output + ": " + problem, 2);
+    return Fail("emitter", options.output + ": " + problem, 2);
 }

@@ -1,3 +1,4 @@
+// The course of a rendering: context, scene, checks, pictures. Drawing.cpp draws them.
 #include "render/Command.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Starts of files, and planes of the view, with words for them.
 #include "render/Diagnosis.h"
 
 #include <cerrno>

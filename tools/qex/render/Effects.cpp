@@ -1,3 +1,4 @@
+// The engine's effects with the figures that suit a scene of any size.
 #include "render/Effects.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// Emitters run at a fixed rate and from a fixed seed.
 #include "render/Emitters.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// A plane of the size of the scene, as a model of its own.
 #include "render/Floor.h"
 
 #include <algorithm>

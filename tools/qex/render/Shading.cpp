@@ -1,3 +1,4 @@
+// The table of the shader modules, and the default look.
 #include "render/Shading.h"
 
 namespace {

@@ -1,3 +1,4 @@
+// Cuts pictures into the squares of a cube map, and draws the scene in units that suit the water.
 #include "render/Sky.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The hooks through which the engine asks for a model's textures, and what they find.
 #include "render/Textures.h"
 
 #include <cstdio>
