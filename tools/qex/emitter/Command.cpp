@@ -49,7 +49,8 @@ void SetUpEmitter(CLI::App* app, EmitterOptions* options) {
 int RunEmitter(const EmitterOptions& options) {
     const std::string extension = Extension(options.output);
     std::string problem = WhyNotOutput(options.output, {options.input});
-    if (extension == "txt") problem = "is no emitter file; a description is JSON, and its name ends in .json";
+    if (problem.empty() && extension == "txt")
+        problem = "is no emitter file; a description is JSON, and its name ends in .json";
     if (!problem.empty()) return Fail("emitter", options.output + ": " + problem, 2);
     const InputFile input(options.input);
     QexParticleEmitter* loaded = options.input.empty() ? NewEmitter() : LoadEmitter(input.Path(), &problem);
