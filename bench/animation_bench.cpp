@@ -48,6 +48,85 @@ void QexWorldMatrices(QexPODModel* scene, QexMatrix* world) {
         QexPODModel_GetWorldMatrix(scene, &world[i], &scene->nodes[i]);
 }
 
+// The scene's nodes with keys of their own: those that lie in the file's bytes are not aligned.
+class AlignedNodes {
+  public:
+    explicit AlignedNodes(const QexPODModel& scene) {
+        for (uint32_t i = 0; i < kNodes; ++i) {
+            const QexPODNode& node = scene.nodes[i];
+            nodes_.push_back({reinterpret_cast<const glm::vec3*>(Copy(node.position, 3)),
+                              reinterpret_cast<const glm::quat*>(Copy(node.rotation, 4)), Copy(node.scale, 7),
+                              node.parentIndex});
+        }
+    }
+    const std::vector<Node>& Nodes() const { return nodes_; }
+
+  private:
+    const float* Copy(const float* keys, size_t floats) {
+        copies_.emplace_back(floats * kFrames);
+        memcpy(copies_.back().data(), keys, copies_.back().size() * sizeof(float));
+        return copies_.back().data();
+    }
+
+    std::vector<std::vector<float>> copies_;
+    std::vector<Node> nodes_;
+};
+
+// What both comparisons work on; they run when all are registered.
+struct Work {
+    QexPODModel* scene;
+    AlignedNodes aligned;
+    std::vector<QexMatrix> world, cached;
+    std::vector<glm::mat4> glmWorld;
+    std::vector<float> nodeKeys, cacheKeys;
+    float qexFrame = 0.5f, glmFrame = 0.5f;
+
+    explicit Work(QexPODModel* read)
+        : scene(read),
+          aligned(*read),
+          world(kNodes),
+          cached(kNodes),
+          glmWorld(kNodes),
+          nodeKeys(kNodes, 1.0f),
+          cacheKeys(kNodes, 1.0f) {}
+};
+
+void CompareChanged(RatioBench* bench, Work* work) {
+    const auto advance = [](float* frame) { *frame = *frame > kFrames - 3 ? 0.5f : *frame + 0.25f; };
+    bench->Compare(
+        "world matrix of a changed node / mix, slerp, mat4_cast", 1.5,
+        [=] {
+            advance(&work->qexFrame);
+            QexPODModel_SetFrame(work->scene, work->qexFrame);
+            QexWorldMatrices(work->scene, work->world.data());
+            KeepValue(work->world[0]);
+        },
+        [=] {
+            advance(&work->glmFrame);
+            GlmWorldMatrices(work->aligned.Nodes(), work->glmFrame, &work->glmWorld);
+            KeepValue(work->glmWorld[0]);
+        },
+        kNodes);
+}
+
+// The test of the cache, and the copy that the call asks for.
+void CompareUnchanged(RatioBench* bench, Work* work) {
+    bench->Compare(
+        "world matrix of an unchanged node / compare and copy", 2.0,
+        [=] {
+            QexWorldMatrices(work->scene, work->world.data());
+            KeepValue(work->world[0]);
+        },
+        [=] {
+            for (uint32_t i = 0; i < kNodes; ++i) {
+                KeepValue(work->nodeKeys[i]);
+                if (work->nodeKeys[i] == work->cacheKeys[i]) work->world[i] = work->cached[i];
+            }
+            KeepValue(work->world[0]);
+        },
+        kNodes);
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -59,60 +138,9 @@ int main(int argc, char** argv) {
         QexPODModel_ReadFromMemory(&scene, file.data(), static_cast<uint32_t>(file.size()), 0, 0, 0, 0);
     }
     if (!scene.runtime) abort();
-
-    // The same keys; those that lie in the file's own bytes are copied out, for alignment.
-    std::vector<std::vector<float>> keys;
-    std::vector<Node> nodes;
-    for (uint32_t i = 0; i < kNodes; ++i) {
-        const QexPODNode& node = scene.nodes[i];
-        const float* sources[] = {node.position, node.rotation, node.scale};
-        const size_t floats[] = {3 * kFrames, 4 * kFrames, 7 * kFrames};
-        for (int k = 0; k < 3; ++k) {
-            keys.emplace_back(floats[k]);
-            memcpy(keys.back().data(), sources[k], floats[k] * sizeof(float));
-        }
-        const size_t last = keys.size() - 1;
-        nodes.push_back({reinterpret_cast<const glm::vec3*>(keys[last - 2].data()),
-                         reinterpret_cast<const glm::quat*>(keys[last - 1].data()), keys[last].data(),
-                         node.parentIndex});
-    }
-
-    std::vector<QexMatrix> qexWorld(kNodes);
-    std::vector<glm::mat4> glmWorld(kNodes);
-    float qexFrame = 0.5f, glmFrame = 0.5f;
-    const auto advance = [](float* frame) { *frame = *frame > kFrames - 3 ? 0.5f : *frame + 0.25f; };
-    bench.Compare(
-        "world matrix of a changed node / mix, slerp, mat4_cast", 1.5,
-        [&] {
-            advance(&qexFrame);
-            QexPODModel_SetFrame(&scene, qexFrame);
-            QexWorldMatrices(&scene, qexWorld.data());
-            KeepValue(qexWorld[0]);
-        },
-        [&] {
-            advance(&glmFrame);
-            GlmWorldMatrices(nodes, glmFrame, &glmWorld);
-            KeepValue(glmWorld[0]);
-        },
-        kNodes);
-
-    // Nothing changed: the test of the cache, and the copy that the call asks for.
-    const std::vector<QexMatrix> cached = qexWorld;
-    std::vector<float> nodeKeys(kNodes, 1.0f), cacheKeys(kNodes, 1.0f);
-    bench.Compare(
-        "world matrix of an unchanged node / compare and copy", 2.0,
-        [&] {
-            QexWorldMatrices(&scene, qexWorld.data());
-            KeepValue(qexWorld[0]);
-        },
-        [&] {
-            for (uint32_t i = 0; i < kNodes; ++i) {
-                KeepValue(nodeKeys[i]);
-                if (nodeKeys[i] == cacheKeys[i]) qexWorld[i] = cached[i];
-            }
-            KeepValue(qexWorld[0]);
-        },
-        kNodes);
+    Work work(&scene);
+    CompareChanged(&bench, &work);
+    CompareUnchanged(&bench, &work);
     const int status = bench.Result();
     QexPODModel_Release(&scene);
     return status;

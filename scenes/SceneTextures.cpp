@@ -3,8 +3,8 @@
 #include <cmath>
 #include <functional>
 
+#include "Paint.h"
 #include "SceneFiles.h"
-#include "Scenes.h"
 
 namespace {
 
@@ -147,7 +147,7 @@ void WriteTextures(const std::string& folder) {
     } spots[] = {{"drop.pvr", {153, 204, 255}},  {"smoke.pvr", {140, 140, 153}},
                  {"flame1.pvr", {255, 204, 77}}, {"flame2.pvr", {255, 115, 26}},
                  {"flame3.pvr", {179, 31, 13}},  {"spark.pvr", {255, 255, 255}}};
-    for (const auto& spot : spots) WritePixels(folder + spot.name, 32, 32, scenes::Spot(32, spot.colour));
-    WritePixels(folder + "waves.pvr", 256, 256, scenes::Waves(256));
-    WriteFile(folder + "sky.pvr", pod::WritePvr(scenes::SkyCube(64, Sky)));
+    for (const auto& spot : spots) WritePixels(folder + spot.name, 32, 32, pod::Spot(32, spot.colour));
+    WritePixels(folder + "waves.pvr", 256, 256, pod::Waves(256));
+    WriteFile(folder + "sky.pvr", pod::WritePvr(pod::SkyCube(64, Sky)));
 }

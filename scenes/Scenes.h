@@ -1,10 +1,7 @@
 // Scenes built in code, for samples, tests and benchmarks alike.
 #pragma once
 
-#include <functional>
-
 #include "PodBuild.h"
-#include "PvrWriter.h"
 
 namespace scenes {
 
@@ -17,9 +14,6 @@ pod::MeshArrays Cube();
 // A sphere of radius 1 with tangents and binormals; u goes once around, v = 0 is the lower pole.
 pod::MeshArrays Sphere(uint32_t segments);
 
-// A floor in the XZ plane, `size` across, its texture repeated once a unit.
-pod::MeshArrays Floor(float size);
-
 // A scene of mesh nodes that stand where they are given, each with its own mesh and its own
 // white material.
 struct Object {
@@ -31,18 +25,6 @@ pod::Scene Still(const std::vector<Object>& objects);
 
 // A boat of about 2.4 along X, afloat at y = 0: the nodes "hull" and "sails", a material each.
 pod::Scene Boat();
-
-// The cube map of a sky box that shows `paint` (red, green, blue, alpha) in the directions that it is given,
-// in which one of x, y and z is 1 or -1 and the others are between.
-using SkyPaint = std::function<std::array<uint8_t, 4>(const pod::Vec3& direction)>;
-pod::PvrImage SkyCube(uint32_t size, const SkyPaint& paint);
-
-// A round spot of a colour (red, green, blue, 0 to 255), dense in the middle, as smoke, sparks and drops are
-// made of: size x size pixels, RGBA.
-std::vector<uint8_t> Spot(uint32_t size, const std::array<uint8_t, 3>& colour);
-
-// Normals of waves, size x size pixels (RGBA) to be repeated: across in red and blue, up in green.
-std::vector<uint8_t> Waves(uint32_t size);
 
 // Two mesh nodes: "floor", 8 across, and "worm", a tube of `bones` bones that stands on it and bends with
 // them over `frames` frames; frame 0 is its bind pose. Its vertices follow two bones each and name them as

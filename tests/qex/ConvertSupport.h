@@ -24,7 +24,7 @@ class ConvertTest : public FolderTest {
         ConvertOptions options;
         options.input = input;
         options.output = Path("out.pod");
-        options.textureFormat = "rgba8888";
+        options.textureFormat = TextureFormat::kRgba8888;
         options.quiet = true;
         return options;
     }
@@ -41,8 +41,8 @@ class ConvertTest : public FolderTest {
         return pod_->scene;
     }
     // Converts to out.pod, keeps what was said on standard error and reads the scene.
-    QexPODModel& Convert(const std::string& input, const std::string& format = "rgba8888", double fps = 30,
-                         const std::string& clip = "") {
+    QexPODModel& Convert(const std::string& input, TextureFormat format = TextureFormat::kRgba8888,
+                         int fps = 30, const std::string& clip = "") {
         ConvertOptions options = Options(input);
         options.textureFormat = format;
         options.fps = fps;
@@ -51,7 +51,7 @@ class ConvertTest : public FolderTest {
         return Read();
     }
     // A quad in the z = 0 plane with the whole picture on it, in the material "m" of a material file.
-    QexPODModel& ConvertQuad(const std::string& material, const std::string& format = "rgba8888") {
+    QexPODModel& ConvertQuad(const std::string& material, TextureFormat format = TextureFormat::kRgba8888) {
         WriteText(Path("q.obj"),
                   "mtllib m.mtl\nusemtl m\nv -1 -1 0\nv 1 -1 0\nv 1 1 0\nv -1 1 0\n"
                   "vt 0 0\nvt 1 0\nvt 1 1\nvt 0 1\nvn 0 0 1\nf 1/1/1 2/2/1 3/3/1 4/4/1\n");

@@ -146,12 +146,12 @@ TEST_F(ConvertMaterial, TexturesOfOnesChoice) {
     WriteText(Path("m.mtl"), "newmtl m\nmap_Kd gone.tga\n");
     WriteTga("mine.tga", 1, 1, {{10, 20, 30, 255}});
     ConvertOptions options = Options(Path("q.obj"));
-    options.textures = {"m=" + Path("mine.tga")};
+    options.textures = {{"m", Path("mine.tga")}};
     EXPECT_EQ(Run(options), 0);
     EXPECT_EQ(said_, "");
     EXPECT_STREQ(Read().textures[0].name, "mine.pvr");
     EXPECT_EQ(PvrBytes("mine.pvr", 0, 3), (Bytes{10, 20, 30}));
-    options.textures = {"x=" + Path("mine.tga")};
+    options.textures = {{"x", Path("mine.tga")}};
     EXPECT_EQ(Run(options), 2);
     EXPECT_TRUE(Contains(said_, "no material 'x'; the scene has ") && Contains(said_, "m\n")) << said_;
 }

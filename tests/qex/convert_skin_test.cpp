@@ -262,7 +262,7 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
         const aiScene* scene = importer.ReadFile(file, aiProcess_Triangulate);
         ASSERT_TRUE(scene);
         const aiAnimation* clip = scene->mAnimations[std::string(row.clip) == "Wuson_Walk" ? 1 : 0];
-        QexPODModel& pod = Convert(file, "etc1", 30, row.clip);
+        QexPODModel& pod = Convert(file, TextureFormat::kEtc1, 30, row.clip);
         ASSERT_GT(pod.frameCount, 20u);
         EXPECT_EQ(pod.nodeCount, row.nodes) << file;  // the bones are nodes of the file
         std::set<float> seen;

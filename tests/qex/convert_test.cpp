@@ -121,7 +121,7 @@ class ConvertNodes : public ConvertTest {
   {"bufferView":0,"byteOffset":44,"componentType":5126,"count":2,"type":"VEC3"},
   {"bufferView":0,"byteOffset":68,"componentType":5126,"count":2,"type":"VEC4"}],
  "bufferViews":[{"buffer":0,"byteLength":100}],"buffers":[{"byteLength":100,"uri":"a.bin"}]})");
-        scene_ = &Convert(Path("a.gltf"), "etc1", 4);
+        scene_ = &Convert(Path("a.gltf"), TextureFormat::kEtc1, 4);
         for (uint32_t i = 0; i < scene_->nodeCount; ++i) nodes_[scene_->nodes[i].name] = &scene_->nodes[i];
     }
 
@@ -198,13 +198,15 @@ std::vector<QexVec3> PointsAt(QexPODModel* scene, float frame) {
 // turned and scaled: in a scene with animation, mirror and shear, and in one with bones.
 TEST_F(ConvertNodes, StandUprightInAnySize) {
     const struct {
-        const char *up, *scale;
+        UpAxis up;
         float factor;
         Floats turn;  // where +X, +Y and +Z go
-    } rows[] = {
-        {"Y", "0.5", 0.5f, {1, 0, 0, 0, 1, 0, 0, 0, 1}},     {"z", "3", 3, {1, 0, 0, 0, 0, -1, 0, 1, 0}},
-        {"-Z", "1", 1, {1, 0, 0, 0, 0, 1, 0, -1, 0}},        {"x", "2", 2, {0, 1, 0, -1, 0, 0, 0, 0, 1}},
-        {"-x", "1e-3", 1e-3f, {0, -1, 0, 1, 0, 0, 0, 0, 1}}, {"-y", "1", 1, {-1, 0, 0, 0, -1, 0, 0, 0, 1}}};
+    } rows[] = {{UpAxis::kY, 0.5f, {1, 0, 0, 0, 1, 0, 0, 0, 1}},
+                {UpAxis::kZ, 3, {1, 0, 0, 0, 0, -1, 0, 1, 0}},
+                {UpAxis::kMinusZ, 1, {1, 0, 0, 0, 0, 1, 0, -1, 0}},
+                {UpAxis::kX, 2, {0, 1, 0, -1, 0, 0, 0, 0, 1}},
+                {UpAxis::kMinusX, 1e-3f, {0, -1, 0, 1, 0, 0, 0, 0, 1}},
+                {UpAxis::kMinusY, 1, {-1, 0, 0, 0, -1, 0, 0, 0, 1}}};
     const std::string bison = "/usr/share/assimp/models/X/Testwuson.X";
     for (const std::string& file : {Path("a.gltf"), bison}) {
         if (!std::filesystem::exists(file)) continue;
@@ -212,8 +214,7 @@ TEST_F(ConvertNodes, StandUprightInAnySize) {
         const auto before = std::move(pod_);
         for (const auto& row : rows) {
             ConvertOptions options = Options(file);
-            options.up = row.up;
-            options.scale = row.scale;
+            options.placement = {row.up, row.factor};
             ASSERT_EQ(Run(options), 0) << said_;
             QexPODModel &was = before->scene, &is = Read();
             const auto moved = [&](const QexVec3& p, float factor) -> QexVec3 {
@@ -252,7 +253,7 @@ TEST_F(ConvertNodes, StandUprightInAnySize) {
                            {was.cameras[i].nearPlane * row.factor, was.cameras[i].farPlane * row.factor});
         }
         ConvertOptions options = Options(file);
-        options.scale = "FIT:7.5";
+        options.placement.fit = 7.5f;
         ASSERT_EQ(Run(options), 0) << said_;
         EXPECT_NEAR(BoundsOf(PointsAt(&Read(), file == bison ? 1 : 0)).LongestEdge(), 7.5f, 1e-3f);
     }
@@ -267,45 +268,28 @@ TEST_F(ConvertTest, ErrorsAreOneLineAndAStatus) {
     WriteText(Path("notes.txt"), "no scene");
     const std::string good = Path("q.obj"), out = Path("out.pod");
     const struct {
-        std::string input, output, format;
-        double fps;
+        std::string input, output;
         int status;
         const char* says;
     } rows[] = {
-        {good, out, "dxt", 30, 2, "etc1, rgba8888 or rgb888 is expected"},
-        {good, out, "etc1", 0, 2, "whole number of frames"},
-        {good, out, "etc1", 29.97, 2, "whole number of frames"},
-        {good, Path("no/such/out.pod"), "etc1", 30, 2, "folder does not exist"},
-        {good, folder_.string(), "etc1", 30, 2, "no file name"},
-        {good, "", "etc1", 30, 2, "no file name"},
-        {good, good, "etc1", 30, 2, "is the input"},
-        {Path("none.obj"), out, "etc1", 30, 1, "existing scene file is expected"},
-        {Path("broken.gltf"), out, "etc1", 30, 1, "cannot be read as a scene"},
-        {Path("skin.gltf"), out, "etc1", 30, 1, "skin 1 has no inverse bind matrices"},
-        {Path("skin.glb"), out, "etc1", 30, 1, "skin 0 has no inverse bind matrices"},
-        {Path("notes.txt"), out, "etc1", 30, 1, "cannot be read as a scene"},
-        {Path("points.obj"), out, "etc1", 30, 1, "holds no triangles"},
+        {good, Path("no/such/out.pod"), 2, "folder does not exist"},
+        {good, folder_.string(), 2, "no file name"},
+        {good, "", 2, "no file name"},
+        {good, good, 2, "is the input"},
+        {Path("none.obj"), out, 1, "existing scene file is expected"},
+        {Path("broken.gltf"), out, 1, "cannot be read as a scene"},
+        {Path("skin.gltf"), out, 1, "skin 1 has no inverse bind matrices"},
+        {Path("skin.glb"), out, 1, "skin 0 has no inverse bind matrices"},
+        {Path("notes.txt"), out, 1, "cannot be read as a scene"},
+        {Path("points.obj"), out, 1, "holds no triangles"},
     };
     for (const auto& row : rows) {
         ConvertOptions options = Options(row.input);
         options.output = row.output;
-        options.textureFormat = row.format;
-        options.fps = row.fps;
         EXPECT_EQ(Run(options), row.status) << said_;
         EXPECT_TRUE(Contains(said_, row.says)) << said_;
         EXPECT_EQ(said_.rfind("qex convert: ", 0), 0u) << said_;
         EXPECT_EQ(CountLines(said_), 1) << said_;
-    }
-    const char* placements[][3] = {{"up", "1", "'up' is no axis; x, y, z, -x"},
-                                   {"y", "0", "'0' is no scale; a number"},
-                                   {"y", "1x", "'1x' is no scale"},
-                                   {"y", "fit:-1", "'fit:-1' is no scale"}};
-    for (const auto& row : placements) {
-        ConvertOptions options = Options(good);
-        options.up = row[0];
-        options.scale = row[1];
-        EXPECT_EQ(Run(options), 2);
-        EXPECT_TRUE(Contains(said_, row[2])) << said_;
     }
     EXPECT_FALSE(std::filesystem::exists(out));
 }
@@ -324,7 +308,7 @@ TEST_F(ConvertTest, ModelsFromThePackages) {
     QexPODModel* s = nullptr;
     for (const auto& row : rows) {
         if (!std::filesystem::exists(row.file)) GTEST_SKIP() << row.file << " is not installed";
-        s = &Convert(row.file, "etc1");
+        s = &Convert(row.file, TextureFormat::kEtc1);
         uint32_t triangles = 0;
         for (uint32_t i = 0; i < s->meshCount; ++i) triangles += s->meshes[i].faceCount;
         EXPECT_EQ(triangles, row.triangles) << row.file;

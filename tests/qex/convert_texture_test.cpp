@@ -32,7 +32,7 @@ TEST_F(ConvertTexture, StoresTheLowerEdgeFirstWithAllMipmaps) {
 
 TEST_F(ConvertTexture, AlphaGoesToAFileOfItsOwn) {
     WriteTga("leaf.tga", 1, 2, {{10, 20, 30, 128}, kRed});
-    const QexPODMaterial& material = ConvertQuad("map_Kd leaf.tga\n", "rgb888").materials[0];
+    const QexPODMaterial& material = ConvertQuad("map_Kd leaf.tga\n", TextureFormat::kRgb888).materials[0];
     EXPECT_EQ(PvrBytes("leaf.pvr", 0, 6), (Bytes{255, 0, 0, 10, 20, 30}));
     EXPECT_EQ(PvrBytes("leaf_a.pvr", 0, 6), (Bytes{255, 255, 255, 128, 128, 128}));
     // Source alpha and one minus source alpha.

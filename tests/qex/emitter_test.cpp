@@ -29,41 +29,22 @@ float FloatAt(const Bytes& file, size_t offset) {
 }
 
 // Every field, each value different; -0.1 and 16777217 are no floats.
-const char kDescription[] = R"(# a remark, and an empty line
-
-emitting 0
-emitDuration 1.5
-emissionRate 2 3
-lifetime -4, 5   # with commas
-color 0.1 0.2 0.3 0.4
-color 0.5 0.6 0.7 0.8
-startOpacity 0.9
-endOpacity 0.25
-scaleMin 10 11 12
-scaleMax 13 14 15
-scaleFactor 1.01
-rotationMin 20 21 22
-rotationMax 23 24 25
-angularVelocityMin 30 31 32
-angularVelocityMax 33 34 35
-angularAccelerationMin 40 41 42
-angularAccelerationMax 43 44 45
-position 50 51 52
-positionSpread 53 54 55
-velocityMin -0.1 61 62
-velocityMax 63 64 16777217
-accelerationMin 70 71 72
-accelerationMax 73 74 3.4028235e38
-animation 2 0.5 1
-animation 3 0.75 0
-currentRate 2.5
-accumulator 0.125
-)";
+const char kDescription[] = R"(// a remark
+{"emitting": false, "emitDuration": 1.5, "emissionRate": [2, 3], "lifetime": [-4, 5],
+"color": [[0.1, 0.2, 0.3, 0.4], [0.5, 0.6, 0.7, 0.8]], "startOpacity": 0.9, "endOpacity": 0.25,
+"scaleMin": [10, 11, 12], "scaleMax": [13, 14, 15], "scaleFactor": 1.01,
+"rotationMin": [20, 21, 22], "rotationMax": [23, 24, 25],
+"angularVelocityMin": [30, 31, 32], "angularVelocityMax": [33, 34, 35],
+"angularAccelerationMin": [40, 41, 42], "angularAccelerationMax": [43, 44, 45],
+"position": [50, 51, 52], "positionSpread": [53, 54, 55],
+"velocityMin": [-0.1, 61, 62], "velocityMax": [63, 64, 16777217],
+"accelerationMin": [70, 71, 72], "accelerationMax": [73, 74, 3.4028235e38],
+"animation": [[2, 0.5, 1], [3, 0.75, 0]], "currentRate": 2.5, "accumulator": 0.125})";
 
 }  // namespace
 
 TEST_F(QexEmitter, FieldsLieWhereTheEngineHasThem) {
-    const Bytes file = Written(kDescription, "all.txt");
+    const Bytes file = Written(kDescription, "all.json");
     ASSERT_EQ(file.size(), 45304u);
     // Offsets of the record, and the values from there on.
     const std::vector<std::pair<size_t, std::vector<float>>> floats = {
@@ -82,6 +63,9 @@ TEST_F(QexEmitter, FieldsLieWhereTheEngineHasThem) {
     for (const auto& [offset, value] : words) EXPECT_EQ(GetWord(file, offset), value) << offset;
     // What is not named is the engine's default, and the rate begins with the least.
     const Bytes some = Written("{\"emissionRate\": [4, 5], \"emitting\": true}", "some.json");
+    EXPECT_EQ(Written("# remark\n\nemissionRate 4, 5 # rate\n  emitting 1", "some.txt"), some);
+    EXPECT_EQ(Written("color 1 1 1 1\ncolor 2 2 2 2", "rows.txt"),
+              Written("{\"color\": [[1, 1, 1, 1], [2, 2, 2, 2]]}", "rows.json"));
     EXPECT_EQ(FloatAt(some, 8), 4);
     EXPECT_EQ(FloatAt(some, 45296), 4);
     EXPECT_EQ(FloatAt(some, 324), 300) << "default velocity";
@@ -90,19 +74,14 @@ TEST_F(QexEmitter, FieldsLieWhereTheEngineHasThem) {
 }
 
 TEST_F(QexEmitter, WhatIsShownReadsBackTheSame) {
-    const Bytes file = Written(kDescription, "all.txt");
+    const Bytes file = Written(kDescription, "all.json");
     WriteBytes(Path("all.emitter"), file);
-    for (const char* extension : {"txt", "json"}) {
-        const std::string shown = Path("shown." + std::string(extension));
-        Output({"emitter", Path("all.emitter"), "-o", shown});
-        Output({"emitter", shown, "-o", Path("out.emitter")});
-        EXPECT_EQ(ReadBytes(Path("out.emitter")), file) << extension;
-    }
-    EXPECT_EQ(Output({"emitter", Path("all.emitter")}), ReadText(Path("shown.txt")));
-    EXPECT_EQ(Output({"emitter", Path("shown.txt"), "--json"}), ReadText(Path("shown.json")));
+    Output({"emitter", Path("all.emitter"), "-o", Path("shown.json")});
+    EXPECT_EQ(Written(ReadText(Path("shown.json")), "again.json"), file);
+    EXPECT_EQ(Output({"emitter", Path("all.emitter")}), ReadText(Path("shown.json")));
     // Edits take the place of all rows of a field.
-    const std::string edited = Output({"emitter", Path("all.emitter"), "--json", "--set", "position=1 2 3",
-                                       "--set", "color=1,1,1,1;2,2,2,2;3,3,3,3", "--set", "animation=0,0,0"});
+    const std::string edited = Output({"emitter", Path("all.emitter"), "--set", "position=1 2 3", "--set",
+                                       "color=1,1,1,1;2,2,2,2;3,3,3,3", "--set", "animation=0,0,0"});
     EXPECT_TRUE(Contains(edited, "\"position\": [1.0,2.0,3.0]")) << edited;
     EXPECT_TRUE(Contains(edited, "\"color\": [[1.0,1.0,1.0,1.0],[2.0,2.0,2.0,2.0],[3.0,3.0,3.0,3.0]]"))
         << edited;
@@ -113,46 +92,39 @@ TEST_F(QexEmitter, WhatIsShownReadsBackTheSame) {
 
 TEST_F(QexEmitter, NonsenseIsNamedWithFieldAndRange) {
     const std::pair<const char*, const char*> nonsense[] = {
-        {"velocity 1 2 3", "unknown field 'velocity'; expected one of emitting, "},
-        {"velocityMin 1 2", "velocityMin: expected 3 values, not 2"},
-        {"position", "position: expected 3 values, not 0"},
-        {"velocityMin 1 2 three", "velocityMin: 'three' is not a number"},
-        {"velocityMin 1 2 nan", "velocityMin: 'nan' is not a number"},
-        {"velocityMin 1 2 1e39", "velocityMin: 1e+39 is not a number from -3.4"},
-        {"startOpacity -0.5", "startOpacity: -0.5 is not a number from 0 on"},
-        {"emissionRate -1 1", "emissionRate: -1 is not a number from 0 on"},
-        {"animation 2.5 1 1", "animation: 2.5 is not a whole number from 0 to 10"},
-        {"animation 2 1 2", "animation: 2 is not a whole number from 0 to 1"},
-        {"startOpacity 1\nstartOpacity 1", "startOpacity: expected once"}};
+        {R"({"velocity": [1, 2, 3]})", "unknown field 'velocity'; expected one of emitting, "},
+        {R"({"a\nb": "c"})", "unknown field 'a b'"},
+        {R"({"position": [1, 2]})", "position: expected 3 values, not 2"},
+        {R"({"position": [1, "2", 3]})", "position: is neither a number nor"},
+        {R"({"position": {}})", "position: is neither a number nor"},
+        {R"({"velocityMin": [1, 2, 1e39]})", "velocityMin: 1e+39 is not a number from -3.4"},
+        {R"({"startOpacity": -0.5})", "startOpacity: -0.5 is not a number from 0 on"},
+        {R"({"animation": [[2.5, 1, 1]]})", "animation: 2.5 is not a whole number from 0 to 10"},
+        {R"({"animation": [2, 1, 2]})", "animation: 2 is not a whole number from 0 to 1"},
+        {R"({"color": []})", "color: expected 4 values, not 0"},
+        {R"({"startOpacity": 1, "startOpacity": 1})", "startOpacity: expected once"},
+        {"{\n\"position\": [1, 2, 3]", "line 2: is not JSON"},
+        {"# remark\nvelocityMin 1 2 three", "line 2: velocityMin: 'three' is not a number"},
+        {"velocityMin 1 2 nan", "line 1: velocityMin: 'nan' is not a number"},
+        {"emitting 1\nposition", "line 2: position: expected 3 values, not 0"},
+        {"startOpacity 1\nstartOpacity 1\nlifetime 1 1", "line 2: startOpacity: expected once"}};
     for (const auto& [text, problem] : nonsense) {
-        WriteText(Path("bad.txt"), "# remark\n" + std::string(text) + "\nlifetime 1 1\n");
-        const long line = 2 + CountLines(text);
-        ExpectRefused({"emitter", Path("bad.txt"), "-o", Path("no.emitter")}, 1,
-                      "bad.txt: line " + std::to_string(line) + ": " + problem);
+        WriteText(Path("bad.json"), text);
+        ExpectRefused({"emitter", Path("bad.json"), "-o", Path("no.emitter")}, 1,
+                      "bad.json: " + std::string(problem));
     }
     std::string rows;
     for (int i = 0; i < 11; ++i) rows += "color 1 1 1 1\n";
     WriteText(Path("bad.txt"), rows);
     ExpectRefused({"emitter", Path("bad.txt")}, 1, "line 11: color: expected 1 to 10 times");
-    const std::pair<const char*, const char*> json[] = {
-        {"{\"position\": [1, 2]}", "position: expected 3 values, not 2"},
-        {"{\"position\": [1, \"2\", 3]}", "position: "},
-        {"{\"color\": []}", "color: expected 4 values, not 0"},
-        {"{\"position\": [1, 2, 3], \"position\": [1, 2, 3]}", "position: expected once"},
-        {"{\"position\": {}}", "position: "},
-        {"{\n\"position\": [1, 2, 3]", "line 2: is not JSON"}};
-    for (const auto& [text, problem] : json) {
-        WriteText(Path("bad.json"), text);
-        ExpectRefused({"emitter", Path("bad.json")}, 1, "bad.json: " + std::string(problem));
-    }
     WriteText(Path("bad.json"), "{\"color\": " + std::string(300000, '[') + std::string(300000, ']') + "}");
     ExpectRefused({"emitter", Path("bad.json")}, 1, "color: is neither a number nor an array of numbers");
     ExpectRefused({"emitter", "--set", "lifetime=1"}, 2, "lifetime: expected 2 values, not 1");
     ExpectRefused({"emitter", "--set", "a\nb"}, 2, "'a b' is no setting");
-    ExpectRefused({"emitter", "--json", "-o", Path("no.json")}, 2, "--json");
+    ExpectRefused({"emitter", "-o", Path("no.txt")}, 2, "its name ends in .json");
     ExpectRefused({"emitter", "--set", "lifetime"}, 2, "expected FIELD=VALUE");
     ExpectRefused({"emitter", Path("none.txt")}, 1, "none.txt");
-    Bytes file = Written("# nothing", "default.txt");
+    Bytes file = Written("{}", "default.json");
     PutWord(&file, 16, 0x7FC00000);  // a lifetime that is no number
     WriteBytes(Path("nan.emitter"), file);
     ExpectRefused({"emitter", Path("nan.emitter")}, 1, "a setting is not a finite number");
@@ -167,13 +139,13 @@ TEST_F(QexEmitter, FilesOfOtherProgramsMayHoldOddValues) {
         size_t offset;
         uint32_t value;
         const char *warning, *line;
-    } cases[] = {{0, 16777217, "emitting: ", "emitting               16777217 "},
-                 {8, 0xBF800000, "emissionRate: -1 is not", "emissionRate           -1 0.8 "},
-                 {416, 2, "animation: 2 is not", "animation              1 0 2 "},
-                 {45292, 3, "3 living particles are left out", "accumulator            0 "},
-                 {184, 0, "", "color                  1 1 1 1 "},
-                 {888, 0, "", "animation              1 0 0 "}};
-    const Bytes file = Written("# nothing", "default.txt");
+    } cases[] = {{0, 16777217, "emitting: ", "\"emitting\": 16777217"},
+                 {8, 0xBF800000, "emissionRate: -1 is not", "\"emissionRate\": [-1.0,0.8]"},
+                 {416, 2, "animation: 2 is not", "\"animation\": [[1,0.0,2]]"},
+                 {45292, 3, "3 living particles are left out", "\"accumulator\": 0.0"},
+                 {184, 0, "", "\"color\": [[1.0,1.0,1.0,1.0]]"},
+                 {888, 0, "", "\"animation\": [[1,0.0,0]]"}};
+    const Bytes file = Written("{}", "default.json");
     for (const auto& c : cases) {
         Bytes odd = file;
         PutWord(&odd, c.offset, c.value);

@@ -1,3 +1,4 @@
+// Answers of a driver that draws nothing: names of objects, locations, texts that a program asks for.
 #include "NullDriver.h"
 
 #include <algorithm>

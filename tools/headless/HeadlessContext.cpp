@@ -1,3 +1,4 @@
+// EGL without a window: a surfaceless display, a pbuffer, and what of multisampling there is.
 #include <EGL/egl.h>
 #include <EGL/eglext.h>
 #include <GLES2/gl2.h>

@@ -1,3 +1,4 @@
+// The header and the levels of a KTX 1.1 file.
 #include "KtxWriter.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Arrays laid out as interleaved vertices, keys as a node's floats.
 #include "PodBuild.h"
 
 #include <cstring>
@@ -66,6 +67,16 @@ Element IndexElement(const std::vector<uint32_t>& indices, bool wide) {
     e.data.resize(indices.size() * size);
     for (size_t i = 0; i < indices.size(); ++i) PutLittleEndian(e.data.data() + i * size, indices[i], size);
     return e;
+}
+
+MeshArrays FloorMesh(float size) {
+    const float half = size / 2;
+    MeshArrays arrays;
+    arrays.positions = {{-half, 0, half}, {half, 0, half}, {-half, 0, -half}, {half, 0, -half}};
+    arrays.normals.assign(4, {0, 1, 0});
+    arrays.uvs = {{0, 0}, {size, 0}, {0, size}, {size, size}};
+    arrays.indices = {0, 1, 2, 2, 1, 3};
+    return arrays;
 }
 
 Mesh BuildMesh(const MeshArrays& a, bool wideIndices) {

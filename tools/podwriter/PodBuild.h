@@ -19,6 +19,9 @@ struct MeshArrays {
     std::vector<uint32_t> indices;
 };
 
+// A floor in the XZ plane, `size` across, its texture repeated once a unit.
+MeshArrays FloorMesh(float size);
+
 // A mesh of interleaved elements in the order position, normal, tangent, binormal, uv, colour, bone
 // indices, bone weights. Indices take 16 bits unless `wideIndices`; the vertex count must fit them.
 Mesh BuildMesh(const MeshArrays& arrays, bool wideIndices = false);

@@ -1,3 +1,4 @@
+// The blocks of a POD file, one writer for each record.
 #include "PodWriter.h"
 
 #include <cstdio>

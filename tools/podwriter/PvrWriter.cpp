@@ -1,3 +1,4 @@
+// The sizes of levels by pixel type, the header and the surfaces of a PVR file.
 #include "PvrWriter.h"
 
 #include <cstddef>

@@ -2,7 +2,6 @@
 #include <cstdio>
 #include <functional>
 #include <string>
-#include <vector>
 
 #include <assimp/DefaultLogger.hpp>
 #include <CLI/CLI.hpp>
@@ -10,6 +9,7 @@
 #include "common/CommandLine.h"
 #include "common/Manual.h"
 #include "common/OutputFile.h"
+#include "common/Usage.h"
 #include "convert/Command.h"
 #include "emitter/Command.h"
 #include "info/Command.h"
@@ -43,48 +43,6 @@ void SetUpVerb(CLI::App* app, const Verb& verb) {
     sub->add_flag("-v,--verbose", GetTalk().verbose, "show the log of the engine, or of the importer");
     const std::string footer = sub->get_footer();
     sub->footer((footer.empty() ? "" : footer + "\n") + kExitStatus);
-}
-
-// The first line of what CLI11 has to say. It asks first for what is missing, whatever stands in its place:
-// an unknown word or option there is named instead.
-int ReportUsage(const CLI::App& app, const CLI::ParseError& error, int argc, char** argv) {
-    std::string text = error.what(), verb;
-    text = text.substr(0, text.find('\n'));
-    if (dynamic_cast<const CLI::ConversionError*>(&error)) text += "; a number is expected";
-    std::vector<std::string> verbs;
-    for (const CLI::App* sub : app.get_subcommands([](const CLI::App* s) { return !s->get_group().empty(); }))
-        verbs.push_back(sub->get_name());
-    for (const CLI::App* used : app.get_subcommands()) {
-        verb = " " + used->get_name();
-        for (const std::string& word : used->remaining())
-            if (word.size() > 1 && word[0] == '-') {
-                text = "unknown option '" + word + "'" + Suggestion(word, OptionNames(*used));
-                break;
-            }
-    }
-    if (verb.empty() && argc > 1) {
-        text = (argv[1][0] == '-' ? "unknown option '" : "unknown verb '") + std::string(argv[1]) +
-               "'; expected ";
-        for (const std::string& name : verbs)
-            text += name + (name == verbs.back() ? "" : name == verbs[verbs.size() - 2] ? " or " : ", ");
-        text += Suggestion(argv[1], verbs);
-    }
-    fprintf(stderr, "qex%s: %s\n", verb.c_str(), text.c_str());
-    return 2;
-}
-
-// The words of the command line, last one first, as CLI11 takes them. An axis behind --up would be taken for
-// an option of one letter.
-std::vector<std::string> Words(int argc, char** argv) {
-    std::vector<std::string> words;
-    for (int i = argc - 1; i > 0; --i) {
-        const std::string word = argv[i];
-        if (word == "--up" && !words.empty() && words.back().size() == 2 && words.back()[0] == '-')
-            words.back() = word + "=" + words.back();
-        else
-            words.push_back(word);
-    }
-    return words;
 }
 
 int RunVerb(int argc, char** argv) {

@@ -1,3 +1,4 @@
+// Options with typed values.
 #include "common/CommandLine.h"
 
 #include <algorithm>
@@ -7,25 +8,46 @@
 
 #include <CLI/CLI.hpp>
 
+#include "common/TextureFiles.h"
+
 namespace {
 
-constexpr int kMostTexts = 1000;
+// What CLI11 knows an option by that is read here: one text each time that it is given.
+CLI::Option* OneText(CLI::Option* option, int most) {
+    return option->type_size(1)->expected(1, most)->allow_extra_args(false);
+}
 
-// The least number of letters to insert, leave out or replace, or of neighbours to swap.
-size_t Distance(const std::string& a, const std::string& b) {
-    std::vector<std::vector<size_t>> least(a.size() + 1, std::vector<size_t>(b.size() + 1));
-    for (size_t i = 0; i <= a.size(); ++i)
-        for (size_t k = 0; k <= b.size(); ++k) {
-            if (i == 0 || k == 0) {
-                least[i][k] = i + k;
-                continue;
-            }
-            least[i][k] = std::min(
-                {least[i - 1][k] + 1, least[i][k - 1] + 1, least[i - 1][k - 1] + (a[i - 1] != b[k - 1])});
-            if (i > 1 && k > 1 && a[i - 1] == b[k - 2] && a[i - 2] == b[k - 1])
-                least[i][k] = std::min(least[i][k], least[i - 2][k - 2] + 1);
-        }
-    return least[a.size()][b.size()];
+std::vector<std::string> Split(const std::string& text, char separator) {
+    std::vector<std::string> parts;
+    for (size_t start = 0; start <= text.size();) {
+        const size_t end = std::min(text.find(separator, start), text.size());
+        parts.push_back(text.substr(start, end - start));
+        start = end + 1;
+    }
+    return parts;
+}
+
+bool ReadNumber(const std::string& text, const NumberRange& range, double* number) {
+    const bool colour = range.kind == NumberRange::kColour;
+    if (colour && (text.size() != 6 || text.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos))
+        return false;
+    char* behind = nullptr;
+    *number =
+        colour ? static_cast<double>(strtoul(text.c_str(), &behind, 16)) : strtod(text.c_str(), &behind);
+    if (text.empty() || *behind || !(*number >= range.least && *number <= range.most)) return false;
+    return range.kind != NumberRange::kWhole || *number == std::floor(*number);
+}
+
+CLI::Validator OneNumber(const char* kind, const NumberRange& range) {
+    char words[64];
+    snprintf(words, sizeof words, "%.10g to %.10g", range.least, range.most);
+    const std::string fault = std::string("' is no ") + kind + " from " + words;
+    return CLI::Validator(
+        [=](std::string& text) -> std::string {
+            double number;
+            return ReadNumber(text, range, &number) ? "" : "'" + text + fault;
+        },
+        words);
 }
 
 }  // namespace
@@ -35,78 +57,85 @@ Talk& GetTalk() {
     return talk;
 }
 
-std::vector<std::string> OptionNames(const CLI::App& app) {
-    std::vector<std::string> names;
-    for (const CLI::Option* option : app.get_options())
-        for (const std::string& name : option->get_lnames()) names.push_back("--" + name);
-    return names;
+void Say(const std::string& verb, const std::string& text) {
+    fprintf(stderr, "qex %s: %s\n", verb.c_str(), text.c_str());
 }
 
-std::string Suggestion(const std::string& word, const std::vector<std::string>& names) {
-    const std::string name = word.substr(0, word.find('='));
-    std::string nearest;
-    size_t least = std::max<size_t>(1, name.size() / 3) + 1;
-    for (const std::string& candidate : names) {
-        const size_t distance = Distance(name, candidate);
-        if (distance < least) least = distance, nearest = candidate;
-    }
-    return nearest.empty() ? "" : "; did you mean " + nearest + "?";
+int Fail(const std::string& verb, const std::string& text, int status) {
+    Say(verb, text);
+    return status;
 }
 
-std::vector<double> ParseNumbers(const std::string& text, char separator) {
-    std::vector<double> numbers;
-    for (size_t start = 0; start <= text.size();) {
-        const size_t end = std::min(text.find(separator, start), text.size());
-        const std::string part = text.substr(start, end - start);
-        char* behind = nullptr;
-        numbers.push_back(strtod(part.c_str(), &behind));
-        if (part.empty() || *behind || !std::isfinite(numbers.back())) return {};
-        start = end + 1;
+std::string ReadNumbers(const std::string& text, const NumberShape& shape, Numbers* numbers) {
+    const std::vector<std::string> parts = Split(text, shape.separator);
+    bool good = parts.size() == shape.needed || parts.size() == shape.ranges.size();
+    numbers->clear();
+    for (size_t i = 0; good && i < shape.ranges.size(); ++i) {
+        numbers->push_back(shape.ranges[i].otherwise);
+        if (i < parts.size()) good = ReadNumber(parts[i], shape.ranges[i], &numbers->back());
     }
-    return numbers;
+    good = good && (!shape.fits || shape.fits(*numbers));
+    return good ? "" : "'" + text + "' " + shape.fault;
 }
 
 CLI::Validator NumberFrom(double least, double most) {
-    char range[64];
-    snprintf(range, sizeof range, "%.10g to %.10g", least, most);
-    const std::string words = range;
-    return CLI::Validator(
-        [=](std::string& text) -> std::string {
-            const std::vector<double> n = ParseNumbers(text);
-            if (n.size() == 1 && n[0] >= least && n[0] <= most) return "";
-            return "'" + text + "' is no number from " + words;
-        },
-        words);
+    return OneNumber("number", {NumberRange::kAny, least, most});
 }
 
-bool ParseHexColour(const std::string& text, unsigned* colour) {
-    if (text.size() != 6 || text.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos)
-        return false;
-    *colour = static_cast<unsigned>(std::stoul(text, nullptr, 16));
-    return true;
+CLI::Validator WholeNumberFrom(double least, double most) {
+    return OneNumber("whole number", {NumberRange::kWhole, least, most});
 }
 
 CLI::Option* AddParsed(CLI::App* app, const std::string& name, const std::string& help,
                        const std::function<std::string(const std::string& text)>& parse, int most) {
-    return app
-        ->add_option_function<std::vector<std::string>>(
-            name,
-            [=](const std::vector<std::string>& texts) {
-                for (const std::string& text : texts) {
-                    const std::string problem = parse(text);
-                    if (!problem.empty()) throw CLI::ValidationError(name, problem);
-                }
-            },
-            help)
-        ->type_size(1)
-        ->expected(1, most)
-        ->allow_extra_args(false);
+    const auto parseAll = [=](const std::vector<std::string>& texts) {
+        for (const std::string& text : texts) {
+            const std::string problem = parse(text);
+            if (!problem.empty()) throw CLI::ValidationError(name, problem);
+        }
+    };
+    return OneText(app->add_option_function<std::vector<std::string>>(name, parseAll, help), most);
+}
+
+CLI::Option* AddNumbers(CLI::App* app, const std::string& name, const std::string& help,
+                        const NumberShape& shape, const std::function<void(const Numbers&)>& take, int most) {
+    const auto parse = [=](const std::string& text) {
+        Numbers numbers;
+        const std::string problem = ReadNumbers(text, shape, &numbers);
+        if (problem.empty()) take(numbers);
+        return problem;
+    };
+    return AddParsed(app, name, help, parse, most);
+}
+
+CLI::Option* AddChoice(CLI::App* app, const std::string& name, const std::string& help,
+                       const std::string& what, const std::vector<std::string>& names,
+                       const std::function<void(size_t)>& take) {
+    const auto parse = [=](const std::string& text) -> std::string {
+        const auto found = std::find(names.begin(), names.end(), Lower(text));
+        if (found == names.end()) return "'" + text + "' is no " + what + "; expected " + Alternatives(names);
+        take(static_cast<size_t>(found - names.begin()));
+        return "";
+    };
+    std::string braced;
+    for (const std::string& choice : names) braced += (braced.empty() ? "{" : ",") + choice;
+    return AddParsed(app, name, help, parse)->type_name(braced + "}");
 }
 
 CLI::Option* AddTexts(CLI::App* app, const std::string& name, std::vector<std::string>* texts,
                       const std::string& help) {
-    return app->add_option(name, *texts, help)
-        ->type_size(1)
-        ->expected(1, kMostTexts)
-        ->allow_extra_args(false);
+    return OneText(app->add_option(name, *texts, help), kMostRepeats);
+}
+
+std::string Alternatives(const std::vector<std::string>& names) {
+    std::string text;
+    for (size_t i = 0; i < names.size(); ++i)
+        text += (i == 0 ? "" : i + 1 == names.size() ? " or " : ", ") + names[i];
+    return text;
+}
+
+CLI::Option* AddUpAxis(CLI::App* app, const std::string& help, UpAxis* up) {
+    // In the order of UpAxis.
+    return AddChoice(app, "--up", help, "axis", {"x", "y", "z", "-x", "-y", "-z"},
+                     [up](size_t index) { *up = static_cast<UpAxis>(index); });
 }

@@ -1,6 +1,8 @@
-// What the command lines of the verbs have in common.
+// What the command lines of the verbs have in common: options whose texts are checked and turned into values
+// where they are declared.
 #pragma once
 
+#include <cfloat>
 #include <functional>
 #include <string>
 #include <vector>
@@ -18,26 +20,61 @@ struct Talk {
 };
 Talk& GetTalk();
 
-// The long names of an app's options, each with its dashes.
-std::vector<std::string> OptionNames(const CLI::App& app);
+constexpr int kMostRepeats = 1000;  // of an option that may be given several times
 
-// "; did you mean NAME?" where one of the names is much like the word, else nothing.
-std::string Suggestion(const std::string& word, const std::vector<std::string>& names);
+// "qex VERB: TEXT" on standard error. Fail returns the status.
+void Say(const std::string& verb, const std::string& text);
+int Fail(const std::string& verb, const std::string& text, int status);
 
-// Numbers with `separator` between them; none when a part of the text is no finite number.
-std::vector<double> ParseNumbers(const std::string& text, char separator = ',');
+using Numbers = std::vector<double>;
 
-// A check for options that take a number.
+struct NumberRange {
+    enum Kind { kAny, kWhole, kColour };  // the last is RRGGBB in hexadecimal
+
+    Kind kind = kAny;
+    double least = -DBL_MAX, most = DBL_MAX;
+    double otherwise = 0;  // taken where the number is left out
+};
+
+// The numbers in an option's text: all of them, or the first `needed` ones.
+struct NumberShape {
+    char separator;
+    std::vector<NumberRange> ranges;
+    size_t needed;
+    const char* fault;                       // behind a text of another shape: "is no size; expected ..."
+    bool (*fits)(const Numbers&) = nullptr;  // whether they go together; null: always
+};
+
+// Reads as many numbers as the shape has. Returns what is wrong with the text, or an empty text.
+std::string ReadNumbers(const std::string& text, const NumberShape& shape, Numbers* numbers);
+
+// Checks for options that take one number.
 CLI::Validator NumberFrom(double least, double most);
-
-// Reads RRGGBB in hexadecimal.
-bool ParseHexColour(const std::string& text, unsigned* colour);
+CLI::Validator WholeNumberFrom(double least, double most);
 
 // An option whose text is read by `parse`, which returns what is wrong with it, or an empty text. May be
 // given up to `most` times.
 CLI::Option* AddParsed(CLI::App* app, const std::string& name, const std::string& help,
                        const std::function<std::string(const std::string& text)>& parse, int most = 1);
 
+// An option whose text is numbers.
+CLI::Option* AddNumbers(CLI::App* app, const std::string& name, const std::string& help,
+                        const NumberShape& shape, const std::function<void(const Numbers&)>& take,
+                        int most = 1);
+
+// An option whose text is one of some names, in any case; `take` gets its index. `what` they are is said of
+// other texts.
+CLI::Option* AddChoice(CLI::App* app, const std::string& name, const std::string& help,
+                       const std::string& what, const std::vector<std::string>& names,
+                       const std::function<void(size_t)>& take);
+
+// "a, b or c".
+std::string Alternatives(const std::vector<std::string>& names);
+
 // Texts, one each time that the option is given.
 CLI::Option* AddTexts(CLI::App* app, const std::string& name, std::vector<std::string>* texts,
                       const std::string& help);
+
+// An axis of a scene that points up, and --up, which names one.
+enum class UpAxis { kX, kY, kZ, kMinusX, kMinusY, kMinusZ };
+CLI::Option* AddUpAxis(CLI::App* app, const std::string& help, UpAxis* up);

@@ -1,12 +1,11 @@
-// Keeps the engine's own output out of the command's: while an EngineOutput lives, what is written to
-// standard output and standard error is collected, and its lines can be asked for afterwards. One may live
-// within another; the inner one keeps its lines to itself.
+// Keeps the engine's log out of the command's output: while an EngineOutput lives, the messages go to it and
+// can be asked for afterwards. One may live within another; the inner one keeps its messages to itself.
 //
-// The engine prints progress lines on standard output, and messages on standard error with "I/TAG: " or
-// "E/TAG: " in front. When the process ends meanwhile (a GL error is fatal), the error lines still reach
-// standard error. With --verbose all lines go there once they are collected.
+// When the process ends meanwhile (a GL error is fatal), the errors still reach standard error. With
+// --verbose all messages go there as they come.
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -17,16 +16,27 @@ class EngineOutput {
     EngineOutput(const EngineOutput&) = delete;
     EngineOutput& operator=(const EngineOutput&) = delete;
 
-    // Stops collecting; the lines stay.
+    // Stops collecting; the messages stay.
     void Stop();
 
-    // The first error line without its tag and without "<Function> ", or an empty text.
+    // The first line of the first error, without "<Function> ", or an empty text.
     std::string FirstError() const;
 
-    // The messages (not the progress lines) that contain `part`, likewise without tag and function.
+    // The first lines of the messages that contain `part` there, likewise without function.
     std::vector<std::string> Messages(const std::string& part) const;
 
   private:
-    std::string text_;
-    bool active_ = false;
+    struct Message {
+        int32_t weight;  // QEX_LOG_...
+        std::string tag, text;
+    };
+
+    static void Take(void* output, int32_t weight, const char* tag, const char* text);
+    static void ShowErrorsAtExit();
+
+    static EngineOutput* s_innermost;
+
+    EngineOutput* outer_;
+    std::vector<Message> messages_;
+    bool active_ = true;
 };

@@ -1,3 +1,4 @@
+// Pictures read and written by stb, resized, turned and laid over one another.
 #include "common/ImageFile.h"
 
 #include <stb/stb_image.h>

@@ -1,3 +1,4 @@
+// Both texts are made from what CLI11 knows of the options.
 #include "common/Manual.h"
 
 #include <cstdio>
@@ -5,6 +6,8 @@
 #include <vector>
 
 #include <CLI/CLI.hpp>
+
+#include "common/CommandLine.h"
 
 namespace {
 
@@ -120,8 +123,7 @@ int PrintManual(const CLI::App& command, const std::string& verb) {
     if (verb.empty()) return Print(Page(command, "qex", "looks into, draws and converts 3D scenes"));
     for (const CLI::App* app : Verbs(command))
         if (app->get_name() == verb) return Print(Page(*app, "qex " + verb, app->get_description()));
-    fprintf(stderr, "qex man: '%s' is no verb\n", verb.c_str());
-    return 2;
+    return Fail("man", "'" + verb + "' is no verb", 2);
 }
 
 int Print(const std::string& text) {

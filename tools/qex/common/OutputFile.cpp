@@ -1,3 +1,4 @@
+// Files are written beside their place and renamed; streams are written as they are.
 #include "common/OutputFile.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// Vertices as the engine draws them: unpacked, moved by their bones and their node.
 #include "common/SceneBounds.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Parts of paths, and files looked up whatever the case of their names.
 #include "common/TextureFiles.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Channels sampled frame by frame, and matrices taken apart into what a node's keys hold.
 #include "convert/Animation.h"
 
 #include <assimp/scene.h>

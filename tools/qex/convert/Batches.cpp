@@ -1,3 +1,4 @@
+// Triangles go into batches that share their bones.
 #include "convert/Batches.h"
 
 #include <Qex.h>

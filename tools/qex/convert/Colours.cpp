@@ -1,3 +1,4 @@
+// Vertex colours become squares of a texture, one for each colour.
 #include "convert/Colours.h"
 
 #include <assimp/mesh.h>

@@ -1,32 +1,29 @@
+// The steps of a conversion, from the file to the report.
 #include "convert/Command.h"
+
+#include <algorithm>
+#include <exception>
+#include <filesystem>
 
 #include <assimp/config.h>
 #include <assimp/postprocess.h>
 #include <assimp/scene.h>
-#include <Qex.h>
-#include <algorithm>
 #include <assimp/Importer.hpp>
 #include <CLI/CLI.hpp>
-#include <cmath>
-#include <exception>
-#include <filesystem>
 
 #include "common/OutputFile.h"
+#include "common/TextureFiles.h"
 #include "convert/Animation.h"
 #include "convert/Gltf.h"
 #include "convert/Log.h"
-#include "convert/Placement.h"
 #include "convert/Process.h"
 #include "convert/Scene.h"
-#include "convert/Textures.h"
 #include "PodWriter.h"
-#include "texture/Overrides.h"
+#include "Qex.h"
 
 namespace fs = std::filesystem;
 
 namespace {
-
-constexpr double kMaxFps = 1000;
 
 // What is particular about the importer of a file type.
 struct FileType {
@@ -37,23 +34,20 @@ struct FileType {
 };
 
 constexpr FileType kFileTypes[] = {
-    {".dae", true, false, {}},
-    {".zae", true, false, {}},
-    {".fbx", true, false, {}},
-    {".3ds", true, false, {false, false, true}},
-    {".ase", true, false, {false, true, false}},
-    {".gltf", false, true, {true, false, false}},
-    {".glb", false, true, {true, false, false}},
+    {"dae", true, false, {}},
+    {"zae", true, false, {}},
+    {"fbx", true, false, {}},
+    {"3ds", true, false, {false, false, true}},
+    {"ase", true, false, {false, true, false}},
+    {"gltf", false, true, {true, false, false}},
+    {"glb", false, true, {true, false, false}},
 };
 
 SceneSettings SettingsFor(const ConvertOptions& options) {
     SceneSettings settings;
     settings.fps = options.fps;
     settings.maxBones = options.maxBones;
-    std::string extension = fs::path(options.input).extension().string();
-    for (char& c : extension) {
-        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-    }
+    const std::string extension = Extension(options.input);
     for (const FileType& type : kFileTypes) {
         if (extension != type.extension) continue;
         settings.materials = {type.textureReplacesColour, type.linearColours, {}};
@@ -63,8 +57,7 @@ SceneSettings SettingsFor(const ConvertOptions& options) {
 }
 
 int BadArgument(const std::string& subject, const std::string& text) {
-    std::fprintf(stderr, "qex convert: %s: %s\n", subject.c_str(), text.c_str());
-    return kBadArgument;
+    return Fail("convert", subject + ": " + text, kBadArgument);
 }
 
 std::string OutputDirectory(const ConvertOptions& options) {
@@ -73,24 +66,10 @@ std::string OutputDirectory(const ConvertOptions& options) {
 }
 
 // kDone, or the status to end with after a message.
-int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placement* placement) {
+int CheckArguments(const ConvertOptions& options) {
     std::error_code ec;
-    std::string error;
-    if (!ParseTextureFormat(options.textureFormat, format)) {
-        return BadArgument(options.textureFormat, "no texture format; etc1, rgba8888 or rgb888 is expected");
-    }
-    if (!(options.fps >= 1 && options.fps <= kMaxFps && options.fps == std::floor(options.fps))) {
-        return BadArgument("--fps", "a whole number of frames per second from 1 to 1000 is expected");
-    }
-    if (!(options.maxBones >= 1 && options.maxBones <= QEX_MAX_BATCH_BONES)) {
-        return BadArgument("--max-bones", "a number of bones from 1 to 16 is expected");
-    }
     if (options.input == "-" || options.output == "-") {
         return BadArgument("-", "no file; a scene and its textures lie side by side in a folder");
-    }
-    if (!ParsePlacement(options.up, options.scale, placement, &error)) {
-        std::fprintf(stderr, "qex convert: %s\n", error.c_str());
-        return kBadArgument;
     }
     if (options.listClips) return kDone;
     if (options.output.empty() || fs::is_directory(options.output, ec)) {
@@ -101,7 +80,7 @@ int CheckArguments(const ConvertOptions& options, TextureFormat* format, Placeme
         return BadArgument(options.output, "cannot be written; its folder does not exist");
     }
     std::vector<std::string> inputs = {options.input};
-    for (const auto& [material, file] : SplitOverrides(options.textures)) inputs.push_back(file);
+    for (const auto& [material, file] : options.textures) inputs.push_back(file);
     const std::string problem = WhyNotOutput(options.output, inputs);
     return problem.empty() ? kDone : BadArgument(options.output, problem);
 }
@@ -148,55 +127,62 @@ void PrintSummary(const ConvertOptions& options, const pod::Scene& scene, const 
                 textures.FilesWritten(), log.Warnings());
 }
 
-int ConvertFile(const ConvertOptions& options, TextureFormat format, const Placement& placement) {
-    ConvertLog log(options.input);
-    std::error_code ec;
-    if (!fs::is_regular_file(options.input, ec)) {
-        log.Error("cannot be read; an existing scene file is expected");
-        return kBadInput;
-    }
+// Null after a message.
+const aiScene* ReadScene(const std::string& path, Assimp::Importer* importer, ConvertLog* log) {
     std::string error;
-    if (!CheckGltf(options.input, &error)) {
-        log.Error(error);
-        return kBadInput;
+    if (!IsRegularFile(path)) {
+        log->Error("cannot be read; an existing scene file is expected");
+        return nullptr;
     }
-    Assimp::Importer importer;
-    const aiScene* source = Import(options.input, &importer);
-    if (!source || !source->mRootNode) {
-        std::string reason = source ? "it holds no nodes" : importer.GetErrorString();
-        reason.resize(std::min(reason.size(), reason.find('\n')));
-        if (reason.find("bad_alloc") != std::string::npos) throw std::bad_alloc();
-        log.Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason +
-                  ")");
-        return kBadInput;
+    if (!CheckGltf(path, &error)) {
+        log->Error(error);
+        return nullptr;
     }
+    const aiScene* scene = Import(path, importer);
+    if (scene && scene->mRootNode) return scene;
+    std::string reason = scene ? "it holds no nodes" : importer->GetErrorString();
+    reason.resize(std::min(reason.size(), reason.find('\n')));
+    if (reason.find("bad_alloc") != std::string::npos) throw std::bad_alloc();
+    log->Error("cannot be read as a scene; glTF, FBX, Collada, OBJ, 3DS or X is expected (" + reason + ")");
+    return nullptr;
+}
 
+// The settings that name parts of the scene. kDone, or the status to end with after a message.
+int ChooseParts(const ConvertOptions& options, const aiScene& source, SceneSettings* settings) {
+    std::string error;
+    if (!options.clip.empty()) {
+        const int clip = FindClip(source, options.clip, &error);
+        if (clip < 0) return BadArgument("--clip", error);
+        settings->clip = clip;
+    }
+    settings->materials.overrides = options.textures;
+    error = UnknownMaterial(options.textures, MaterialNames(source));
+    return error.empty() ? kDone : BadArgument("--texture", error);
+}
+
+int ConvertFile(const ConvertOptions& options) {
+    ConvertLog log(options.input);
+    Assimp::Importer importer;
+    const aiScene* source = ReadScene(options.input, &importer, &log);
+    if (!source) return kBadInput;
     if (options.listClips) {
         ListClips(*source);
         if (!source->mNumAnimations) log.Error("has no animations");
         return kDone;
     }
     SceneSettings settings = SettingsFor(options);
-    if (!options.clip.empty()) {
-        const int clip = FindClip(*source, options.clip, &error);
-        if (clip < 0) return BadArgument("--clip", error);
-        settings.clip = clip;
-    }
-    settings.materials.overrides = SplitOverrides(options.textures);
-    error = UnknownMaterial(settings.materials.overrides, MaterialNames(*source));
-    if (!error.empty()) return BadArgument("--texture", error);
-    TextureSet textures(source, options.input, OutputDirectory(options), format, &log);
+    int status = ChooseParts(options, *source, &settings);
+    if (status != kDone) return status;
+    TextureSet textures(source, options.input, OutputDirectory(options), options.textureFormat, &log);
     pod::Scene scene;
-    const ExitStatus status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
+    std::string error;
+    status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
     if (status != kDone) {
         log.Error(error);
         return status;
     }
-    if (!textures.WriteError().empty()) {
-        std::fprintf(stderr, "qex convert: %s\n", textures.WriteError().c_str());
-        return kBadArgument;
-    }
-    if (!PlaceScene(placement, &scene)) log.Warn("has no size that could be made to fit");
+    if (!textures.WriteError().empty()) return Fail("convert", textures.WriteError(), kBadArgument);
+    if (!PlaceScene(options.placement, &scene)) log.Warn("has no size that could be made to fit");
     if (!WriteOutput(options.output, pod::WritePod(scene), &error)) return BadArgument(options.output, error);
     if (!options.quiet) PrintSummary(options, scene, textures, log);
     return kDone;
@@ -209,31 +195,28 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
     app->add_option("-o,--output", options->output,
                     "POD scene, needed unless clips are listed; its textures are written beside it");
     app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
-        ->check(CLI::Range(1.0, 1000.0));
+        ->check(WholeNumberFrom(1, 1000));
     app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
     app->add_flag("--list-clips", options->listClips,
                   "print index, name, seconds and channels of the animations; convert nothing");
     app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")
-        ->check(CLI::Range(1, 16));
-    app->add_option("--texture-format", options->textureFormat, "etc1, rgba8888 or rgb888 (etc1)")
-        ->transform(CLI::IsMember({"etc1", "rgba8888", "rgb888"}, CLI::ignore_case));
+        ->check(WholeNumberFrom(1, QEX_MAX_BATCH_BONES));
+    AddChoice(app, "--texture-format", "etc1, rgba8888 or rgb888 (etc1)", "texture format",
+              TextureFormatNames(),
+              [=](size_t index) { options->textureFormat = static_cast<TextureFormat>(index); });
     AddTextureOption(app, &options->textures);
-    app->add_option("--up", options->up, "the file's vertical axis: x, y, z, -x, -y or -z (y)");
-    app->add_option("--scale", options->scale,
-                    "a factor, or fit:SIZE for the length of the longest edge (1)");
+    SetUpPlacement(app, &options->placement);
     app->add_option("--memory", options->memory, "megabytes of memory that it may take (4096)")
-        ->check(CLI::Range(64, 1 << 24));
+        ->check(WholeNumberFrom(64, 1 << 24));
     app->add_flag("-q,--quiet", options->quiet, "no summary");
 }
 
 int RunConvert(const ConvertOptions& options) {
-    TextureFormat format;
-    Placement placement;
-    const int argumentStatus = CheckArguments(options, &format, &placement);
+    const int argumentStatus = CheckArguments(options);
     if (argumentStatus != kDone) return argumentStatus;
     return RunInProcess(options.input, options.memory, [&]() -> int {
         try {
-            return ConvertFile(options, format, placement);
+            return ConvertFile(options);
         } catch (const std::bad_alloc&) {
             ConvertLog(options.input).Error(NeedsMoreMemory(options.memory));
         } catch (const std::exception& failure) {  // such as a folder that vanishes while it is read

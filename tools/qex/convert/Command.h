@@ -2,7 +2,10 @@
 #pragma once
 
 #include <string>
-#include <vector>
+
+#include "convert/Placement.h"
+#include "convert/Textures.h"
+#include "texture/Overrides.h"
 
 namespace CLI {
 class App;
@@ -11,16 +14,15 @@ class App;
 struct ConvertOptions {
     std::string input;
     std::string output;
-    std::string textureFormat = "etc1";  // etc1, rgba8888 or rgb888
-    double fps = 30;                     // whole frames per second of the sampled animation
-    int maxBones = 16;                   // in a bone batch of a skinned mesh, 1 to 16
-    std::string clip;                    // name or index of the animation; the first when empty
-    std::vector<std::string> textures;   // MATERIAL=FILE, see TextureOverrides.h
-    std::string up = "y";                // the source's vertical axis: x, y, z, -x, -y or -z
-    std::string scale = "1";             // a number above 0, or fit:SIZE for the scene's longest edge
-    int memory = 4096;                   // megabytes that the conversion may take
-    bool listClips = false;              // print the animations and convert nothing
-    bool quiet = false;                  // no summary; warnings and errors still show
+    TextureFormat textureFormat = TextureFormat::kEtc1;
+    int fps = 30;               // of the sampled animation
+    int maxBones = 16;          // in a bone batch of a skinned mesh, 1 to 16
+    std::string clip;           // name or index of the animation; the first when empty
+    TextureOverrides textures;  // in place of the materials' own
+    Placement placement;
+    int memory = 4096;       // megabytes that the conversion may take
+    bool listClips = false;  // print the animations and convert nothing
+    bool quiet = false;      // no summary; warnings and errors still show
 };
 
 // Gives the verb its options.

@@ -1,15 +1,17 @@
+// What the importer would crash on is found in the JSON part of the file beforehand.
 #include "convert/Gltf.h"
 
-#include <algorithm>
 #include <fstream>
 #include <iterator>
+
 #include <nlohmann/json.hpp>
-#include <vector>
+
+#include "common/TextureFiles.h"
 
 namespace {
 
-constexpr size_t kBinaryHeader =
-    20;  // of a .glb file: magic "glTF", version, length, and of its JSON length and type
+// Of a .glb file: magic "glTF", version, length, and of its JSON length and type.
+constexpr size_t kBinaryHeader = 20;
 
 uint32_t Word(const std::string& bytes, size_t offset) {
     uint32_t word = 0;
@@ -30,10 +32,8 @@ nlohmann::json ReadJson(const std::string& path) {
 }  // namespace
 
 bool CheckGltf(const std::string& path, std::string* error) {
-    const size_t dot = path.rfind('.');
-    std::string extension = dot == std::string::npos ? "" : path.substr(dot);
-    for (char& c : extension) c = static_cast<char>(c >= 'A' && c <= 'Z' ? c - 'A' + 'a' : c);
-    if (extension != ".gltf" && extension != ".glb") return true;
+    const std::string extension = Extension(path);
+    if (extension != "gltf" && extension != "glb") return true;
     const nlohmann::json json = ReadJson(path);
     if (!json.is_object() || !json.contains("skins") || !json["skins"].is_array()) return true;
     const nlohmann::json& skins = json["skins"];

@@ -2,8 +2,9 @@
 // how it ends.
 #pragma once
 
-#include <cstdio>
 #include <string>
+
+#include "common/CommandLine.h"
 
 enum ExitStatus { kDone = 0, kBadInput = 1, kBadArgument = 2 };
 
@@ -13,11 +14,9 @@ class ConvertLog {
 
     void Warn(const std::string& text) {
         ++warnings_;
-        std::fprintf(stderr, "qex convert: %s: warning: %s\n", file_.c_str(), text.c_str());
+        Say("convert", file_ + ": warning: " + text);
     }
-    void Error(const std::string& text) const {
-        std::fprintf(stderr, "qex convert: %s: %s\n", file_.c_str(), text.c_str());
-    }
+    void Error(const std::string& text) const { Say("convert", file_ + ": " + text); }
     int Warnings() const { return warnings_; }
 
   private:

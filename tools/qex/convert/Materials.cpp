@@ -1,3 +1,4 @@
+// Colours, opacity and textures of the importer's materials, by what each file type means by them.
 #include "convert/Materials.h"
 
 #include <assimp/GltfMaterial.h>

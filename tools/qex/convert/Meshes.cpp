@@ -1,3 +1,4 @@
+// The importer's meshes as interleaved vertices and indices.
 #include "convert/Meshes.h"
 
 #include <assimp/mesh.h>

@@ -1,3 +1,4 @@
+// Nodes, cameras and lights in the engine's conventions: where they look, how wide they see.
 #include "convert/Nodes.h"
 
 #include <assimp/scene.h>

@@ -1,11 +1,14 @@
+// Turns and scales what has been converted, not the file, whose animation would have to follow.
 #include "convert/Placement.h"
 
-#include <assimp/vector3.h>
-#include <Qex.h>
 #include <algorithm>
+#include <cfloat>
 #include <cmath>
-#include <cstdio>
 #include <cstring>
+
+#include <assimp/quaternion.h>
+#include <assimp/vector3.h>
+#include <CLI/CLI.hpp>
 
 #include "common/EngineOutput.h"
 #include "common/SceneBounds.h"
@@ -17,25 +20,27 @@ namespace {
 constexpr float kHalfTurn = 3.14159265f;
 constexpr char kFit[] = "fit:";
 
-struct Axis {
-    const char* name;
+// By UpAxis: the turn that makes it +Y.
+struct Turn {
     aiVector3D about;
     float angle;
 };
 
-const Axis kAxes[] = {
-    {"y", {1, 0, 0}, 0},
-    {"z", {1, 0, 0}, -kHalfTurn / 2},
-    {"-z", {1, 0, 0}, kHalfTurn / 2},
-    {"x", {0, 0, 1}, kHalfTurn / 2},
-    {"-x", {0, 0, 1}, -kHalfTurn / 2},
-    {"-y", {0, 0, 1}, kHalfTurn},
-};
+const Turn kTurns[] = {{{0, 0, 1}, kHalfTurn / 2},  {{1, 0, 0}, 0},         {{1, 0, 0}, -kHalfTurn / 2},
+                       {{0, 0, 1}, -kHalfTurn / 2}, {{0, 0, 1}, kHalfTurn}, {{1, 0, 0}, kHalfTurn / 2}};
 
-bool ParsePositive(const std::string& text, float* value) {
-    int consumed = 0;
-    return sscanf(text.c_str(), "%f%n", value, &consumed) == 1 &&
-           static_cast<size_t>(consumed) == text.size() && std::isfinite(*value) && *value > 0;
+// A factor, or fit:SIZE.
+std::string ParseScale(const std::string& text, Placement* placement) {
+    const NumberShape shape = {',',
+                               {{NumberRange::kAny, FLT_TRUE_MIN, FLT_MAX}},
+                               1,
+                               "is no scale; expected a number above 0, or fit:SIZE for the longest edge"};
+    Numbers n;
+    const bool fit = Lower(text).rfind(kFit, 0) == 0;
+    const std::string problem = ReadNumbers(fit ? text.substr(strlen(kFit)) : text, shape, &n);
+    if (!problem.empty()) return "'" + text + "' " + shape.fault;
+    (fit ? placement->fit : placement->scale) = static_cast<float>(n[0]);
+    return "";
 }
 
 void TurnMatrix(const aiMatrix4x4& turn, float* m) {
@@ -113,27 +118,17 @@ float LongestEdge(const pod::Scene& scene) {
 
 }  // namespace
 
-bool ParsePlacement(const std::string& up, const std::string& scale, Placement* placement,
-                    std::string* error) {
-    const Axis* found = nullptr;
-    for (const Axis& axis : kAxes)
-        if (Lower(up) == axis.name) found = &axis;
-    if (!found) {
-        *error = "'" + up + "' is no axis; x, y, z, -x, -y or -z is expected";
-        return false;
-    }
-    placement->turn = aiQuaternion(found->about, found->angle);
-    const bool fit = Lower(scale).rfind(kFit, 0) == 0;
-    if (ParsePositive(fit ? scale.substr(strlen(kFit)) : scale, fit ? &placement->fit : &placement->scale))
-        return true;
-    *error = "'" + scale + "' is no scale; a number above 0, or fit:SIZE for the longest edge, is expected";
-    return false;
+void SetUpPlacement(CLI::App* app, Placement* placement) {
+    AddUpAxis(app, "the file's vertical axis: x, y, z, -x, -y or -z (y)", &placement->up);
+    AddParsed(app, "--scale", "a factor, or fit:SIZE for the length of the longest edge (1)",
+              [=](const std::string& text) { return ParseScale(text, placement); });
 }
 
 bool PlaceScene(const Placement& placement, pod::Scene* scene) {
-    const bool turned = placement.turn.w < 1;
+    const Turn& turn = kTurns[static_cast<int>(placement.up)];
     for (pod::Node& node : scene->nodes)
-        if (turned && node.parent < 0) TurnNode(placement.turn, &node);
+        if (placement.up != UpAxis::kY && node.parent < 0)
+            TurnNode(aiQuaternion(turn.about, turn.angle), &node);
     float scale = placement.scale;
     if (placement.fit > 0) {
         const float edge = LongestEdge(*scene);

@@ -1,3 +1,4 @@
+// The child writes its messages into a pipe that the parent reads line by line.
 #include "convert/Process.h"
 
 #ifdef __linux__
@@ -36,6 +37,7 @@ void Limit(int what, uint64_t bytes) {
 }
 
 [[noreturn]] void RunChild(int errors, pid_t parent, int megabytes, const std::function<int()>& work) {
+    // Importers and the C++ runtime write to standard error themselves, whatever log they are given.
     dup2(errors, STDERR_FILENO);
     close(errors);
 #ifdef __linux__

@@ -1,3 +1,4 @@
+// Puts the parts of a converted scene together: nodes, meshes, materials, animation.
 #include "convert/Scene.h"
 
 #include <assimp/scene.h>

@@ -1,3 +1,4 @@
+// Bones and weights of the vertices, at most four each.
 #include "convert/Skin.h"
 
 #include <assimp/scene.h>

@@ -1,10 +1,10 @@
+// Pictures are looked up beside the scene or within it, made fit for the GL, and written once.
 #include "convert/Textures.h"
 
 #include <assimp/scene.h>
 #include <algorithm>
 #include <cstring>
 #include <filesystem>
-#include <iterator>
 
 #include "common/OutputFile.h"
 #include "common/TextureFiles.h"
@@ -26,9 +26,6 @@ std::string CleanPath(std::string path) {
     return path;
 }
 
-// In the order of TextureFormat.
-constexpr const char* kFormatNames[] = {"etc1", "rgba8888", "rgb888"};
-
 void MakeOpaque(Image* image) {
     for (size_t i = 3; i < image->pixels.size(); i += 4) image->pixels[i] = 255;
     image->hasAlpha = false;
@@ -49,13 +46,9 @@ void SwapRedGreen(Image* image) {
 
 }  // namespace
 
-bool ParseTextureFormat(const std::string& name, TextureFormat* format) {
-    for (size_t i = 0; i < std::size(kFormatNames); ++i) {
-        if (name != kFormatNames[i]) continue;
-        *format = static_cast<TextureFormat>(i);
-        return true;
-    }
-    return false;
+const std::vector<std::string>& TextureFormatNames() {
+    static const std::vector<std::string> names = {"etc1", "rgba8888", "rgb888"};
+    return names;
 }
 
 int PowerOfTwoSide(int side) {
@@ -72,7 +65,8 @@ std::vector<uint8_t> EncodePvr(const Image& image, TextureFormat format, bool mi
         level = ResizeImage(level, width, height);
         level.hasAlpha = image.hasAlpha;
     }
-    return EncodePvrFile({level}, *FindFormat(kFormatNames[static_cast<size_t>(format)]), mipmaps, true);
+    return EncodePvrFile({level}, *FindFormat(TextureFormatNames()[static_cast<size_t>(format)]), mipmaps,
+                         true);
 }
 
 TextureSet::TextureSet(const aiScene* scene, std::string inputPath, std::string outputDirectory,

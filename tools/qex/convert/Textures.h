@@ -13,8 +13,8 @@ struct aiScene;
 
 enum class TextureFormat { kEtc1, kRgba8888, kRgb888 };
 
-// False for a name that is none of etc1, rgba8888, rgb888.
-bool ParseTextureFormat(const std::string& name, TextureFormat* format);
+// In the order of TextureFormat.
+const std::vector<std::string>& TextureFormatNames();
 
 enum class TextureUse {
     kColour,        // with alpha, if any pixel is not opaque

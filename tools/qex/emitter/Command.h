@@ -4,15 +4,17 @@
 #include <string>
 #include <vector>
 
+#include "emitter/Fields.h"
+
 namespace CLI {
 class App;
 }
 
 struct EmitterOptions {
-    std::string input;   // emitter file or description; empty: the engine's defaults
-    std::string output;  // .json or .txt: a description, else an emitter file; empty: text on standard output
-    std::vector<std::string> settings;  // FIELD=VALUE
-    bool json = false;
+    std::string input;  // emitter file or description; empty: the engine's defaults
+    std::string
+        output;  // .json: a description, else an emitter file; empty: a description on standard output
+    std::vector<FieldValues> settings;
 };
 
 void SetUpEmitter(CLI::App* app, EmitterOptions* options);

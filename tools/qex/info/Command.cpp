@@ -1,3 +1,4 @@
+// Tells the formats apart, and shows what was found.
 #include "info/Command.h"
 
 #include <cstdint>
@@ -76,7 +77,7 @@ int RunInfo(const InfoOptions& options) {
             documents.push_back(document);
             continue;
         }
-        fprintf(stderr, "qex info: %s: %s\n", CleanText(input.Name()).c_str(), CleanText(error).c_str());
+        Say("info", CleanText(input.Name()) + ": " + CleanText(error));
         status = 1;
     }
     if (options.json && !documents.empty())

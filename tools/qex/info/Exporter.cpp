@@ -1,3 +1,4 @@
+// Reads the blocks before the scene; options are NAME=VALUE lines.
 #include "info/Exporter.h"
 
 #include <cstdio>

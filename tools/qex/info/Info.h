@@ -18,10 +18,10 @@ using Json = nlohmann::ordered_json;
 // Text from a file, made fit for a terminal and for JSON: valid UTF-8 without control characters.
 std::string CleanText(const std::string& text);
 
-// InfoScene.cpp. False, with the reason, when the file is no sound scene.
+// Scene.cpp. False, with the reason, when the file is no sound scene.
 bool DescribeScene(const std::string& path, Json* document, std::string* error);
 
-// InfoProblems.cpp. A line for each thing that would draw wrong or not at all. `textures` is the document's
+// Problems.cpp. A line for each thing that would draw wrong or not at all. `textures` is the document's
 // list of the textures; `engine` holds what the engine said while it read the scene.
 std::vector<std::string> FindSceneProblems(QexPODModel* scene, const Json& textures,
                                            const EngineOutput& engine);
@@ -30,7 +30,7 @@ std::vector<std::string> FindSceneProblems(QexPODModel* scene, const Json& textu
 // its last.
 std::vector<float> SampleFrames(const QexPODModel& scene);
 
-// InfoTexture.cpp and InfoTextureKtx.cpp. Each describes a whole file in memory, with "loads" (whether the
+// Texture.cpp and TextureKtx.cpp. Each describes a whole file in memory, with "loads" (whether the
 // engine takes it) and "problems". False, with the reason, when it is too short to have a header.
 bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* error);
 bool DescribeTga(const std::vector<uint8_t>& file, Json* document, std::string* error);
@@ -39,8 +39,8 @@ bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* 
 constexpr char kPartialChain[] = "its mipmap chain is not whole: it is decoded, and the rest is made";
 constexpr char kNoMipmaps[] = "its sides are no powers of two: a plain GL ES 2.0 has no mipmaps for it";
 
-// InfoCommand.cpp. Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.
+// Command.cpp. Describes a PVR or KTX file by its content; false when it is neither, or cannot be read.
 bool DescribeContainer(const std::string& path, Json* document, std::string* error);
 
-// InfoText.cpp. Prints the document on standard output.
+// Text.cpp. Prints the document on standard output.
 void PrintInfo(const Json& document);

@@ -1,3 +1,4 @@
+// One check for each thing that goes wrong with scenes.
 #include <algorithm>
 #include <cmath>
 #include <cstdio>

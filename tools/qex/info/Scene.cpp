@@ -1,3 +1,4 @@
+// A scene as JSON: a function for each kind of record.
 #include <algorithm>
 #include <cmath>
 #include <cstdio>

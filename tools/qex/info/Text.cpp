@@ -1,3 +1,4 @@
+// The document as tables and lines for a terminal.
 #include <algorithm>
 #include <cstdio>
 

@@ -1,3 +1,4 @@
+// The scene's own camera, and one that is placed so that everything is in the picture.
 #include "render/Camera.h"
 
 #include <algorithm>

@@ -3,10 +3,8 @@
 
 #include <vector>
 
+#include "common/CommandLine.h"
 #include "Qex.h"
-
-// The scene's vertical axis.
-enum class UpAxis { kX, kY, kZ, kMinusX, kMinusY, kMinusZ };
 
 struct OrbitView {
     float yaw = 30;    // degrees about the vertical: with Y up, 0 looks along -Z, 90 along -X

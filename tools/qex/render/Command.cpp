@@ -1,3 +1,4 @@
+// The course of a rendering: context, scene, checks, pictures. Drawing.cpp draws them.
 #include "render/Command.h"
 
 #include <algorithm>
@@ -16,7 +17,6 @@
 #include "render/Renderer.h"
 #include "render/Report.h"
 #include "render/Textures.h"
-#include "texture/Overrides.h"
 
 namespace {
 
@@ -111,12 +111,14 @@ bool Renderer::Load() {
 }
 
 size_t Renderer::PictureCount() const {
-    if (!options_.sequence) return static_cast<size_t>(std::max(options_.turn, 1));
-    return static_cast<size_t>((options_.last - options_.first) / options_.step + 1e-9) + 1;
+    const auto& frames = options_.frames;
+    if (!frames) return static_cast<size_t>(std::max(options_.turn, 1));
+    return static_cast<size_t>((frames->last - frames->first) / frames->step + 1e-9) + 1;
 }
 
 double Renderer::FrameAt(size_t picture) const {
-    return options_.sequence ? options_.first + static_cast<double>(picture) * options_.step : options_.frame;
+    const auto& frames = options_.frames;
+    return frames ? frames->first + static_cast<double>(picture) * frames->step : options_.frame;
 }
 
 bool Renderer::Save(const std::string& path, const std::vector<uint8_t>& pixels) const {
@@ -153,13 +155,13 @@ bool Renderer::LoadSurroundings(std::string* problem) {
 std::string Renderer::WrongOutput() const {
     const std::string problem = WhyNoPictureName(options_.output);
     if (!problem.empty()) return options_.output + ": " + problem;
-    if (options_.output == "-" && (options_.sequence || options_.turn))
+    if (options_.output == "-" && (options_.frames || options_.turn))
         return "several pictures do not go to standard output; a file name is expected";
     const EffectOptions& effects = options_.effects;
     std::vector<std::string> inputs = {options_.input};
     for (const auto* more : {&effects.sky, &effects.emitters.emitters, &effects.emitters.textures})
         inputs.insert(inputs.end(), more->begin(), more->end());
-    for (const auto& [material, file] : SplitOverrides(options_.textures.overrides)) inputs.push_back(file);
+    for (const auto& [material, file] : options_.textures.overrides) inputs.push_back(file);
     for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
         if (model_.scene.textures[i].name)
             inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);
@@ -171,7 +173,7 @@ std::string Renderer::WrongOutput() const {
 }
 
 std::string Renderer::OutputPath(size_t index) const {
-    return options_.sequence || options_.turn ? NumberedOutput(options_.output, index) : options_.output;
+    return options_.frames || options_.turn ? NumberedOutput(options_.output, index) : options_.output;
 }
 
 // What is wrong with options that name parts of the scene; empty when nothing is.
@@ -190,8 +192,8 @@ std::string Renderer::CheckOptions() {
 void Renderer::WarnOfFrames() const {
     const uint32_t count = model_.scene.frameCount;
     const double last = FrameAt(PictureCount() - 1);
-    const char* asked = options_.sequence ? "--frames" : "--frame";
-    if (count < 2 && (options_.sequence || last > 0))
+    const char* asked = options_.frames ? "--frames" : "--frame";
+    if (count < 2 && (options_.frames || last > 0))
         Warn(std::string(asked) + ": the scene has no animation; every frame is the same");
     else if (count > 1 && last > count - 1)
         Warn(std::string(asked) + ": the last frame is " + std::to_string(count - 1) +
@@ -249,8 +251,8 @@ int Renderer::DrawAll() {
         std::string reason;
         {
             EngineOutput quiet;
-            if (emitters_ && options_.sequence && i > 0)
-                emitters_->Run(static_cast<float>(options_.step) /
+            if (emitters_ && options_.frames && i > 0)
+                emitters_->Run(static_cast<float>(options_.frames->step) /
                                static_cast<float>(std::max(model_.scene.framesPerSecond, 1u)));
             DrawNumber(i);
             pixels = Pixels(false);

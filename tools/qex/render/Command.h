@@ -13,6 +13,10 @@ namespace CLI {
 class App;
 }
 
+struct FrameRange {
+    double first, last, step;
+};
+
 struct RenderOptions {
     std::string input;
     std::string output;
@@ -20,10 +24,9 @@ struct RenderOptions {
     int height = 600;
     int antialias = 4;  // samples of a pixel: 1, 2 or 4
     double frame = 0;
-    bool sequence = false;  // several frames, numbered
-    double first = 0, last = 0, step = 1;
-    int turn = 0;               // pictures of one turn around the scene, 0 for none
-    std::optional<int> camera;  // the first; with autoCamera or without cameras the scene is framed
+    std::optional<FrameRange> frames;  // several, numbered
+    int turn = 0;                      // pictures of one turn around the scene, 0 for none
+    std::optional<int> camera;         // the first; with autoCamera or without cameras the scene is framed
     bool autoCamera = false;
     OrbitView view;
     uint32_t background = 0x404858;  // RRGGBB

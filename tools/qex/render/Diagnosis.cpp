@@ -1,3 +1,4 @@
+// Starts of files, and planes of the view, with words for them.
 #include "render/Diagnosis.h"
 
 #include <cerrno>
@@ -25,21 +26,6 @@ const Magic kMagics[] = {
 
 const char kNothing[] = "; there is nothing to draw (qex info shows what it holds)";
 
-}  // namespace
-
-bool ShowsOnly(uint32_t background, const std::vector<uint8_t>& pixels) {
-    const int want[3] = {static_cast<int>(background >> 16 & 0xFF), static_cast<int>(background >> 8 & 0xFF),
-                         static_cast<int>(background & 0xFF)};
-    for (size_t i = 0; i < pixels.size(); i += 4)
-        for (size_t c = 0; c < 3; ++c) {
-            const int difference = pixels[i + c] - want[c];
-            if (difference > 1 || difference < -1) return false;
-        }
-    return true;
-}
-
-namespace {
-
 // The clip planes that all points lie beyond, in words; empty when some point is inside all of them.
 std::string OutsideOf(const QexCamera& camera, const std::vector<QexVec3>& points) {
     QexMatrix transform;
@@ -64,6 +50,17 @@ std::string OutsideOf(const QexCamera& camera, const std::vector<QexVec3>& point
 }
 
 }  // namespace
+
+bool ShowsOnly(uint32_t background, const std::vector<uint8_t>& pixels) {
+    const int want[3] = {static_cast<int>(background >> 16 & 0xFF), static_cast<int>(background >> 8 & 0xFF),
+                         static_cast<int>(background & 0xFF)};
+    for (size_t i = 0; i < pixels.size(); i += 4)
+        for (size_t c = 0; c < 3; ++c) {
+            const int difference = pixels[i + c] - want[c];
+            if (difference > 1 || difference < -1) return false;
+        }
+    return true;
+}
 
 std::string WhyNotPod(const std::string& path, const std::string& wanted) {
     std::error_code error;

@@ -27,7 +27,7 @@ void Renderer::SetFrame(double frame) {
 
 // Collects what the automatic camera has to show, over all frames, with its mirror image.
 void Renderer::Frame() {
-    const size_t count = options_.sequence ? PictureCount() : 1;
+    const size_t count = options_.frames ? PictureCount() : 1;
     // Of long sequences some pictures stand for all.
     const size_t step = (count + kFramingPictures - 1) / kFramingPictures;
     const size_t share = std::max<size_t>(1000, kFramingPoints / (count / step));

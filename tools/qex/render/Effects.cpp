@@ -1,3 +1,4 @@
+// The engine's effects with the figures that suit a scene of any size.
 #include "render/Effects.h"
 
 #include <cstdio>
@@ -68,10 +69,10 @@ std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes)
         if (found < 0) return problem;
         const uint32_t node = static_cast<uint32_t>(found);
         const QexVec3& v = change.value;
-        if (change.what == "hide") QexModel_EnableNodeRenderingR(model, node, 0);
-        if (change.what == "move") QexModel_SetNodePosition(model, node, v.x, v.y, v.z);
-        if (change.what == "rotate") QexModel_SetNodeRotation(model, node, v.x, v.y, v.z);
-        if (change.what == "face") QexModel_SetNodeFaceTo(model, node, &v);
+        if (change.what == NodeChange::kHide) QexModel_EnableNodeRenderingR(model, node, 0);
+        if (change.what == NodeChange::kMove) QexModel_SetNodePosition(model, node, v.x, v.y, v.z);
+        if (change.what == NodeChange::kRotate) QexModel_SetNodeRotation(model, node, v.x, v.y, v.z);
+        if (change.what == NodeChange::kFace) QexModel_SetNodeFaceTo(model, node, &v);
     }
     return "";
 }

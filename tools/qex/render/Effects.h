@@ -11,14 +11,15 @@
 #include "render/Emitters.h"
 
 struct NodeChange {
+    enum What { kHide, kMove, kRotate, kFace };
+
     std::string node;
-    std::string what;  // hide, move, rotate or face
-    QexVec3 value;     // a place, or degrees
+    What what;
+    QexVec3 value;  // a place, or degrees
 };
 
 struct DepthOfField {
-    float focus, range;  // as QexPostProcessing_DrawDOF takes them
-    float sigma = 5, samples = 9;
+    float focus, range, sigma, samples;  // as QexPostProcessing_DrawDOF takes them
 };
 
 struct EffectOptions {

@@ -1,3 +1,4 @@
+// Emitters run at a fixed rate and from a fixed seed.
 #include "render/Emitters.h"
 
 #include <algorithm>
@@ -9,8 +10,8 @@
 #include "common/EngineOutput.h"
 #include "common/TextureFiles.h"
 #include "emitter/Description.h"
+#include "Paint.h"
 #include "render/Textures.h"
-#include "Scenes.h"
 #include "texture/Write.h"
 
 namespace {
@@ -60,7 +61,7 @@ bool Emitters::Load(const EmitterScene& scene, std::vector<std::string>* warning
         AddTexture(FlipRows(image), FileName(path));
     }
     if (scene.textures.empty())
-        AddTexture({kSpotSize, kSpotSize, scenes::Spot(kSpotSize, {255, 255, 255})}, "spot");
+        AddTexture({kSpotSize, kSpotSize, pod::Spot(kSpotSize, {255, 255, 255})}, "spot");
     for (const std::string& path : scene.emitters) {
         QexParticleEmitter* emitter = LoadEmitter(path, problem);
         if (!emitter) {

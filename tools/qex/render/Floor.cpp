@@ -1,3 +1,4 @@
+// A plane of the size of the scene, as a model of its own.
 #include "render/Floor.h"
 
 #include <algorithm>
@@ -5,8 +6,8 @@
 #include <GLES2/gl2.h>
 
 #include "common/SceneBounds.h"
+#include "PodBuild.h"
 #include "render/Textures.h"
-#include "Scenes.h"
 
 namespace {
 
@@ -26,6 +27,18 @@ Image Chequers() {
     return image;
 }
 
+pod::Scene PlaneScene(float size, const pod::Vec3& place) {
+    pod::MeshArrays plane = pod::FloorMesh(size);
+    for (pod::Vec2& uv : plane.uvs)
+        for (float& t : uv) t *= kSquares / 2 / size;
+    pod::Scene scene;
+    scene.materials.resize(1);
+    scene.meshes = {pod::BuildMesh(plane)};
+    scene.nodes = {pod::BuildNode("floor", {{place}, {}, {}, {}}, -1, 0, 0)};
+    scene.meshNodeCount = 1;
+    return scene;
+}
+
 }  // namespace
 
 Floor::~Floor() {
@@ -37,14 +50,8 @@ Floor::~Floor() {
 void Floor::Create(const std::vector<QexVec3>& points, float height, bool mirrors) {
     const Bounds bounds = BoundsOf(points);
     if (bounds.empty) return;
-    const float size = kSpread * bounds.LongestEdge();
-    pod::MeshArrays plane = scenes::Floor(size);
-    for (pod::Vec2& uv : plane.uvs)
-        for (float& t : uv) t *= kSquares / 2 / size;
-    file_ = pod::WritePod(
-        scenes::Still({{"floor",
-                        plane,
-                        {(bounds.low.x + bounds.high.x) / 2, height, (bounds.low.z + bounds.high.z) / 2}}}));
+    const pod::Vec3 place = {(bounds.low.x + bounds.high.x) / 2, height, (bounds.low.z + bounds.high.z) / 2};
+    file_ = pod::WritePod(PlaneScene(kSpread * bounds.LongestEdge(), place));
     QexModel_Create(&model_);
     QexModel_LoadContentFromCache(&model_, file_.data(), static_cast<uint32_t>(file_.size()), nullptr);
     created_ = true;

@@ -2,11 +2,11 @@
 #pragma once
 
 #include <cstdint>
-#include <cstdio>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "common/CommandLine.h"
 #include "common/OutputFile.h"
 #include "Headless.h"
 #include "render/Command.h"
@@ -37,7 +37,7 @@ class Renderer {
     int DrawAll();
     bool Save(const std::string& path, const std::vector<uint8_t>& pixels) const;
 
-    // In RendererDrawing.cpp.
+    // In Drawing.cpp.
     void SetFrame(double frame);
     void Frame();
     float SceneSize() const;
@@ -54,11 +54,8 @@ class Renderer {
     std::vector<uint8_t> Pixels(bool text);
     bool UsesAutoCamera() const { return autoCamera_ || options_.autoCamera || options_.turn; }
 
-    void Warn(const std::string& text) const { fprintf(stderr, "qex render: warning: %s\n", text.c_str()); }
-    int Fail(const std::string& text, int status) const {
-        fprintf(stderr, "qex render: %s\n", text.c_str());
-        return status;
-    }
+    void Warn(const std::string& text) const { Say("render", "warning: " + text); }
+    int Fail(const std::string& text, int status) const { return ::Fail("render", text, status); }
 
     const RenderOptions& options_;
     const InputFile input_;

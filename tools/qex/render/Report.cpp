@@ -1,3 +1,4 @@
+// A progress bar, and figures of the GL tap and the system.
 #include "render/Report.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// The table of the shader modules, and the default look.
 #include "render/Shading.h"
 
 namespace {
@@ -63,9 +64,9 @@ bool Shines(const QexLightSet& set) {
 
 }  // namespace
 
-std::string ShaderNames() {
-    std::string names;
-    for (const ShaderRow& row : kShaders) names += (names.empty() ? "" : ", ") + std::string(row.name);
+std::vector<std::string> ShaderNames() {
+    std::vector<std::string> names;
+    for (const ShaderRow& row : kShaders) names.emplace_back(row.name);
     return names;
 }
 
@@ -78,10 +79,6 @@ std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shad
         if (material >= 0 && !HasNormals(scene, i)) lit[static_cast<size_t>(material)] = false;
     }
     return lit;
-}
-
-bool IsShaderName(const std::string& name) {
-    return FindShader(name) != nullptr;
 }
 
 void SceneShaders::Use(QexModel* model, const std::string& name, const std::vector<bool>& lit) {

@@ -10,9 +10,8 @@
 // The clip-space z of a camera's near and far plane.
 constexpr float kNearDepth = 0, kFarDepth = 1;
 
-// The names of the shader modules, ", " between them.
-std::string ShaderNames();
-bool IsShaderName(const std::string& name);
+// The short names of the shader modules.
+std::vector<std::string> ShaderNames();
 
 // By material, whether the modules of that name multiply its colour with that of the texture. In the default
 // look, which has no name, those are lit whose meshes all have normals.

@@ -1,3 +1,4 @@
+// Cuts pictures into the squares of a cube map, and draws the scene in units that suit the water.
 #include "render/Sky.h"
 
 #include <algorithm>
@@ -5,8 +6,8 @@
 
 #include <GLES2/gl2.h>
 
+#include "Paint.h"
 #include "render/Textures.h"
-#include "Scenes.h"
 
 namespace {
 
@@ -108,7 +109,7 @@ bool Sky::LoadTexture(const std::vector<std::string>& files, std::string* proble
         return squares[index].At(l.rightSign * look[l.right], l.upSign * look[l.up]);
     };
     const std::vector<uint8_t> file =
-        pod::WritePvr(scenes::SkyCube(static_cast<uint32_t>(std::min(squares[0].size, most)), paint));
+        pod::WritePvr(pod::SkyCube(static_cast<uint32_t>(std::min(squares[0].size, most)), paint));
     if (QexTexture_LoadPVRFromMemSized(&texture_, file.data(), static_cast<uint32_t>(file.size()), nullptr, 0,
                                        0, nullptr) != 0) {
         *problem = files[0] + ": the GL does not take a cube map of it";
@@ -122,7 +123,7 @@ bool Sky::LoadTexture(const std::vector<std::string>& files, std::string* proble
 bool Sky::Load(const std::vector<std::string>& files, const QexCamera& first, float sceneSize,
                std::optional<float> waterHeight, std::string* problem) {
     if (!LoadTexture(files, problem)) return false;
-    waves_ = NewPictureTexture({kWaves, kWaves, scenes::Waves(kWaves)}, "waves");
+    waves_ = NewPictureTexture({kWaves, kWaves, pod::Waves(kWaves)}, "waves");
     box_.scale = kSceneSize / sceneSize;
     box_.size = kFarDistance * first.farPlane * box_.scale;
     box_.skyTexture = &texture_;

@@ -1,3 +1,4 @@
+// The hooks through which the engine asks for a model's textures, and what they find.
 #include "render/Textures.h"
 
 #include <cstdio>
@@ -8,7 +9,6 @@
 
 #include "common/TextureFiles.h"
 #include "info/Exporter.h"
-#include "texture/Overrides.h"
 #include "texture/Write.h"
 
 namespace {
@@ -242,7 +242,7 @@ void SetTextureHook(QexModel* model, const std::string& directory, const std::st
                     const TextureChoices& choices) {
     g_problems.clear();
     g_lookup.directory = directory;
-    g_lookup.overrides = SplitOverrides(choices.overrides);
+    g_lookup.overrides = choices.overrides;
     g_lookup.vRunsDown =
         choices.flipped.value_or(ReadExporterText(scenePath).FlipsTextureV().value_or(false));
     model->loadTextureHook = LoadTextureHook;

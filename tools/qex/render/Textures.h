@@ -7,6 +7,7 @@
 
 #include "common/ImageFile.h"
 #include "Qex.h"
+#include "texture/Overrides.h"
 
 namespace CLI {
 class App;
@@ -14,8 +15,8 @@ class App;
 
 // What the command line says about textures.
 struct TextureChoices {
-    std::vector<std::string> overrides;  // MATERIAL=FILE, see TextureOverrides.h
-    std::optional<bool> flipped;         // V runs down the pictures; as the scene's export options say
+    TextureOverrides overrides;
+    std::optional<bool> flipped;  // V runs down the pictures; as the scene's export options say
 };
 
 void SetUpTextureChoices(CLI::App* app, TextureChoices* choices);

@@ -12,34 +12,21 @@ namespace {
 constexpr size_t kMostListed = 20;
 
 // Names of materials may hold '='; the names of files seldom do.
-size_t SplitPoint(const std::string& text) {
-    return text.rfind('=');
-}
-
-// What is wrong with a text, or nothing.
-std::string Check(const std::string& text) {
-    const size_t at = SplitPoint(text);
+std::string Parse(const std::string& text, TextureOverrides* overrides) {
+    const size_t at = text.rfind('=');
     if (at == std::string::npos || at + 1 == text.size())
         return "'" + text + "' is no texture; expected MATERIAL=FILE";
     const std::string file = text.substr(at + 1);
+    overrides->emplace_back(text.substr(0, at), file);
     return IsRegularFile(file) ? "" : file + ": no such file";
 }
 
 }  // namespace
 
-void AddTextureOption(CLI::App* app, std::vector<std::string>* texts) {
-    AddTexts(app, "--texture", texts,
-             "MATERIAL=FILE, a texture for a material, in place of its own; repeatable")
-        ->check(Check);
-}
-
-TextureOverrides SplitOverrides(const std::vector<std::string>& texts) {
-    TextureOverrides overrides;
-    for (const std::string& text : texts) {
-        const size_t at = SplitPoint(text);
-        overrides.emplace_back(text.substr(0, at), text.substr(at + 1));
-    }
-    return overrides;
+void AddTextureOption(CLI::App* app, TextureOverrides* overrides) {
+    AddParsed(
+        app, "--texture", "MATERIAL=FILE, a texture for a material, in place of its own; repeatable",
+        [=](const std::string& text) { return Parse(text, overrides); }, kMostRepeats);
 }
 
 std::string OverrideOf(const TextureOverrides& overrides, const std::string& material) {

@@ -12,9 +12,7 @@ class App;
 using TextureOverrides = std::vector<std::pair<std::string, std::string>>;  // material and file
 
 // Adds --texture, which may be given several times. The files have to be there.
-void AddTextureOption(CLI::App* app, std::vector<std::string>* texts);
-
-TextureOverrides SplitOverrides(const std::vector<std::string>& texts);
+void AddTextureOption(CLI::App* app, TextureOverrides* overrides);
 
 // The file for a material, the last one given; empty when there is none.
 std::string OverrideOf(const TextureOverrides& overrides, const std::string& material);
