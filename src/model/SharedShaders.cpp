@@ -1,3 +1,4 @@
+// The shader modules that all models share, made when the first model needs them.
 #include <cstring>
 
 #include "gl/GL.h"
