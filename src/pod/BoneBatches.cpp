@@ -188,7 +188,7 @@ int32_t QexBoneBatches_Create(QexBoneBatches* batches, uint32_t* outVertexCount,
                                     indexType,
                                     static_cast<int32_t>(bonesPerVertex)};
     const QexMadeBatches made = QexBoneBatches_Make(batches, outVertexCount, outVertices, indices, layout,
-                                                    triangleCount, maxBones, false);
+                                                    triangleCount, maxBones, QexBoneJoin::None);
     if (made == QexMadeBatches::OutOfMemory) QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
     return made == QexMadeBatches::Made ? 0 : -1;
 }

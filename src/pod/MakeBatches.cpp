@@ -49,13 +49,45 @@ uint64_t Signature(const CBatch* batch) {
 struct BatchList {
     CBatch batches[kMaxBatches];
     uint64_t signatures[kMaxBatches];
+    uint32_t numbers[kMaxBatches];  // of the batches before they were joined
     uint32_t count;
+    // The triangles of which unjoined batches come out one after the other, and the batch that each went
+    // into.
+    uint32_t runs[kMaxBatches];
+    uint32_t joinedInto[kMaxBatches];
+    uint32_t runCount;
 
     bool Contains(uint32_t i, const CBatch* set, uint64_t signature) const {
         return !(signature & ~signatures[i]) && CBatch_Contains(&batches[i], set);
     }
     bool IsWithin(uint32_t i, const CBatch* set, uint64_t signature) const {
         return !(signatures[i] & ~signature) && CBatch_Contains(set, &batches[i]);
+    }
+    void NumberAll() {
+        runCount = count;
+        for (uint32_t i = 0; i < count; ++i) numbers[i] = runs[i] = joinedInto[i] = i;
+    }
+    void AddRun(uint32_t i, uint32_t into) {
+        runs[runCount++] = numbers[i];
+        joinedInto[numbers[i]] = into;
+    }
+    // Puts a batch further to the front, before those that were there.
+    void Move(uint32_t from, uint32_t to) {
+        Rotate(batches, from, to);
+        Rotate(signatures, from, to);
+        Rotate(numbers, from, to);
+    }
+    void Remove(uint32_t i) {
+        CBatch_Destructor(&batches[i]);
+        for (--count; i < count; ++i) Move(i + 1, i);
+    }
+
+  private:
+    template <class T>
+    static void Rotate(T* array, uint32_t from, uint32_t to) {
+        const T moved = array[from];
+        memmove(array + to + 1, array + to, (from - to) * sizeof(T));
+        array[to] = moved;
     }
 };
 
@@ -97,31 +129,49 @@ struct Work {
     uint32_t copyCount = 0;
 };
 
-// Joins batches that fit into one, those that share most bones first.
+uint32_t Largest(const BatchList& list, uint32_t first) {
+    uint32_t largest = first;
+    for (uint32_t k = first + 1; k < list.count; ++k)
+        if (list.batches[k].count > list.batches[largest].count) largest = k;
+    return largest;
+}
+
+// The batch behind the one of index i that costs it the fewest new bones; the count when none fits.
+uint32_t BestToMerge(const BatchList& list, uint32_t i) {
+    uint32_t best = list.count;
+    int32_t fewest = INT32_MAX;
+    for (uint32_t k = i + 1; k < list.count; ++k) {
+        const int32_t missing = CBatch_TestMerge(&list.batches[i], &list.batches[k]);
+        if (missing < 0 || missing >= fewest) continue;
+        fewest = missing;
+        best = k;
+    }
+    return best;
+}
+
+// Joins batches: from the one with most bones on, each takes in what costs it the fewest new bones for as
+// long as anything fits.
 void JoinBatches(BatchList* list) {
+    list->runCount = 0;
     for (uint32_t i = 0; i < list->count; ++i) {
+        list->Move(Largest(*list, i), i);
+        list->AddRun(i, i);
         for (;;) {
-            uint32_t best = list->count;
-            int32_t fewest = INT32_MAX;
-            for (uint32_t k = i + 1; k < list->count; ++k) {
-                const int32_t missing = CBatch_TestMerge(&list->batches[i], &list->batches[k]);
-                if (missing < 0 || missing >= fewest) continue;
-                fewest = missing;
-                best = k;
-            }
+            const uint32_t best = BestToMerge(*list, i);
             if (best == list->count) break;
             CBatch_Merge(&list->batches[i], &list->batches[best]);
             list->signatures[i] |= list->signatures[best];
-            CBatch_Destructor(&list->batches[best]);
-            --list->count;
-            list->batches[best] = list->batches[list->count];
-            list->signatures[best] = list->signatures[list->count];
+            list->AddRun(best, i);
+            list->Remove(best);
         }
     }
 }
 
 bool AppendBatch(BatchList* list, int32_t maxBones, bool join) {
-    if (list->count == kMaxBatches && join) JoinBatches(list);
+    if (list->count == kMaxBatches && join) {
+        list->NumberAll();
+        JoinBatches(list);
+    }
     if (list->count == kMaxBatches) return false;
     CBatch* batch = &list->batches[list->count++];
     CBatch_Constructor(batch);
@@ -150,7 +200,7 @@ bool ListBatches(Work& work, const QexBoneVertices& layout, const uint32_t* indi
         CBatch_Assign(&list.batches[i], &work.set);
         list.signatures[i] = signature;
     }
-    if (join) JoinBatches(&list);
+    list.NumberAll();
     return true;
 }
 
@@ -163,6 +213,19 @@ void AssignTriangles(Work& work, const QexBoneVertices& layout, const uint32_t* 
         while (!list.Contains(i, &work.set, signature)) ++i;
         work.batchOf[t] = i;
     }
+}
+
+// Joins the batches that triangles were assigned to; the others go.
+void JoinAssigned(Work& work, uint32_t triangles, bool inOrder) {
+    BatchList& list = work.list[0];
+    bool used[kMaxBatches] = {};
+    for (uint32_t t = 0; t < triangles; ++t) used[work.batchOf[t]] = true;
+    for (uint32_t i = list.count; i-- > 0;)
+        if (!used[i]) list.Remove(i);
+    JoinBatches(&list);
+    if (!inOrder) return;
+    for (uint32_t t = 0; t < triangles; ++t) work.batchOf[t] = list.joinedInto[work.batchOf[t]];
+    list.NumberAll();
 }
 
 // The output vertex that is `vertex` with its bones counted within the batch.
@@ -193,15 +256,19 @@ bool AllocTables(QexBoneBatches* out, uint32_t batches, int32_t maxBones) {
 // Writes the batches and, grouped by them, the new triangles.
 void EmitBatches(Work& work, QexBoneBatches* out, const QexBoneVertices& layout, const uint32_t* indices,
                  uint32_t triangles) {
+    const BatchList& list = work.list[0];
     uint32_t emitted = 0;
-    for (uint32_t b = 0; b < work.list[0].count; ++b) {
-        const CBatch* batch = &work.list[0].batches[b];
-        CBatch_Write(batch, out->boneTable + uint64_t{b} * static_cast<uint32_t>(out->maxBones),
-                     &out->bonesPerBatch[b]);
-        out->offsets[b] = static_cast<int32_t>(emitted / 3);
-        ++out->batchCount;
+    for (uint32_t r = 0; r < list.runCount; ++r) {
+        const uint32_t run = list.runs[r], b = list.joinedInto[run];
+        const CBatch* batch = &list.batches[b];
+        if (b == static_cast<uint32_t>(out->batchCount)) {
+            CBatch_Write(batch, out->boneTable + uint64_t{b} * static_cast<uint32_t>(out->maxBones),
+                         &out->bonesPerBatch[b]);
+            out->offsets[b] = static_cast<int32_t>(emitted / 3);
+            ++out->batchCount;
+        }
         for (uint32_t t = 0; t < triangles; ++t)
-            for (uint32_t corner = 0; corner < 3 && work.batchOf[t] == b; ++corner)
+            for (uint32_t corner = 0; corner < 3 && work.batchOf[t] == run; ++corner)
                 work.indices[emitted++] = OutputVertex(work, layout, indices[3 * t + corner], batch);
     }
 }
@@ -237,13 +304,16 @@ bool IsReadable(const QexBoneVertices& layout, const uint32_t* indices, uint32_t
 
 QexMadeBatches QexBoneBatches_Make(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
                                    uint32_t* indices, const QexBoneVertices& layout, uint32_t triangleCount,
-                                   int32_t maxBones, bool join) {
+                                   int32_t maxBones, QexBoneJoin join) {
     memset(batches, 0, sizeof *batches);
     if (!IsReadable(layout, indices, triangleCount)) return QexMadeBatches::Impossible;
     Work work;
     if (!work.Alloc(layout.count, triangleCount, maxBones)) return QexMadeBatches::OutOfMemory;
-    if (!ListBatches(work, layout, indices, triangleCount, maxBones, join)) return QexMadeBatches::Impossible;
+    const bool joined = join != QexBoneJoin::None;
+    if (!ListBatches(work, layout, indices, triangleCount, maxBones, joined))
+        return QexMadeBatches::Impossible;
     AssignTriangles(work, layout, indices, triangleCount);
+    if (joined) JoinAssigned(work, triangleCount, join == QexBoneJoin::InOrder);
     const bool allocated = AllocTables(batches, work.list[0].count, maxBones);
     if (allocated) EmitBatches(work, batches, layout, indices, triangleCount);
     uint8_t* block = allocated ? WriteVertices(work, layout) : nullptr;

@@ -21,7 +21,13 @@ enum class QexMadeBatches {
     OutOfMemory
 };
 
-// QexBoneBatches_Create; where `join` is set, batches that fit into one become one, as each costs a draw.
+// Whether batches that fit into one become one, as each costs a draw, and those without triangles go.
+enum class QexBoneJoin {
+    None,     // as QexBoneBatches_Create does it
+    InOrder,  // within a batch the triangles keep their order
+    Grouped   // within a batch those that follow the same bones come together
+};
+
 QexMadeBatches QexBoneBatches_Make(QexBoneBatches* batches, uint32_t* outVertexCount, void** outVertices,
                                    uint32_t* indices, const QexBoneVertices& vertices, uint32_t triangleCount,
-                                   int32_t maxBones, bool join);
+                                   int32_t maxBones, QexBoneJoin join);

@@ -143,8 +143,9 @@ const char* QexPODMesh_MakeBatches(QexPODMesh* mesh, int32_t maxBones) {
                                     offsetof(SkinVertex, bones),
                                     QEX_POD_FLOAT,
                                     static_cast<int32_t>(QexPODData_Components(mesh->boneIndices))};
-    const QexMadeBatches result = QexBoneBatches_Make(&batches, &count, &made, triangles.corners.Get(),
-                                                      layout, triangles.count, maxBones, true);
+    const QexMadeBatches result =
+        QexBoneBatches_Make(&batches, &count, &made, triangles.corners.Get(), layout, triangles.count,
+                            maxBones, QexBoneJoin::InOrder);
     if (result == QexMadeBatches::OutOfMemory) return kOutOfMemory;
     if (result != QexMadeBatches::Made)
         return "a triangle follows too many bones, or there would be more than 512 batches";
