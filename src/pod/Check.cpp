@@ -18,12 +18,13 @@ struct Check {
 
 bool Fail(const Check& at, const char* format, ...) QEX_PRINTF(2, 3);
 bool Fail(const Check& at, const char* format, ...) {
-    char text[192];
+    char* text = at.fault->text;
+    const size_t used =
+        static_cast<size_t>(snprintf(text, sizeof at.fault->text, "%s %u: ", at.kind, at.index));
     va_list arguments;
     va_start(arguments, format);
-    vsnprintf(text, sizeof text, format, arguments);
+    vsnprintf(text + used, sizeof at.fault->text - used, format, arguments);
     va_end(arguments);
-    snprintf(at.fault->text, sizeof at.fault->text, "%s %u: %s", at.kind, at.index, text);
     return false;
 }
 

@@ -3,6 +3,7 @@
 #include "pod/MakeBatches.h"
 
 #include <cstring>
+#include <utility>
 
 #include "base/Memory.h"
 #include "pod/Types.h"
@@ -82,6 +83,22 @@ struct BatchList {
         for (--count; i < count; ++i) Move(i + 1, i);
     }
 
+    void Release() {
+        for (uint32_t i = 0; i < count; ++i) CBatch_Destructor(&batches[i]);
+        count = 0;
+    }
+    // False, and nothing to release, when memory runs out.
+    bool Copy(const BatchList& from) {
+        *this = from;
+        for (count = 0; count < from.count; ++count) {
+            CBatch_CopyConstructor(&batches[count], &from.batches[count]);
+            if (batches[count].bones) continue;
+            Release();
+            return false;
+        }
+        return true;
+    }
+
   private:
     template <class T>
     static void Rotate(T* array, uint32_t from, uint32_t to) {
@@ -102,7 +119,7 @@ struct Copy {
 struct Work {
     Work() { CBatch_Constructor(&set); }
     ~Work() {
-        for (uint32_t i = 0; list && i < list[0].count; ++i) CBatch_Destructor(&list[0].batches[i]);
+        if (list) list[0].Release();
         CBatch_Destructor(&set);
     }
     Work(const Work&) = delete;
@@ -136,13 +153,14 @@ uint32_t Largest(const BatchList& list, uint32_t first) {
     return largest;
 }
 
-// The batch behind the one of index i that costs it the fewest new bones; the count when none fits.
-uint32_t BestToMerge(const BatchList& list, uint32_t i) {
+// The batch behind the one of index i that costs it the fewest new bones, the first or last such; the count
+// when none fits.
+uint32_t BestToMerge(const BatchList& list, uint32_t i, bool last) {
     uint32_t best = list.count;
     int32_t fewest = INT32_MAX;
     for (uint32_t k = i + 1; k < list.count; ++k) {
         const int32_t missing = CBatch_TestMerge(&list.batches[i], &list.batches[k]);
-        if (missing < 0 || missing >= fewest) continue;
+        if (missing < 0 || missing > fewest || (missing == fewest && !last)) continue;
         fewest = missing;
         best = k;
     }
@@ -151,13 +169,13 @@ uint32_t BestToMerge(const BatchList& list, uint32_t i) {
 
 // Joins batches: from the one with most bones on, each takes in what costs it the fewest new bones for as
 // long as anything fits.
-void JoinBatches(BatchList* list) {
+void JoinBatches(BatchList* list, bool last) {
     list->runCount = 0;
     for (uint32_t i = 0; i < list->count; ++i) {
         list->Move(Largest(*list, i), i);
         list->AddRun(i, i);
         for (;;) {
-            const uint32_t best = BestToMerge(*list, i);
+            const uint32_t best = BestToMerge(*list, i, last);
             if (best == list->count) break;
             CBatch_Merge(&list->batches[i], &list->batches[best]);
             list->signatures[i] |= list->signatures[best];
@@ -167,10 +185,21 @@ void JoinBatches(BatchList* list) {
     }
 }
 
+// Joins batches as well as two ways of choosing among equals can; one way where memory is short.
+void JoinBest(BatchList* list) {
+    QexScratch<BatchList> other(1);
+    const bool copied = other && other[0].Copy(*list);
+    JoinBatches(list, false);
+    if (!copied) return;
+    JoinBatches(other.Get(), true);
+    if (other[0].count < list->count) std::swap(*list, other[0]);
+    other[0].Release();
+}
+
 bool AppendBatch(BatchList* list, int32_t maxBones, bool join) {
     if (list->count == kMaxBatches && join) {
         list->NumberAll();
-        JoinBatches(list);
+        JoinBest(list);
     }
     if (list->count == kMaxBatches) return false;
     CBatch* batch = &list->batches[list->count++];
@@ -222,7 +251,7 @@ void JoinAssigned(Work& work, uint32_t triangles, bool inOrder) {
     for (uint32_t t = 0; t < triangles; ++t) used[work.batchOf[t]] = true;
     for (uint32_t i = list.count; i-- > 0;)
         if (!used[i]) list.Remove(i);
-    JoinBatches(&list);
+    JoinBest(&list);
     if (!inOrder) return;
     for (uint32_t t = 0; t < triangles; ++t) work.batchOf[t] = list.joinedInto[work.batchOf[t]];
     list.NumberAll();
