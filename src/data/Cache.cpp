@@ -1,3 +1,4 @@
+// Growable caches: entries of one size by index, and the same with names.
 #include <cstring>
 
 #include "Qex.h"

@@ -1,3 +1,4 @@
+// Reading little-endian words from the bytes of a file, never past their end.
 #include <cstring>
 
 #include "base/Diagnostics.h"
@@ -6,9 +7,7 @@ namespace {
 
 constexpr uint32_t kMaxWordMessages = 32;
 
-bool HostIsLittleEndian() {
-    return __BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__;
-}
+static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__, "the data of files is used as it lies in memory");
 
 uint32_t Remaining(const QexSourceStream* stream) {
     return stream->file ? QexResFile_GetSize(stream->file) - stream->position : 0;
@@ -22,10 +21,10 @@ bool NewFile(QexSourceStream* stream, const char* function) {
     return stream->file != nullptr;
 }
 
-// Reads all `count` words at once where memory holds them as the data does. False leaves the stream as it is.
+// Reads all `count` words at once. False, where there are fewer, leaves the stream as it is.
 template <class Word>
 bool ReadBlock(QexSourceStream* stream, Word* destination, uint32_t count) {
-    if (!HostIsLittleEndian() || count > Remaining(stream) / sizeof(Word)) return false;
+    if (count > Remaining(stream) / sizeof(Word)) return false;
     const uint32_t bytes = count * static_cast<uint32_t>(sizeof(Word));
     return QexSourceStream_Read(stream, reinterpret_cast<uint8_t*>(destination), bytes) != 0;
 }
@@ -65,20 +64,13 @@ int32_t QexSourceStream_Read(QexSourceStream* stream, uint8_t* destination, uint
 }
 
 int32_t QexSourceStream_Read16(QexSourceStream* stream, uint16_t* destination) {
-    uint8_t bytes[2];
-    if (!QexSourceStream_Read(stream, bytes, sizeof bytes)) {
-        QexError(QEX_TAG, "<QexSourceStream_ReadMarker> read WORD fail");
-        return 0;
-    }
-    *destination = static_cast<uint16_t>(bytes[0] | bytes[1] << 8);
-    return 1;
+    if (QexSourceStream_Read(stream, reinterpret_cast<uint8_t*>(destination), sizeof *destination)) return 1;
+    QexError(QEX_TAG, "<QexSourceStream_ReadMarker> read WORD fail");
+    return 0;
 }
 
 int32_t QexSourceStream_Read32(QexSourceStream* stream, uint32_t* destination) {
-    uint8_t bytes[4];
-    if (!QexSourceStream_Read(stream, bytes, sizeof bytes)) return 0;
-    *destination = bytes[0] | uint32_t{bytes[1]} << 8 | uint32_t{bytes[2]} << 16 | uint32_t{bytes[3]} << 24;
-    return 1;
+    return QexSourceStream_Read(stream, reinterpret_cast<uint8_t*>(destination), sizeof *destination);
 }
 
 int32_t QexSourceStream_ReadArray16(QexSourceStream* stream, uint16_t* destination, uint32_t count) {

@@ -5,6 +5,7 @@
 #include "base/Memory.h"
 #include "mesh/Mesh.h"
 #include "model/Model.h"
+#include "pod/Scene.h"
 
 #define QEX_MODULE "src/QexModel"
 
@@ -57,7 +58,7 @@ bool CopyElement(CPODData* element, const T* from, uint32_t count) {
 
 bool FillMesh(QexPODMesh* out, const QexMesh& mesh, bool tangents) {
     const uint32_t count = mesh.vertexCount;
-    QexMatrix_Identity(&out->unpackMatrix);
+    QexPODMesh_SetDefaults(out);
     out->vertexCount = count;
     out->faceCount = QexMesh_CornerCount(mesh) / 3;
     out->uvwChannelCount = mesh.uvs ? 1 : 0;
@@ -78,12 +79,7 @@ bool FillMesh(QexPODMesh* out, const QexMesh& mesh, bool tangents) {
 }
 
 void FillMaterial(QexPODMaterial* material) {
-    int32_t* const textures[] = {&material->diffuseTexture,        &material->ambientTexture,
-                                 &material->specularColourTexture, &material->specularLevelTexture,
-                                 &material->bumpTexture,           &material->emissiveTexture,
-                                 &material->glossinessTexture,     &material->opacityTexture,
-                                 &material->reflectionTexture,     &material->refractionTexture};
-    for (int32_t* texture : textures) *texture = -1;
+    QexPODMaterial_SetDefaults(material);
     material->opacity = 1;
     for (int i = 0; i < 3; ++i) {
         material->ambient[i] = kAmbient;
@@ -105,10 +101,7 @@ bool FillScene(QexPODModel* scene, const QexMesh& mesh, bool tangents) {
     QexPODNode* node = scene->nodes;
     node->name = CopyArray(name, sizeof name);
     node->parentIndex = -1;
-    node->speed = 1;
-    node->stateFlags = QEX_NODE_ANIMATION_ENABLED | QEX_NODE_RENDERING_ENABLED;
-    node->blendFlags = QEX_NODE_OPAQUE;
-    QexPODModel_ResetNodeTransform(node);
+    QexPODNode_SetDefaults(node);
     return scene->materials->name && node->name && FillMesh(scene->meshes, mesh, tangents) &&
            QexPODModel_InitImpl(scene) == 0;
 }

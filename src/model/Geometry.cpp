@@ -1,9 +1,11 @@
+// The geometry of a mesh as it goes to GL: its own interleaved block where that will do, laid out anew where
+// not.
 #include <cstring>
 
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "model/Model.h"
-#include "pod/Reader.h"
+#include "pod/Rebatch.h"
 #include "pod/Scene.h"
 
 #define QEX_MODULE "src/QexModel"
@@ -17,27 +19,22 @@ struct GLType {
 };
 
 GLType ToGLType(uint32_t podType) {
-    static const GLType types[] = {
-        {0, false},                  // none
-        {GL_FLOAT, false},           // float
-        {0, false},                  // int
-        {GL_UNSIGNED_SHORT, false},  // unsigned short
-        {0, false},                  // RGBA
-        {0, false},                  // ARGB
-        {0, false},                  // D3DCOLOR
-        {GL_UNSIGNED_BYTE, false},   // four bytes
-        {0, false},                  // three 10-bit fields
-        {GL_FIXED, false},           // 16.16
-        {GL_UNSIGNED_BYTE, false},   // unsigned byte
-        {GL_SHORT, false},           // short
-        {GL_SHORT, true},            // short, normalised
-        {GL_BYTE, false},            // byte
-        {GL_BYTE, true},             // byte, normalised
-        {GL_UNSIGNED_BYTE, true},    // unsigned byte, normalised
-        {GL_UNSIGNED_SHORT, true},   // unsigned short, normalised
-        {0, false},                  // unsigned int
+    static const GLenum types[] = {
+        0,                  // none
+        GL_FLOAT,           // float
+        0,                  // 32 bits
+        0,                  // 32 bits, unsigned
+        GL_SHORT,           // 16 bits
+        GL_UNSIGNED_SHORT,  // 16 bits, unsigned
+        GL_BYTE,            // 8 bits
+        GL_UNSIGNED_BYTE,   // 8 bits, unsigned
+        GL_FIXED,           // 16.16
+        0,                  // colour word
+        0,                  // three 10-bit fields
     };
-    return podType < sizeof types / sizeof types[0] ? types[podType] : types[0];
+    static_assert(sizeof types / sizeof *types == kPODStorages, "a GL type, or none, for every storage");
+    const QexPODType& type = QexPODType_Of(podType);
+    return {types[type.storage], type.plain != podType};
 }
 
 struct Element {
@@ -54,25 +51,18 @@ struct Elements {
 
 Elements ListElements(const QexPODMesh& mesh) {
     static const CPODData none = {};
-    const CPODData* const sources[QEX_ELEMENT_COUNT] = {&mesh.vertices,
-                                                        &mesh.normals,
-                                                        &mesh.tangents,
-                                                        &mesh.binormals,
-                                                        mesh.uvwChannelCount ? &mesh.uvws[0] : &none,
-                                                        &mesh.boneIndices,
-                                                        &mesh.boneWeights};
     Elements elements;
-    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
-        const CPODData* data = sources[i];
+    for (Element& element : elements.list) element = {&none, nullptr, false, 0};
+    const uint32_t count = QexPODMesh_ElementCount(&mesh);
+    for (uint32_t i = kPODVertices; i < count && i <= kPODUVWs; ++i) {
+        const CPODData& data = *QexPODMesh_Element(&mesh, i);
+        const int32_t attribute = kPODElements[i].attribute;
+        if (attribute < 0 || !data.componentCount) continue;
         // Positions are always floats: the mesh's box comes from them, and its unpack matrix goes into them.
-        const bool asFloats =
-            i == QEX_ELEMENT_POSITION ? data->type != QEX_POD_FLOAT : !ToGLType(data->type).type;
-        const uint32_t bytes = asFloats ? QexPODData_Components(*data) * 4
-                                        : QexPODData_ElementSize(data->type, data->componentCount);
-        if (data->componentCount)
-            elements.list[i] = {data, QexPODMesh_ElementData(&mesh, *data), asFloats, (bytes + 3) / 4 * 4};
-        else
-            elements.list[i] = {data, nullptr, false, 0};
+        const bool asFloats = i == kPODVertices ? data.type != QEX_POD_FLOAT : !ToGLType(data.type).type;
+        const uint32_t bytes = asFloats ? QexPODData_Components(data) * 4 : QexPODData_ElementSize(data);
+        elements.list[attribute] = {&data, QexPODMesh_ElementData(&mesh, data), asFloats,
+                                    (bytes + 3) / 4 * 4};
     }
     return elements;
 }
@@ -89,10 +79,10 @@ bool UploadsAsIs(const QexPODMesh& mesh, const Elements& elements) {
     for (const Element& element : elements.list) {
         const CPODData& data = *element.data;
         if (!data.componentCount) continue;
-        const uint32_t unit = QexPODData_ComponentSize(data.type);
+        const uint32_t unit = QexPODType_Of(data.type).componentSize;
         const uint64_t offset = reinterpret_cast<uintptr_t>(data.data);
         if (element.asFloats || data.stride != stride || offset % unit || stride % unit) return false;
-        if (offset + QexPODData_ElementSize(data.type, data.componentCount) > stride) return false;
+        if (offset + QexPODData_ElementSize(data) > stride) return false;
     }
     return true;
 }
@@ -111,9 +101,10 @@ QexVertexAttribute Describe(QexVertexElement element, const CPODData& data, bool
 // An element as floats; bytes are signed here, as GL takes them.
 void Decode(float* out, const uint8_t* source, const CPODData& data) {
     QexPODVertex_ReadVec(out, source, data.type, static_cast<int32_t>(data.componentCount));
-    if (data.type != QEX_POD_BYTE && data.type != QEX_POD_BYTE_NORM) return;
+    const QexPODType& type = QexPODType_Of(data.type);
+    if (type.storage != kPODInt8) return;
     for (uint32_t i = 0; i < data.componentCount; ++i)
-        if (source[i] > 127) out[i] -= data.type == QEX_POD_BYTE ? 256.0f : 256.0f / 127.0f;
+        if (source[i] > 127) out[i] -= 256.0f / type.divisor;
 }
 
 void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, bool position,
@@ -121,7 +112,7 @@ void PackElement(uint8_t* out, const QexPODMesh& mesh, const Element& element, b
     const CPODData& data = *element.data;
     const uint8_t* source = element.source + uint64_t{vertex} * data.stride;
     if (!element.asFloats && !position) {
-        memcpy(out, source, QexPODData_ElementSize(data.type, data.componentCount));
+        memcpy(out, source, QexPODData_ElementSize(data));
         return;
     }
     QexVec4 value;

@@ -1,3 +1,4 @@
+// Loading models: the scene, its geometry, textures and modules, and what unloading gives back.
 #include "model/Model.h"
 
 #include <cstdio>

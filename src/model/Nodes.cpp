@@ -1,3 +1,4 @@
+// The nodes of a model: names, transforms, frames, world positions, and their boxes on the screen.
 #include <cmath>
 
 #include "math/Pi.h"
@@ -147,53 +148,21 @@ void QexModel_SetNodeFaceToByName(QexModel* model, const char* name, const QexVe
 
 // ---- Animation and rendering ----
 
-int32_t QexModel_SetNodeAnimationFrame(QexModel* model, uint32_t nodeIndex, float frame) {
-    return QexPODModel_SetNodeAnimationFrame(&model->scene, nodeIndex, frame);
-}
-
-int32_t QexModel_SetNodeAnimationFrameByName(QexModel* model, const char* name, float frame) {
-    return QexPODModel_SetNodeAnimationFrameByName(&model->scene, name, frame);
-}
-
-int32_t QexModel_SetNodeAnimationFrameR(QexModel* model, uint32_t nodeIndex, float frame) {
-    return ApplyR(&model->scene, nodeIndex, frame, QexPODModel_SetNodeAnimationFrame);
-}
-
-int32_t QexModel_SetMeshNodeBoneAnimationFrame(QexModel* model, uint32_t nodeIndex, float frame) {
-    return QexPODModel_SetMeshNodeBoneAnimationFrame(&model->scene, nodeIndex, frame);
-}
-
-int32_t QexModel_SetMeshNodeBoneAnimationFrameByName(QexModel* model, const char* name, float frame) {
-    return QexPODModel_SetMeshNodeBoneAnimationFrameByName(&model->scene, name, frame);
-}
-
-int32_t QexModel_SetMeshNodeBoneAnimationFrameR(QexModel* model, uint32_t nodeIndex, float frame) {
-    return ApplyR(&model->scene, nodeIndex, frame, QexPODModel_SetMeshNodeBoneAnimationFrame);
-}
-
-uint32_t QexModel_EnableNodeRendering(QexModel* model, uint32_t nodeIndex, uint32_t enable) {
-    return QexPODModel_EnableNodeRendering(&model->scene, nodeIndex, enable);
-}
-
-uint32_t QexModel_EnableNodeRenderingByName(QexModel* model, const char* name, uint32_t enable) {
-    return QexPODModel_EnableNodeRenderingByName(&model->scene, name, enable);
-}
-
-uint32_t QexModel_EnableNodeRenderingR(QexModel* model, uint32_t nodeIndex, uint32_t enable) {
-    return ApplyR(&model->scene, nodeIndex, enable, QexPODModel_EnableNodeRendering);
-}
-
-uint32_t QexModel_EnableNodeAnimation(QexModel* model, uint32_t nodeIndex, uint32_t enable) {
-    return QexPODModel_EnableNodeAnimation(&model->scene, nodeIndex, enable);
-}
-
-uint32_t QexModel_EnableNodeAnimationByName(QexModel* model, const char* name, uint32_t enable) {
-    return QexPODModel_EnableNodeAnimationByName(&model->scene, name, enable);
-}
-
-uint32_t QexModel_EnableNodeAnimationR(QexModel* model, uint32_t nodeIndex, uint32_t enable) {
-    return ApplyR(&model->scene, nodeIndex, enable, QexPODModel_EnableNodeAnimation);
-}
+// An operation of the scene on a node by its index, by its name, and on a node with all below it.
+#define QEX_NODE_OPERATION(Result, Name, Value)                                      \
+    Result QexModel_##Name(QexModel* model, uint32_t nodeIndex, Value value) {       \
+        return QexPODModel_##Name(&model->scene, nodeIndex, value);                  \
+    }                                                                                \
+    Result QexModel_##Name##ByName(QexModel* model, const char* name, Value value) { \
+        return QexPODModel_##Name##ByName(&model->scene, name, value);               \
+    }                                                                                \
+    Result QexModel_##Name##R(QexModel* model, uint32_t nodeIndex, Value value) {    \
+        return ApplyR(&model->scene, nodeIndex, value, QexPODModel_##Name);          \
+    }
+QEX_NODE_OPERATION(int32_t, SetNodeAnimationFrame, float)
+QEX_NODE_OPERATION(int32_t, SetMeshNodeBoneAnimationFrame, float)
+QEX_NODE_OPERATION(uint32_t, EnableNodeRendering, uint32_t)
+QEX_NODE_OPERATION(uint32_t, EnableNodeAnimation, uint32_t)
 
 QexPODNode* QexModel_SetNodeAnimationSpeed(QexModel* model, const char* name, float speed) {
     QexPODNode* node = QexPODModel_FindNodeByName(&model->scene, name);

@@ -1,3 +1,5 @@
+// Drawing models: mesh nodes with their modules, in passes; blending, boxes, and what the scene says of light
+// and camera.
 #include <cstdlib>
 #include <cstring>
 

@@ -1,3 +1,4 @@
+// Scene nodes: a tree of what an application places and moves, down to the models that it draws.
 #include <cstddef>
 #include <cstring>
 

@@ -1,3 +1,4 @@
+// The textures that the materials of a model name.
 #include <cstdio>
 #include <cstring>
 

@@ -1,9 +1,18 @@
-// World matrices for the engine's own modules: the cached matrix itself instead of a copy.
+// Frames and world matrices for the engine's own modules: the cached matrix itself instead of a copy.
 //
 // The pointer is good until a frame or an override changes; drawing code uses it at once.
 #pragma once
 
 #include "Qex.h"
+
+inline uint32_t QexPODAnimation_LastFrame(const QexPODModel* scene) {
+    return scene->frameCount ? scene->frameCount - 1 : 0;
+}
+
+// The frame that a node is at.
+inline float QexPODAnimation_NodeFrame(const QexPODNode* node) {
+    return static_cast<float>(node->frame) + node->frameFraction;
+}
 
 const QexMatrix* QexPODAnimation_WorldMatrix(QexPODModel* scene, QexPODNode* node);
 

@@ -1,15 +1,16 @@
 // Gives a skinned mesh new bone batches: one that was read without any, or whose batches need more bones than
 // the shaders hold.
+#include "pod/Rebatch.h"
+
 #include <cstddef>
+#include <cstring>
 
 #include "base/Memory.h"
-#include "pod/BoneBatches.h"
-#include "pod/Reader.h"
+#include "pod/MakeBatches.h"
 #include "pod/Scene.h"
 
 namespace {
 
-constexpr uint32_t kMaxElements = 7 + kPODMaxUVChannels;
 constexpr uint32_t kMaxVertices = 65536;  // that 16-bit indices reach
 const char* const kOutOfMemory = "out of memory";
 
@@ -29,7 +30,7 @@ struct Triangles {
 
 // Elements other than faces and bone indices that a mesh has.
 struct ElementList {
-    CPODData* elements[kMaxElements];
+    CPODData* elements[kPODMaxElements];
     uint32_t count = 0;
 };
 
@@ -64,9 +65,8 @@ bool ReadTriangles(const QexPODMesh& mesh, Triangles* out) {
     for (uint32_t b = 0; b < batchCount; ++b) {
         const bool tables = batches.batchCount > 0;
         const int32_t* bones = tables ? batches.boneTable + int64_t{b} * batches.maxBones : nullptr;
-        const uint32_t first = tables ? static_cast<uint32_t>(batches.offsets[b]) : 0;
-        const uint32_t end = b + 1 < batchCount ? static_cast<uint32_t>(batches.offsets[b + 1]) : out->count;
-        for (uint64_t i = uint64_t{first} * 3; i < uint64_t{end} * 3; ++i) {
+        const QexPODFaceRun run = tables ? QexPODMesh_FacesOfBatch(mesh, b) : QexPODFaceRun{0, out->count};
+        for (uint64_t i = uint64_t{run.first} * 3; i < uint64_t{run.end} * 3; ++i) {
             Seen& at = seen[out->corners[i]];
             if (at.batch != b + 1) {
                 at = {b + 1, out->vertexCount};
@@ -79,18 +79,16 @@ bool ReadTriangles(const QexPODMesh& mesh, Triangles* out) {
 }
 
 ElementList ListElements(QexPODMesh* mesh) {
-    CPODData* const elements[] = {&mesh->vertices,  &mesh->normals, &mesh->tangents,
-                                  &mesh->binormals, &mesh->colours, &mesh->boneWeights};
     ElementList list;
-    for (CPODData* element : elements)
-        if (element->componentCount) list.elements[list.count++] = element;
-    for (uint32_t i = 0; i < mesh->uvwChannelCount; ++i)
-        if (mesh->uvws[i].componentCount) list.elements[list.count++] = &mesh->uvws[i];
+    for (uint32_t i = kPODVertices; i < QexPODMesh_ElementCount(mesh); ++i) {
+        CPODData* element = QexPODMesh_Element(mesh, i);
+        if (i != kPODBoneIndices && element->componentCount) list.elements[list.count++] = element;
+    }
     return list;
 }
 
 uint32_t AlignedSize(const CPODData& element) {
-    return (QexPODData_ElementSize(element.type, element.componentCount) + 3) / 4 * 4;
+    return (QexPODData_ElementSize(element) + 3) / 4 * 4;
 }
 
 // Lays the vertices out as one interleaved block, the bone indices as bytes at its front.
@@ -110,7 +108,7 @@ bool ReplaceVertices(QexPODMesh* mesh, const SkinVertex* vertices, uint32_t coun
     for (uint32_t e = 0; e < list.count; ++e) {
         CPODData* element = list.elements[e];
         const uint8_t* source = QexPODMesh_ElementData(mesh, *element);
-        const uint32_t size = QexPODData_ElementSize(element->type, element->componentCount);
+        const uint32_t size = QexPODData_ElementSize(*element);
         for (uint32_t v = 0; v < count; ++v)
             memcpy(block + uint64_t{v} * stride + offset,
                    source + uint64_t{vertices[v].source} * element->stride, size);
@@ -130,30 +128,6 @@ bool ReplaceVertices(QexPODMesh* mesh, const SkinVertex* vertices, uint32_t coun
 
 }  // namespace
 
-uint32_t QexPODMesh_CountTriangles(const QexPODMesh& mesh) {
-    return mesh.stripCount ? QexPODModel_CountIndices(&mesh) - 2 * mesh.stripCount : mesh.faceCount;
-}
-
-void QexPODMesh_ListCorners(const QexPODMesh& mesh, uint32_t* corners) {
-    uint32_t n = 0;
-    if (!mesh.stripCount)
-        for (; n < mesh.faceCount * 3; ++n) corners[n] = n;
-    uint32_t first = 0;
-    for (uint32_t strip = 0; strip < mesh.stripCount; ++strip) {
-        for (uint32_t i = first; i < first + mesh.stripLengths[strip]; ++i) {
-            // Every second triangle of a strip is turned over.
-            const uint32_t odd = (i - first) & 1;
-            corners[n++] = i + odd;
-            corners[n++] = i + 1 - odd;
-            corners[n++] = i + 2;
-        }
-        first += mesh.stripLengths[strip] + 2;
-    }
-    const uint32_t size = mesh.faces.type == QEX_POD_UNSIGNED_INT ? 4 : 2;
-    for (uint32_t i = 0; mesh.faces.data && i < n; ++i)
-        QexPODVertex_ReadInt(&corners[i], mesh.faces.data + uint64_t{corners[i]} * size, mesh.faces.type);
-}
-
 const char* QexPODMesh_MakeBatches(QexPODMesh* mesh, int32_t maxBones) {
     Triangles triangles;
     if (!QexPODMesh_CountTriangles(*mesh)) return "it has no faces";
@@ -169,8 +143,11 @@ const char* QexPODMesh_MakeBatches(QexPODMesh* mesh, int32_t maxBones) {
                                     offsetof(SkinVertex, bones),
                                     QEX_POD_FLOAT,
                                     static_cast<int32_t>(QexPODData_Components(mesh->boneIndices))};
-    if (QexBoneBatches_Make(&batches, &count, &made, triangles.corners.Get(), layout, triangles.count,
-                            maxBones, true) != 0)
+    const QexMadeBatches result =
+        QexBoneBatches_Make(&batches, &count, &made, triangles.corners.Get(), layout, triangles.count,
+                            maxBones, QexBoneJoin::InOrder);
+    if (result == QexMadeBatches::OutOfMemory) return kOutOfMemory;
+    if (result != QexMadeBatches::Made)
         return "a triangle follows too many bones, or there would be more than 512 batches";
     SkinVertex* vertices = static_cast<SkinVertex*>(made);
     const uint64_t corners = uint64_t{triangles.count} * 3;

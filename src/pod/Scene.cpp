@@ -1,102 +1,27 @@
+// The records of a scene: what they begin with, what releasing them frees, the runtime part, and what
+// triangles and bones say.
 #include "pod/Scene.h"
 
 #include <cstring>
 
-#include "base/Memory.h"
-
 namespace {
 
-// ---- Vertex elements ----
-
-template <class T>
-T Load(const void* source, int32_t i) {
-    T value;
-    memcpy(&value, static_cast<const uint8_t*>(source) + static_cast<size_t>(i) * sizeof(T), sizeof(T));
-    return value;
-}
-
-template <class T>
-void Store(void* destination, int32_t i, T value) {
-    memcpy(static_cast<uint8_t*>(destination) + static_cast<size_t>(i) * sizeof(T), &value, sizeof(T));
-}
-
-template <class T>
-void ReadComponents(float* out, const void* source, int32_t count, float divisor) {
-    for (int32_t i = 0; i < count; ++i) out[i] = static_cast<float>(Load<T>(source, i)) / divisor;
-}
-
-// Truncates toward zero; what does not fit becomes the nearest value that does, NaN becomes 0. The product is
-// rounded to a float first: k / divisor * divisor is k again then, and truncation does not make it k - 1.
-template <class T>
-void WriteComponents(void* destination, int32_t count, const float* values, float factor, double low,
-                     double high) {
-    for (int32_t i = 0; i < count; ++i) {
-        const float product = values[i] * factor;
-        double value = static_cast<double>(product);
-        if (!(value == value)) value = 0;
-        value = value < low ? low : value > high ? high : value;
-        Store(destination, i, static_cast<T>(static_cast<int64_t>(value)));
-    }
-}
-
-// Shifts of the four values of a colour word.
-const uint8_t kRGBAShifts[4] = {24, 16, 8, 0};
-const uint8_t kARGBShifts[4] = {16, 8, 0, 24};
-
-const uint8_t* ColourShifts(uint32_t type) {
-    return type == QEX_POD_RGBA ? kRGBAShifts : kARGBShifts;
-}
-
-void WriteColour(void* destination, const uint8_t* shifts, const float* values) {
-    uint32_t word = 0;
-    for (int i = 0; i < 4; ++i) {
-        const float clamped = values[i] > 0 ? values[i] < 1 ? values[i] : 1.0f : 0.0f;
-        word |= static_cast<uint32_t>(clamped * 255.0f) << shifts[i];
-    }
-    Store(destination, 0, word);
-}
-
-void WriteDec3N(void* destination, const float* values) {
-    uint32_t word = 0;
-    for (int i = 0; i < 3; ++i) {
-        float value = values[i] * 511.0f;
-        value = value > -512.0f ? value < 511.0f ? value : 511.0f : -512.0f;
-        word |= (static_cast<uint32_t>(static_cast<int32_t>(value)) & 0x3FFu) << (10 * i);
-    }
-    Store(destination, 0, word);
-}
-
-// ---- Release ----
-
 void ReleaseMesh(QexPODMesh* mesh) {
-    CPODData_Reset(&mesh->faces);
-    CPODData* const elements[] = {&mesh->vertices, &mesh->normals,     &mesh->tangents,   &mesh->binormals,
-                                  &mesh->colours,  &mesh->boneIndices, &mesh->boneWeights};
-    if (!mesh->interleaved) {
-        for (CPODData* element : elements) CPODData_Reset(element);
-        for (uint32_t i = 0; i < mesh->uvwChannelCount; ++i) CPODData_Reset(&mesh->uvws[i]);
-    }
+    // In an interleaved mesh only the faces have data of their own.
+    const uint32_t own = mesh->interleaved ? kPODFaces + 1 : QexPODMesh_ElementCount(mesh);
+    for (uint32_t i = 0; i < own; ++i) CPODData_Reset(QexPODMesh_Element(mesh, i));
     QexMemory_FreeArray(mesh->uvws);
     QexMemory_FreeArray(mesh->stripLengths);
     QexMemory_FreeArray(mesh->interleaved);
     QexBoneBatches_Release(&mesh->boneBatches);
 }
 
-void FreeKeys(float*& keys, uint32_t ownership, uint32_t sharedBit) {
-    if (!(ownership & sharedBit)) QexMemory_Free(keys);
-    keys = nullptr;
-}
-
 void ReleaseNode(QexPODNode* node) {
     QexMemory_FreeArray(node->name);
-    QexMemory_FreeArray(node->positionIndex);
-    QexMemory_FreeArray(node->rotationIndex);
-    QexMemory_FreeArray(node->scaleIndex);
-    QexMemory_FreeArray(node->matrixIndex);
-    FreeKeys(node->position, node->ownershipFlags, QEX_NODE_SHARED_POSITION);
-    FreeKeys(node->rotation, 0, 0);
-    FreeKeys(node->scale, node->ownershipFlags, QEX_NODE_SHARED_SCALE);
-    FreeKeys(node->matrix, node->ownershipFlags, QEX_NODE_SHARED_MATRIX);
+    for (const QexPODChannel& channel : kPODChannelTable) {
+        QexMemory_FreeArray(node->*channel.index);
+        QexPODNode_FreeKeys(node, channel);
+    }
 }
 
 void ReleaseImpl(QexPODModel* scene) {
@@ -105,17 +30,68 @@ void ReleaseImpl(QexPODModel* scene) {
     QexMemory_FreeArray(scene->runtime);
 }
 
-void SetBox(QexBoundingBox* box, const QexVec3& low, const QexVec3& high) {
-    for (int i = 0; i < 8; ++i) {
-        box->corners[i].x = i & 4 ? high.x : low.x;
-        box->corners[i].y = i & 2 ? high.y : low.y;
-        box->corners[i].z = i & 1 ? high.z : low.z;
-    }
-    box->centre = {(low.x + high.x) / 2, (low.y + high.y) / 2, (low.z + high.z) / 2};
-    QexVec3_Subtract(&box->halfExtent, &high, &box->centre);
+}  // namespace
+
+void QexPODMaterial_SetDefaults(QexPODMaterial* material) {
+    for (int32_t* index = &material->diffuseTexture; index <= &material->refractionTexture; ++index)
+        *index = -1;
+    material->blendSrcColour = material->blendSrcAlpha = 1;     // GL_ONE
+    material->blendDstColour = material->blendDstAlpha = 0;     // GL_ZERO
+    material->blendOpColour = material->blendOpAlpha = 0x8006;  // GL_FUNC_ADD
 }
 
-}  // namespace
+void QexPODMesh_SetDefaults(QexPODMesh* mesh) {
+    QexMatrix_Identity(&mesh->unpackMatrix);
+}
+
+void QexPODNode_SetDefaults(QexPODNode* node) {
+    node->speed = 1;
+    node->stateFlags = QEX_NODE_ANIMATION_ENABLED | QEX_NODE_RENDERING_ENABLED;
+    node->blendFlags = QEX_NODE_OPAQUE;
+    QexPODModel_ResetNodeTransform(node);
+}
+
+void QexPODNode_FreeKeys(QexPODNode* node, const QexPODChannel& channel) {
+    if (!(node->ownershipFlags & channel.shared)) QexMemory_Free(node->*channel.keys);
+    node->ownershipFlags &= ~channel.shared;
+    node->*channel.keys = nullptr;
+}
+
+uint32_t QexPODMesh_CountTriangles(const QexPODMesh& mesh) {
+    return mesh.stripCount ? QexPODModel_CountIndices(&mesh) - 2 * mesh.stripCount : mesh.faceCount;
+}
+
+void QexPODMesh_ListCorners(const QexPODMesh& mesh, uint32_t* corners) {
+    uint32_t n = 0;
+    if (!mesh.stripCount)
+        for (; n < mesh.faceCount * 3; ++n) corners[n] = n;
+    uint32_t first = 0;
+    for (uint32_t strip = 0; strip < mesh.stripCount; ++strip) {
+        for (uint32_t i = first; i < first + mesh.stripLengths[strip]; ++i) {
+            // Every second triangle of a strip is turned over.
+            const uint32_t odd = (i - first) & 1;
+            corners[n++] = i + odd;
+            corners[n++] = i + 1 - odd;
+            corners[n++] = i + 2;
+        }
+        first += mesh.stripLengths[strip] + 2;
+    }
+    const uint32_t size = QexPODData_ElementSize(mesh.faces.type, 1);
+    for (uint32_t i = 0; mesh.faces.data && i < n; ++i)
+        QexPODVertex_ReadInt(&corners[i], mesh.faces.data + uint64_t{corners[i]} * size, mesh.faces.type);
+}
+
+void QexPODMesh_ReadInfluences(const QexPODMesh* mesh, uint32_t vertex, float bones[4], float weights[4]) {
+    const CPODData& index = mesh->boneIndices;
+    const CPODData& weight = mesh->boneWeights;
+    const int32_t n = static_cast<int32_t>(QexPODData_Components(index));
+    // Bone indices count even where the file calls them normalised: the shaders get them as they are.
+    QexPODVertex_ReadVec(bones, QexPODMesh_ElementData(mesh, index) + uint64_t{vertex} * index.stride,
+                         QexPODType_Of(index.type).plain, n);
+    QexPODVertex_ReadVec(weights, QexPODMesh_ElementData(mesh, weight) + uint64_t{vertex} * weight.stride,
+                         weight.type, n);
+    for (int32_t i = n; i < 4; ++i) bones[i] = weights[i] = 0;
+}
 
 extern "C" {
 
@@ -189,103 +165,6 @@ uint32_t QexPODModel_CountIndices(const QexPODMesh* mesh) {
 void QexPODModel_SetPassID(QexPODModel* scene, QexPODMesh* mesh, uint32_t passID) {
     mesh->passID = passID;
     if (passID > scene->highestPass) scene->highestPass = passID;
-}
-
-void QexPODVertex_ReadVec(float* out, const void* source, uint32_t type, int32_t count) {
-    out[0] = out[1] = out[2] = 0;
-    out[3] = 1;
-    if (count > 4) count = 4;
-    switch (type) {
-        case QEX_POD_FLOAT: ReadComponents<float>(out, source, count, 1); break;
-        case QEX_POD_INT: ReadComponents<int32_t>(out, source, count, 1); break;
-        case QEX_POD_UNSIGNED_SHORT: ReadComponents<uint16_t>(out, source, count, 1); break;
-        case QEX_POD_RGBA:
-        case QEX_POD_ARGB:
-        case QEX_POD_D3DCOLOR: {
-            const uint32_t word = Load<uint32_t>(source, 0);
-            for (int i = 0; i < 4; ++i)
-                out[i] = static_cast<float>(word >> ColourShifts(type)[i] & 0xFF) / 255.0f;
-            break;
-        }
-        case QEX_POD_UBYTE4: ReadComponents<uint8_t>(out, source, 4, 1); break;
-        case QEX_POD_DEC3N: {
-            const uint32_t word = Load<uint32_t>(source, 0);
-            for (int i = 0; i < 3; ++i) {
-                const int32_t field = static_cast<int32_t>(word << (22 - 10 * i)) >> 22;
-                out[i] = static_cast<float>(field) / 511.0f;
-            }
-            break;
-        }
-        case QEX_POD_FIXED16_16: ReadComponents<int32_t>(out, source, count, 65536); break;
-        case QEX_POD_UNSIGNED_BYTE: ReadComponents<uint8_t>(out, source, count, 1); break;
-        case QEX_POD_SHORT: ReadComponents<int16_t>(out, source, count, 1); break;
-        case QEX_POD_SHORT_NORM: ReadComponents<int16_t>(out, source, count, 32767); break;
-        case QEX_POD_BYTE: ReadComponents<uint8_t>(out, source, count, 1); break;
-        case QEX_POD_BYTE_NORM: ReadComponents<uint8_t>(out, source, count, 127); break;
-        case QEX_POD_UNSIGNED_BYTE_NORM: ReadComponents<uint8_t>(out, source, count, 255); break;
-        case QEX_POD_UNSIGNED_SHORT_NORM: ReadComponents<uint16_t>(out, source, count, 65535); break;
-        case QEX_POD_UNSIGNED_INT: ReadComponents<uint32_t>(out, source, count, 1); break;
-        default: break;
-    }
-}
-
-void QexPODVertex_ReadInt(uint32_t* out, const void* source, uint32_t type) {
-    if (type == QEX_POD_UNSIGNED_SHORT) *out = Load<uint16_t>(source, 0);
-    if (type == QEX_POD_UNSIGNED_INT) *out = Load<uint32_t>(source, 0);
-}
-
-void QexVertexWriteVec(void* destination, uint32_t type, int32_t count, const float* values) {
-    if (count > 4) count = 4;
-    switch (type) {
-        case QEX_POD_FLOAT:
-            for (int32_t i = 0; i < count; ++i) Store(destination, i, values[i]);
-            break;
-        case QEX_POD_INT:
-            WriteComponents<int32_t>(destination, count, values, 1, INT32_MIN, INT32_MAX);
-            break;
-        case QEX_POD_UNSIGNED_SHORT:
-            WriteComponents<uint16_t>(destination, count, values, 1, 0, 65535);
-            break;
-        case QEX_POD_RGBA:
-        case QEX_POD_ARGB:
-        case QEX_POD_D3DCOLOR: WriteColour(destination, ColourShifts(type), values); break;
-        case QEX_POD_UBYTE4: WriteComponents<uint8_t>(destination, 4, values, 1, 0, 255); break;
-        case QEX_POD_DEC3N: WriteDec3N(destination, values); break;
-        case QEX_POD_FIXED16_16:
-            WriteComponents<int32_t>(destination, count, values, 65536, INT32_MIN, INT32_MAX);
-            break;
-        case QEX_POD_UNSIGNED_BYTE:
-        case QEX_POD_BYTE: WriteComponents<uint8_t>(destination, count, values, 1, 0, 255); break;
-        case QEX_POD_SHORT: WriteComponents<int16_t>(destination, count, values, 1, -32768, 32767); break;
-        case QEX_POD_SHORT_NORM:
-            WriteComponents<int16_t>(destination, count, values, 32767, -32768, 32767);
-            break;
-        case QEX_POD_BYTE_NORM: WriteComponents<uint8_t>(destination, count, values, 127, 0, 255); break;
-        case QEX_POD_UNSIGNED_BYTE_NORM:
-            WriteComponents<uint8_t>(destination, count, values, 255, 0, 255);
-            break;
-        case QEX_POD_UNSIGNED_SHORT_NORM:
-            WriteComponents<uint16_t>(destination, count, values, 65535, 0, 65535);
-            break;
-        case QEX_POD_UNSIGNED_INT:
-            WriteComponents<uint32_t>(destination, count, values, 1, 0, UINT32_MAX);
-            break;
-        default: break;
-    }
-}
-
-void QexBoundingBox_ComputeInterleaved(QexBoundingBox* box, const void* data, int32_t count, uint32_t offset,
-                                       uint32_t stride) {
-    QexVec3 low = {0, 0, 0}, high = {0, 0, 0};
-    const uint8_t* bytes = static_cast<const uint8_t*>(data) + offset;
-    for (int32_t i = 0; i < count; ++i, bytes += stride) {
-        QexVec3 p;
-        memcpy(&p, bytes, sizeof p);
-        if (i == 0) low = high = p;
-        low = {p.x < low.x ? p.x : low.x, p.y < low.y ? p.y : low.y, p.z < low.z ? p.z : low.z};
-        high = {p.x > high.x ? p.x : high.x, p.y > high.y ? p.y : high.y, p.z > high.z ? p.z : high.z};
-    }
-    SetBox(box, low, high);
 }
 
 }  // extern "C"
