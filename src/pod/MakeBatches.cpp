@@ -52,8 +52,7 @@ struct BatchList {
     uint64_t signatures[kMaxBatches];
     uint32_t numbers[kMaxBatches];  // of the batches before they were joined
     uint32_t count;
-    // The triangles of which unjoined batches come out one after the other, and the batch that each went
-    // into.
+    // The unjoined batches in the order in which their triangles come out, and where each of them went.
     uint32_t runs[kMaxBatches];
     uint32_t joinedInto[kMaxBatches];
     uint32_t runCount;
@@ -82,7 +81,6 @@ struct BatchList {
         CBatch_Destructor(&batches[i]);
         for (--count; i < count; ++i) Move(i + 1, i);
     }
-
     void Release() {
         for (uint32_t i = 0; i < count; ++i) CBatch_Destructor(&batches[i]);
         count = 0;

@@ -1,5 +1,4 @@
-// The tables of what a POD scene is made of: data types of vertex data, elements of a mesh, channels of a
-// node.
+// The tables of what a POD scene is made of: types of vertex data, elements of a mesh, channels of a node.
 #pragma once
 
 #include "Qex.h"
@@ -24,12 +23,11 @@ enum QexPODStorage : uint8_t {
 
 struct QexPODType {
     QexPODStorage storage;
-    uint8_t
-        componentSize;   // bytes of a component, of the one word of a packed type; 0: there is no such type
-    bool packed;         // an element is one word whatever the component count
-    uint8_t components;  // of every element, whatever its count says; 0: as many as it says
-    uint8_t plain;       // the type of the same bytes that is not normalised
-    float divisor;       // of stored numbers
+    uint8_t componentSize;  // bytes of a component or of a packed element's word; 0: there is no such type
+    bool packed;            // an element is one word whatever the component count
+    uint8_t components;     // of every element, whatever its count says; 0: as many as it says
+    uint8_t plain;          // the type of the same bytes that is not normalised
+    float divisor;          // of stored numbers
 };
 
 // The row of a data type; that of type 0 for one that does not exist.
