@@ -155,10 +155,12 @@ uint32_t Largest(const BatchList& list, uint32_t first) {
 // when none fits.
 uint32_t BestToMerge(const BatchList& list, uint32_t i, bool last) {
     uint32_t best = list.count;
-    int32_t fewest = INT32_MAX;
+    int32_t fewest = list.batches[i].capacity - list.batches[i].count;
     for (uint32_t k = i + 1; k < list.count; ++k) {
+        // As many bits as it lacks are bones that it lacks, at the least.
+        if (__builtin_popcountll(list.signatures[k] & ~list.signatures[i]) > fewest) continue;
         const int32_t missing = CBatch_TestMerge(&list.batches[i], &list.batches[k]);
-        if (missing < 0 || missing > fewest || (missing == fewest && !last)) continue;
+        if (missing < 0 || missing > fewest || (missing == fewest && best < list.count && !last)) continue;
         fewest = missing;
         best = k;
     }
