@@ -61,8 +61,8 @@ enum QexPODElementNumber : uint32_t {
 };
 
 struct QexPODElement {
-    uint32_t block;  // identifier in the file
-    const char* name;
+    uint32_t block;                // identifier in the file
+    char name[20];                 // no pointer, which the loader would have to set
     CPODData QexPODMesh::*member;  // null: a UV channel
     int32_t attribute;  // QexVertexElement that it is uploaded as, the first UV channel alone; -1: none
 };
@@ -91,7 +91,7 @@ inline const CPODData* QexPODMesh_Element(const QexPODMesh* mesh, uint32_t numbe
 enum QexPODChannelNumber : uint32_t { kPODPosition, kPODRotation, kPODScale, kPODMatrix, kPODChannels };
 
 struct QexPODChannel {
-    const char* name;
+    char name[12];
     uint32_t animated;   // flag of a node whose keys change from frame to frame
     uint32_t shared;     // flag of a node whose keys lie in the memory that the scene was read from; 0: never
     uint32_t keyFloats;  // that are read of a key
