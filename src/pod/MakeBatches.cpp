@@ -52,8 +52,7 @@ struct BatchList {
     uint64_t signatures[kMaxBatches];
     uint32_t numbers[kMaxBatches];  // of the batches before they were joined
     uint32_t count;
-    // The triangles of which unjoined batches come out one after the other, and the batch that each went
-    // into.
+    // The unjoined batches in the order in which their triangles come out, and where each of them went.
     uint32_t runs[kMaxBatches];
     uint32_t joinedInto[kMaxBatches];
     uint32_t runCount;
@@ -82,7 +81,6 @@ struct BatchList {
         CBatch_Destructor(&batches[i]);
         for (--count; i < count; ++i) Move(i + 1, i);
     }
-
     void Release() {
         for (uint32_t i = 0; i < count; ++i) CBatch_Destructor(&batches[i]);
         count = 0;
@@ -157,10 +155,12 @@ uint32_t Largest(const BatchList& list, uint32_t first) {
 // when none fits.
 uint32_t BestToMerge(const BatchList& list, uint32_t i, bool last) {
     uint32_t best = list.count;
-    int32_t fewest = INT32_MAX;
+    int32_t fewest = list.batches[i].capacity - list.batches[i].count;
     for (uint32_t k = i + 1; k < list.count; ++k) {
+        // As many bits as it lacks are bones that it lacks, at the least.
+        if (__builtin_popcountll(list.signatures[k] & ~list.signatures[i]) > fewest) continue;
         const int32_t missing = CBatch_TestMerge(&list.batches[i], &list.batches[k]);
-        if (missing < 0 || missing > fewest || (missing == fewest && !last)) continue;
+        if (missing < 0 || missing > fewest || (missing == fewest && best < list.count && !last)) continue;
         fewest = missing;
         best = k;
     }

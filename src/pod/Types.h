@@ -1,5 +1,4 @@
-// The tables of what a POD scene is made of: data types of vertex data, elements of a mesh, channels of a
-// node.
+// The tables of what a POD scene is made of: types of vertex data, elements of a mesh, channels of a node.
 #pragma once
 
 #include "Qex.h"
@@ -24,12 +23,11 @@ enum QexPODStorage : uint8_t {
 
 struct QexPODType {
     QexPODStorage storage;
-    uint8_t
-        componentSize;   // bytes of a component, of the one word of a packed type; 0: there is no such type
-    bool packed;         // an element is one word whatever the component count
-    uint8_t components;  // of every element, whatever its count says; 0: as many as it says
-    uint8_t plain;       // the type of the same bytes that is not normalised
-    float divisor;       // of stored numbers
+    uint8_t componentSize;  // bytes of a component or of a packed element's word; 0: there is no such type
+    bool packed;            // an element is one word whatever the component count
+    uint8_t components;     // of every element, whatever its count says; 0: as many as it says
+    uint8_t plain;          // the type of the same bytes that is not normalised
+    float divisor;          // of stored numbers
 };
 
 // The row of a data type; that of type 0 for one that does not exist.
@@ -63,8 +61,8 @@ enum QexPODElementNumber : uint32_t {
 };
 
 struct QexPODElement {
-    uint32_t block;  // identifier in the file
-    const char* name;
+    uint32_t block;                // identifier in the file
+    char name[20];                 // no pointer, which the loader would have to set
     CPODData QexPODMesh::*member;  // null: a UV channel
     int32_t attribute;  // QexVertexElement that it is uploaded as, the first UV channel alone; -1: none
 };
@@ -93,7 +91,7 @@ inline const CPODData* QexPODMesh_Element(const QexPODMesh* mesh, uint32_t numbe
 enum QexPODChannelNumber : uint32_t { kPODPosition, kPODRotation, kPODScale, kPODMatrix, kPODChannels };
 
 struct QexPODChannel {
-    const char* name;
+    char name[12];
     uint32_t animated;   // flag of a node whose keys change from frame to frame
     uint32_t shared;     // flag of a node whose keys lie in the memory that the scene was read from; 0: never
     uint32_t keyFloats;  // that are read of a key

@@ -89,6 +89,11 @@ void ExpectRefused(const Refusal& refusal) {
 
 TEST(PodCheck, RefusesWhatCannotBeDrawn) {
     for (const Refusal& refusal : kRefusals) ExpectRefused(refusal);
+    // What is refused is not put right before.
+    Scene odd = everything::Scene();
+    odd.nodes[kHip].positions.resize(9);
+    odd.nodes[kKnee].parent = 11;
+    EXPECT_FALSE(Has(LoadedPod(odd).log, "fewer keys"));
     // World matrices are found by recursion, so the depth has a limit.
     for (const int32_t generations : {1000, 1100}) {
         Scene scene;

@@ -4,7 +4,6 @@
 #include <Qex.h>
 #include <algorithm>
 #include <cstddef>
-#include <memory>
 #include <new>
 #include <set>
 #include <unordered_map>
@@ -56,37 +55,40 @@ class PieceWriter {
   public:
     explicit PieceWriter(uint32_t maxVertices) : maxVertices_(maxVertices) {}
 
-    // A batch that was left without a triangle is dropped.
     void Add(const Batched& made) {
         const QexBoneBatches& b = made.batches;
         for (ptrdiff_t batch = 0; batch < b.batchCount; ++batch) {
+            const bool last = batch + 1 == b.batchCount;
             const int32_t* bones = b.boneTable + batch * b.maxBones;
-            const size_t first = 3 * static_cast<size_t>(b.offsets[batch]);
-            const size_t end = batch + 1 < b.batchCount ? 3 * static_cast<size_t>(b.offsets[batch + 1])
-                                                        : made.indices.size();
-            bool open = false;
-            for (size_t i = first; i < end; i += 3) {
-                // Three new vertices at the most; a piece may end up to two short of its limit.
-                if (pieces_.empty() || pieces_.back().sources.size() + 3 > maxVertices_) {
-                    pieces_.emplace_back();
-                    known_.clear();
-                    open = false;
-                }
-                SkinPiece& piece = pieces_.back();
-                if (!open) {
-                    piece.batchOffsets.push_back(static_cast<int32_t>(piece.indices.size() / 3));
-                    piece.batchBones.emplace_back(bones, bones + b.bonesPerBatch[batch]);
-                    open = true;
-                }
-                for (size_t corner = i; corner < i + 3; ++corner) {
-                    piece.indices.push_back(NumberOf(made.vertices[made.indices[corner]], &piece));
-                }
-            }
+            AddBatch(made, {bones, bones + b.bonesPerBatch[batch]}, 3 * static_cast<size_t>(b.offsets[batch]),
+                     last ? made.indices.size() : 3 * static_cast<size_t>(b.offsets[batch + 1]));
         }
     }
     std::vector<SkinPiece> Take() { return std::move(pieces_); }
 
   private:
+    // The corners `first` to `end`, which follow these bones.
+    void AddBatch(const Batched& made, const std::vector<int32_t>& bones, size_t first, size_t end) {
+        bool open = false;
+        for (size_t i = first; i < end; i += 3) {
+            // Three new vertices at the most; a piece may end up to two short of its limit.
+            if (pieces_.empty() || pieces_.back().sources.size() + 3 > maxVertices_) {
+                pieces_.emplace_back();
+                known_.clear();
+                open = false;
+            }
+            SkinPiece& piece = pieces_.back();
+            if (!open) {
+                piece.batchOffsets.push_back(static_cast<int32_t>(piece.indices.size() / 3));
+                piece.batchBones.push_back(bones);
+                open = true;
+            }
+            for (size_t corner = i; corner < i + 3; ++corner) {
+                piece.indices.push_back(NumberOf(made.vertices[made.indices[corner]], &piece));
+            }
+        }
+    }
+
     uint32_t NumberOf(const BatchVertex& vertex, SkinPiece* piece) {
         std::array<uint8_t, 4> bones{};
         for (size_t i = 0; i < 4; ++i) bones[i] = static_cast<uint8_t>(vertex.bones[i]);
