@@ -1,3 +1,4 @@
+// Arrays of elements of one size that grow as they are filled.
 #include <cstring>
 
 #include "Qex.h"

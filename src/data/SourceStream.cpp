@@ -1,3 +1,4 @@
+// Little-endian numbers and blocks read one after the other from a file or from memory.
 #include <cstring>
 
 #include "base/Diagnostics.h"
