@@ -291,7 +291,7 @@ TEST_F(QexTextureVerb, DamagedTexturesAreRefusedInOneLine) {
                     continue;
                 }
                 for (size_t level = 0; level < texture.levels.size(); ++level)
-                    for (size_t face = 0; face < texture.levels[level].faces.size(); ++face)
+                    for (size_t face = 0; face < texture.faces; ++face)
                         EXPECT_FALSE(DecodeFace(texture, level, face).pixels.empty());
             }
     }

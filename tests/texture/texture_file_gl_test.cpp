@@ -207,12 +207,12 @@ class DecodedFileTest : public TextureFileTest {
             ++loaded_;
             const bool cube = texture.flags & QEX_TEXFLAG_CUBEMAP;
             const GLenum target = cube ? GL_TEXTURE_CUBE_MAP : GL_TEXTURE_2D;
-            const bool whole =
-                decoded.levels.size() == FullChain(decoded.levels[0].width, decoded.levels[0].height);
+            const bool whole = decoded.levels.size() ==
+                               QexImage_ChainLength(decoded.levels[0].width, decoded.levels[0].height);
             glTexParameteri(target, GL_TEXTURE_MIN_FILTER, whole ? GL_NEAREST_MIPMAP_NEAREST : GL_NEAREST);
             glTexParameteri(target, GL_TEXTURE_MAG_FILTER, GL_NEAREST);
             for (size_t level = 0; level < (whole ? decoded.levels.size() : 1); ++level)
-                for (size_t face = 0; face < decoded.levels[level].faces.size(); ++face)
+                for (size_t face = 0; face < decoded.faces; ++face)
                     Compare(DecodeFace(decoded, level, face), *decoded.format, cube ? kFaces[face] : nullptr);
             QexTexture_Release(&texture);
         }
@@ -223,10 +223,10 @@ class DecodedFileTest : public TextureFileTest {
   private:
     static bool HoldsUndefined(const Texture& texture) {
         bool found = false;
-        for (const TextureLevel& level : texture.levels)
-            for (const uint64_t at : level.faces)
-                for (uint64_t i = 0; texture.format->coding == PixelFormat::kEtc1 && i < level.bytes; i += 8)
-                    found |= IsUndefined(&texture.file[at + i]);
+        for (size_t level = 0; texture.format->coding == kQexETC1 && level < texture.levels.size(); ++level)
+            for (size_t face = 0; face < texture.faces; ++face)
+                for (uint64_t i = 0; i < texture.levels[level].bytes; i += 8)
+                    found |= IsUndefined(&texture.file[texture.FaceOffset(level, face) + i]);
         return found;
     }
     void Compare(const Image& image, const PixelFormat& format, const float (*face)[3]) {
