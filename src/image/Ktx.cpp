@@ -98,7 +98,7 @@ bool QexKtx_ReadPair(const QexKtx& ktx, const QexImageBytes& file, uint64_t* at,
     const uint64_t length = ReadWord(ktx, file.bytes + *at);
     const char* text = reinterpret_cast<const char*>(file.bytes) + *at + 4;
     if (length > end - *at - 4) return false;
-    const uint64_t keyBytes = strnlen(text, length) + 1;
+    const uint64_t keyBytes = strnlen(text, static_cast<size_t>(length)) + 1;
     if (keyBytes > length) return false;
     *pair = {text, text + keyBytes, length - keyBytes};
     *at += 4 + Padded(length);

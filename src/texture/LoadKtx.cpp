@@ -1,8 +1,7 @@
 // KTX 1.1 textures: everything that is sound of a file is uploaded, natively or decoded, and made complete.
-#include "image/Ktx.h"
-
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "image/Ktx.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

@@ -1,8 +1,7 @@
 // PVR textures with the legacy header: all levels of a file, from one of them on, as they are or decoded.
-#include "image/Pvr.h"
-
 #include "gl/GL.h"
 #include "image/Ktx.h"
+#include "image/Pvr.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
