@@ -258,7 +258,7 @@ std::vector<uint8_t> KtxFile(bool topFirst, bool says) {
     image.width = 2;
     image.height = 3;
     if (says)
-        image.keyValues = {{"author", std::string(300, 'x')},
+        image.keyValues = {{"author", std::string(301, 'x')},
                            {"KTXorientation", topFirst ? "S=r,T=d" : "S=r,T=u"}};
     image.surfaces = {{Rows(topFirst)}};
     return pod::WriteKtx(image);

@@ -231,12 +231,10 @@ TEST_F(QexTextureVerb, ReadsWhatOthersWrite) {
     };
     const Bytes redBlue = {255, 0, 0, 255, 0, 0, 255, 255};
     Ktx ktx;
+    ktx.type = GL_UNSIGNED_SHORT_5_6_5;
     ktx.format = ktx.internal = ktx.base = GL_RGB;
     ktx.width = 2;
     ktx.height = 1;
-    ktx.levels = {{{255, 0, 0, 0, 0, 255}}};
-    holds("tight_rows.ktx", ktx.File(), redBlue);
-    ktx.type = GL_UNSIGNED_SHORT_5_6_5;
     ktx.levels = {{{0x00, 0xF8, 0x1F, 0x00}}};
     ktx.levelCount = 0;
     holds("swapped.ktx", SwappedFile(ktx), redBlue);
@@ -295,6 +293,9 @@ TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
     WriteBytes(Path("empty.pvr"), pod::WritePvr(PvrNoise(pod::kPvrAlpha8, 0, 1, 1, 1)));
     WriteBytes(Path("odd.pvr"), pod::WritePvr(PvrNoise(pod::kPvrtc4, 12, 8, 1, 1)));
     WriteBytes(Path("one.pvr"), UniformPvr(pod::kPvrRgb888, 4, {1, 2, 3}));
+    Bytes vast = UniformPvr(pod::kPvrRgb888, 4, {1, 2, 3});
+    PutWord(&vast, 8, 65536);  // its width
+    WriteBytes(Path("vast.pvr"), vast);
     const std::string a = Path("a.png"), pvr = Path("out.pvr"), png = Path("out.png");
     // clang-format off
     const struct {
@@ -319,6 +320,7 @@ TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
         {1, {Path("new.pvr"), "-o", png}, "newer PVR container"},
         {1, {Path("r555.pvr"), "-o", png}, "RGB 555 pixels are not read"},
         {1, {Path("large.pvr"), "-o", png}, "8193 x 1 pixels; at most 8192"},
+        {1, {Path("vast.pvr"), "-o", png}, "65536 x 4 pixels are too many"},
         {1, {Path("empty.pvr"), "-o", png}, "it has no pixels"},
         {1, {Path("odd.pvr"), "-o", png}, "powers of two"},
     };

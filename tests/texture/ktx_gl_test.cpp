@@ -61,7 +61,12 @@ TEST_F(KtxLoader, LevelsAndFacesAreFoundInOrder) {
     Ktx compressed = Etc1Ktx();
     compressed.width = 4;
     compressed.levels = {{Noise(8, 1)}, {Noise(8, 2)}, {Noise(8, 3)}};
-    for (const Ktx& ktx : {SoundKtx(), CubeKtx(), compressed, narrow}) {
+    Ktx odd;  // faces of a size that is no multiple of four
+    odd.type = GL_UNSIGNED_SHORT_4_4_4_4;
+    odd.width = odd.height = 3;
+    odd.faces = 6;
+    odd.levels = {std::vector<Bytes>(6, Noise(18)), std::vector<Bytes>(6, Noise(2))};
+    for (const Ktx& ktx : {SoundKtx(), CubeKtx(), compressed, narrow, odd}) {
         const Outcome outcome = TryFile(ktx.File());
         ASSERT_EQ(outcome.result, 0) << outcome.out;
         ASSERT_EQ(outcome.uploads.size(), ktx.levels.size() * ktx.faces);
