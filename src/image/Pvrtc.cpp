@@ -2,6 +2,7 @@
 // colours stand at the words' centres and are interpolated between them; a pixel is a mixture of both by its
 // weight. So the image is decoded in cells between the centres of four words: a cell begins half a word right
 // of and below the upper left one, and takes a quarter of the weights of each.
+#include "image/Image.h"
 #include "image/Lanes.h"
 #include "Qex.h"
 
@@ -29,12 +30,6 @@ struct Image {
     uint8_t* pixels;
     int64_t width, height;
 };
-
-uint32_t ReadLE32(const uint8_t* bytes) {
-    uint32_t word;
-    memcpy(&word, bytes, sizeof word);
-    return word;
-}
 
 // A zero above each bit.
 uint32_t SpreadBits(uint32_t bits) {
@@ -104,10 +99,10 @@ void UnpackRows(Word* word) {
 template <uint32_t kWidth>
 void Fetch(const Grid& grid, uint32_t x, uint32_t y, Word* word) {
     const uint8_t* bytes = grid.words + 8 * WordIndex(grid, x & (grid.across - 1), y & (grid.down - 1));
-    const uint32_t colours = ReadLE32(bytes + 4);
+    const uint32_t colours = QexImage_ReadWord(bytes + 4);
     UnpackColour(colours & 0xFFFF, true, word->pairs);
     UnpackColour(colours >> 16, false, word->pairs + 2);
-    word->modulation = ReadLE32(bytes);
+    word->modulation = QexImage_ReadWord(bytes);
     word->mode = colours & 1;
     if (kWidth == 8) UnpackRows(word);
 }

@@ -3,44 +3,31 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
-#include "texture/Upload.h"
+#include "image/Ktx.h"
+#include "image/Pvr.h"
+#include "image/Tga.h"
 
 namespace {
 
 constexpr size_t kPathSize = 256;
-constexpr uint32_t kPVRFlipped = 0x10000;
-constexpr uint32_t kTGATopFirst = 0x20;  // in the header's last byte
-constexpr uint64_t kKTXSearched = 256;   // bytes of a KTX file in which its orientation is looked for
 
-bool IsPVR(const QexTextureBytes& image) {
-    const uint32_t headerSize = image.size >= 4 ? QexTextureLoad_ReadLE32(image.bytes) : 0;
-    return headerSize == 44 || headerSize == 52;
-}
-
-// KTX files that say nothing begin with the upper edge, as pictures do.
-bool SaysUp(const QexTextureBytes& image) {
-    static const char key[] = "KTXorientation\0S=r,T=u";
-    const uint64_t end = image.size < kKTXSearched ? image.size : kKTXSearched;
-    for (uint64_t at = 64; at + sizeof key <= end; ++at)
-        if (memcmp(image.bytes + at, key, sizeof key - 1) == 0) return true;
-    return false;
-}
-
-// Of an image that was loaded, so that its header is whole.
-bool IsTopFirst(const QexTextureBytes& image) {
-    if (QexTextureLoad_IsKTX(image)) return !SaysUp(image);
-    if (IsPVR(image)) return !(QexTextureLoad_ReadLE32(image.bytes + 16) & kPVRFlipped);
-    return image.bytes[17] & kTGATopFirst;
+// Of a file that was loaded, so that its header is whole.
+bool IsTopFirst(const QexImageBytes& file) {
+    QexKtx ktx;
+    QexPvr pvr;
+    if (QexKtx_Is(file)) return QexKtx_ReadHeader(&ktx, file) && QexKtx_IsTopFirst(ktx, file);
+    if (QexPvr_ReadHeader(&pvr, file)) return pvr.IsTopFirst();
+    return QexTga_ReadHeader(file.bytes).topFirst;
 }
 
 // Loads an image of any of the three kinds; true when there is a texture afterwards.
-bool Load(QexTexture* texture, const QexTextureBytes& image) {
-    const uint32_t size = static_cast<uint32_t>(image.size);
+bool Load(QexTexture* texture, const QexImageBytes& file) {
+    const uint32_t size = static_cast<uint32_t>(file.size);
     memset(texture, 0, sizeof *texture);
-    if (QexTextureLoad_IsKTX(image) || IsPVR(image))
-        QexTexture_LoadPVRFromMemSized(texture, image.bytes, size, nullptr, 1, 0, nullptr);
+    if (QexKtx_Is(file) || QexPvr_Is(file))
+        QexTexture_LoadPVRFromMemSized(texture, file.bytes, size, nullptr, 1, 0, nullptr);
     else
-        QexTexture_CreateTGAFromMemSized(texture, 0, 0, QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, image.bytes, size);
+        QexTexture_CreateTGAFromMemSized(texture, 0, 0, QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, file.bytes, size);
     if (!texture->glName) return false;
     QexTexture_SetFilter(texture, QEX_FILTER_LINEAR);
     QexTexture_SetWrapping(texture, QEX_WRAP_CLAMP);
@@ -51,7 +38,7 @@ bool Load(QexTexture* texture, const QexTextureBytes& image) {
 bool LoadFile(QexTexture* texture, uint32_t* topFirst, const char* path) {
     QexResFile file;
     const bool opened = QexResFile_Create(&file, path) == 0;  // what cannot be opened was said
-    const QexTextureBytes image = {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)};
+    const QexImageBytes image = {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)};
     const bool loaded = QexResFile_IsOpen(&file) && Load(texture, image);
     if (opened && !loaded) QexError(QEX_TAG, "<QexPicture_Load> %s is no picture that can be loaded", path);
     if (!loaded) memset(texture, 0, sizeof *texture);

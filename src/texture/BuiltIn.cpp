@@ -1,18 +1,17 @@
+// Textures that need no file: white, the flat normal map, the cube map of normals.
 #include <cmath>
 #include <cstring>
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "image/Pvr.h"
 #include "texture/Texture.h"
 
 #define QEX_MODULE "src/QexTexture"
 
 namespace {
 
-constexpr uint32_t kPVRHeaderSize = 52;
-constexpr uint32_t kPVRTag = 0x21525650;  // "PVR!"
-// ETC1, vertical-flip bit, mipmaps.
-constexpr uint32_t kPVRFlags = 0x10136;
+constexpr uint32_t kPVRFlags = kQexPvrFlipped | kQexPvrMipmaps | 0x36;  // of ETC1
 constexpr uint32_t kETCBlockSize = 8;
 
 // The default texture: 64 x 64 with 7 levels, 343 blocks.
@@ -34,18 +33,15 @@ QexTexture s_Default;
 QexTexture s_BlankNormalMap;
 bool s_Created;
 
-void WriteLE32(uint8_t* bytes, uint32_t value) {
-    for (int i = 0; i < 4; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
-}
-
 // Loads a PVR image of one colour: every block of every level is the same. `image` is room for it.
 void LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mipmaps, const uint8_t* block,
                  uint32_t blocks) {
     const uint32_t words[13] = {
-        kPVRHeaderSize, size, size, mipmaps, kPVRFlags, blocks * kETCBlockSize, 4, 0, 0, 0, 0, kPVRTag, 1};
-    for (uint32_t i = 0; i < 13; ++i) WriteLE32(image + 4 * i, words[i]);
+        kQexPvrHeaderSize, size, size, mipmaps, kPVRFlags, blocks * kETCBlockSize, 4, 0, 0, 0, 0,
+        kQexPvrTag,        1};
+    memcpy(image, words, sizeof words);
     for (uint32_t i = 0; i < blocks; ++i)
-        memcpy(image + kPVRHeaderSize + i * kETCBlockSize, block, kETCBlockSize);
+        memcpy(image + kQexPvrHeaderSize + i * kETCBlockSize, block, kETCBlockSize);
     memset(texture, 0, sizeof *texture);
     QexTexture_LoadPVRFromMem(texture, image, nullptr, 1, 0, nullptr);
 }
@@ -96,7 +92,7 @@ int32_t QexTexture_CreateDefault(void) {
         QexLog(QEX_TAG, "<QexTexture_CreateDefault> Already created.");
         return 0;
     }
-    uint8_t image[kPVRHeaderSize + kDefaultBlocks * kETCBlockSize];
+    uint8_t image[kQexPvrHeaderSize + kDefaultBlocks * kETCBlockSize];
     LoadUniform(&s_Default, image, kDefaultSize, kDefaultMipmaps, kWhiteBlock, kDefaultBlocks);
     LoadUniform(&s_BlankNormalMap, image, kNormalSize, kNormalMipmaps, kFlatNormalBlock, kNormalBlocks);
     s_Created = true;

@@ -1,3 +1,4 @@
+// Texture records: pixels and TGA images become textures, which are set, filtered and released.
 #include "texture/Texture.h"
 
 #include <cstdio>
@@ -6,6 +7,7 @@
 #include "base/Memory.h"
 #include "data/ResFile.h"
 #include "gl/GL.h"
+#include "image/Tga.h"
 
 #define QEX_MODULE "src/QexTexture"
 
@@ -13,7 +15,6 @@ namespace {
 
 constexpr int32_t kUnknownCode = -2;
 constexpr uint32_t kStages = 5;
-constexpr uint32_t kTGAHeaderSize = 18;
 
 // By format code, from 1.
 const struct {
@@ -31,24 +32,33 @@ bool IsFormat(uint32_t format) {
     return format >= 1 && format <= sizeof kFormats / sizeof kFormats[0];
 }
 
-// Sets a pair of parameters of a bound texture to one value.
-void SetParameters(GLenum target, GLenum first, GLenum second, GLint value) {
-    QEX_GL(glTexParameteri(target, first, value));
-    QEX_GL(glTexParameteri(target, second, value));
-}
-
-struct TGAHeader {
-    int32_t width;
-    int32_t height;
-    uint32_t bytesPerPixel;  // 0 for a depth that is not whole bytes
-
-    uint64_t PixelBytes() const {
-        return static_cast<uint64_t>(width) * static_cast<uint64_t>(height) * bytesPerPixel;
-    }
+// Two parameters of a texture that always have the same value, and the values by their codes.
+struct Setting {
+    GLenum first, second;
+    struct {
+        uint8_t code;
+        GLint value;
+    } values[2];
 };
 
-TGAHeader ReadTGAHeader(const uint8_t* tga) {
-    return {tga[12] | tga[13] << 8, tga[14] | tga[15] << 8, tga[16] % 8 ? 0u : tga[16] / 8u};
+const Setting kFilter = {GL_TEXTURE_MIN_FILTER,
+                         GL_TEXTURE_MAG_FILTER,
+                         {{QEX_FILTER_NEAREST, GL_NEAREST}, {QEX_FILTER_LINEAR, GL_LINEAR}}};
+const Setting kWrap = {
+    GL_TEXTURE_WRAP_S, GL_TEXTURE_WRAP_T, {{QEX_WRAP_CLAMP, GL_CLAMP_TO_EDGE}, {QEX_WRAP_REPEAT, GL_REPEAT}}};
+
+// Binds the texture in any case; `field` of the record keeps the code.
+int32_t Set(QexTexture* texture, const Setting& setting, uint32_t code, uint8_t* field) {
+    const GLenum target = QexTexture_Target(texture);
+    QexRenderState_Bind(target, texture->glName);
+    for (const auto& value : setting.values) {
+        if (value.code != code) continue;
+        QEX_GL(glTexParameteri(target, setting.first, value.value));
+        QEX_GL(glTexParameteri(target, setting.second, value.value));
+        *field = value.code;
+        return 0;
+    }
+    return kUnknownCode;
 }
 
 // BGR(A) to RGB(A).
@@ -103,30 +113,31 @@ int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t 
 int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage, uint32_t filter,
                                     uint32_t wrap, const void* tga) {
     const uint8_t* file = static_cast<const uint8_t*>(tga);
-    const TGAHeader header = ReadTGAHeader(file);
+    const QexTga header = QexTga_ReadHeader(file);
+    const uint32_t bytesPerPixel = header.BytesPerPixel();
     memset(texture, 0, sizeof *texture);
-    texture->width = header.width;
-    texture->height = static_cast<uint32_t>(header.height);
-    texture->bytesPerPixel = static_cast<uint8_t>(header.bytesPerPixel);
+    texture->width = static_cast<int32_t>(header.width);
+    texture->height = header.height;
+    texture->bytesPerPixel = static_cast<uint8_t>(bytesPerPixel);
     QexTexture_SetStage(texture, stage);
-    if (header.bytesPerPixel != 4 && header.bytesPerPixel != 3) {
+    if (bytesPerPixel != 4 && bytesPerPixel != 3) {
         QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %d bytes a pixel; images have 3 or 4",
-                 header.bytesPerPixel);
+                 bytesPerPixel);
         return -4;
     }
-    if (!QexTexture_IsPossibleSize(static_cast<uint32_t>(header.width), texture->height, false)) {
+    if (!QexTexture_IsPossibleSize(header.width, header.height, false)) {
         QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %d x %d pixels are not possible here", header.width,
                  header.height);
         return -1;
     }
-    QexTexture_SetFormat(texture, header.bytesPerPixel == 4 ? QEX_TEXFMT_RGBA8888 : QEX_TEXFMT_RGB888);
+    QexTexture_SetFormat(texture, bytesPerPixel == 4 ? QEX_TEXFMT_RGBA8888 : QEX_TEXFMT_RGB888);
     QexScratch<uint8_t> copy(header.PixelBytes());
     if (!copy) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return -1;
     }
-    memcpy(copy.Get(), file + kTGAHeaderSize, header.PixelBytes());
-    SwapRedAndBlue(copy.Get(), header.PixelBytes(), header.bytesPerPixel);
+    memcpy(copy.Get(), file + kQexTgaHeaderSize, header.PixelBytes());
+    SwapRedAndBlue(copy.Get(), header.PixelBytes(), bytesPerPixel);
     QexRenderState_ActiveTexture(GL_TEXTURE0);
     QEX_GL(glGenTextures(1, &texture->glName));
     QexRenderState_Bind(GL_TEXTURE_2D, texture->glName);
@@ -139,10 +150,7 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
 
 int32_t QexTexture_CreateTGAFromMemSized(QexTexture* texture, int32_t ignored, uint32_t stage,
                                          uint32_t filter, uint32_t wrap, const void* tga, uint32_t size) {
-    const uint8_t* file = static_cast<const uint8_t*>(tga);
-    const uint64_t needed =
-        size < kTGAHeaderSize ? kTGAHeaderSize : kTGAHeaderSize + ReadTGAHeader(file).PixelBytes();
-    if (file && needed <= size)
+    if (tga && QexTga_IsWhole({static_cast<const uint8_t*>(tga), size}))
         return QexTexture_CreateTGAFromMem(texture, ignored, stage, filter, wrap, tga);
     memset(texture, 0, sizeof *texture);
     QexError(QEX_TAG, "<QexTexture_CreateTGAFromMem> %u bytes are not a whole uncompressed TGA image", size);
@@ -198,23 +206,11 @@ int32_t QexTexture_SetStage(QexTexture* texture, uint32_t stage) {
 }
 
 int32_t QexTexture_SetFilter(QexTexture* texture, uint32_t filter) {
-    const GLenum target = QexTexture_Target(texture);
-    QexRenderState_Bind(target, texture->glName);
-    if (filter != QEX_FILTER_NEAREST && filter != QEX_FILTER_LINEAR) return kUnknownCode;
-    SetParameters(target, GL_TEXTURE_MIN_FILTER, GL_TEXTURE_MAG_FILTER,
-                  filter == QEX_FILTER_NEAREST ? GL_NEAREST : GL_LINEAR);
-    texture->filter = static_cast<uint8_t>(filter);
-    return 0;
+    return Set(texture, kFilter, filter, &texture->filter);
 }
 
 int32_t QexTexture_SetWrapping(QexTexture* texture, uint32_t wrap) {
-    const GLenum target = QexTexture_Target(texture);
-    QexRenderState_Bind(target, texture->glName);
-    if (wrap != QEX_WRAP_CLAMP && wrap != QEX_WRAP_REPEAT) return kUnknownCode;
-    SetParameters(target, GL_TEXTURE_WRAP_S, GL_TEXTURE_WRAP_T,
-                  wrap == QEX_WRAP_CLAMP ? GL_CLAMP_TO_EDGE : GL_REPEAT);
-    texture->wrap = static_cast<uint8_t>(wrap);
-    return 0;
+    return Set(texture, kWrap, wrap, &texture->wrap);
 }
 
 void QexTexture_Set(QexTexture* texture, uint32_t stage) {

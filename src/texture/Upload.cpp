@@ -1,3 +1,4 @@
+// Sizes that a GL takes, the texture that the levels of a file go into, and levels that are decoded for it.
 #include "texture/Upload.h"
 
 #include <cstdarg>
@@ -8,16 +9,6 @@
 #include "gl/GL.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
-
-uint32_t QexTextureLoad_ChainLength(uint32_t width, uint32_t height) {
-    uint32_t levels = 1;
-    for (uint32_t size = width > height ? width : height; size > 1; size /= 2) ++levels;
-    return levels;
-}
-
-uint64_t QexTextureLoad_ETCSize(uint32_t width, uint32_t height) {
-    return (uint64_t{width} + 3) / 4 * ((uint64_t{height} + 3) / 4) * 8;
-}
 
 int32_t QexTextureLoad_Refuse(const char* function, const char* format, ...) {
     char text[160];
@@ -45,7 +36,7 @@ void QexTextureLoad_Begin(QexTexture* texture, uint32_t* name, bool cube) {
 }
 
 bool QexTextureLoad_TakesMipmaps(uint32_t width, uint32_t height) {
-    if (util_number_is_power_2(width) && util_number_is_power_2(height)) return true;
+    if (QexImage_IsPowerOfTwo(width, height)) return true;
     const char* extensions = reinterpret_cast<const char*>(glGetString(GL_EXTENSIONS));
     return extensions && strstr(extensions, "GL_OES_texture_npot");
 }
@@ -55,31 +46,31 @@ void QexTextureLoad_GenerateMipmaps(uint32_t target) {
     glGetError();  // of a GL that knows mipmaps of powers of two only; level 0 is there
 }
 
+uint32_t QexTextureLoad_FaceTarget(bool cube, uint32_t face) {
+    return cube ? GL_TEXTURE_CUBE_MAP_POSITIVE_X + face : GL_TEXTURE_2D;
+}
+
 void QexTextureLoad_SetWrap(uint32_t target, uint32_t width, uint32_t height) {
-    const bool repeats = util_number_is_power_2(width) && util_number_is_power_2(height);
-    const GLint wrap = repeats ? GL_REPEAT : GL_CLAMP_TO_EDGE;
+    const GLint wrap = QexImage_IsPowerOfTwo(width, height) ? GL_REPEAT : GL_CLAMP_TO_EDGE;
     glTexParameteri(target, GL_TEXTURE_WRAP_S, wrap);
     glTexParameteri(target, GL_TEXTURE_WRAP_T, wrap);
 }
 
-bool QexTextureLoad_UploadDecodedETC(uint32_t target, int32_t level, uint32_t width, uint32_t height,
-                                     const uint8_t* data) {
-    const uint64_t pixels = uint64_t{width} * height;
-    const GLsizei w = static_cast<GLsizei>(width), h = static_cast<GLsizei>(height);
+bool QexTextureLoad_UploadDecoded(uint32_t target, int32_t index, const QexPixelFormat& format,
+                                  const QexImageLevel& level, const uint8_t* data) {
+    const uint64_t pixels = uint64_t{level.width} * level.height;
+    const GLsizei w = static_cast<GLsizei>(level.width), h = static_cast<GLsizei>(level.height);
+    const bool etc = format.coding == kQexETC1;
+    const GLenum order = etc ? GL_RGB : GL_RGBA;
     QexScratch<uint8_t> decoded;
-    if (!decoded.Alloc(4 * pixels) || QexDecompressETC(data, w, h, decoded.Get(), 0) < 0) return false;
-    for (uint64_t i = 1; i < pixels; ++i) memmove(decoded.Get() + 3 * i, decoded.Get() + 4 * i, 3);
-    QEX_GL(glTexImage2D(target, level, GL_RGB, w, h, 0, GL_RGB, GL_UNSIGNED_BYTE, decoded.Get()));
-    return true;
-}
-
-bool QexTextureLoad_UploadDecodedPVRTC(uint32_t target, int32_t level, uint32_t width, uint32_t height,
-                                       bool twoBits, const uint8_t* data) {
-    const GLsizei w = static_cast<GLsizei>(width), h = static_cast<GLsizei>(height);
-    QexScratch<uint8_t> decoded;
-    if (!decoded.Alloc(uint64_t{width} * height * 4)) return false;
-    QexDecompressPVRTC(data, twoBits, w, h, decoded.Get());
-    QEX_GL(glTexImage2D(target, level, GL_RGBA, w, h, 0, GL_RGBA, GL_UNSIGNED_BYTE, decoded.Get()));
+    if (!decoded.Alloc(4 * pixels)) return false;
+    if (!etc)
+        QexDecompressPVRTC(data, format.bits == 2, w, h, decoded.Get());
+    else if (QexDecompressETC(data, w, h, decoded.Get(), 0) < 0)
+        return false;
+    for (uint64_t i = 1; etc && i < pixels; ++i) memmove(decoded.Get() + 3 * i, decoded.Get() + 4 * i, 3);
+    QEX_GL(glTexImage2D(target, index, static_cast<GLint>(order), w, h, 0, order, GL_UNSIGNED_BYTE,
+                        decoded.Get()));
     return true;
 }
 

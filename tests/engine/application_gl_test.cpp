@@ -257,7 +257,9 @@ std::vector<uint8_t> KtxFile(bool topFirst, bool says) {
     image.pixelBytes = 4;
     image.width = 2;
     image.height = 3;
-    if (says) image.keyValues = {{"KTXorientation", topFirst ? "S=r,T=d" : "S=r,T=u"}};
+    if (says)
+        image.keyValues = {{"author", std::string(301, 'x')},
+                           {"KTXorientation", topFirst ? "S=r,T=d" : "S=r,T=u"}};
     image.surfaces = {{Rows(topFirst)}};
     return pod::WriteKtx(image);
 }

@@ -164,34 +164,6 @@ INSTANTIATE_TEST_SUITE_P(, Decoder,
                                                   PortableDecompressPVRTC}),
                          [](const auto& test) { return test.param.name; });
 
-TEST_P(Decoder, EtcBlocksByHand) {
-    struct Expected {
-        int x, y;
-        Pixel pixel;
-    };
-    const struct {
-        Bytes block;
-        std::vector<Expected> expected;
-    } cases[] = {
-        {{0xF8, 0xF8, 0xF8, 0x02, 0, 0, 0, 0}, {{0, 0, {255, 255, 255, 255}}, {3, 3, {255, 255, 255, 255}}}},
-        {{0x78, 0x78, 0xF8, 0x26, 0, 0, 0, 0}, {{0, 0, {128, 128, 255, 255}}, {3, 3, {128, 128, 255, 255}}}},
-        // Two colours of their own, (136, 68, 0) with (2, 8) above (255, 0, 34) with (47, 183).
-        {{0x8F, 0x40, 0x02, 0x1D, 0x00, 0x41, 0x80, 0x01},
-         {{0, 0, {128, 60, 0, 255}},
-          {1, 0, {138, 70, 2, 255}},
-          {3, 1, {138, 70, 2, 255}},
-          {1, 2, {208, 0, 0, 255}},
-          {0, 3, {255, 47, 81, 255}},
-          {3, 3, {255, 183, 217, 255}}}},
-        // Differences that leave the range: 31 + 1 is 0, 0 - 1 is 31. Halves side by side.
-        {{0xF9, 0x00, 0x07, 0x02, 0, 0, 0, 0}, {{1, 3, {255, 2, 2, 255}}, {2, 0, {2, 2, 255, 255}}}},
-    };
-    for (const auto& c : cases) {
-        const Bytes pixels = Etc(c.block, 4, 4);
-        for (const auto& e : c.expected) EXPECT_EQ(At(pixels, 4, e.x, e.y), e.pixel) << e.x << ", " << e.y;
-    }
-}
-
 TEST_P(Decoder, EtcIsWhatLibETC1Decodes) {
     std::vector<std::pair<int, int>> sizes = {{128, 64}};
     for (int width = 1; width <= 12; ++width)

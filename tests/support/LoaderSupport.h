@@ -130,6 +130,20 @@ inline Outcome Try(const std::function<int32_t(QexTexture*)>& load, const QexTex
 // Loads a file of the given bytes.
 using TryFunction = Outcome (*)(const Bytes& file);
 
+// The same by its name, or from a block of just its size, with one of the loaders of PVR and KTX files.
+template <int32_t (*kLoad)(QexTexture*, const char*, QexPVRHeader*, int32_t, uint32_t)>
+Outcome TryFile(const Bytes& file) {
+    const MemoryFile memory(file);
+    return Try([&](QexTexture* t) { return kLoad(t, memory.Path(), nullptr, 1, 0); });
+}
+template <int32_t (*kLoad)(QexTexture*, const void*, uint32_t, QexPVRHeader*, int32_t, uint32_t, const void*)>
+Outcome TrySized(const Bytes& file) {
+    const std::unique_ptr<uint8_t[]> block(new uint8_t[file.size()]);
+    std::copy(file.begin(), file.end(), block.get());
+    const auto size = static_cast<uint32_t>(file.size());
+    return Try([&](QexTexture* t) { return kLoad(t, block.get(), size, nullptr, 1, 0, nullptr); });
+}
+
 // A file that is refused with a result and a line, without a texture.
 inline void ExpectRefused(const Bytes& file, TryFunction tryFile, int32_t result, const std::string& line) {
     const Outcome outcome = tryFile(file);

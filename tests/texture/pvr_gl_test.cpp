@@ -22,20 +22,7 @@ Outcome TryMemory(const Bytes& file, uint32_t firstLevel, QexPVRHeader* header,
     };
     return Try(load, before);
 }
-Outcome TryFile(const Bytes& file) {
-    const MemoryFile memory(file);
-    return Try([&](QexTexture* t) { return QexTexture_LoadPVRFromFile(t, memory.Path(), nullptr, 1, 0); });
-}
-
-// From a block of just that size.
-Outcome TrySized(const Bytes& file) {
-    const std::unique_ptr<uint8_t[]> block(new uint8_t[file.size()]);
-    std::copy(file.begin(), file.end(), block.get());
-    return Try([&](QexTexture* t) {
-        return QexTexture_LoadPVRFromMemSized(t, block.get(), static_cast<uint32_t>(file.size()), nullptr, 1,
-                                              0, nullptr);
-    });
-}
+constexpr TryFunction TryFile = ::TryFile<QexTexture_LoadPVRFromFile>;
 
 Bytes File(uint32_t type, uint32_t width, uint32_t height, uint32_t levels = 1, uint32_t surfaces = 1) {
     return pod::WritePvr(PvrNoise(type, width, height, levels, surfaces));
@@ -188,11 +175,31 @@ TEST_F(PvrLoader, PvrtcIsDecoded) {
     }
 }
 
+// Four blocks of which all but the first reach beyond the picture, in either container.
+TEST_F(PvrLoader, Etc1IsDecodedForAGLWithoutIt) {
+    pod::PvrImage pvr = PvrNoise(pod::kPvrEtc1, 6, 5, 1, 1);
+    Ktx ktx = Etc1Ktx();
+    ktx.width = 6;
+    ktx.height = 5;
+    ktx.levels = {pvr.surfaces[0]};
+    Bytes rgba(6 * 5 * 4), rgb;
+    QexDecompressETC(pvr.surfaces[0][0].data(), 6, 5, rgba.data(), 0);
+    for (size_t i = 0; i < rgba.size(); ++i)
+        if (i % 4 != 3) rgb.push_back(rgba[i]);
+    gltapSetInteger(GL_NUM_COMPRESSED_TEXTURE_FORMATS, 0);
+    for (const Bytes& file : {pod::WritePvr(pvr), ktx.File()}) {
+        const Outcome outcome = TryFile(file);
+        ASSERT_EQ(outcome.uploads.size(), 1u) << outcome.out;
+        ExpectUpload(outcome.uploads[0], false, 0, 0, 6, rgb);
+        EXPECT_EQ(outcome.uploads[0].format, GLenum(GL_RGB));
+    }
+}
+
 TEST_F(PvrLoader, NoCutAndNoWordIsTrusted) {
     for (const Bytes& file :
          {File(0x10, 8, 4, 4), File(0x36, 4, 4, 2, 6), OldFile(0x15, 5, 3), File(0x19, 8, 8)}) {
-        ExpectEveryCutRefused(file, TryFile, "ERROR:<QexTexture_LoadPVRFromMem> ");
-        ExpectEveryCutRefused(file, TrySized, "ERROR:<QexTexture_LoadPVRFromMem> ");
+        for (const TryFunction load : {TryFile, &TrySized<QexTexture_LoadPVRFromMemSized>})
+            ExpectEveryCutRefused(file, load, "ERROR:<QexTexture_LoadPVRFromMem> ");
     }
     ExpectNoWordTrusted(File(0x12, 4, 4, 3, 6), 0, 52, TryFile);
     for (const char* path : {"/nonexistent/x.pvr", "/"}) {

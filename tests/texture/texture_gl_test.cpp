@@ -1,6 +1,8 @@
 // Textures as the ready-made programs sample them; what the loaders upload is tested with the loaders.
 #include <GLES2/gl2.h>
 
+#include "support/Capture.h"
+#include "support/ImageFiles.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -117,6 +119,45 @@ TEST_F(TextureTest, BuiltInTexturesAreUniformAtEveryLevel) {
         for (const Rgba& texel : Texels(size, size)) ASSERT_EQ(texel, (Rgba{255, 255, 255, 255}));
         QexTexture_SetBlankNormalMap(0);
         for (const Rgba& texel : Texels(size, size)) ASSERT_EQ(texel, (Rgba{128, 128, 255, 255}));
+    }
+}
+
+// Levels of one grey each.
+pod::PvrImage Greys(uint32_t width, uint32_t height, const std::vector<uint8_t>& greys) {
+    pod::PvrImage image = PvrNoise(pod::kPvrRgba8888, width, height, static_cast<uint32_t>(greys.size()), 1);
+    for (size_t i = 0; i < greys.size(); ++i)
+        std::fill(image.surfaces[0][i].begin(), image.surfaces[0][i].end(), greys[i]);
+    return image;
+}
+
+TEST_F(TextureTest, MipmapsThatAFileLacksAreMade) {
+    Bytes pvr = pod::WritePvr(Greys(8, 8, {90}));
+    PutWord(&pvr, 12, 3);  // its count of mipmaps
+    Ktx ktx;
+    ktx.width = ktx.height = 8;
+    ktx.levels = {{Bytes(256, 90)}};
+    for (const Bytes& file : {pvr, ktx.File()}) {
+        QexTexture texture = {};
+        ASSERT_EQ(QexTexture_LoadPVRFromMem(&texture, file.data(), nullptr, 1, 0, nullptr), 0);
+        // Drawn on one pixel, level 3 is asked for.
+        EXPECT_EQ(Texels(1, 1)[0], (Rgba{90, 90, 90, 90}));
+        QexTexture_Release(&texture);
+    }
+}
+
+TEST_F(TextureTest, WithoutOddMipmapsTheFirstLevelIsDrawn) {
+    const Bytes file = pod::WritePvr(Greys(6, 2, {90, 200, 250}));
+    for (const bool poor : {false, true}) {
+        gltapReset();
+        if (poor) gltapHideExtension("GL_OES_texture_npot");
+        QexTexture texture = {};
+        Capture out(STDOUT_FILENO);
+        EXPECT_EQ(QexTexture_LoadPVRFromMem(&texture, file.data(), nullptr, 1, 0, nullptr), 0);
+        const std::string printed = out.Text();
+        EXPECT_EQ(gltapCount("glTexImage2D"), poor ? 1u : 3u);
+        EXPECT_EQ(printed.find("no mipmaps of 6 x 2 pixels here") != std::string::npos, poor) << printed;
+        EXPECT_EQ(Texels(1, 1)[0], poor ? (Rgba{90, 90, 90, 90}) : (Rgba{250, 250, 250, 250}));
+        QexTexture_Release(&texture);
     }
 }
 

@@ -20,7 +20,7 @@ constexpr size_t kStartBytes = 16;  // enough to tell the formats apart
 // Whether the first block is one that POD files begin with, in either byte order.
 bool IsPod(const std::vector<uint8_t>& start) {
     if (start.size() < 4) return false;
-    const uint32_t id = ReadLE32(start, 0);
+    const uint32_t id = QexImage_ReadWord(start.data());
     return (id >= 1000 && id <= 1003) || id == 0xE8030000u;
 }
 
@@ -28,7 +28,8 @@ bool Describe(const std::string& path, Json* document, std::string* error) {
     std::vector<uint8_t> bytes;
     ReadFileBytes(path, kStartBytes, &bytes, error);
     if (IsPod(bytes)) return DescribeScene(path, document, error);
-    if (IsKtx(bytes) || IsPvr(bytes)) return DescribeContainer(path, document, error);
+    if (QexKtx_Is(BytesOf(bytes)) || QexPvr_Is(BytesOf(bytes)))
+        return DescribeContainer(path, document, error);
     *error = WhyNotPod(path, kReadable);
     if (!error->empty()) return false;
     if (Extension(path) == "tga")
@@ -53,8 +54,8 @@ std::string CleanText(const std::string& text) {
 bool DescribeContainer(const std::string& path, Json* document, std::string* error) {
     std::vector<uint8_t> bytes;
     if (!ReadFileBytes(path, SIZE_MAX, &bytes, error)) return false;
-    if (IsKtx(bytes)) return DescribeKtx(bytes, document, error);
-    if (IsPvr(bytes)) return DescribePvr(bytes, document, error);
+    if (QexKtx_Is(BytesOf(bytes))) return DescribeKtx(bytes, document, error);
+    if (QexPvr_Is(BytesOf(bytes))) return DescribePvr(bytes, document, error);
     *error = "is neither a PVR texture with the header of 52 or 44 bytes nor a KTX 1.1 texture";
     return false;
 }

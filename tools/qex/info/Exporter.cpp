@@ -7,7 +7,7 @@
 #include <sstream>
 #include <vector>
 
-#include "texture/Container.h"
+#include "image/Image.h"
 
 namespace {
 
@@ -30,7 +30,7 @@ ExporterText ReadExporterText(const std::string& path) {
     const uint64_t size = std::filesystem::file_size(path, error);
     std::vector<uint8_t> marker(8);
     while (file && !error && fread(marker.data(), 1, 8, file.get()) == 8) {
-        const uint32_t id = ReadLE32(marker, 0), length = ReadLE32(marker, 4);
+        const uint32_t id = QexImage_ReadWord(&marker[0]), length = QexImage_ReadWord(&marker[4]);
         if (id == kSceneBlock || length > size) break;
         if (id != kOptionsBlock && id != kHistoryBlock) {
             if (fseek(file.get(), static_cast<long>(length), SEEK_CUR) != 0) break;

@@ -1,8 +1,8 @@
+// What PVR and TGA files hold.
+#include "image/Tga.h"
 #include "info/Info.h"
 
 namespace {
-
-constexpr size_t kTgaHeader = 18;
 
 void AddVerdict(const std::string& refusal, Json* document) {
     (*document)["loads"] = refusal.empty();
@@ -34,76 +34,77 @@ const char* const kOrigins[] = {"lower left", "lower right", "upper left", "uppe
 }  // namespace
 
 bool DescribePvr(const std::vector<uint8_t>& file, Json* document, std::string* error) {
-    PvrFile pvr;
-    if (!ReadPvrHeader(file, &pvr)) {
+    QexPvr pvr;
+    if (!QexPvr_ReadHeader(&pvr, BytesOf(file))) {
         *error = "is cut short in the header of a PVR texture";
         return false;
     }
-    document->update({{"format", "PVR"},
-                      {"bytes", file.size()},
-                      {"header", pvr.headerBytes == 52 ? "52 bytes" : "44 bytes, the old one"},
-                      {"pixelType", pvr.format ? pvr.format->title : "unknown"},
-                      {"pixelTypeCode", pvr.typeCode},
-                      {"width", pvr.width},
-                      {"height", pvr.height},
-                      {"levels", pvr.levels},
-                      {"bitsPerPixel", pvr.bitsPerPixel},
-                      {"cubeMap", pvr.cube},
-                      {"surfaces", pvr.surfaces},
-                      {"twiddled", pvr.twiddled},
-                      {"surfaceBytes", pvr.surfaceBytes},
-                      {"pixelBytes", pvr.pixelBytes}});
-    const std::string refusal = PvrRefusal(pvr);
+    const QexImage& image = pvr.image;
+    const QexPVRHeader& header = pvr.header;
+    document->update(
+        {{"format", "PVR"},
+         {"bytes", file.size()},
+         {"header", header.headerSize == kQexPvrHeaderSize ? "52 bytes" : "44 bytes, the old one"},
+         {"pixelType", image.format ? FormatOf(image.format).title : "unknown"},
+         {"pixelTypeCode", header.flags & 0xFF},
+         {"width", image.width},
+         {"height", image.height},
+         {"levels", image.levelCount},
+         {"bitsPerPixel", header.bitsPerPixel},
+         {"cubeMap", pvr.IsCube()},
+         {"surfaces", image.faces},
+         {"twiddled", (header.flags & kQexPvrTwiddled) != 0},
+         {"surfaceBytes", header.dataSize},
+         {"pixelBytes", file.size() - header.headerSize}});
+    const std::string refusal = PvrRefusal(&pvr, file);
     AddVerdict(refusal, document);
     Json& problems = (*document)["problems"];
-    if (refusal.empty() && !MipmapsFit(pvr.width, pvr.height, pvr.levels))
+    if (refusal.empty() && !MipmapsFit(image.width, image.height, image.levelCount))
         problems.push_back(kNoMipmaps);
-    else if (refusal.empty() && pvr.format->coding == PixelFormat::kEtc1 && pvr.levels > 1 &&
-             pvr.levels < FullChain(pvr.width, pvr.height))
+    else if (refusal.empty() && image.format->coding == kQexETC1 && image.levelCount > 1 &&
+             image.levelCount < QexImage_ChainLength(image.width, image.height))
         problems.push_back(kPartialChain);
-    if (refusal.empty() && !pvr.cube && pvr.surfaces > 1)
+    if (refusal.empty() && !pvr.IsCube() && image.faces > 1)
         problems.push_back("it is no cube map: the last of its surfaces is what shows");
-    if (refusal.empty() && pvr.cube && pvr.surfaces < 6)
-        problems.push_back("its cube map has " + std::to_string(pvr.surfaces) + " of 6 faces");
+    if (refusal.empty() && pvr.IsCube() && image.faces < 6)
+        problems.push_back("its cube map has " + std::to_string(image.faces) + " of 6 faces");
     return true;
 }
 
 bool DescribeTga(const std::vector<uint8_t>& file, Json* document, std::string* error) {
-    if (file.size() < kTgaHeader) {
+    if (file.size() < kQexTgaHeaderSize) {
         *error = "is cut short in the header of a TGA image";
         return false;
     }
-    const uint32_t type = file[2], bits = file[16];
-    const uint32_t width = file[12] | static_cast<uint32_t>(file[13]) << 8;
-    const uint32_t height = file[14] | static_cast<uint32_t>(file[15]) << 8;
+    const QexTga tga = QexTga_ReadHeader(file.data());
     document->update({{"format", "TGA"},
                       {"bytes", file.size()},
-                      {"imageType", TgaTypeName(type)},
-                      {"imageTypeCode", type},
-                      {"width", width},
-                      {"height", height},
-                      {"bitsPerPixel", bits},
-                      {"alphaBits", file[17] & 15},
-                      {"origin", kOrigins[file[17] >> 4 & 3]},
-                      {"identifierBytes", file[0]},
-                      {"colourMap", file[1] != 0}});
+                      {"imageType", TgaTypeName(tga.type)},
+                      {"imageTypeCode", tga.type},
+                      {"width", tga.width},
+                      {"height", tga.height},
+                      {"bitsPerPixel", tga.bits},
+                      {"alphaBits", tga.alphaBits},
+                      {"origin", kOrigins[2 * tga.topFirst + tga.rightFirst]},
+                      {"identifierBytes", tga.identifierBytes},
+                      {"colourMap", tga.mapped}});
     std::string refusal;
-    if (TgaTypeName(type) == std::string("unknown") || type == 0)
+    if (TgaTypeName(tga.type) == std::string("unknown") || tga.type == 0)
         refusal = "it is no TGA image with a picture";
-    else if (type != 2 || file[1])
-        refusal = std::string("it is ") + TgaTypeName(type) + "; only uncompressed true colour is read";
-    else if (bits != 24 && bits != 32)
-        refusal = std::to_string(bits) + " bits per pixel; only 24 and 32 are read";
-    else if (!width || !height)
+    else if (tga.type != 2 || tga.mapped)
+        refusal = std::string("it is ") + TgaTypeName(tga.type) + "; only uncompressed true colour is read";
+    else if (tga.bits != 24 && tga.bits != 32)
+        refusal = std::to_string(tga.bits) + " bits per pixel; only 24 and 32 are read";
+    else if (!tga.width || !tga.height)
         refusal = "it has no pixels";
-    else if (kTgaHeader + uint64_t{width} * height * (bits / 8) > file.size())
-        refusal = "cut short: " + std::to_string(file.size() - kTgaHeader) + " bytes of pixels instead of " +
-                  std::to_string(uint64_t{width} * height * (bits / 8));
+    else if (!QexTga_IsWhole(BytesOf(file)))
+        refusal = "cut short: " + std::to_string(file.size() - kQexTgaHeaderSize) +
+                  " bytes of pixels instead of " + std::to_string(tga.PixelBytes());
     AddVerdict(refusal, document);
     Json& problems = (*document)["problems"];
-    if (refusal.empty() && file[0])
+    if (refusal.empty() && tga.identifierBytes)
         problems.push_back("the engine does not skip its identifier field, the picture is shifted");
-    if (refusal.empty() && file[17] & 0x10)
+    if (refusal.empty() && tga.rightFirst)
         problems.push_back("it starts at the right, the picture is mirrored");
     return true;
 }

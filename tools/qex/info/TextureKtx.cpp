@@ -1,5 +1,4 @@
-#include <algorithm>
-
+// What KTX files hold.
 #include "info/Info.h"
 
 namespace {
@@ -7,58 +6,58 @@ namespace {
 constexpr size_t kMostPairs = 1000;  // key and value pairs that are listed
 
 // Key and value pairs as far as they are whole; values that are no text are given by their length.
-Json KeyValues(const std::vector<uint8_t>& file, const KtxFile& ktx) {
+Json KeyValues(const std::vector<uint8_t>& file, const QexKtx& ktx) {
     Json pairs = Json::array();
-    const uint64_t end = std::min<uint64_t>(file.size(), kKtxHeaderBytes + uint64_t{ktx.keyValueBytes});
-    for (uint64_t at = kKtxHeaderBytes; at + 4 <= end && pairs.size() < kMostPairs;) {
-        const uint64_t length = KtxWord(file, ktx, at);
-        at += 4;
-        if (length > end - at) break;
-        const std::string pair(file.begin() + static_cast<long>(at),
-                               file.begin() + static_cast<long>(at + length));
-        const size_t zero = pair.find('\0');
-        if (zero == std::string::npos) break;
-        std::string value = pair.substr(zero + 1);
+    QexKtxPair pair;
+    uint64_t at = kQexKtxHeaderSize;
+    while (pairs.size() < kMostPairs && QexKtx_ReadPair(ktx, BytesOf(file), &at, &pair)) {
+        std::string value(pair.value, pair.valueBytes);
         while (!value.empty() && value.back() == '\0') value.pop_back();
-        if (value.find('\0') != std::string::npos) value = std::to_string(length - zero - 1) + " bytes";
-        pairs.push_back({{"key", CleanText(pair.substr(0, zero))}, {"value", CleanText(value)}});
-        at += (length + 3) / 4 * 4;
+        if (value.find('\0') != std::string::npos) value = std::to_string(pair.valueBytes) + " bytes";
+        pairs.push_back({{"key", CleanText(pair.key)}, {"value", CleanText(value)}});
     }
     return pairs;
+}
+
+// The sizes of the levels that are there; of a file that is refused, also of the one that is at fault.
+Json LevelSizes(const QexImage& image, bool refused) {
+    Json sizes = Json::array();
+    for (uint32_t i = 0; i < image.levelCount + refused && image.levels[i].offset; ++i)
+        sizes.push_back({{"width", image.levels[i].width},
+                         {"height", image.levels[i].height},
+                         {"bytes", image.levels[i].bytes}});
+    return sizes;
 }
 
 }  // namespace
 
 bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* error) {
-    KtxFile ktx;
-    if (!ReadKtxHeader(file, &ktx)) {
+    QexKtx ktx;
+    const QexKtxHeader& header = ktx.header;
+    const QexImage& image = ktx.image;
+    if (!QexKtx_ReadHeader(&ktx, BytesOf(file))) {
         *error = "is cut short in the header of a KTX texture";
         return false;
     }
-    std::vector<TextureLevel> levels;
-    std::string refusal = KtxRefusal(ktx);
-    if (refusal.empty()) refusal = FindKtxLevels(file, ktx, &levels);
-    Json sizes = Json::array();
-    for (const TextureLevel& level : levels)
-        sizes.push_back({{"width", level.width}, {"height", level.height}, {"bytes", level.bytes}});
+    const std::string refusal = KtxRefusal(&ktx, file);
     document->update({{"format", "KTX"},
                       {"bytes", file.size()},
                       {"byteOrder", ktx.swapped ? "the other" : "little-endian"},
-                      {"glType", GlName(ktx.glType)},
-                      {"glTypeSize", ktx.glTypeSize},
-                      {"glFormat", GlName(ktx.glFormat)},
-                      {"glInternalFormat", GlName(ktx.glInternalFormat)},
-                      {"glBaseInternalFormat", GlName(ktx.glBaseInternalFormat)},
-                      {"width", ktx.width},
-                      {"height", ktx.height},
-                      {"depth", ktx.depth},
-                      {"arrayElements", ktx.arrayElements},
-                      {"cubeMap", ktx.faces == 6},
-                      {"faces", ktx.faces},
-                      {"levels", ktx.levels},
-                      {"keyValueBytes", ktx.keyValueBytes},
+                      {"glType", GlName(header.glType)},
+                      {"glTypeSize", header.glTypeSize},
+                      {"glFormat", GlName(header.glFormat)},
+                      {"glInternalFormat", GlName(header.glInternalFormat)},
+                      {"glBaseInternalFormat", GlName(header.glBaseInternalFormat)},
+                      {"width", header.width},
+                      {"height", header.height},
+                      {"depth", header.depth},
+                      {"arrayElements", header.arrayElements},
+                      {"cubeMap", image.faces == 6},
+                      {"faces", image.faces},
+                      {"levels", header.levels},
+                      {"keyValueBytes", header.keyValueBytes},
                       {"keyValues", KeyValues(file, ktx)},
-                      {"levelSizes", sizes},
+                      {"levelSizes", LevelSizes(image, !refusal.empty())},
                       {"loads", refusal.empty()},
                       {"problems", Json::array()}});
     Json& problems = (*document)["problems"];
@@ -66,17 +65,17 @@ bool DescribeKtx(const std::vector<uint8_t>& file, Json* document, std::string* 
         problems.push_back("the engine refuses it: " + refusal);
         return true;
     }
-    if (ktx.Compressed() && !(ktx.format && ktx.format->Compressed()))
-        problems.push_back("only a GL with the extension takes " + GlName(ktx.glInternalFormat));
-    const uint32_t chain = FullChain(ktx.width, ktx.height);
-    if (!MipmapsFit(ktx.width, ktx.height, ktx.levels ? ktx.levels : chain))
+    if (ktx.IsCompressed() && !image.format)
+        problems.push_back("only a GL with the extension takes " + GlName(header.glInternalFormat));
+    const uint32_t chain = QexImage_ChainLength(header.width, header.height);
+    if (!MipmapsFit(header.width, header.height, header.levels ? header.levels : chain))
         problems.push_back(kNoMipmaps);
-    else if (ktx.format && ktx.Compressed() && levels.size() > 1 && levels.size() < chain)
+    else if (image.format && ktx.IsCompressed() && image.levelCount > 1 && image.levelCount < chain)
         problems.push_back(kPartialChain);
-    if (levels.size() < ktx.levels)
-        problems.push_back("level " + std::to_string(levels.size()) +
+    if (image.levelCount < header.levels)
+        problems.push_back("level " + std::to_string(image.levelCount) +
                            " or the one behind it is not of its size: it is made from level 0");
-    if (ktx.depth > 1 || ktx.arrayElements > 0)
+    if (header.depth > 1 || header.arrayElements > 0)
         problems.push_back("only the first picture is read of a volume or an array");
     return true;
 }

@@ -1,3 +1,4 @@
+// qex texture: options, inputs of all kinds, outputs of all kinds.
 #include "texture/Command.h"
 
 #include <algorithm>
@@ -10,6 +11,7 @@
 #include "common/ImageFile.h"
 #include "common/OutputFile.h"
 #include "common/TextureFiles.h"
+#include "image/Tga.h"
 #include "texture/Container.h"
 #include "texture/Formats.h"
 #include "texture/Write.h"
@@ -17,7 +19,6 @@
 namespace {
 
 constexpr int kMaxSide = 8192;
-constexpr uint32_t kRgb = 0x1907, kRgba = 0x1908;
 
 struct Failure {
     int status = 0;
@@ -34,16 +35,17 @@ bool WritesPicture(const TextureOptions& options) {
 
 bool IsTexture(const std::vector<uint8_t>& file, const std::string& path) {
     const bool newer = file.size() >= 4 && memcmp(file.data(), "PVR\x03", 4) == 0;
-    return IsPvr(file) || IsKtx(file) || newer || Extension(path) == "pvr" || Extension(path) == "ktx";
+    return QexPvr_Is(BytesOf(file)) || QexKtx_Is(BytesOf(file)) || newer || Extension(path) == "pvr" ||
+           Extension(path) == "ktx";
 }
 
 // The picture reader fills up a TGA image that is cut short with what lies there.
 bool IsCutTga(const std::vector<uint8_t>& file, const std::string& path) {
-    constexpr size_t kHeader = 18;
-    if (Extension(path) != "tga" || file.size() < kHeader || file[2] < 1 || file[2] > 3) return false;
-    const auto word = [&](size_t at) { return file[at] | size_t{file[at + 1]} << 8; };
-    const size_t map = file[1] ? word(5) * ((file[7] + 7u) / 8) : 0;
-    return kHeader + file[0] + map + word(12) * word(14) * ((file[16] + 7u) / 8) > file.size();
+    if (Extension(path) != "tga" || file.size() < kQexTgaHeaderSize) return false;
+    const QexTga tga = QexTga_ReadHeader(file.data());
+    const uint64_t pixels = uint64_t{tga.width} * tga.height * ((tga.bits + 7) / 8);
+    return tga.type >= 1 && tga.type <= 3 &&
+           kQexTgaHeaderSize + tga.identifierBytes + tga.mapBytes + pixels > file.size();
 }
 
 Failure LoadPicture(const std::vector<uint8_t>& file, const TextureOptions& options, const std::string& path,
@@ -63,7 +65,7 @@ Failure LoadTexture(std::vector<uint8_t> file, const TextureOptions& options, co
     Texture texture;
     std::string error;
     if (!ReadTexture(std::move(file), &texture, &error)) return {1, path + ": " + error};
-    const size_t levels = texture.levels.size(), faces = texture.levels[0].faces.size();
+    const size_t levels = texture.levels.size(), faces = texture.faces;
     const size_t level = static_cast<size_t>(std::max(options.level, 0));
     const size_t first = static_cast<size_t>(std::max(options.face, 0));
     if (level >= levels)
@@ -126,7 +128,8 @@ std::string Misuse(const TextureOptions& options) {
     if (format.rfind("pvrtc", 0) == 0) return "PVRTC is read, not written; expected one of " + FormatNames();
     const PixelFormat* known = FindFormat(format);
     if (!format.empty() && !known) return "'" + format + "' is no format; expected one of " + FormatNames();
-    if (ktx && known && !known->Compressed() && known->glFormat != kRgb && known->glFormat != kRgba)
+    if (ktx && known && !known->Compressed() && known->pixelOrder != kQexGLRGB &&
+        known->pixelOrder != kQexGLRGBA)
         return "the engine takes no " + format + " from KTX files; write a .pvr";
     return "";
 }
@@ -148,9 +151,9 @@ Failure WriteTextures(const TextureOptions& options, const std::vector<Image>& f
     const Failure failure = WriteTexture(options, format, faces, options.output);
     if (failure.status) return failure;
     const std::string warning = options.output + ": warning: ";
-    if (options.mipmaps && !MipmapsFit(width, height, FullChain(width, height)))
+    if (options.mipmaps && !MipmapsFit(width, height, QexImage_ChainLength(width, height)))
         Say(warning + "its sides are no powers of two; a plain GL ES 2.0 has no mipmaps for it");
-    if (format.coding != PixelFormat::kEtc1) {
+    if (format.coding != kQexETC1) {
         if (alpha && !format.alpha) Say(warning + "the picture's alpha is lost in " + format.name);
         return {};
     }

@@ -1,81 +1,40 @@
-// PVR and KTX files: what their headers say, whether the engine takes them, and where their pixels lie.
+// PVR and KTX files: whether the engine takes them, what is wrong with them, and pictures of their pixels.
 #pragma once
 
 #include <cstdint>
 #include <string>
 #include <vector>
 
+#include "image/Ktx.h"
+#include "image/Pvr.h"
 #include "texture/Formats.h"
 
 using TextureBytes = std::vector<uint8_t>;
 
-struct TextureLevel {
-    uint32_t width, height;
-    uint64_t bytes;               // of a face
-    uint64_t rowBytes;            // of uncompressed pixels
-    std::vector<uint64_t> faces;  // where each begins in the file
-};
+inline QexImageBytes BytesOf(const TextureBytes& file) {
+    return {file.data(), file.size()};
+}
 
-// ---- PVR with the legacy header ----
-
-struct PvrFile {
-    const PixelFormat* format;  // null: not known
-    uint32_t headerBytes, typeCode, width, height, levels, surfaces, surfaceBytes, bitsPerPixel;
-    bool cube, twiddled;
-    uint64_t pixelBytes;  // behind the header
-
-    uint64_t LevelsBytes() const;  // of a surface with all its levels
-    uint64_t Stride() const;       // from one surface to the next
-};
-
-bool IsPvr(const TextureBytes& start);
-
-// False when the file is shorter than its header.
-bool ReadPvrHeader(const TextureBytes& file, PvrFile* pvr);
-
-// Why the engine does not take the file; empty when it does.
-std::string PvrRefusal(const PvrFile& pvr);
-
-// ---- KTX 1.1 ----
-
-struct KtxFile {
-    bool swapped;  // the header is in the other byte order
-    uint32_t glType, glTypeSize, glFormat, glInternalFormat, glBaseInternalFormat;
-    uint32_t width, height, depth, arrayElements, faces, levels, keyValueBytes;
-    const PixelFormat* format;  // null: not known
-
-    bool Compressed() const { return !glType || !glFormat; }
-};
-
-constexpr size_t kKtxHeaderBytes = 64;
-
-bool IsKtx(const TextureBytes& start);
-
-// False when the file is shorter than its header.
-bool ReadKtxHeader(const TextureBytes& file, KtxFile* ktx);
-
-// A word of the file in the order of its header.
-uint32_t KtxWord(const TextureBytes& file, const KtxFile& ktx, uint64_t at);
-
-// Adds the levels that are there and returns what is wrong with them. The header is one that KtxRefusal lets
-// through.
-std::string FindKtxLevels(const TextureBytes& file, const KtxFile& ktx, std::vector<TextureLevel>* levels);
-
-// Why the engine does not take the file, judged by its header; empty when it may.
-std::string KtxRefusal(const KtxFile& ktx);
+// Why the engine does not take a file of that header; empty when it does, or with KTX when it may. Levels are
+// looked for where the header allows it.
+std::string PvrRefusal(QexPvr* pvr, const TextureBytes& file);
+std::string KtxRefusal(QexKtx* ktx, const TextureBytes& file);
 
 // "GL_RGBA (0x1908)"; "0" for 0.
 std::string GlName(uint32_t value);
 
-// ---- both ----
-
 struct Texture {
     const PixelFormat* format = nullptr;
-    std::vector<TextureLevel> levels;  // at least one, of at least one face
+    uint32_t faces = 0;
+    std::vector<QexImageLevel> levels;  // at least one, with offsets in the file
     TextureBytes file;
+
+    uint64_t FaceOffset(size_t level, size_t face) const {
+        return levels[level].offset + face * levels[level].stride;
+    }
 };
 
-// One of the two containers, for ReadTexture; a KTX file's pixels are put into the order of this machine.
+// One of the two containers, for ReadTexture; the pixels of a KTX file are put into little-endian order.
 bool ReadPvr(const TextureBytes& file, Texture* texture, std::string* error);
 bool ReadKtx(TextureBytes* file, Texture* texture, std::string* error);
 
@@ -84,13 +43,8 @@ bool ReadTexture(TextureBytes file, Texture* texture, std::string* error);
 
 Image DecodeFace(const Texture& texture, size_t level, size_t face);
 
-uint32_t ReadLE32(const TextureBytes& bytes, size_t at);
-
-// Levels of a whole mipmap chain.
-uint32_t FullChain(uint32_t width, uint32_t height);
-
 // GL ES 2.0 has mipmaps for powers of two alone.
 bool MipmapsFit(uint32_t width, uint32_t height, uint32_t levels);
 
 // What is wrong with the size of a texture; empty when nothing is.
-std::string SizeFault(const PixelFormat* format, uint32_t width, uint32_t height, bool cube, uint32_t levels);
+std::string SizeFault(const QexImage& image, bool cube);

@@ -1,3 +1,4 @@
+// The table of formats, and the pixels of a level in each of them.
 #include "texture/Formats.h"
 
 #include <ETC1/etc1.h>
@@ -7,37 +8,34 @@
 
 namespace {
 
-constexpr auto kPixels = PixelFormat::kPixels;
-constexpr auto kPvrtc = PixelFormat::kPvrtc;
-
-constexpr uint32_t kByte = 0x1401, k4444 = 0x8033, k5551 = 0x8034, k565 = 0x8363;
-constexpr uint32_t kAlpha = 0x1906, kRgb = 0x1907, kRgba = 0x1908, kLuminance = 0x1909,
-                   kLuminanceAlpha = 0x190A, kBgra = 0x80E1;
-
 constexpr char kNo555[] = "GL ES 2.0 has no RGB 555";
 constexpr char kNoBgra[] = "GL ES 2.0 has no BGRA without an extension";
 
+constexpr const QexPixelFormat* kRows = kQexPixelFormats;
+
+// In the order of the engine's table.
 // clang-format off
 const PixelFormat kFormats[] = {
-    {"etc1", "ETC1", 0x36, 4, PixelFormat::kEtc1, false, {}, 0, 0, 0x8D64, nullptr},
-    {"rgba8888", "RGBA 8888", 0x12, 32, kPixels, true, {{0, 8}, {8, 8}, {16, 8}, {24, 8}}, kRgba, kByte, 0x8058, nullptr},
-    {"rgb888", "RGB 888", 0x15, 24, kPixels, false, {{0, 8}, {8, 8}, {16, 8}, {}}, kRgb, kByte, 0x8051, nullptr},
-    {"rgba4444", "RGBA 4444", 0x10, 16, kPixels, true, {{12, 4}, {8, 4}, {4, 4}, {0, 4}}, kRgba, k4444, 0x8056, nullptr},
-    {"rgba5551", "RGBA 5551", 0x11, 16, kPixels, true, {{11, 5}, {6, 5}, {1, 5}, {0, 1}}, kRgba, k5551, 0x8057, nullptr},
-    {"rgb565", "RGB 565", 0x13, 16, kPixels, false, {{11, 5}, {5, 6}, {0, 5}, {}}, kRgb, k565, 0x8D62, nullptr},
-    {"l8", "luminance 8", 0x16, 8, kPixels, false, {{0, 8}, {0, 8}, {0, 8}, {}}, kLuminance, kByte, kLuminance, nullptr},
-    {"la88", "luminance-alpha 88", 0x17, 16, kPixels, true, {{0, 8}, {0, 8}, {0, 8}, {8, 8}}, kLuminanceAlpha, kByte, kLuminanceAlpha, nullptr},
-    {"a8", "alpha 8", 0x1B, 8, kPixels, true, {{}, {}, {}, {0, 8}}, kAlpha, kByte, kAlpha, nullptr},
-    {nullptr, "BGRA 8888", 0x1A, 32, kPixels, true, {{16, 8}, {8, 8}, {0, 8}, {24, 8}}, kBgra, kByte, kBgra, kNoBgra},
-    {nullptr, "RGB 555", 0x14, 16, PixelFormat::kUnread, false, {}, 0, 0, 0, kNo555},
-    {nullptr, "PVRTC, 2 bits", 0x0C, 2, kPvrtc, true, {}, 0, 0, 0, nullptr},
-    {nullptr, "PVRTC, 4 bits", 0x0D, 4, kPvrtc, true, {}, 0, 0, 0, nullptr},
-    {nullptr, "PVRTC, 2 bits", 0x18, 2, kPvrtc, true, {}, 0, 0, 0x8C03, nullptr},
-    {nullptr, "PVRTC, 4 bits", 0x19, 4, kPvrtc, true, {}, 0, 0, 0x8C02, nullptr},
-    {nullptr, "PVRTC without alpha, 2 bits", kNoPvrType, 2, kPvrtc, false, {}, 0, 0, 0x8C01, nullptr},
-    {nullptr, "PVRTC without alpha, 4 bits", kNoPvrType, 4, kPvrtc, false, {}, 0, 0, 0x8C00, nullptr},
+    {kRows[kQexFormatETC1], "etc1", "ETC1", false, {}, nullptr},
+    {kRows[kQexFormatRGBA8888], "rgba8888", "RGBA 8888", true, {{0, 8}, {8, 8}, {16, 8}, {24, 8}}, nullptr},
+    {kRows[kQexFormatRGB888], "rgb888", "RGB 888", false, {{0, 8}, {8, 8}, {16, 8}, {}}, nullptr},
+    {kRows[kQexFormatRGBA4444], "rgba4444", "RGBA 4444", true, {{12, 4}, {8, 4}, {4, 4}, {0, 4}}, nullptr},
+    {kRows[kQexFormatRGBA5551], "rgba5551", "RGBA 5551", true, {{11, 5}, {6, 5}, {1, 5}, {0, 1}}, nullptr},
+    {kRows[kQexFormatRGB565], "rgb565", "RGB 565", false, {{11, 5}, {5, 6}, {0, 5}, {}}, nullptr},
+    {kRows[kQexFormatL8], "l8", "luminance 8", false, {{0, 8}, {0, 8}, {0, 8}, {}}, nullptr},
+    {kRows[kQexFormatLA88], "la88", "luminance-alpha 88", true, {{0, 8}, {0, 8}, {0, 8}, {8, 8}}, nullptr},
+    {kRows[kQexFormatA8], "a8", "alpha 8", true, {{}, {}, {}, {0, 8}}, nullptr},
+    {kRows[kQexFormatBGRA8888], nullptr, "BGRA 8888", true, {{16, 8}, {8, 8}, {0, 8}, {24, 8}}, kNoBgra},
+    {kRows[kQexFormatRGB555], nullptr, "RGB 555", false, {}, kNo555},
+    {kRows[kQexFormatPVRTC2Plain], nullptr, "PVRTC, 2 bits", true, {}, nullptr},
+    {kRows[kQexFormatPVRTC4Plain], nullptr, "PVRTC, 4 bits", true, {}, nullptr},
+    {kRows[kQexFormatPVRTC2], nullptr, "PVRTC, 2 bits", true, {}, nullptr},
+    {kRows[kQexFormatPVRTC4], nullptr, "PVRTC, 4 bits", true, {}, nullptr},
+    {kRows[kQexFormatPVRTC2RGB], nullptr, "PVRTC without alpha, 2 bits", false, {}, nullptr},
+    {kRows[kQexFormatPVRTC4RGB], nullptr, "PVRTC without alpha, 4 bits", false, {}, nullptr},
 };
 // clang-format on
+static_assert(sizeof kFormats / sizeof *kFormats == kQexFormatCount);
 
 uint32_t Rounded(uint32_t value, uint32_t from, uint32_t to) {
     return (value * to + from / 2) / from;
@@ -109,21 +107,8 @@ const PixelFormat* FindFormat(const std::string& name) {
     return nullptr;
 }
 
-const PixelFormat* FindPvrFormat(uint32_t pvrType) {
-    for (const PixelFormat& format : kFormats)
-        if (format.pvrType == pvrType) return &format;
-    return nullptr;
-}
-
-const PixelFormat* FindKtxFormat(uint32_t glFormat, uint32_t glType, uint32_t glInternalFormat) {
-    const bool compressed = !glFormat || !glType;
-    for (const PixelFormat& format : kFormats) {
-        if (!format.glInternalFormat || format.Compressed() != compressed) continue;
-        if (compressed ? format.glInternalFormat == glInternalFormat
-                       : format.glFormat == glFormat && format.glType == glType)
-            return &format;
-    }
-    return nullptr;
+const PixelFormat& FormatOf(const QexPixelFormat* row) {
+    return kFormats[row - kQexPixelFormats];
 }
 
 std::string FormatNames() {
@@ -133,16 +118,8 @@ std::string FormatNames() {
     return names;
 }
 
-uint64_t LevelBytes(const PixelFormat& format, uint32_t width, uint32_t height) {
-    if (format.coding == PixelFormat::kEtc1) return uint64_t{(width + 3) / 4} * ((height + 3) / 4) * 8;
-    if (format.coding == kPvrtc)
-        return uint64_t{std::max(width, format.bits == 2 ? 16u : 8u)} * std::max(height, 8u) * format.bits /
-               8;
-    return uint64_t{width} * height * format.bits / 8;
-}
-
 std::vector<uint8_t> EncodeLevel(const PixelFormat& format, const Image& image) {
-    return format.coding == PixelFormat::kEtc1 ? EncodeEtc1(image) : EncodePixels(format, image);
+    return format.coding == kQexETC1 ? EncodeEtc1(image) : EncodePixels(format, image);
 }
 
 Image DecodeLevel(const PixelFormat& format, const uint8_t* data, uint32_t width, uint32_t height,
@@ -151,9 +128,9 @@ Image DecodeLevel(const PixelFormat& format, const uint8_t* data, uint32_t width
     image.width = static_cast<int>(width);
     image.height = static_cast<int>(height);
     image.pixels.resize(size_t{width} * height * 4);
-    if (format.coding == PixelFormat::kEtc1)
+    if (format.coding == kQexETC1)
         QexDecompressETC(data, image.width, image.height, image.pixels.data(), 0);
-    else if (format.coding == kPvrtc)
+    else if (format.coding == kQexPVRTC)
         QexDecompressPVRTC(data, format.bits == 2, image.width, image.height, image.pixels.data());
     else
         DecodePixels(format, data, rowBytes, &image);

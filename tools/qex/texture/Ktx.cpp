@@ -1,14 +1,10 @@
+// KTX files: what is wrong with them, their faces, and the names of what they hold.
 #include <algorithm>
 #include <cstdio>
-#include <cstring>
 
 #include "texture/Container.h"
 
 namespace {
-
-constexpr uint32_t kSwappedEndianness = 0x01020304;  // anything else counts as little-endian
-const uint8_t kIdentifier[12] = {0xAB, 'K', 'T', 'X', ' ', '1', '1', 0xBB, '\r', '\n', 0x1A, '\n'};
-constexpr uint32_t kRgb = 0x1907, kRgba = 0x1908;
 
 const struct {
     uint32_t value;
@@ -52,31 +48,30 @@ const struct {
     {0x9278, "GL_COMPRESSED_RGBA8_ETC2_EAC"},
 };
 
-uint32_t Swapped(uint32_t word) {
-    return word >> 24 | (word >> 8 & 0xFF00) | (word << 8 & 0xFF0000) | word << 24;
+// What is wrong with a header whatever reads it.
+std::string KtxFault(const QexKtx& ktx) {
+    const QexImage& image = ktx.image;
+    if (image.faults & kQexFaultFaces) return std::to_string(image.faces) + " faces instead of 1 or 6";
+    if (!image.width || !image.height) return "it has no pixels of two dimensions";
+    return SizeFault(image, image.faces == 6);
 }
 
-// Bytes of a row in a level of `bytes` bytes: rows padded to 4 bytes, as the format asks, or tight, as some
-// writers have it. 0 when the level is neither, and for blocks that are not of their size.
-uint64_t RowBytes(const PixelFormat& format, uint32_t width, uint32_t height, uint32_t bytes) {
-    const uint64_t tight = uint64_t{width} * format.bits / 8, padded = (tight + 3) / 4 * 4;
-    if (format.Compressed()) return bytes == LevelBytes(format, width, height) ? 1 : 0;
-    return bytes == padded * height ? padded : bytes == tight * height ? tight : 0;
+// Finds the levels of a file whose header is in order; returns what is wrong with them.
+std::string FindLevels(QexKtx* ktx, const TextureBytes& file) {
+    if (QexKtx_FindLevels(ktx, BytesOf(file), ktx->image.levelCount)) return "";
+    const std::string level = "level " + std::to_string(ktx->faultLevel);
+    if (ktx->image.faults & kQexFaultCut) return "cut short in " + level;
+    return level + " of " + std::to_string(ktx->image.levels[ktx->faultLevel].bytes) +
+           " bytes is not of its size";
 }
 
-// What is wrong with a file whatever reads it.
-std::string KtxFault(const KtxFile& ktx) {
-    if (ktx.faces != 1 && ktx.faces != 6) return std::to_string(ktx.faces) + " faces instead of 1 or 6";
-    if (!ktx.width || !ktx.height) return "it has no pixels of two dimensions";
-    return SizeFault(ktx.format, ktx.width, ktx.height, ktx.faces == 6, std::max(ktx.levels, 1u));
-}
-
-// Turns 16-bit pixels into the order of this machine.
 void SwapPixels(const Texture& texture, TextureBytes* file) {
-    for (const TextureLevel& level : texture.levels)
-        for (const uint64_t face : level.faces)
-            for (uint64_t at = face; at + 1 < face + level.bytes; at += 2)
-                std::swap((*file)[static_cast<size_t>(at)], (*file)[static_cast<size_t>(at + 1)]);
+    for (size_t level = 0; level < texture.levels.size(); ++level)
+        for (size_t face = 0; face < texture.faces; ++face) {
+            uint8_t* pixels = file->data() + texture.FaceOffset(level, face);
+            for (uint64_t i = 0; i + 1 < texture.levels[level].bytes; i += 2)
+                std::swap(pixels[i], pixels[i + 1]);
+        }
 }
 
 }  // namespace
@@ -93,88 +88,41 @@ std::string GlName(uint32_t value) {
     return text;
 }
 
-bool IsKtx(const TextureBytes& start) {
-    return start.size() >= sizeof kIdentifier && memcmp(start.data(), kIdentifier, sizeof kIdentifier) == 0;
-}
-
-uint32_t KtxWord(const TextureBytes& file, const KtxFile& ktx, uint64_t at) {
-    const uint32_t word = ReadLE32(file, static_cast<size_t>(at));
-    return ktx.swapped ? Swapped(word) : word;
-}
-
-bool ReadKtxHeader(const TextureBytes& file, KtxFile* ktx) {
-    if (file.size() < kKtxHeaderBytes) return false;
-    uint32_t* const fields[] = {
-        &ktx->glType, &ktx->glTypeSize,   &ktx->glFormat, &ktx->glInternalFormat, &ktx->glBaseInternalFormat,
-        &ktx->width,  &ktx->height,       &ktx->depth,    &ktx->arrayElements,    &ktx->faces,
-        &ktx->levels, &ktx->keyValueBytes};
-    ktx->swapped = ReadLE32(file, 12) == kSwappedEndianness;
-    uint64_t at = 16;
-    for (uint32_t* field : fields) {
-        *field = KtxWord(file, *ktx, at);
-        at += 4;
-    }
-    if (!ktx->faces) ktx->faces = 1;  // a picture of no faces is a picture
-    ktx->format = FindKtxFormat(ktx->glFormat, ktx->glType, ktx->glInternalFormat);
-    return true;
-}
-
-// As the engine does it: where a level is not of its size, those before it stay, but one whose rows may have
-// been read shifted.
-std::string FindKtxLevels(const TextureBytes& file, const KtxFile& ktx, std::vector<TextureLevel>* levels) {
-    uint64_t at = kKtxHeaderBytes + uint64_t{ktx.keyValueBytes};
-    const uint64_t size = file.size();
-    for (uint32_t i = 0; i < std::max(ktx.levels, 1u); ++i) {
-        if (at + 4 > size) return "cut short in level " + std::to_string(i);
-        const uint32_t width = std::max(ktx.width >> i, 1u), height = std::max(ktx.height >> i, 1u);
-        const uint32_t bytes = KtxWord(file, ktx, at);
-        TextureLevel level = {width, height, bytes, 0, {}};
-        const uint64_t padded = (uint64_t{bytes} + 3) / 4 * 4;
-        for (uint32_t face = 0; face < ktx.faces; ++face) level.faces.push_back(at + 4 + face * padded);
-        if (ktx.format) level.rowBytes = RowBytes(*ktx.format, width, height, bytes);
-        if (i > 0 && ktx.format && !level.rowBytes) {
-            const bool shifted = !ktx.Compressed() && levels->back().width * ktx.format->bits / 8 % 4;
-            if (shifted && i > 1) levels->pop_back();
-            return "";
-        }
-        levels->push_back(level);
-        // The padding behind the last face may be missing.
-        if (level.faces.back() + bytes > size) return "cut short in level " + std::to_string(i);
-        if (ktx.format && !level.rowBytes)
-            return "level " + std::to_string(i) + " of " + std::to_string(bytes) +
-                   " bytes is not of its size";
-        at += 4 + ktx.faces * padded;
-    }
-    return "";
-}
-
-std::string KtxRefusal(const KtxFile& ktx) {
-    const bool takesPixels = ktx.format && (ktx.glFormat == kRgb || ktx.glFormat == kRgba) &&
-                             ktx.glBaseInternalFormat == ktx.glFormat;
-    if (!ktx.Compressed() && !takesPixels)
-        return "it takes RGB and RGBA pixels of bytes or of 16 bits, not " + GlName(ktx.glFormat) + " of " +
-               GlName(ktx.glType) +
-               (ktx.glBaseInternalFormat == ktx.glFormat ? "" : " as " + GlName(ktx.glBaseInternalFormat));
-    return KtxFault(ktx);
+std::string KtxRefusal(QexKtx* ktx, const TextureBytes& file) {
+    const QexKtxHeader& header = ktx->header;
+    const bool sameBase = header.glBaseInternalFormat == header.glFormat;
+    const bool takesPixels =
+        ktx->image.format && sameBase && (header.glFormat == kQexGLRGB || header.glFormat == kQexGLRGBA);
+    if (!ktx->IsCompressed() && !takesPixels)
+        return "it takes RGB and RGBA pixels of bytes or of 16 bits, not " + GlName(header.glFormat) +
+               " of " + GlName(header.glType) +
+               (sameBase ? "" : " as " + GlName(header.glBaseInternalFormat));
+    const std::string fault = KtxFault(*ktx);
+    return fault.empty() ? FindLevels(ktx, file) : fault;
 }
 
 bool ReadKtx(TextureBytes* file, Texture* texture, std::string* error) {
-    KtxFile ktx;
-    if (!ReadKtxHeader(*file, &ktx)) {
+    QexKtx ktx;
+    const QexImage& image = ktx.image;
+    const QexKtxHeader& header = ktx.header;
+    if (!QexKtx_ReadHeader(&ktx, BytesOf(*file))) {
         *error = "is cut short in the header of a KTX texture";
         return false;
     }
-    if (!ktx.format)
-        *error = ktx.Compressed()
-                     ? "the compressed format " + GlName(ktx.glInternalFormat) + " is not read"
-                     : "pixels of " + GlName(ktx.glFormat) + " and " + GlName(ktx.glType) + " are not read";
-    else if (ktx.depth > 1 || ktx.arrayElements > 0)
+    if (!image.format)
+        *error =
+            ktx.IsCompressed()
+                ? "the compressed format " + GlName(header.glInternalFormat) + " is not read"
+                : "pixels of " + GlName(header.glFormat) + " and " + GlName(header.glType) + " are not read";
+    else if (header.depth > 1 || header.arrayElements > 0)
         *error = "volumes and arrays are not read";
     else
         *error = KtxFault(ktx);
-    if (error->empty()) *error = FindKtxLevels(*file, ktx, &texture->levels);
+    if (error->empty()) *error = FindLevels(&ktx, *file);
     if (!error->empty()) return false;
-    texture->format = ktx.format;
-    if (ktx.swapped && ktx.glTypeSize == 2) SwapPixels(*texture, file);
+    texture->format = &FormatOf(image.format);
+    texture->faces = image.faces;
+    texture->levels.assign(image.levels, image.levels + image.levelCount);
+    if (ktx.HasSwappedPixels()) SwapPixels(*texture, file);
     return true;
 }

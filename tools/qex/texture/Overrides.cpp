@@ -1,3 +1,4 @@
+// Checks and finds textures that a command line gives to materials.
 #include "texture/Overrides.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Encodes the levels of pictures and hands them to the writers of the two containers.
 #include "texture/Write.h"
 
 #include <algorithm>
@@ -6,8 +7,6 @@
 #include "PvrWriter.h"
 
 namespace {
-
-constexpr uint32_t kRgb = 0x1907;
 
 // [face][level], as both writers want them.
 std::vector<std::vector<std::vector<uint8_t>>> EncodeFaces(const std::vector<Image>& faces,
@@ -60,10 +59,10 @@ std::vector<uint8_t> EncodePvrFile(const std::vector<Image>& faces, const PixelF
 std::vector<uint8_t> EncodeKtxFile(const std::vector<Image>& faces, const PixelFormat& format, bool mipmaps,
                                    bool flipped) {
     pod::KtxImage ktx;
-    ktx.glType = format.glType;
-    ktx.glFormat = format.glFormat;
-    ktx.glInternalFormat = format.glInternalFormat;
-    ktx.glBaseInternalFormat = format.Compressed() ? kRgb : format.glFormat;
+    ktx.glType = format.pixelType;
+    ktx.glFormat = format.pixelOrder;
+    ktx.glInternalFormat = format.glInternal;
+    ktx.glBaseInternalFormat = format.Compressed() ? kQexGLRGB : format.pixelOrder;
     ktx.pixelBytes = format.Compressed() ? 0 : format.bits / 8;
     ktx.width = static_cast<uint32_t>(faces[0].width);
     ktx.height = static_cast<uint32_t>(faces[0].height);
