@@ -12,7 +12,7 @@
  *   Qex/pod.h              POD scenes: records, reading, vertex access
  *   Qex/pod_animation.h    POD scenes that move: bone batching, animation and world matrices
  *   Qex/meshes.h           meshes of plain arrays
- *   Qex/decoders.h         decoders of compressed pixels
+ *   Qex/images.h           images in files: codes of their pixels, the PVR header, decoders
  *   Qex/renderer.h         the context record, render state, renderer settings, stereo, shaders and programs
  *   Qex/textures.h         textures and render targets
  *   Qex/shader_modules.h   the built-in shader modules, and the records that they draw
@@ -43,10 +43,10 @@
 #define QEX_H
 
 #include "Qex/base.h"
-#include "Qex/decoders.h"
 #include "Qex/effects.h"
 #include "Qex/engine.h"
 #include "Qex/geometry.h"
+#include "Qex/images.h"
 #include "Qex/math.h"
 #include "Qex/meshes.h"
 #include "Qex/models.h"

@@ -5,6 +5,13 @@
 
 #include "base/Diagnostics.h"
 #include "overlay/Font.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
+#include "Qex/engine.h"
+#include "Qex/models.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 namespace {
 

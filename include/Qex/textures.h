@@ -3,6 +3,7 @@
 #define QEX_TEXTURES_H
 
 #include "Qex/base.h"
+#include "Qex/images.h"
 
 QEX_BEGIN
 
@@ -16,12 +17,6 @@ QEX_BEGIN
 /** Flags of a texture record. */
 #define QEX_TEXFLAG_OWNS_PIXELS 0x10u /* `pixels` belong to the record and go with it */
 #define QEX_TEXFLAG_CUBEMAP 0x80u     /* the GL object is a cube map */
-
-/** Format codes. */
-#define QEX_TEXFMT_RGBA8888 1
-#define QEX_TEXFMT_RGB888 2
-#define QEX_TEXFMT_RGBA4444 3
-#define QEX_TEXFMT_RGBA5551 4
 
 /** Filter modes. */
 #define QEX_FILTER_NEAREST 1
@@ -140,23 +135,6 @@ QEX_API int32_t QexTexture_ReleaseDefault(void);
  *  @param size     edge in pixels, > 0
  *  @return 0, or -1, with a line printed, for a size that the GL does not take or when memory runs out. */
 QEX_API int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t size);
-
-/** The legacy PVR header, as QexTexture_LoadPVRFromMem gives it back. */
-typedef struct QexPVRHeader {
-    uint32_t headerSize;  /* 52, or 44 for the oldest files */
-    uint32_t height;      /* pixels */
-    uint32_t width;       /* pixels */
-    uint32_t mipmapCount; /* levels below level 0 */
-    uint32_t flags;       /* bits 0..7 pixel type; 0x100 mipmaps, 0x200 twiddled, 0x1000 cube map */
-    uint32_t dataSize;    /* bytes of one surface with all its levels */
-    uint32_t bitsPerPixel;
-    uint32_t redMask;
-    uint32_t greenMask;
-    uint32_t blueMask;
-    uint32_t alphaMask;
-    uint32_t tag; /* "PVR!" */
-    uint32_t numSurfaces;
-} QexPVRHeader;
 
 /** Loads a legacy PVR image, or a KTX 1.1 image, from memory. ETC1 goes to the GL as it is, or is decoded to
  *  RGB where the GL does not take it or mipmaps are missing; PVRTC is decoded to RGBA. Where the header asks

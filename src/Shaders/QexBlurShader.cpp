@@ -1,6 +1,9 @@
 // One direction of a Gaussian blur over the screen.
 #include <cstring>
 
+#include "Qex/math.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 

@@ -1,4 +1,7 @@
 // The mix of a sharp and a blurred picture by depth.
+#include "Qex/math.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 

@@ -1,4 +1,7 @@
 // Depth as a grey level.
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexShaderModule.h"
 

@@ -1,5 +1,10 @@
 // Lights, material and shadow as the lit modules' uniforms take them.
 #include "Shaders/QexLitShader.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 #include <cstring>
 

@@ -2,6 +2,9 @@
 // Render.
 #pragma once
 
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
 // What a module has beside diffuse light.

@@ -3,6 +3,8 @@
 // are read afterwards.
 #pragma once
 
+#include "Qex/math.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
 // The first slots of such a module. Its description leaves the names of the two attributes empty.

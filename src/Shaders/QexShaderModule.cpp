@@ -5,6 +5,13 @@
 
 #include "pod/Animation.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE (type->path)
 

@@ -12,7 +12,9 @@
 
 #include "gl/GL.h"
 #include "gl/Program.h"
-#include "Qex.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 
 // The uniforms of all modules: one list that gives names and numbers.
 #define QEX_SHADER_UNIFORMS(X) \

@@ -1,5 +1,6 @@
 // Modules by number.
-#include "Qex.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
 
 namespace {
 

@@ -1,4 +1,7 @@
 // Flat white: a mask.
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
 #define QEX_MODULE (kType.path)

@@ -1,4 +1,5 @@
 // Light per vertex and highlights per fragment, on bones.
+#include "Qex/shader_modules.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexLitShader.h"
 

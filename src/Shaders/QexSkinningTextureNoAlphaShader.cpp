@@ -1,4 +1,7 @@
 // Unlit, alpha from the texture, on bones.
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexSkinningTextureShader.h"
 #include "Shaders/QexTextureShader.h"
 

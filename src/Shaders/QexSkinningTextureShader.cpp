@@ -1,6 +1,9 @@
 // Unlit, alpha from the alpha texture, on bones.
 #include "Shaders/QexSkinningTextureShader.h"
 
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexTextureShader.h"
 

@@ -1,6 +1,7 @@
 // What the unlit skinned modules have in common.
 #pragma once
 
+#include "Qex/math.h"
 #include "Shaders/QexShaderModule.h"
 
 // Puts a skinned vertex on the screen and passes its texture coordinates on.

@@ -1,4 +1,7 @@
 // Unlit, alpha from the texture.
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexTextureShader.h"
 
 const char* const kQexTextureNoAlphaFragmentSource = R"(

@@ -2,6 +2,7 @@
 // set.
 #pragma once
 
+#include "Qex/math.h"
 #include "Shaders/QexShaderModule.h"
 
 extern const char* const kQexTextureVertexSource;

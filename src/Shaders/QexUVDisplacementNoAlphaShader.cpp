@@ -1,6 +1,9 @@
 // Unlit, alpha from the texture, with shifted texture coordinates.
 #include "Shaders/QexUVDisplacementShader.h"
 
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexTextureShader.h"
 
 namespace {

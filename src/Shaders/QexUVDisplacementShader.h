@@ -1,6 +1,8 @@
 // What the two modules that shift texture coordinates have in common.
 #pragma once
 
+#include "Qex/math.h"
+#include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
 extern const char* const kQexUVDisplacementVertexSource;

@@ -2,6 +2,8 @@
 // uses is declared here with the same contract, and AndroidLog.cpp defines it over standard error.
 #pragma once
 
+#include "Qex/base.h"
+
 #if defined(__ANDROID__)
 #include <android/log.h>
 #else

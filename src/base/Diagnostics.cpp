@@ -9,6 +9,7 @@
 
 #include "base/AndroidLog.h"
 #include "base/Formatted.h"
+#include "Qex/base.h"
 
 namespace {
 

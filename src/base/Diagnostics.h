@@ -9,7 +9,7 @@
 #include <cstdint>
 #include <cstdio>
 
-#include "Qex.h"
+#include "Qex/base.h"
 
 // Logs the GL error with its place, in a second line the source file, as a module may have several, at any
 // level, and ends the process with exit status 255.

@@ -4,7 +4,7 @@
 
 #include <cstring>
 
-#include "Qex.h"
+#include "Qex/base.h"
 
 // An uninitialised block of `count` elements, one byte where that is none; null when it cannot be had.
 template <class T>

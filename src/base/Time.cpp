@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "Qex/base.h"
 
 namespace {
 

@@ -1,7 +1,8 @@
 // Growable caches: entries of one size by index, and the same with names.
 #include <cstring>
 
-#include "Qex.h"
+#include "Qex/base.h"
+#include "Qex/resources.h"
 
 namespace {
 

@@ -7,6 +7,8 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "Qex/base.h"
+#include "Qex/resources.h"
 
 namespace {
 

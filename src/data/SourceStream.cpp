@@ -2,6 +2,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "Qex/base.h"
+#include "Qex/resources.h"
 
 namespace {
 

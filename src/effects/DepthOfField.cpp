@@ -4,9 +4,15 @@
 #include "gl/GL.h"
 #include "gl/Program.h"
 #include "gl/Quad.h"
-#include "texture/RenderTarget.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
+#include "Qex/math.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
+#include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexPostProcessing"
 

@@ -3,6 +3,13 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexParticle"
 

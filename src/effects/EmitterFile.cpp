@@ -6,6 +6,8 @@
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
 #include "data/ResFile.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
 
 #define QEX_MODULE "src/QexParticle"
 

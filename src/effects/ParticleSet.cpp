@@ -2,6 +2,12 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "gl/Program.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexParticle"
 

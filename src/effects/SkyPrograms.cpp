@@ -2,6 +2,9 @@
 #include "effects/SkyPrograms.h"
 
 #include "gl/Program.h"
+#include "Qex/base.h"
+#include "Qex/effects.h"
+#include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexSkyBox"
 

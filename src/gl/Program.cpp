@@ -3,6 +3,8 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "Qex/base.h"
+#include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexShader"
 

@@ -2,7 +2,8 @@
 // Names are 0 where there is no object.
 #pragma once
 
-#include "Qex.h"
+#include <cstddef>
+#include <cstdint>
 
 // What a program is made of.
 struct QexProgramSource {

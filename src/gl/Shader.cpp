@@ -3,6 +3,9 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "Qex/base.h"
+#include "Qex/renderer.h"
+#include "Qex/resources.h"
 
 #define QEX_MODULE "src/QexShader"
 

@@ -1,5 +1,6 @@
 // The state cache, and the renderer's settings.
 #include "gl/GL.h"
+#include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
 

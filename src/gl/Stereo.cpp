@@ -1,5 +1,6 @@
 // Two pictures in one: colour masks or halves of the screen.
 #include "gl/GL.h"
+#include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
 

@@ -1,6 +1,7 @@
 // The two programs that applications draw their own meshes with: textured with vertex colours, or lit.
 #include "gl/GL.h"
 #include "gl/Program.h"
+#include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
 

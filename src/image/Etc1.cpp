@@ -1,7 +1,7 @@
 // ETC1 is blocks of 4 x 4 pixels: two halves, each with a base colour and a row of four distances from it.
 #include "base/Memory.h"
 #include "image/Lanes.h"
-#include "Qex.h"
+#include "Qex/images.h"
 
 namespace {
 

@@ -9,6 +9,8 @@
 #include <cstdint>
 #include <cstring>
 
+#include "Qex/base.h"
+
 static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__, "pixels are put together from 16-bit lanes");
 
 #define QEX_INLINE inline __attribute__((always_inline))

@@ -2,7 +2,7 @@
 #pragma once
 
 #include "image/Image.h"
-#include "Qex.h"
+#include "Qex/images.h"
 
 constexpr uint32_t kQexPvrHeaderSize = 52, kQexPvrOldHeaderSize = 44;
 constexpr uint32_t kQexPvrTag = 0x21525650;  // "PVR!"

@@ -4,7 +4,8 @@
 // of and below the upper left one, and takes a quarter of the weights of each.
 #include "image/Image.h"
 #include "image/Lanes.h"
-#include "Qex.h"
+#include "Qex/images.h"
+#include "Qex/math.h"
 
 namespace {
 

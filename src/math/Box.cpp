@@ -2,7 +2,8 @@
 #include <cfloat>
 #include <initializer_list>
 
-#include "Qex.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 
 namespace {
 

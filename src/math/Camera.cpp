@@ -2,7 +2,8 @@
 #include <cmath>
 #include <initializer_list>
 
-#include "Qex.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 
 int32_t QexCamera_Create(QexCamera* camera, int32_t tag) {
     *camera = {};

@@ -4,7 +4,7 @@
 
 #include <cstring>
 
-#include "Qex.h"
+#include "Qex/base.h"
 
 typedef float Float4 __attribute__((vector_size(16)));
 typedef double Double4 __attribute__((vector_size(32)));

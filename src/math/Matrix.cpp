@@ -4,6 +4,9 @@
 
 #include "math/Float4.h"
 #include "math/Pi.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 
 const QexMatrix g_sMatIdentity = {{1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1}};
 

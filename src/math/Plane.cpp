@@ -4,7 +4,8 @@
 #include <cstring>
 #include <ctime>
 
-#include "Qex.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
 
 namespace {
 

@@ -3,6 +3,7 @@
 
 #include "math/Float4.h"
 #include "math/Pi.h"
+#include "Qex/math.h"
 
 namespace {
 

@@ -3,7 +3,7 @@
 #include <cmath>
 
 #include "math/Pi.h"
-#include "Qex.h"
+#include "Qex/math.h"
 
 namespace {
 

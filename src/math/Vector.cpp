@@ -1,7 +1,7 @@
 // Vectors of two, three and four floats.
 #include <cmath>
 
-#include "Qex.h"
+#include "Qex/math.h"
 
 void QexVec2_Set(QexVec2* out, float x, float y) {
     *out = {x, y};

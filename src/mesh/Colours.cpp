@@ -5,6 +5,7 @@
 // between its vertices would.
 #include "base/Memory.h"
 #include "mesh/Mesh.h"
+#include "Qex/meshes.h"
 
 namespace {
 

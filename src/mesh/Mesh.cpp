@@ -8,6 +8,9 @@
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
 #include "math/Pi.h"
+#include "Qex/base.h"
+#include "Qex/math.h"
+#include "Qex/meshes.h"
 
 #define QEX_MODULE "src/QexMesh"
 

@@ -1,7 +1,8 @@
 // Meshes of plain arrays, for the engine's own modules.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/math.h"
+#include "Qex/meshes.h"
 
 // Arrays of a mesh in one block that the mesh owns. False, with the mesh empty, without memory. Which arrays
 // there are is the caller's choice; the pointers are to be written through.

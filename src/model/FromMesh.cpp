@@ -6,6 +6,15 @@
 #include "mesh/Mesh.h"
 #include "model/Model.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/images.h"
+#include "Qex/math.h"
+#include "Qex/meshes.h"
+#include "Qex/models.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexModel"
 

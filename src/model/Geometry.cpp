@@ -7,6 +7,10 @@
 #include "model/Model.h"
 #include "pod/Rebatch.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 #define QEX_MODULE "src/QexModel"
 

@@ -6,6 +6,13 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/models.h"
+#include "Qex/pod.h"
+#include "Qex/resources.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexModel"
 

@@ -4,7 +4,9 @@
 // QexModel_ReleaseShader count.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/shader_modules.h"
 
 struct QexModelSharedShaders {
     QexShaderModule* texture;  // null while there are none

@@ -2,7 +2,13 @@
 #include <cmath>
 
 #include "math/Pi.h"
-#include "Qex.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
+#include "Qex/renderer.h"
+#include "Qex/scene_nodes.h"
+#include "Qex/shader_modules.h"
 
 namespace {
 

@@ -5,6 +5,15 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "model/Model.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/models.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/shadows.h"
 
 #define QEX_MODULE "src/QexModel"
 

@@ -7,6 +7,15 @@
 #include "model/Model.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/models.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/shadows.h"
 
 namespace {
 

@@ -2,7 +2,12 @@
 #include <cstddef>
 #include <cstring>
 
-#include "Qex.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/models.h"
+#include "Qex/scene_nodes.h"
+#include "Qex/shader_modules.h"
 
 namespace {
 

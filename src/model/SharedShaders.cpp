@@ -3,8 +3,13 @@
 
 #include "gl/GL.h"
 #include "gl/Program.h"
-#include "texture/RenderTarget.h"
 #include "model/Model.h"
+#include "Qex/base.h"
+#include "Qex/models.h"
+#include "Qex/renderer.h"
+#include "Qex/shader_modules.h"
+#include "Qex/shadows.h"
+#include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexModel"
 

@@ -4,6 +4,11 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "Qex/base.h"
+#include "Qex/models.h"
+#include "Qex/resources.h"
+#include "Qex/shader_modules.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexModel"
 

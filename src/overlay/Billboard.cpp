@@ -6,6 +6,12 @@
 #include "gl/Program.h"
 #include "gl/Quad.h"
 #include "math/Float4.h"
+#include "Qex/base.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexBillboard"
 

@@ -9,6 +9,12 @@
 #include "gl/GL.h"
 #include "gl/Program.h"
 #include "overlay/FontLatin.h"
+#include "Qex/base.h"
+#include "Qex/images.h"
+#include "Qex/math.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexFont"
 

@@ -3,7 +3,7 @@
 // It lives from QexFont_Create to QexFont_Release; before and after, the names are 0.
 #pragma once
 
-#include "Qex.h"
+#include <cstdint>
 
 struct QexFontProgram {
     uint32_t program;  // GL names

@@ -2,8 +2,7 @@
 //
 // Capitals and figures take the cell rows 2 to 11, small letters begin at row 5, descenders reach row 14.
 // Column 7 stays free, so that letters never touch.
-
-#include "Qex.h"
+#include "Qex/overlay.h"
 
 namespace {
 

@@ -6,6 +6,11 @@
 #include "image/Ktx.h"
 #include "image/Pvr.h"
 #include "image/Tga.h"
+#include "Qex/base.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/resources.h"
+#include "Qex/textures.h"
 
 namespace {
 

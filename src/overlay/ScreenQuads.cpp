@@ -2,6 +2,10 @@
 #include "gl/GL.h"
 #include "gl/Quad.h"
 #include "overlay/Font.h"
+#include "Qex/base.h"
+#include "Qex/overlay.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexFont"
 

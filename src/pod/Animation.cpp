@@ -4,6 +4,9 @@
 #include <cstring>
 
 #include "pod/Types.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 namespace {
 

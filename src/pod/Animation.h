@@ -3,7 +3,8 @@
 // The pointer is good until a frame or an override changes; drawing code uses it at once.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
 
 inline uint32_t QexPODAnimation_LastFrame(const QexPODModel* scene) {
     return scene->frameCount ? scene->frameCount - 1 : 0;

@@ -5,6 +5,9 @@
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
 #include "pod/MakeBatches.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 #define QEX_MODULE "src/QexBoneBatches"
 

@@ -6,6 +6,8 @@
 
 #include "base/Diagnostics.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
 
 namespace {
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "pod/Extents.h"
+#include "Qex/pod.h"
 
 constexpr uint32_t kPODMaxParents = 1000;  // the world matrix of a node is found by recursion
 

@@ -4,6 +4,9 @@
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
 #include "pod/Values.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/resources.h"
 
 namespace {
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "pod/Reader.h"
+#include "Qex/pod.h"
 
 // The block that the elements of a mesh lie in, if they have none of their own. It comes before them.
 bool QexPODReader_ReadInterleaved(QexPODReader& reader, const QexPODField& field, uint32_t length,

@@ -3,6 +3,9 @@
 
 #include "base/Diagnostics.h"
 #include "pod/Animation.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 namespace {
 

@@ -7,6 +7,8 @@
 
 #include "base/Memory.h"
 #include "pod/Types.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 namespace {
 

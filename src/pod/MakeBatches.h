@@ -1,7 +1,7 @@
 // Bone batching for the engine's own modules and its tools.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/pod.h"
 
 // Where the weights and bone indices of some vertices lie.
 struct QexBoneVertices {

@@ -11,6 +11,9 @@
 #include "pod/Repair.h"
 #include "pod/Scene.h"
 #include "pod/Values.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/resources.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 

@@ -2,6 +2,9 @@
 #pragma once
 
 #include "pod/Fields.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/resources.h"
 
 // Set in the identifier of the marker that closes a block.
 constexpr uint32_t kPODEndMark = 0x80000000u;

@@ -8,6 +8,9 @@
 #include "base/Memory.h"
 #include "pod/MakeBatches.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 namespace {
 

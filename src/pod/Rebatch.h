@@ -1,7 +1,7 @@
 // New bone batches for a skinned mesh.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/pod.h"
 
 // Cuts a skinned mesh of sound data anew into batches of at most maxBones bones: its triangles, strips too,
 // become an indexed list, its vertices one interleaved block of those that triangles use. Null, or why it

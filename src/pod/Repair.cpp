@@ -7,6 +7,9 @@
 #include "base/Diagnostics.h"
 #include "pod/Rebatch.h"
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 #define QEX_READING "<QexPODModel_ReadFromSourceStream> "
 

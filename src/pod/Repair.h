@@ -2,6 +2,7 @@
 #pragma once
 
 #include "pod/Extents.h"
+#include "Qex/pod.h"
 
 // Puts right what is odd in a scene that passed the checks, with a line in the log for each kind of it, and
 // marks its skinned meshes.

@@ -1,6 +1,10 @@
 // The records of a scene: what they begin with, what releasing them frees, the runtime part, and what
 // triangles and bones say.
 #include "pod/Scene.h"
+#include "Qex/base.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
+#include "Qex/pod_animation.h"
 
 #include <cstring>
 

@@ -3,6 +3,7 @@
 
 #include "base/Memory.h"
 #include "pod/Types.h"
+#include "Qex/pod.h"
 
 // What a zeroed record holds before anything is known of it.
 void QexPODMaterial_SetDefaults(QexPODMaterial* material);

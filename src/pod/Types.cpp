@@ -1,5 +1,6 @@
 // The tables of what a POD scene is made of, and what follows from a row of them.
 #include "pod/Types.h"
+#include "Qex/pod.h"
 
 // clang-format off
 static const QexPODType kTypes[] = {

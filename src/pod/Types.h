@@ -1,7 +1,7 @@
 // The tables of what a POD scene is made of: types of vertex data, elements of a mesh, channels of a node.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/pod.h"
 
 // ---- Data types ----
 

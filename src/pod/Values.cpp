@@ -6,6 +6,9 @@
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
 #include "pod/Elements.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/resources.h"
 
 namespace {
 

@@ -3,7 +3,9 @@
 #include <limits>
 
 #include "pod/Types.h"
-#include "Qex.h"
+#include "Qex/geometry.h"
+#include "Qex/math.h"
+#include "Qex/pod.h"
 
 namespace {
 

@@ -5,6 +5,10 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "image/Pvr.h"
+#include "Qex/base.h"
+#include "Qex/math.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 #include "texture/Texture.h"
 
 #define QEX_MODULE "src/QexTexture"

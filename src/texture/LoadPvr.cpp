@@ -2,6 +2,10 @@
 #include "gl/GL.h"
 #include "image/Ktx.h"
 #include "image/Pvr.h"
+#include "Qex/base.h"
+#include "Qex/images.h"
+#include "Qex/resources.h"
+#include "Qex/textures.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

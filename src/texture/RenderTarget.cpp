@@ -2,6 +2,9 @@
 #include <cstring>
 
 #include "gl/GL.h"
+#include "Qex/base.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 #include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexRenderTarget"

@@ -2,7 +2,7 @@
 // by way of the error check, beyond it.
 #pragma once
 
-#include "Qex.h"
+#include <cstdint>
 
 // The most pixels a side that the current GL can draw into; no limit where it names none.
 int32_t QexRenderTarget_MaxSize();

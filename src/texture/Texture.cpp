@@ -8,6 +8,10 @@
 #include "data/ResFile.h"
 #include "gl/GL.h"
 #include "image/Tga.h"
+#include "Qex/base.h"
+#include "Qex/images.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexTexture"
 

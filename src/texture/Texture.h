@@ -3,7 +3,7 @@
 // A record belongs to its caller; its GL object lives from a create or load function to QexTexture_Release.
 #pragma once
 
-#include "Qex.h"
+#include "Qex/textures.h"
 
 // The GL target that every bind of the record uses.
 uint32_t QexTexture_Target(const QexTexture* texture);

@@ -7,6 +7,10 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "Qex/base.h"
+#include "Qex/images.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 

@@ -3,6 +3,8 @@
 #pragma once
 
 #include "image/Image.h"
+#include "Qex/base.h"
+#include "Qex/textures.h"
 #include "texture/Texture.h"
 
 #ifndef GL_ETC1_RGB8_OES

@@ -1,10 +1,33 @@
-/* Decoders of compressed pixels. No GL context needed on this page. */
-#ifndef QEX_DECODERS_H
-#define QEX_DECODERS_H
+/* Images in files: codes of their pixels, the PVR header, decoders. No GL context needed on this page. */
+#ifndef QEX_IMAGES_H
+#define QEX_IMAGES_H
 
 #include "Qex/base.h"
 
 QEX_BEGIN
+
+/** Format codes of texture records. */
+#define QEX_TEXFMT_RGBA8888 1
+#define QEX_TEXFMT_RGB888 2
+#define QEX_TEXFMT_RGBA4444 3
+#define QEX_TEXFMT_RGBA5551 4
+
+/** The legacy PVR header, as QexTexture_LoadPVRFromMem gives it back. */
+typedef struct QexPVRHeader {
+    uint32_t headerSize;  /* 52, or 44 for the oldest files */
+    uint32_t height;      /* pixels */
+    uint32_t width;       /* pixels */
+    uint32_t mipmapCount; /* levels below level 0 */
+    uint32_t flags;       /* bits 0..7 pixel type; 0x100 mipmaps, 0x200 twiddled, 0x1000 cube map */
+    uint32_t dataSize;    /* bytes of one surface with all its levels */
+    uint32_t bitsPerPixel;
+    uint32_t redMask;
+    uint32_t greenMask;
+    uint32_t blueMask;
+    uint32_t alphaMask;
+    uint32_t tag; /* "PVR!" */
+    uint32_t numSurfaces;
+} QexPVRHeader;
 
 /** Decodes one level of ETC1 to RGBA. A width or height that is no multiple of 4, 1 and 2 among them, takes
  * the upper left pixels of its last blocks, and a temporary image from QexMemory_Alloc; nothing else
