@@ -1,14 +1,6 @@
 // Meshes that follow bones: what is sent for each batch, and where the vertices land.
-#include <algorithm>
 #include <cmath>
-#include <cstring>
-#include <fstream>
-#include <glm/gtc/quaternion.hpp>
 
-#include <unistd.h>
-
-#include "convert/Command.h"
-#include "support/Capture.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -195,73 +187,6 @@ TEST_F(SkinningTest, VerticesLandWhereTheirBonesCarryThem) {
         }
 }
 
-glm::mat4 ReadMatrix(const QexPODNode& node, float frame, uint32_t last) {
-    const size_t key = std::min(static_cast<size_t>(frame), size_t{last});
-    const size_t next = std::min(key + 1, size_t{last});
-    const float t = frame - std::floor(frame);
-    const auto at = [&](const float* data, const uint32_t* index, uint32_t flag, size_t k, size_t floats) {
-        return data + (!(node.animationFlags & flag) ? 0 : index ? index[k] : k * floats);
-    };
-    glm::mat4 local(1);
-    if (node.position) {
-        float a[3], b[3];
-        memcpy(a, at(node.position, node.positionIndex, QEX_NODE_POSITION_ANIMATED, key, 3), sizeof a);
-        memcpy(b, at(node.position, node.positionIndex, QEX_NODE_POSITION_ANIMATED, next, 3), sizeof b);
-        local = glm::translate(local, glm::mix(glm::make_vec3(a), glm::make_vec3(b), t));
-    }
-    if (node.rotation) {
-        const float* a = at(node.rotation, node.rotationIndex, QEX_NODE_ROTATION_ANIMATED, key, 4);
-        const float* b = at(node.rotation, node.rotationIndex, QEX_NODE_ROTATION_ANIMATED, next, 4);
-        local *= glm::mat4_cast(glm::slerp(glm::make_quat(a), glm::make_quat(b), t));
-    }
-    return local;
-}
-
-glm::mat4 WorldOf(const QexPODModel& scene, int32_t node, float frame) {
-    if (node < 0) return glm::mat4(1);
-    return WorldOf(scene, scene.nodes[node].parentIndex, frame) *
-           ReadMatrix(scene.nodes[node], frame, scene.frameCount - 1);
-}
-
-// The vertices of the first mesh node's triangles.
-std::vector<glm::vec3> SkinnedVertices(QexPODModel* scene, float frame) {
-    const QexPODMesh& mesh = scene->meshes[0];
-    const QexBoneBatches& batches = mesh.boneBatches;
-    std::vector<glm::mat4> bones;
-    for (uint32_t node = 0; node < scene->nodeCount; ++node)
-        bones.push_back(WorldOf(*scene, static_cast<int32_t>(node), frame) *
-                        glm::inverse(WorldOf(*scene, static_cast<int32_t>(node), 0)) * WorldOf(*scene, 0, 0));
-    std::vector<glm::vec3> out;
-    int32_t batch = 0;
-    for (uint32_t i = 0; i < mesh.faceCount * 3; ++i) {
-        while (batch + 1 < batches.batchCount && i / 3 >= static_cast<uint32_t>(batches.offsets[batch + 1]))
-            ++batch;
-        uint16_t index;
-        float position[3];
-        memcpy(&index, mesh.faces.data + 2 * i, 2);
-        const uint8_t* vertex = mesh.interleaved + index * mesh.vertices.stride;
-        memcpy(position, vertex + reinterpret_cast<uintptr_t>(mesh.vertices.data), sizeof position);
-        const uint8_t* bone = vertex + reinterpret_cast<uintptr_t>(mesh.boneIndices.data);
-        const uint8_t* weight = vertex + reinterpret_cast<uintptr_t>(mesh.boneWeights.data);
-        glm::vec4 sum(0);
-        for (uint32_t k = 0; k < mesh.boneIndices.componentCount; ++k)
-            sum += bones[static_cast<size_t>(batches.boneTable[batch * batches.maxBones + bone[k]])] *
-                   glm::vec4(glm::make_vec3(position), 1) * (static_cast<float>(weight[k]) / 255);
-        out.emplace_back(sum);
-    }
-    return out;
-}
-
-const Rgba kBlue = {0, 0, 255, 255};  // the background
-
-// Whether something is drawn at most a pixel from here.
-bool ShowsNear(const Picture& picture, glm::vec2 at) {
-    for (int y = static_cast<int>(at.y) - 1; y <= static_cast<int>(at.y) + 1; ++y)
-        for (int x = static_cast<int>(at.x) - 1; x <= static_cast<int>(at.x) + 1; ++x)
-            if (x >= 0 && y >= 0 && x < kWidth && y < kHeight && picture.Pixel(x, y) != kBlue) return true;
-    return false;
-}
-
 // The squares as a file without batches has them: vertices name nodes.
 pod::Mesh WithoutBatches(uint32_t influences) {
     pod::Mesh mesh = Squares(influences, pod::kUint8);
@@ -318,55 +243,6 @@ TEST_F(SkinningTest, MeshesGetTheBatchesThatTheyLack) {
         EXPECT_TRUE(SamePicture(draw(WithoutBatches(influences)), draw(strips)));
         QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
     }
-}
-
-// A character as it comes out of the converter, at several frames: every vertex of its skin, worked out here
-// from keys, weights and bone lists, lies where the picture shows something, and nothing else is shown.
-TEST_F(SkinningTest, ConvertedCharacterIsWhereItsBonesAre) {
-    ConvertOptions options;
-    options.input = "/usr/share/assimp/models/X/Testwuson.X";
-    if (!std::ifstream(options.input)) GTEST_SKIP() << options.input << " is not installed";
-    options.output = OutputPath("character.pod");
-    options.quiet = true;
-    QexModel model;
-    QexModel_Create(&model);
-    {
-        Capture out(STDOUT_FILENO), errors(STDERR_FILENO);
-        ASSERT_EQ(RunConvert(options), 0);
-        ASSERT_EQ(QexModel_LoadContent(&model, OutputPath("").c_str(), "character.pod"), 0);
-    }
-    const QexPODMesh& mesh = model.scene.meshes[0];
-    ASSERT_GT(mesh.boneBatches.batchCount, 1);
-    ASSERT_GT(model.scene.frameCount, 21u);
-    const glm::mat4 projection = glm::ortho(-2.2f, 2.2f, -0.6f, 2.7f, -10.0f, 10.0f);
-    const glm::mat4 view = glm::rotate(glm::mat4(1), 1.2f, glm::vec3(0, 1, 0));
-    for (const float frame : {0.0f, 3.25f, 7.5f, 20.0f}) {
-        QexPODModel_SetFrame(&model.scene, frame);
-        Clear(0, 0, 1, 1);
-        const QexMatrix v = ToQex(view), p = ToQex(projection);
-        QexModel_RenderWithViewProjection(&model, nullptr, nullptr, &v, &p, 0);
-        const Picture picture = Read();
-        glm::vec2 low(1e9f), high(-1e9f);
-        int missing = 0;
-        for (const glm::vec3& vertex : SkinnedVertices(&model.scene, frame)) {
-            const glm::vec4 clip = projection * view * glm::vec4(vertex, 1);
-            const glm::vec2 at = {(clip.x + 1) / 2 * kWidth, (1 - clip.y) / 2 * kHeight};
-            low = glm::min(low, at);
-            high = glm::max(high, at);
-            missing += !ShowsNear(picture, at);
-        }
-        EXPECT_EQ(missing, 0) << frame;
-        glm::vec2 first(1e9f), last(-1e9f);
-        for (int y = 0; y < kHeight; ++y)
-            for (int x = 0; x < kWidth; ++x)
-                if (picture.Pixel(x, y) != kBlue) {
-                    first = glm::min(first, glm::vec2(x, y));
-                    last = glm::max(last, glm::vec2(x + 1, y + 1));
-                }
-        EXPECT_LT(glm::distance(first, low), 1.5f) << frame;
-        EXPECT_LT(glm::distance(last, high), 1.5f) << frame;
-    }
-    QexModel_Unload(&model);
 }
 
 }  // namespace

@@ -3,11 +3,7 @@
 
 #include <algorithm>
 #include <array>
-#include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <random>
-#include <string>
 #include <vector>
 
 #include <ETC1/etc1.h>
@@ -239,28 +235,6 @@ TEST_P(Decoder, SizesAndPointersThatCannotBe) {
     decode.pvrtc(block.data(), 1, 3, 5, pixels.data());  // a power of two is asked for
     EXPECT_TRUE(std::equal(pixels.begin(), pixels.begin() + 60, Bytes(60, 0).begin()));
     EXPECT_EQ(pixels[60], 0x5A);
-}
-
-TEST_P(Decoder, LevelsThatOthersDecoded) {
-    const char* folder = std::getenv("QEX_REAL_FILES");
-    if (!folder || !*folder) GTEST_SKIP() << "QEX_REAL_FILES names no folder of real textures";
-    const std::string path = std::string(folder) + "/textures/decoded/";
-    const auto read = [&](const std::string& name) {
-        std::ifstream stream(path + name, std::ios::binary);
-        return Bytes((std::istreambuf_iterator<char>(stream)), {});
-    };
-    std::ifstream table(path + "MANIFEST.tsv");
-    std::string name, kind, rest;
-    int width, height, levels = 0;
-    for (std::getline(table, rest); table >> name >> kind >> width >> height;
-         std::getline(table, rest), ++levels) {
-        const Bytes stored = read(name + ".blk"), expected = read(name + ".rgba");
-        ASSERT_EQ(expected.size(), PixelBytes(width, height)) << name;
-        const Bytes pixels =
-            kind == "ETC1" ? Etc(stored, width, height) : Pvrtc(stored, kind == "PVRTC2", width, height);
-        EXPECT_TRUE(pixels == expected) << name;
-    }
-    EXPECT_GT(levels, 0);
 }
 
 }  // namespace
