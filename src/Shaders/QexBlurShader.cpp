@@ -4,6 +4,7 @@
 #include "Qex/math.h"
 #include "Qex/renderer.h"
 #include "Qex/shader_modules.h"
+#include "Shaders/QexBlurShader.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 

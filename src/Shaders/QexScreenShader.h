@@ -14,6 +14,3 @@ enum { kScreenPosition, kScreenProjection, kScreenTexCoord, kScreenSlots };
 // come first behind the first slots, for the units 0, 1, ...
 void QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
                            const QexMatrix* projection, int32_t samplers);
-
-// What QexBlurShader_SetParameters uploads from now on.
-void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* projection);

@@ -10,6 +10,7 @@
 #include "Qex/renderer.h"
 #include "Qex/shader_modules.h"
 #include "Qex/textures.h"
+#include "Shaders/QexBlurShader.h"
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexScreenShader.h"
 #include "texture/RenderTarget.h"

@@ -3,6 +3,7 @@
 // A triangle gets a patch of 4 x 4 texels, its corners in the middles of three corner texels. Linear
 // filtering between texels of a colour that changes evenly is exact, so the triangle shows what interpolating
 // between its vertices would.
+#include "mesh/Colours.h"
 #include "base/Memory.h"
 #include "mesh/Mesh.h"
 #include "Qex/meshes.h"

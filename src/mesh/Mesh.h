@@ -22,16 +22,5 @@ inline uint32_t QexMesh_CornerCount(const QexMesh& mesh) {
     return mesh.indexCount ? mesh.indexCount : mesh.vertexCount;
 }
 
-// The colours of a mesh as a texture: RGBA, width x height, the first row at t = 0.
-struct QexMeshColours {
-    uint8_t* pixels;  // owned; from QexMemory_Alloc
-    uint32_t width, height;
-};
-
-// Bakes vertex colours. One colour for all leaves the mesh as it is, and `parted` empty; otherwise `parted`
-// is the mesh with three vertices of its own for each triangle and the texture coordinates of its patch.
-// Null, or why it cannot be done.
-const char* QexMesh_BakeColours(const QexMesh& mesh, QexMesh* parted, QexMeshColours* colours);
-
 // Tangents of a mesh with normals and texture coordinates, of unit length and perpendicular to the normals.
 void QexMesh_MakeTangents(const QexMesh& mesh, QexVec3* tangents);

@@ -3,8 +3,9 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "mesh/Colours.h"
 #include "mesh/Mesh.h"
-#include "model/Model.h"
+#include "model/SharedShaders.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"
 #include "Qex/geometry.h"

@@ -4,7 +4,7 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "model/Model.h"
+#include "model/Geometry.h"
 #include "pod/Rebatch.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"

@@ -1,5 +1,6 @@
 // Loading models: the scene, its geometry, textures and modules, and what unloading gives back.
-#include "model/Model.h"
+#include "model/Geometry.h"
+#include "model/SharedShaders.h"
 
 #include <cstdio>
 #include <cstring>

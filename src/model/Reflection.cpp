@@ -4,7 +4,8 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "model/Model.h"
+#include "model/Casters.h"
+#include "model/SharedShaders.h"
 #include "Qex/base.h"
 #include "Qex/geometry.h"
 #include "Qex/math.h"

@@ -4,7 +4,7 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
-#include "model/Model.h"
+#include "model/SharedShaders.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"

@@ -1,7 +1,8 @@
 // The shadow pass: what casts a shadow into the camera's view, and its depth as the light sees it.
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "model/Model.h"
+#include "model/Casters.h"
+#include "model/SharedShaders.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"

@@ -3,7 +3,7 @@
 
 #include "gl/GL.h"
 #include "gl/Program.h"
-#include "model/Model.h"
+#include "model/SharedShaders.h"
 #include "Qex/base.h"
 #include "Qex/models.h"
 #include "Qex/renderer.h"

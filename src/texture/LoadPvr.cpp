@@ -6,6 +6,7 @@
 #include "Qex/images.h"
 #include "Qex/resources.h"
 #include "Qex/textures.h"
+#include "texture/LoadKtx.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"

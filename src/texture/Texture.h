@@ -10,6 +10,3 @@ uint32_t QexTexture_Target(const QexTexture* texture);
 
 // Whether the GL takes textures of that many pixels: the upload of any other would end the process.
 bool QexTexture_IsPossibleSize(uint32_t width, uint32_t height, bool cube);
-
-// Whether the GL takes textures of that compressed internal format.
-bool QexTexture_IsCompressedFormat(uint32_t internalFormat);

@@ -38,5 +38,5 @@ void QexTextureLoad_SetWrap(uint32_t target, uint32_t width, uint32_t height);
 bool QexTextureLoad_UploadDecoded(uint32_t target, int32_t index, const QexPixelFormat& format,
                                   const QexImageLevel& level, const uint8_t* data);
 
-// Loads a KTX image; what QexTexture_LoadKTXFromMem and its siblings do.
-int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file);
+// Whether the GL takes textures of that compressed internal format.
+bool QexTexture_IsCompressedFormat(uint32_t internalFormat);
