@@ -1,5 +1,4 @@
-// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx, tga, etc, pvrtc and
-// emitter.
+// Writes the files that fuzzing starts from: corpus FOLDER makes FOLDER/pod, pvr, ktx, tga and emitter.
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
@@ -14,22 +13,12 @@ namespace {
 
 using Entry = std::pair<const char*, Bytes>;
 
-// What the decoders' targets take: two bytes of size, and noise.
-Bytes Level(uint8_t width, uint8_t height, size_t size) {
-    Bytes level = Noise(size + 2);
-    level[0] = width;
-    level[1] = height;
-    return level;
-}
-
 // The settings and counts of an emitter file, as they lie in one.
 Bytes EmitterSettings() {
     QexParticleEmitter* emitter = QexParticleEmitter_Create();
     emitter->emissionRate[0] = emitter->currentRate = 3;
-    emitter->colorCount = 2;
-    emitter->animationCount = 2;
+    emitter->colorCount = emitter->animationCount = 2;
     emitter->animations[1].frameCount = 3;
-    emitter->animations[1].loop = 1;
     emitter->positionSpread = {1, 2, 3};
     const MemoryFile file({});
     QexParticleEmitter_WriteToBinFile(emitter, file.Path());
@@ -72,13 +61,6 @@ std::vector<Entry> Entries() {
         {"tga/rgba", TgaFile(2, 2, 32, Noise(16))},
         {"tga/grey", TgaFile(2, 2, 8, Noise(4))},
         {"emitter/settings", EmitterSettings()},
-        {"etc/whole", Level(8, 4, 16)},
-        {"etc/cut", Level(6, 3, 16)},
-        {"etc/small", Level(1, 2, 8)},
-        {"pvrtc/four", Level(4 << 1, 3 << 1, 64)},
-        {"pvrtc/two", Level(5 << 1 | 1, 3 << 1, 64)},
-        {"pvrtc/small", Level(1 << 1, 0, 32)},
-        {"pvrtc/odd", Level(0x80 | 12, 3 << 1, 32)},
     };
 }
 

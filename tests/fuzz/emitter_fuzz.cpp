@@ -1,7 +1,8 @@
 // An emitter file of any bytes, without a driver: it is refused, or it runs, draws, and is written as it was
 // read. Short inputs, which would be cut files, are also spread over a whole one: settings and counts first,
 // then the particles, which matter least.
-#include <algorithm>
+#include <fstream>
+#include <iterator>
 
 #include "gltap.h"
 #include "Qex.h"
@@ -21,16 +22,12 @@ void Require(bool condition, const char* what) {
 Bytes Written(const QexParticleEmitter* emitter) {
     const MemoryFile file({});
     Require(QexParticleEmitter_WriteToBinFile(emitter, file.Path()) == 0, "an emitter is not written");
-    Bytes bytes(QEX_EMITTER_FILE_SIZE + 1);
-    FILE* stream = fopen(file.Path(), "rb");
-    bytes.resize(stream ? fread(bytes.data(), 1, bytes.size(), stream) : 0);
-    if (stream) fclose(stream);
-    return bytes;
+    std::ifstream stream(file.Path(), std::ios::binary);
+    return Bytes((std::istreambuf_iterator<char>(stream)), {});
 }
 
 QexParticleEmitter* Read(const Bytes& bytes) {
-    const MemoryFile file(bytes);
-    return QexParticleEmitter_CreateFromBinFile(file.Path());
+    return QexParticleEmitter_CreateFromBinFile(MemoryFile(bytes).Path());
 }
 
 void Try(const Bytes& bytes) {
@@ -65,15 +62,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     Try(input);
     if (size >= QEX_EMITTER_FILE_SIZE) return 0;
     Bytes whole(QEX_EMITTER_FILE_SIZE);
-    auto from = input.begin();
-    const auto spread = [&](size_t offset, size_t most) {
-        const auto to = from + std::min<long>(static_cast<long>(most), input.end() - from);
-        std::copy(from, to, whole.begin() + static_cast<long>(offset));
-        from = to;
-    };
-    spread(0, kParticles);
-    spread(kCounts, QEX_EMITTER_FILE_SIZE - kCounts);
-    spread(kParticles, kCounts - kParticles);
+    for (size_t i = 0; i < size; ++i) {
+        const size_t counts = QEX_EMITTER_FILE_SIZE - kCounts;
+        whole[i < kParticles ? i : i < kParticles + counts ? i - kParticles + kCounts : i - counts] = data[i];
+    }
     Try(whole);
     return 0;
 }

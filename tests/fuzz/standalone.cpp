@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -21,7 +22,7 @@ using Bytes = std::vector<uint8_t>;
 
 using Random = std::minstd_rand;
 
-// One to four changes: a bit, a byte, a telling word, a piece lost or a piece doubled.
+// One to four changes: a byte, a telling word, a piece lost or a piece doubled.
 Bytes Damaged(Bytes file, Random* random) {
     static const uint32_t words[] = {0, 1, 0x7FFFFFFF, 0x80000000u, UINT32_MAX, 0xFFFF, 16, 4};
     const auto below = [&](size_t limit) { return static_cast<uint32_t>((*random)() % limit); };
@@ -29,18 +30,12 @@ Bytes Damaged(Bytes file, Random* random) {
         const size_t at = below(file.size() - 4);
         const auto from = file.begin() + static_cast<long>(at);
         const auto to = from + static_cast<long>(below(std::min<size_t>(64, file.size() - at)));
-        switch (below(5)) {
-            case 0: *from = static_cast<uint8_t>(*from ^ 1 << below(8)); break;
-            case 1: *from = static_cast<uint8_t>(below(256)); break;
-            case 2:
-                for (uint32_t i = 0, word = words[below(8)]; i < 4; ++i)
-                    from[i] = static_cast<uint8_t>(word >> (8 * i));
-                break;
-            case 3: file.erase(from, to); break;
-            default: {
-                const Bytes piece(from, to);
-                file.insert(from, piece.begin(), piece.end());
-            }
+        const Bytes piece(from, to);
+        switch (below(4)) {
+            case 0: *from = static_cast<uint8_t>(*from ^ (below(2) ? 1 << below(8) : below(256))); break;
+            case 1: memcpy(&*from, &words[below(8)], 4); break;
+            case 2: file.erase(from, to); break;
+            default: file.insert(from, piece.begin(), piece.end());
         }
     }
     return file;

@@ -12,7 +12,6 @@
 #include "PvrWriter.h"
 #include "support/FolderTest.h"
 #include "support/ImageFiles.h"
-#include "support/RealFiles.h"
 
 struct CommandResult {
     int status = -1;  // exit status, or 1000 + the signal that ended it

@@ -8,16 +8,17 @@
 namespace {
 
 using Colour = std::array<float, 4>;
+using Rgb = std::array<int, 3>;
 
 class ConvertMaterial : public ConvertTest {
   protected:
     // Two triangles that make a square, corner by corner in the colours given, in linear light.
     QexPODModel& ConvertSquare(const std::string& material, const std::vector<Colour>& colours = {}) {
-        std::vector<float> data = {0, 0, 0, 1, 0, 0, 1, 1, 0, 0, 0, 0, 1, 1, 0, 0, 1, 0};
-        for (const Colour& c : colours) data.insert(data.end(), c.begin(), c.end());
-        Bytes bin(data.size() * 4);
-        std::memcpy(bin.data(), data.data(), bin.size());
-        WriteBytes(Path("s.bin"), bin);
+        std::string bin;
+        const auto add = [&bin](float value) { bin.append(reinterpret_cast<const char*>(&value), 4); };
+        for (const float x : {0, 0, 0, 1, 0, 0, 1, 1, 0, 0, 0, 0, 1, 1, 0, 0, 1, 0}) add(x);
+        for (const Colour& c : colours) std::for_each(c.begin(), c.end(), add);
+        WriteText(Path("s.bin"), bin);
         const std::string bytes = std::to_string(bin.size());
         WriteText(Path("s.gltf"),
                   R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0]}],"nodes":[{"mesh":0}],
@@ -26,16 +27,15 @@ class ConvertMaterial : public ConvertTest {
                       R"(}}]}],"materials":[{"name":"m",)" + material + R"(}],
  "images":[{"uri":"pic.tga"}],"textures":[{"source":0}],
  "accessors":[{"bufferView":0,"componentType":5126,"count":6,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
-  {"bufferView":0,"byteOffset":)" +
-                      (colours.empty() ? "0" : "72") + R"(,"componentType":5126,"count":)" +
-                      (colours.empty() ? "4" : "6") +
+  {"bufferView":0,"componentType":5126,)" +
+                      (colours.empty() ? R"("count":4)" : R"("byteOffset":72,"count":6)") +
                       R"(,"type":"VEC4"}],
  "bufferViews":[{"buffer":0,"byteLength":)" +
                       bytes + R"(}],"buffers":[{"uri":"s.bin","byteLength":)" + bytes + "}]}");
         return Convert(Path("s.gltf"));
     }
     // Red, green and blue of a texture without mipmaps, filtered.
-    std::array<int, 3> Sample(const std::string& name, float u, float v) const {
+    Rgb Sample(const std::string& name, float u, float v) const {
         const Bytes file = ReadBytes(Path(name));
         uint32_t height, width;
         std::memcpy(&height, &file.at(4), 4);
@@ -43,7 +43,7 @@ class ConvertMaterial : public ConvertTest {
         EXPECT_EQ(file.size(), 52 + 3u * width * height) << name;
         const float x = u * float(width) - 0.5f, y = v * float(height) - 0.5f;
         const float left = std::floor(x), low = std::floor(y);
-        std::array<int, 3> mixed;
+        Rgb mixed;
         for (size_t c = 0; c < 3; ++c) {
             const auto texel = [&](float dx, float dy) {
                 const size_t column = size_t(left + dx) % width, row = size_t(low + dy) % height;
@@ -75,7 +75,7 @@ TEST_F(ConvertMaterial, LinearColoursAreEncoded) {
     // Glow in one colour: a texel of all the light there can be, and shares of it.
     m = &ConvertSquare(pbr("[0.25,0,0.25,1]") + R"(,"emissiveFactor":[0.25,0.5,0])").materials[0];
     ASSERT_EQ(m->diffuseTexture, 0);
-    EXPECT_EQ(Sample("m.pvr", 0.5f, 0.5f), (std::array<int, 3>{255, 188, 137}));
+    EXPECT_EQ(Sample("m.pvr", 0.5f, 0.5f), (Rgb{255, 188, 137}));
     ExpectNear(m->diffuse, {0.5371f, 0, 1});
     ExpectNear(m->ambient, {1.2f * 0.5371f, 1, 0.2f});
     EXPECT_EQ(said_, "");
@@ -117,16 +117,13 @@ TEST_F(ConvertMaterial, VerticesKeepTheirColoursInATexture) {
                               uv = VertexValue(mesh, mesh.uvws[0], vertex);
                 middle.x += uv.x / 3;
                 middle.y += uv.y / 3;
+                if (at.x == at.y) continue;
                 first |= at.x > at.y;
-                if (at.x > at.y) {
-                    EXPECT_EQ(Sample("colours.pvr", uv.x, uv.y), (std::array<int, 3>{120, 120, blue}));
-                }
-                if (at.x < at.y) {
-                    EXPECT_EQ(Sample("colours.pvr", uv.x, uv.y), (std::array<int, 3>{0, 0, blue}));
-                }
+                EXPECT_EQ(Sample("colours.pvr", uv.x, uv.y),
+                          (at.x > at.y ? Rgb{120, 120, blue} : Rgb{0, 0, blue}));
             }
-            const std::array<int, 3> mean = {120, 113, blue}, plain = {0, 0, blue};
-            EXPECT_EQ(Sample("colours.pvr", middle.x, middle.y), first ? mean : plain);
+            EXPECT_EQ(Sample("colours.pvr", middle.x, middle.y),
+                      (first ? Rgb{120, 113, blue} : Rgb{0, 0, blue}));
         }
     }
     WriteTga("pic.tga", 1, 1, {{9, 9, 9, 255}});
@@ -138,22 +135,7 @@ TEST_F(ConvertMaterial, VerticesKeepTheirColoursInATexture) {
         WriteText(Path("c.obj"), "v 0 0 0" + colour + "v 1 0 0" + colour + "v 0 1 0" + colour + "f 1 2 3\n");
         EXPECT_EQ(Convert(Path("c.obj")).textureCount, colour[1] == '1' ? 1u : 0u);
     }
-    EXPECT_EQ(Sample("colours.pvr", 0.5f, 0.5f), (std::array<int, 3>{255, 128, 0}));
-}
-
-TEST_F(ConvertMaterial, TexturesOfOnesChoice) {
-    WriteText(Path("q.obj"), "mtllib m.mtl\nusemtl m\nv 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
-    WriteText(Path("m.mtl"), "newmtl m\nmap_Kd gone.tga\n");
-    WriteTga("mine.tga", 1, 1, {{10, 20, 30, 255}});
-    ConvertOptions options = Options(Path("q.obj"));
-    options.textures = {{"m", Path("mine.tga")}};
-    EXPECT_EQ(Run(options), 0);
-    EXPECT_EQ(said_, "");
-    EXPECT_STREQ(Read().textures[0].name, "mine.pvr");
-    EXPECT_EQ(PvrBytes("mine.pvr", 0, 3), (Bytes{10, 20, 30}));
-    options.textures = {{"x", Path("mine.tga")}};
-    EXPECT_EQ(Run(options), 2);
-    EXPECT_TRUE(Contains(said_, "no material 'x'; the scene has ") && Contains(said_, "m\n")) << said_;
+    EXPECT_EQ(Sample("colours.pvr", 0.5f, 0.5f), (Rgb{255, 128, 0}));
 }
 
 TEST(RunInProcess, TellsHowTheImporterEnded) {
@@ -164,21 +146,14 @@ TEST(RunInProcess, TellsHowTheImporterEnded) {
     } rows[] = {
         {[] { return fprintf(stderr, "qex convert: f: bad\nnoise\n") ? 1 : 0; }, 1, "f: bad\n"},
         {[] { return fprintf(stderr, "noise\nqex convert: f: warning: x\n") ? 0 : 1; }, 0, "f: warning: x\n"},
-        {[]() -> int {
-             fprintf(stderr, "heap is corrupt\n");
-             abort();
-         },
-         1, "f: cannot be converted: the importer crashed, Aborted (heap is corrupt)\n"},
+        {[] { return fprintf(stderr, "heap is corrupt\n") ? raise(SIGABRT) : 0; }, 1,
+         "f: cannot be converted: the importer crashed, Aborted (heap is corrupt)\n"},
         {[] { return raise(SIGSEGV); }, 1,
          "f: cannot be converted: the importer crashed, Segmentation fault\n"},
-        {[]() -> int {
-             fprintf(stderr, "qex convert: f: warning: x\n");
-             _exit(3);
-         },
-         1,
+        {[] { return fprintf(stderr, "qex convert: f: warning: x\n") ? 3 : 0; }, 1,
          "f: warning: x\nqex convert: f: cannot be converted: the importer ended the process with status "
          "3\n"},
-        {[]() noexcept -> int {
+        {[]() noexcept {
              static void* volatile block = ::operator new(SIZE_MAX / 2);
              return block ? 0 : 1;
          },
@@ -195,31 +170,27 @@ TEST(RunInProcess, TellsHowTheImporterEnded) {
     }
 }
 
+#ifndef __SANITIZE_ADDRESS__  // which takes more memory than a limit could allow
 TEST_F(ConvertTest, MemoryIsLimited) {
-#ifdef __SANITIZE_ADDRESS__
-    GTEST_SKIP() << "the sanitizer takes more memory than a limit could allow";
-#endif
     std::string obj;
     for (int i = 0; i < 2000000; ++i) obj += "v 0 1 0\n";
     WriteText(Path("big.obj"), obj + "v 1 0 0\nv 0 0 1\nf -1 -2 -3\n");
     ConvertOptions options = Options(Path("big.obj"));
     options.memory = 64;
     EXPECT_EQ(Run(options), 1);
-    EXPECT_TRUE(Contains(said_, "big.obj: needs more than 64 MB of memory; --memory allows more")) << said_;
-    EXPECT_EQ(CountLines(said_), 1) << said_;
+    EXPECT_EQ(said_,
+              "qex convert: " + options.input + ": needs more than 64 MB of memory; --memory allows more\n");
     options.memory = 4096;
     EXPECT_EQ(Run(options), 0) << said_;
 }
+#endif
 
-TEST_F(ConvertTest, MotionWithoutAMeshIsAWarning) {
+TEST_F(ConvertTest, SaysThatThereAreNoMeshesOrClips) {
     WriteText(Path("m.bvh"),
               "HIERARCHY\nROOT a\n{\nOFFSET 0 0 0\nCHANNELS 0\nEnd Site\n{\nOFFSET 0 1 0\n}\n}\n"
               "MOTION\nFrames: 1\nFrame Time: 0.1\n\n");
     Convert(Path("m.bvh"));
     EXPECT_TRUE(Contains(said_, "the file has no meshes; pointed bodies")) << said_;
-}
-
-TEST_F(ConvertTest, SaysThatThereAreNoClips) {
     WriteText(Path("q.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
     ConvertOptions options = Options(Path("q.obj"));
     options.listClips = true;

@@ -257,8 +257,7 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
     std::string error;
     const auto context = qex::HeadlessContext::Create(16, 16, &error);
     ASSERT_TRUE(context) << error;
-    std::vector<std::string> files = RealFilesIn("textures", ".pvr");
-    for (const std::string& ktx : RealFilesIn("textures", ".ktx")) files.push_back(ktx);
+    std::vector<std::string> files;
     const auto add = [&](const std::string& name, const Bytes& bytes) {
         WriteBytes(Path(name), bytes);
         files.push_back(Path(name));

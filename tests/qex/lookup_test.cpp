@@ -28,6 +28,7 @@ class QexLookup : public QexCommandTest {
         if (result.status || !LoadImage(Path("out.png"), &image, &error)) return error;
         const auto at = [&](int y) -> std::string {
             const uint8_t* p = image.Pixel(120, y);
+            if (p[0] > 200 && p[1] > 200) return "white";
             return p[0] > 200 ? "red" : p[1] > 200 ? "green" : p[2] > 200 ? "blue" : "background";
         };
         return at(34) == at(45) ? at(34) : at(34) + " above " + at(45);
@@ -35,10 +36,7 @@ class QexLookup : public QexCommandTest {
     void WriteQuad(const std::string& texture, const std::string& options = "") const {
         pod::Scene scene = QuadScene();
         scene.exportOptions = options;
-        if (!texture.empty()) {
-            TextureQuad(&scene, texture);
-            scene.materials[0].diffuse = {1, 1, 1};
-        }
+        if (!texture.empty()) TextureQuad(&scene, texture);
         WriteScene(Path("s.pod"), scene);
     }
 };
@@ -84,6 +82,21 @@ TEST_F(QexLookup, NamesMayDifferInCaseAndFolder) {
     }
 }
 
+TEST_F(QexLookup, PvrGoesBeforeKtxAndKtxBeforePictures) {
+    WriteBytes(Path("tex.pvr"), UniformPvr(pod::kPvrRgb565, 8, {0x00, 0xF8}));
+    WriteBytes(Path("tex.ktx"), UniformKtx(8, {0, 0, 255, 255}));
+    WritePicture("tex.png");
+    WriteQuad("tex.png");
+    const std::pair<const char*, std::string> rows[] = {
+        {"tex.pvr", kPlain}, {"tex.ktx", "blue"}, {"tex.png", kUpright}, {"", "white"}};
+    for (const auto& [file, drawn] : rows) {
+        EXPECT_EQ(Draw(), drawn) << file;
+        if (*file) std::filesystem::remove(Path(file));
+    }
+    const CommandResult missing = Run({"render", Path("s.pod"), "-o", Path("out.png")});
+    EXPECT_TRUE(Contains(missing.err, "tex.png is missing")) << missing.err;
+}
+
 TEST_F(QexLookup, MaterialsTakeTexturesOfOnesChoice) {
     WritePicture("mine.png");
     WriteBytes(Path("mine.pvr"), UniformPvr(pod::kPvrRgb565, 8, {0x1F, 0x00}));
@@ -98,4 +111,14 @@ TEST_F(QexLookup, MaterialsTakeTexturesOfOnesChoice) {
                   "none.png: no such file");
     ExpectRefused({"render", Path("s.pod"), "-o", Path("o.png"), "--texture", "paint"}, 2,
                   "expected MATERIAL=FILE");
+    // Of a model that is converted, too.
+    WriteText(Path("q.obj"), "mtllib m.mtl\nusemtl m\nv 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    WriteText(Path("m.mtl"), "newmtl m\nmap_Kd gone.tga\n");
+    const std::string out = Path("folder/q.pod");
+    std::filesystem::create_directory(Path("folder"));
+    EXPECT_EQ(Run({"convert", Path("q.obj"), "-o", out, "--texture", "m=" + Path("mine.png")}).err, "");
+    EXPECT_TRUE(Contains(Run({"info", out}).out, "mine.pvr"));
+    EXPECT_GT(ReadBytes(Path("folder/mine.pvr")).size(), 52u);
+    ExpectRefused({"convert", Path("q.obj"), "-o", out, "--texture", "x=" + Path("mine.png")}, 2,
+                  "no material 'x'; the scene has ");
 }

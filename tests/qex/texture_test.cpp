@@ -1,6 +1,5 @@
 // qex texture writes what it was given, bit by bit where the format keeps it, and reads what others wrote.
 #include "common/ImageFile.h"
-#include "common/TextureFiles.h"
 #include "Headless.h"
 #include "Qex.h"
 #include "qex/QexCommandTest.h"
@@ -332,41 +331,4 @@ TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
     }
     EXPECT_FALSE(std::filesystem::exists(pvr) || std::filesystem::exists(png));
     EXPECT_EQ(Run({"texture", a, "-o", pvr, "--flip"}).status, 0);
-}
-
-TEST_F(QexTextureVerb, RealTexturesHoldTheirPictures) {
-    const char* root = std::getenv("QEX_REAL_FILES");
-    if (!root) GTEST_SKIP() << "QEX_REAL_FILES names no folder with textures";
-    const std::string files = std::string(root) + "/textures/files/";
-    for (const char* name : {"rgb_bl_raw", "rgb_tl_raw", "rgba_bl_raw", "rgba_tl_raw"}) {
-        const std::string base = files + "pillow_200x32_" + name;
-        EXPECT_EQ(Read(base + ".tga"), Read(base.substr(0, base.size() - 7) + ".png")) << name;
-    }
-    for (int level = 0; level < 7; ++level) {
-        const std::string name = files + "piglit_waffles-";
-        EXPECT_EQ(Read(name + "compressed-etc1-64x32-miptree.ktx", level),
-                  Read(name + "decompressed-rgb-64x32-miptree.ktx", level));
-    }
-    // All levels and faces, rows not padded, lie beside files that libktx wrote.
-    int compared = 0;
-    for (const std::string& raw : RealFilesIn("textures", ".raw")) {
-        Texture texture;
-        std::string error;
-        Bytes all;
-        if (!ReadTexture(ReadBytes(WithoutExtension(raw)), &texture, &error)) continue;
-        for (size_t level = 0; level < texture.levels.size(); ++level)
-            for (size_t face = 0; face < texture.faces; ++face) {
-                const QexImageLevel& l = texture.levels[level];
-                const bool blocks = texture.format->Compressed();
-                const size_t row = blocks ? l.bytes : l.width * texture.format->bits / 8;
-                for (size_t y = 0; y < (blocks ? 1 : l.height); ++y) {
-                    const Bytes part =
-                        Part(texture.file, texture.FaceOffset(level, face) + y * l.rowBytes, row);
-                    all.insert(all.end(), part.begin(), part.end());
-                }
-            }
-        EXPECT_TRUE(all == ReadBytes(raw)) << raw;
-        ++compared;
-    }
-    EXPECT_GT(compared, 5);
 }
