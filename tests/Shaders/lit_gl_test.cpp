@@ -1,9 +1,10 @@
 // The lit modules against their formulas: a triangle with its own normals, drawn and evaluated on the CPU;
-// and what every module sends, binds and leaves behind.
+// and what every module binds and leaves behind.
 #include <GLES2/gl2.h>
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 #include <glm/gtc/quaternion.hpp>
 
 #include "support/RenderScenes.h"
@@ -86,10 +87,16 @@ pod::Scene TriangleScene(Skin skin) {
         arrays.boneWeights.push_back(Weights(c, skin.first));
     }
     arrays.indices = {0, 1, 2};
-    const pod::Mesh mesh = skin.first ? SkinnedMesh(arrays, skin.first, skin.second, {{1, 2, 3, 4}}, {0})
-                                      : pod::BuildMesh(arrays);
+    const pod::Mesh mesh =
+        skin.first ? SkinnedMesh(arrays, skin.first, skin.second, {1, 2, 3, 4}) : pod::BuildMesh(arrays);
     // A turn by 0.3 about Z, then the place; the scale is uneven, so that normals need their own matrix.
     pod::Scene scene = SceneOf(mesh, {{{60, 46, 2}}, {{0, 0, 0.14944f, 0.98877f}}, {{0.9f, 1.1f, 2}}, {}});
+    pod::Material& material = scene.materials[0];
+    material.ambient = {0.1f, 0.2f, 0.05f};
+    material.diffuse = {0.7f, 0.8f, 0.9f};
+    material.specular = {0.4f, 0.5f, 0.3f};
+    material.shininess = 0.05f;
+    material.opacity = 0.8f;
     for (const char* bone : {"a", "b", "c", "d"}) scene.nodes.push_back(pod::BuildNode(bone, {}));
     return scene;
 }
@@ -115,18 +122,9 @@ const uint8_t kMapDepths[kMap * kMap] = {255, 60,  200, 10,  120, 0,   255, 90,
                                          30,  150, 80,  140, 254, 100, 20,  60};
 
 // What the vertex stage hands on; kLight and kHalf are the first of four.
-enum {
-    kWorld,
-    kNormal,
-    kTangent,
-    kBinormal,
-    kDiffuse,
-    kShadowAt,
-    kFacing,
-    kLight,
-    kHalf = kLight + 4,
-    kCount = kHalf + 4
-};
+// clang-format off
+enum { kWorld, kNormal, kTangent, kBinormal, kDiffuse, kShadowAt, kFacing, kLight, kHalf = kLight + 4, kCount = kHalf + 4 };
+// clang-format on
 using Varyings = std::array<glm::vec3, kCount>;
 
 glm::vec3 Towards(const QexLight& light, glm::vec3 point) {
@@ -265,14 +263,7 @@ TEST_F(LitTest, EveryModuleFollowsItsFormula) {
             const QexMatrix bone = ToQex(kBones[b]);
             QexPODModel_SetNodeMatrix(&model.model.scene, 1 + b, &bone);
         }
-        QexPODMaterial& material = model.Material();
-        for (int i = 0; i < 3; ++i) {
-            material.ambient[i] = std::array{0.1f, 0.2f, 0.05f}[i];
-            material.diffuse[i] = std::array{0.7f, 0.8f, 0.9f}[i];
-            material.specular[i] = std::array{0.4f, 0.5f, 0.3f}[i];
-        }
-        material.shininess = 0.05f;
-        material.opacity = 0.8f;
+        const QexPODMaterial& material = model.Material();
         model.model.textures[0] = &diffuse;
         model.model.alphaTextures[0] = &white;
         if (kind.normalMap) model.model.bindTextureHook = BindNormalMap;
@@ -297,8 +288,8 @@ TEST_F(LitTest, EveryModuleFollowsItsFormula) {
     };
     QexRenderer_SetGlobalAlpha(0.5f);
     for (const Kind& kind : kKinds)
-        for (const Skin& skin : {Skin(0, 0), Skin(1, pod::kUint8), Skin(2, pod::kFloat32),
-                                 Skin(3, pod::kUint8Norm), Skin(4, pod::kFloat32), Skin(4, pod::kUint8Norm)})
+        for (const Skin& skin : {Skin(0, 0), Skin(1, pod::kUint8), Skin(2, pod::kUint8),
+                                 Skin(3, pod::kUint8Norm), Skin(4, pod::kUint8Norm)})
             if (kind.skinned == (skin.first > 0)) draw(kind, skin);
     QexRenderer_SetGlobalAlpha(1);
 }
@@ -306,17 +297,15 @@ TEST_F(LitTest, EveryModuleFollowsItsFormula) {
 // The names of the uniforms that a program has at those locations.
 std::string Names(uint32_t program, const std::vector<int64_t>& locations) {
     std::string text;
-    GLint count = 0;
+    GLint count = 0, size;
+    GLenum type;
     glGetProgramiv(program, GL_ACTIVE_UNIFORMS, &count);
     for (const int64_t location : locations)
         for (GLint i = 0; i < count; ++i) {
             char name[64];
-            GLint size;
-            GLenum type;
             glGetActiveUniform(program, static_cast<GLuint>(i), sizeof name, nullptr, &size, &type, name);
-            if (glGetUniformLocation(program, name) != location) continue;
-            const std::string whole = name;
-            text += whole.substr(0, whole.find('[')) + " ";
+            if (glGetUniformLocation(program, name) == location)
+                text += std::string(name, std::strcspn(name, "[")) + " ";
         }
     return text;
 }
@@ -325,62 +314,43 @@ const std::string kLights = "lightCount lightType lightPosDir lightColor sceneAm
 const std::string kSpecular = "sceneSpecular shininess ", kAlpha = "opacity alphaThreshold ";
 const std::string kMatrices = "transMatrix normalMatrix mvpMatrix ";
 const std::string kBoneSlots = "viewProjMatrix boneCount boneMatrixArray boneVecMatrixArray ";
-const std::string kVectors = "boneVecMatrixArray ";
-const std::string kDepthBatch = kAlpha + "viewProjMatrix boneCount boneMatrixArray ";
 
-// The order of a module's slots and that of its uploads; both are fixed.
+// The order of a module's slots, which applications read.
 struct Order {
     QexShaderModule* (*create)();
     void (*release)(QexShaderModule**);
     bool skinned;
-    std::string slots, uploads, textures = "03";  // units that are bound
+    std::string slots, textures = "03";  // units that are bound
 };
-#define ORDER(Name, ...) \
-    { Name##_CreateProgram, Name##_Release, __VA_ARGS__ }
+#define MODULE(Name) Name##_CreateProgram, Name##_Release
+const std::string kShadow = "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity ";
+const std::string kLit = kLights + kAlpha, kHighlight = "cameraPos " + kLights + kSpecular + kAlpha;
+const std::string kSkinned = "boneCount boneMatrixArray viewProjMatrix " + kAlpha;
 const Order kOrders[] = {
-    ORDER(QexGouraudShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices),
-    ORDER(QexGouraudNormalMapShader, false, kMatrices + kLights + kAlpha, kLights + kAlpha + kMatrices,
-          "013"),
-    ORDER(QexGouraudSpecularShader, false, kMatrices + "cameraPos " + kLights + kSpecular + kAlpha,
-          "cameraPos " + kLights + kSpecular + kAlpha + kMatrices),
-    ORDER(QexGouraudShadowShader, false,
-          kMatrices + kLights + kAlpha + "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity ",
-          kLights + kAlpha + kMatrices + "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue ",
-          "023"),
-    ORDER(QexGouraudShadowExtShader, false,
-          kMatrices + kLights + kAlpha +
-              "shadowLightDir shadowSpaceMatrix biasValue shadowIntensity shadowFade ",
-          kLights + kAlpha + kMatrices +
-              "shadowLightDir shadowSpaceMatrix shadowIntensity biasValue shadowFade ",
-          "023"),
-    ORDER(QexTextureShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix "),
-    ORDER(QexTextureNoAlphaShader, false, "mvpMatrix " + kAlpha, kAlpha + "mvpMatrix "),
-    ORDER(QexSimpleShader, false, "mvpMatrix ", "mvpMatrix ", ""),
-    ORDER(QexSkinningTextureShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha, kDepthBatch),
-    ORDER(QexSkinningTextureNoAlphaShader, true, "boneCount boneMatrixArray viewProjMatrix " + kAlpha,
-          kDepthBatch),
-    ORDER(QexSkinningGouraudShader, true, kBoneSlots + kLights + kAlpha, kLights + kDepthBatch + kVectors),
-    ORDER(QexSkinningGouraudNormalMapShader, true, kBoneSlots + kLights + kAlpha,
-          kLights + kDepthBatch + kVectors, "013"),
-    ORDER(QexSkinningGouraudSpecularShader, true, kBoneSlots + "cameraPos " + kLights + kSpecular + kAlpha,
-          "cameraPos " + kLights + kSpecular + kDepthBatch + kVectors),
-    ORDER(QexUVDisplacementShader, false, "displacement mvpMatrix " + kAlpha,
-          kAlpha + "displacement mvpMatrix "),
-    ORDER(QexUVDisplacementNoAlphaShader, false, "displacement mvpMatrix " + kAlpha,
-          kAlpha + "displacement mvpMatrix "),
-    ORDER(QexDepthShader, false, "near far mvpMatrix ", "mvpMatrix "),
-    ORDER(QexSkinningDepthShader, true, "near far boneCount boneMatrixArray viewProjMatrix " + kAlpha,
-          kDepthBatch),
+    {MODULE(QexGouraudShader), false, kMatrices + kLit},
+    {MODULE(QexGouraudNormalMapShader), false, kMatrices + kLit, "013"},
+    {MODULE(QexGouraudSpecularShader), false, kMatrices + kHighlight},
+    {MODULE(QexGouraudShadowShader), false, kMatrices + kLit + kShadow, "023"},
+    {MODULE(QexGouraudShadowExtShader), false, kMatrices + kLit + kShadow + "shadowFade ", "023"},
+    {MODULE(QexTextureShader), false, "mvpMatrix " + kAlpha},
+    {MODULE(QexTextureNoAlphaShader), false, "mvpMatrix " + kAlpha},
+    {MODULE(QexSimpleShader), false, "mvpMatrix ", ""},
+    {MODULE(QexSkinningTextureShader), true, kSkinned},
+    {MODULE(QexSkinningTextureNoAlphaShader), true, kSkinned},
+    {MODULE(QexSkinningGouraudShader), true, kBoneSlots + kLit},
+    {MODULE(QexSkinningGouraudNormalMapShader), true, kBoneSlots + kLit, "013"},
+    {MODULE(QexSkinningGouraudSpecularShader), true, kBoneSlots + kHighlight},
+    {MODULE(QexUVDisplacementShader), false, "displacement mvpMatrix " + kAlpha},
+    {MODULE(QexUVDisplacementNoAlphaShader), false, "displacement mvpMatrix " + kAlpha},
+    {MODULE(QexDepthShader), false, "near far mvpMatrix "},
+    {MODULE(QexSkinningDepthShader), true, "near far " + kSkinned},
 };
 
 const Skin kNoSkin = {0, 0}, kTwoBones = {2, pod::kUint8Norm};
 
-TEST_F(LitTest, SlotsUploadsMatricesAndStateOfEveryModule) {
+TEST_F(LitTest, SlotsAndStateOfEveryModule) {
     const QexLightSet lights = Lights(2);
     const QexShadowInfo shadow = {};
-    const glm::mat4 view = glm::lookAt(glm::vec3(10, 20, 30), glm::vec3(0), glm::vec3(0, 1, 0));
-    const glm::mat4 projection = glm::perspective(1.0f, 1.5f, 1.0f, 100.0f);
-    const QexMatrix extra = ToQex(kExtra), viewMatrix = ToQex(view), projectionMatrix = ToQex(projection);
     for (const Order& order : kOrders) {
         LoadedModel model(TriangleScene(order.skinned ? kTwoBones : kNoSkin));
         QexShaderModule* module = order.create();
@@ -389,8 +359,8 @@ TEST_F(LitTest, SlotsUploadsMatricesAndStateOfEveryModule) {
         const auto slotCount = std::count(order.slots.begin(), order.slots.end(), ' ');
         for (long i = 0; i < slotCount; ++i) slots.push_back(module->slots[i].location);
         EXPECT_EQ(Names(module->program, slots), order.slots);
-        const auto draw = [&](uint32_t node, const QexMatrix* modelMatrix) {
-            module->render(module, &model.model, node, &lights, modelMatrix, &viewMatrix, &projectionMatrix,
+        const auto draw = [&](uint32_t node) {
+            module->render(module, &model.model, node, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
                            &shadow);
         };
         for (const GLenum unit : {3, 2, 1, 0}) {
@@ -398,36 +368,17 @@ TEST_F(LitTest, SlotsUploadsMatricesAndStateOfEveryModule) {
             glBindTexture(GL_TEXTURE_2D, 0);
         }
         QexRenderState_UseProgram(0);
-        const std::string change = StateChange([&] { draw(0, nullptr); });
+        const std::string change = StateChange([&] { draw(0); });
         EXPECT_EQ(change.find("program: 0 -> " + std::to_string(module->program) + "\n"), 0u);
         for (const char unit : std::string("0123"))
             EXPECT_EQ(change.find(std::string("texture2D[") + unit) != std::string::npos,
                       order.textures.find(unit) != std::string::npos)
                 << unit;
-        EXPECT_EQ(
-            std::count(change.begin(), change.end(), '\n'),
-            static_cast<long>(1 + order.textures.size() + (change.find("activeUnit") != std::string::npos)))
-            << change;
-        for (const bool given : {false, true}) {
-            const GLCalls calls([&] { draw(0, given ? &extra : nullptr); });
-            const glm::mat4 world = given ? kExtra * NodeMatrix() : NodeMatrix();
-            const int64_t whole =
-                glGetUniformLocation(module->program, order.skinned ? "viewProjMatrix" : "mvpMatrix");
-            std::vector<int64_t> uploads;
-            for (const gltapCall* call :
-                 calls.Of({"glUniform1f", "glUniform1i", "glUniform3f", "glUniform1iv", "glUniform2fv",
-                           "glUniform3fv", "glUniform4fv", "glUniformMatrix3fv", "glUniformMatrix4fv"})) {
-                uploads.push_back(call->argument[0].i);
-                EXPECT_TRUE(
-                    uploads.back() != whole ||
-                    SameMatrix(call->data, order.skinned ? projection * view : projection * view * world));
-            }
-            EXPECT_EQ(Names(module->program, uploads), order.uploads);
-            EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 1u);
-        }
+        const size_t lines = 1 + order.textures.size() + (change.find("activeUnit") != std::string::npos);
+        EXPECT_EQ(size_t(std::count(change.begin(), change.end(), '\n')), lines) << change;
         // No mesh node, and one that is hidden.
         model.Node().stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
-        for (const uint32_t node : {0u, 1u, 7u}) EXPECT_EQ(GLCalls([&] { draw(node, &extra); }).Size(), 0u);
+        for (const uint32_t node : {0u, 1u, 7u}) EXPECT_EQ(GLCalls([&] { draw(node); }).Size(), 0u);
         order.release(&module);
         order.release(&module);
     }
@@ -454,67 +405,31 @@ TEST_F(SteadyModuleTest, NoModuleAllocatesOrCreates) {
     }
 }
 
-// Depth of flat triangles, and texels shifted by half a picture.
-TEST_F(LitTest, DepthAndShiftedTextures) {
-    const glm::mat4 flat = glm::ortho(0.0f, float{kWidth}, 0.0f, float{kHeight}, -1.0f, 1.0f);
+TEST_F(LitTest, DepthOfFlatTriangles) {
     for (const bool skinned : {false, true}) {
         LoadedModel model(TriangleScene(skinned ? kTwoBones : kNoSkin));
         QexShaderModule* module =
             skinned ? QexSkinningDepthShader_CreateProgram() : QexDepthShader_CreateProgram();
         QexRenderState_UseProgram(module->program);
         (skinned ? QexSkinningDepthShader_SetParameters : QexDepthShader_SetParameters)(module, 0.1f, 0.9f);
-        for (const auto& [z, grey] : {std::pair{0.05f, 0}, {1.0f, 255}, {0.4f, 128}, {0.2f, 64}}) {
-            // Every vertex at this depth of clip space.
-            glm::mat4 projection = flat;
+        // Every vertex at that depth of clip space.
+        const auto draw = [&](float z) {
+            glm::mat4 projection = glm::ortho(0.0f, float{kWidth}, 0.0f, float{kHeight}, -1.0f, 1.0f);
             for (int c = 0; c < 4; ++c) projection[c][2] = c == 3 ? z : 0;
             const QexMatrix matrix = ToQex(projection);
-            Clear();
-            module->render(module, &model.model, 0, nullptr, nullptr, &g_sMatIdentity, &matrix, nullptr);
-            EXPECT_TRUE(Near(Read().Pixel(50, 60), {grey, grey, grey, 255}, 1)) << z;
-        }
-        // What the threshold cuts off is clear, the rest is opaque, whatever its opacity.
-        for (const auto& [opacity, alpha] : {std::pair{0.8f, 255}, {0.4f, skinned ? 0 : 255}}) {
-            glm::mat4 projection = flat;
-            for (int c = 0; c < 4; ++c) projection[c][2] = 0;
-            const QexMatrix matrix = ToQex(projection);
-            model.Material().opacity = opacity;
             Clear(1, 1, 1, 0.25f);
             module->render(module, &model.model, 0, nullptr, nullptr, &g_sMatIdentity, &matrix, nullptr);
-            EXPECT_EQ(Read().Pixel(50, 60)[3], alpha) << opacity;
+            return Read().Pixel(50, 60);
+        };
+        for (const auto& [z, grey] : {std::pair{0.05f, 0}, {1.0f, 255}, {0.4f, 128}, {0.2f, 64}})
+            EXPECT_TRUE(Near(draw(z), {grey, grey, grey, 255}, 1)) << z;
+        // What the threshold cuts off is clear, the rest is opaque, whatever its opacity.
+        for (const auto& [opacity, alpha] : {std::pair{0.8f, 255}, {0.4f, skinned ? 0 : 255}}) {
+            model.Material().opacity = opacity;
+            EXPECT_EQ(draw(0)[3], alpha) << opacity;
         }
         (skinned ? QexSkinningDepthShader_Release : QexDepthShader_Release)(&module);
     }
-    const uint8_t texels[] = {255, 0, 0, 255, 0, 255, 0, 100};
-    ScopedTexture twoColours(2, 1, texels);
-    QexTexture_SetWrapping(&twoColours, QEX_WRAP_REPEAT);
-    LoadedModel model(SceneOf(pod::BuildMesh(Rectangle(0, 0, 128, 96))));
-    model.model.textures[0] = &twoColours;
-    const struct {
-        QexShaderModule* module;
-        void (*set)(QexShaderModule*, float, float);
-        void (*get)(const QexShaderModule*, float*, float*);
-        void (*release)(QexShaderModule**);
-        int alpha;
-    } rows[] = {
-        {QexUVDisplacementShader_CreateProgram(), QexUVDisplacementShader_SetDisplacement,
-         QexUVDisplacementShader_GetDisplacement, QexUVDisplacementShader_Release, 255},
-        {QexUVDisplacementNoAlphaShader_CreateProgram(), QexUVDisplacementNoAlphaShader_SetDisplacement,
-         QexUVDisplacementNoAlphaShader_GetDisplacement, QexUVDisplacementNoAlphaShader_Release, 0}};
-    float u, v;
-    static int hooked;
-    model.model.bindTextureHook = [](QexModel*, uint32_t) { return ++hooked, 0; };
-    for (auto row : rows) {
-        row.set(row.module, 0.5f, 0.25f);
-        hooked = 0;
-        model.DrawNode(row.module);
-        EXPECT_EQ(hooked, 1);
-        EXPECT_EQ(Read().Pixel(20, 40), (Rgba{0, 255, 0, row.alpha}));
-        EXPECT_EQ(Read().Pixel(100, 40), (Rgba{255, 0, 0, 255}));
-        row.get(row.module, &u, &v);
-        EXPECT_TRUE(u == 0.5f && v == 0.25f);
-        row.release(&row.module);
-    }
-    model.model.textures[0] = nullptr;
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 #include <GLES2/gl2.h>
 
 #include <cmath>
-#include <fstream>
 
 #include "KtxWriter.h"
 #include "PvrWriter.h"
@@ -123,19 +122,13 @@ TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
 
 // A quad in pixels at z = 0, u to the right and v up.
 struct Quad {
-    explicit Quad(bool lit) {
-        mesh.vertexCount = 4;
-        mesh.positions = positions;
-        mesh.normals = lit ? normals : nullptr;
-        mesh.uvs = uvs;
-        mesh.indexCount = 6;
-        mesh.indices = indices;
-    }
+    explicit Quad(bool lit)
+        : mesh{4, positions, lit ? normals : nullptr, uvs, nullptr, 6, indices, nullptr} {}
     QexVec3 positions[4] = {{20, 20, 0}, {60, 20, 0}, {20, 60, 0}, {60, 60, 0}};
     QexVec3 normals[4] = {{0, 0, 1}, {0, 0, 1}, {0, 0, 1}, {0, 0, 1}};
     QexVec2 uvs[4] = {{0, 0}, {1, 0}, {0, 1}, {1, 1}};
     uint16_t indices[6] = {0, 1, 2, 2, 1, 3};
-    QexMesh mesh = {};
+    QexMesh mesh;
 };
 
 TEST_F(MeshTest, ModelsShowTextureColoursAndLightAndArePicked) {
@@ -204,23 +197,21 @@ TEST_F(MeshTest, TangentsFollowTheTexture) {
 }
 
 TEST_F(MeshTest, BadMeshesAreRefusedWithALine) {
-    const struct {
-        std::function<void(QexMesh*)> spoil;
-        std::string line;
-    } cases[] = {
-        {[](QexMesh* m) { m->positions = nullptr; }, "no mesh, no positions, or no indices"},
-        {[](QexMesh* m) { m->indices = nullptr; }, "no mesh, no positions, or no indices"},
+    const char* const nothing = "no mesh, no positions, or no indices";
+    const std::pair<void (*)(QexMesh*), std::string> cases[] = {
+        {[](QexMesh* m) { m->positions = nullptr; }, nothing},
+        {[](QexMesh* m) { m->indices = nullptr; }, nothing},
         {[](QexMesh* m) { m->vertexCount = 65537; }, "65537 vertices; 1 to 65536 can be drawn"},
         {[](QexMesh* m) { m->vertexCount = 3; }, "index 5 names vertex 3 of 3"},
         {[](QexMesh* m) { m->indexCount = 0; }, "4 corners are no whole triangles"},
     };
     QexModel model;
-    for (const auto& c : cases) {
+    for (const auto& [spoil, line] : cases) {
         Quad quad(true);
-        c.spoil(&quad.mesh);
+        spoil(&quad.mesh);
         Capture errors(STDERR_FILENO);
         EXPECT_EQ(QexModel_CreateFromMesh(&model, &quad.mesh, nullptr), -1);
-        EXPECT_EQ(errors.Text(), "E/Qex: <QexModel_CreateFromMesh> " + c.line + "\n");
+        EXPECT_EQ(errors.Text(), "E/Qex: <QexModel_CreateFromMesh> " + line + "\n");
         QexModel_Unload(&model);
     }
     Capture errors(STDERR_FILENO);
@@ -228,53 +219,42 @@ TEST_F(MeshTest, BadMeshesAreRefusedWithALine) {
     EXPECT_EQ(QexModel_CreateFromMesh(&model, nullptr, nullptr), -1);
 }
 
-// Three rows: red above, green, blue below.
+// A file of three rows: red above, green, blue below.
 std::vector<uint8_t> Rows(bool topFirst, bool bgr = false) {
-    const std::array<uint8_t, 4> rgba[] = {{255, 0, 0, 255}, {0, 255, 0, 255}, {0, 0, 255, 255}};
     std::vector<uint8_t> bytes;
-    for (int row = 0; row < 3; ++row)
-        for (int x = 0; x < 2; ++x) {
-            std::array<uint8_t, 4> c = rgba[topFirst ? row : 2 - row];
-            if (bgr) std::swap(c[0], c[2]);
-            bytes.insert(bytes.end(), c.begin(), c.end());
+    for (const int row : {0, 1, 2})
+        for (int i = 0; i < 8; ++i) {
+            const int at = topFirst ? row : 2 - row, c = i % 4;
+            bytes.push_back(c == 3 || c == (bgr ? 2 - at : at) ? 255 : 0);
         }
     return bytes;
 }
 
 std::vector<uint8_t> PvrFile(bool topFirst) {
-    pod::PvrImage image;
-    image.width = 2;
-    image.height = 3;
-    image.flags = topFirst ? 0u : pod::kPvrFlipped;
-    image.surfaces = {{Rows(topFirst)}};
-    return pod::WritePvr(image);
+    return pod::WritePvr({pod::kPvrRgba8888, 2, 3, topFirst ? 0u : pod::kPvrFlipped, {{Rows(topFirst)}}});
 }
 
-std::vector<uint8_t> KtxFile(bool topFirst, bool says) {
-    pod::KtxImage image;
-    image.glType = GL_UNSIGNED_BYTE;
-    image.glFormat = image.glInternalFormat = image.glBaseInternalFormat = GL_RGBA;
-    image.pixelBytes = 4;
-    image.width = 2;
-    image.height = 3;
-    if (says)
-        image.keyValues = {{"author", std::string(301, 'x')},
-                           {"KTXorientation", topFirst ? "S=r,T=d" : "S=r,T=u"}};
-    image.surfaces = {{Rows(topFirst)}};
+std::vector<uint8_t> KtxFile(bool topFirst, const char* orientation) {
+    pod::KtxImage image = {GL_UNSIGNED_BYTE, GL_RGBA, GL_RGBA, GL_RGBA, 4, 2, 3, {}, {{Rows(topFirst)}}};
+    if (orientation) image.keyValues = {{"author", std::string(301, 'x')}, {"KTXorientation", orientation}};
     return pod::WriteKtx(image);
 }
 
 std::vector<uint8_t> TgaFile(bool topFirst) {
-    std::vector<uint8_t> file = {0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 2, 0, 3, 0, 32, 8};
-    if (topFirst) file[17] |= 0x20;
+    std::vector<uint8_t> file = {0, 0, 2, 0, 0, 0, 0, 0,  0,
+                                 0, 0, 0, 2, 0, 3, 0, 32, uint8_t(topFirst ? 40 : 8)};
     const std::vector<uint8_t> rows = Rows(topFirst, true);
     file.insert(file.end(), rows.begin(), rows.end());
     return file;
 }
 
 TEST_F(PictureTest, StandUprightWhicheverRowComesFirst) {
-    const std::vector<uint8_t> files[] = {PvrFile(true),        PvrFile(false),       KtxFile(true, true),
-                                          KtxFile(false, true), KtxFile(true, false), TgaFile(true),
+    const std::vector<uint8_t> files[] = {PvrFile(true),
+                                          PvrFile(false),
+                                          KtxFile(true, "S=r,T=d"),
+                                          KtxFile(false, "S=r,T=u"),
+                                          KtxFile(true, nullptr),
+                                          TgaFile(true),
                                           TgaFile(false)};
     const Rgba red = {255, 0, 0, 255}, green = {0, 255, 0, 255}, blue = {0, 0, 255, 255};
     const QexRect lower = {0, 1, 1, 2}, middle = {1, 1, 1, 1};
@@ -305,13 +285,9 @@ TEST_F(PictureTest, StandUprightWhicheverRowComesFirst) {
 }
 
 TEST_F(PictureTest, AlphaFileRectanglesAndErrors) {
-    const std::string path = OutputPath("picture.pvr"), alphaPath = OutputPath("picture_a.pvr");
-    const auto save = [](const std::string& name, const std::vector<uint8_t>& bytes) {
-        std::ofstream(name, std::ios::binary)
-            .write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
-    };
-    save(path, PvrFile(true));
-    save(alphaPath, PvrFile(true));  // red, which counts, above alone
+    const std::string path = OutputPath("picture.pvr");
+    pod::WriteFile(path, PvrFile(true));
+    pod::WriteFile(OutputPath("picture_a.pvr"), PvrFile(true));  // red, which counts, above alone
     QexPicture picture;
     ASSERT_EQ(QexPicture_Load(&picture, path.c_str()), 0);
     Clear(1, 1, 1, 1);

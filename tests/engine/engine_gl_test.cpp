@@ -41,8 +41,8 @@ TEST_F(EngineTest, FlagsAndLogOfEachWayThroughTheStates) {
         QexEngineConfig config = SurfaceConfig();
         const uint64_t calls = gltapCountAll();
         Capture log(STDERR_FILENO);
-        for (const size_t size : {size_t{0}, size_t{45}, sizeof config + 1})
-            EXPECT_EQ(way.init(&runtime, static_cast<uint32_t>(size), &config), -1) << size;
+        for (const uint32_t size : {0u, 45u, uint32_t{sizeof config + 1}})
+            EXPECT_EQ(way.init(&runtime, size, &config), -1) << size;
         EXPECT_EQ(way.init(&runtime, way.size, nullptr), -1);
         EXPECT_EQ(gltapCountAll(), calls);
         EXPECT_EQ(way.init(&runtime, way.size, &config), 0);

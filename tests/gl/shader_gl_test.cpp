@@ -62,20 +62,16 @@ TEST_F(ShaderTest, CompileAndLinkFailures) {
     source += "void main() { gl_FragColor = " + sum + "; }";
     ASSERT_EQ(QexShader_Create(&unlinkable, source.c_str(), GL_FRAGMENT_SHADER), 0);
 
-    struct {
-        char text[QEX_SHADER_LOG_SIZE];
-        char after[16];
-    } buffer;
-    memset(&buffer, 'z', sizeof buffer);
+    std::string buffer(QEX_SHADER_LOG_SIZE + 16, 'z');
     const char* const names[] = {"p"};
-    EXPECT_EQ(QexShader_CreateProgram(&program, vertex, unlinkable, names, 1, buffer.text), -1);
-    EXPECT_GT(strnlen(buffer.text, sizeof buffer.text), 10u);
-    EXPECT_LT(strnlen(buffer.text, sizeof buffer.text), sizeof buffer.text);
-    EXPECT_EQ(buffer.after[0], 'z');
+    EXPECT_EQ(QexShader_CreateProgram(&program, vertex, unlinkable, names, 1, buffer.data()), -1);
+    EXPECT_GT(std::strlen(buffer.c_str()), 10u);
+    EXPECT_LT(std::strlen(buffer.c_str()), size_t{QEX_SHADER_LOG_SIZE});
+    EXPECT_EQ(buffer.substr(QEX_SHADER_LOG_SIZE), std::string(16, 'z'));
     glDeleteProgram(program);
 
-    EXPECT_EQ(QexShader_CreateProgram(&program, vertex, fragment, names, 1, buffer.text), 0);
-    EXPECT_EQ(buffer.text[0], 0);
+    EXPECT_EQ(QexShader_CreateProgram(&program, vertex, fragment, names, 1, buffer.data()), 0);
+    EXPECT_EQ(buffer[0], 0);
     EXPECT_EQ(g_QexCachedRenderStates.currentProgram, program);
     EXPECT_EQ(glGetAttribLocation(program, "p"), 0);
     QexRenderState_UseProgram(0);

@@ -8,30 +8,11 @@ namespace {
 class StateTest : public NullRenderTest {};
 
 // Names mean what GL calls so.
-constexpr uint32_t kPairs[][2] = {{GL_NEVER + QEX_DEPTH_LESS, GL_LESS},
-                                  {GL_NEVER + QEX_DEPTH_EQUAL, GL_EQUAL},
-                                  {GL_NEVER + QEX_DEPTH_LESS_EQUAL, GL_LEQUAL},
-                                  {GL_NEVER + QEX_DEPTH_GREATER, GL_GREATER},
-                                  {GL_NEVER + QEX_DEPTH_NOT_EQUAL, GL_NOTEQUAL},
-                                  {GL_NEVER + QEX_DEPTH_GREATER_EQUAL, GL_GEQUAL},
-                                  {GL_NEVER + QEX_DEPTH_ALWAYS, GL_ALWAYS},
-                                  {QEX_FACTOR_ZERO, GL_ZERO},
-                                  {QEX_FACTOR_ONE, GL_ONE},
-                                  {QEX_FACTOR_SRC_COLOR, GL_SRC_COLOR},
-                                  {QEX_FACTOR_ONE_MINUS_SRC_COLOR, GL_ONE_MINUS_SRC_COLOR},
-                                  {QEX_FACTOR_SRC_ALPHA, GL_SRC_ALPHA},
-                                  {QEX_FACTOR_ONE_MINUS_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA},
-                                  {QEX_FACTOR_DST_ALPHA, GL_DST_ALPHA},
-                                  {QEX_FACTOR_ONE_MINUS_DST_ALPHA, GL_ONE_MINUS_DST_ALPHA},
-                                  {QEX_FACTOR_DST_COLOR, GL_DST_COLOR},
-                                  {QEX_FACTOR_ONE_MINUS_DST_COLOR, GL_ONE_MINUS_DST_COLOR},
-                                  {QEX_FACTOR_SRC_ALPHA_SATURATE, GL_SRC_ALPHA_SATURATE}};
-constexpr bool AllAlike() {
-    for (const auto& pair : kPairs)
-        if (pair[0] != pair[1]) return false;
-    return true;
-}
-static_assert(AllAlike(), "a name differs from GL's");
+#define FACTOR(name) static_assert(QEX_FACTOR_##name == GL_##name, "as GL has it")
+// clang-format off
+FACTOR(ZERO); FACTOR(ONE); FACTOR(SRC_COLOR); FACTOR(ONE_MINUS_SRC_COLOR); FACTOR(SRC_ALPHA); FACTOR(ONE_MINUS_SRC_ALPHA);
+FACTOR(DST_ALPHA); FACTOR(ONE_MINUS_DST_ALPHA); FACTOR(DST_COLOR); FACTOR(ONE_MINUS_DST_COLOR); FACTOR(SRC_ALPHA_SATURATE);
+// clang-format on
 
 TEST_F(StateTest, OnlyChangesReachGL) {
     const GLCalls calls([] {
@@ -50,30 +31,35 @@ TEST_F(StateTest, OnlyChangesReachGL) {
 }
 
 TEST_F(StateTest, ModesReachGLAndUnknownOnesDoNot) {
-    const std::string depth = "glEnable(GL_DEPTH_TEST)\nglDepthFunc(GL_", cull = "glEnable(GL_CULL_FACE)\n";
+    const std::string depth = "glEnable(GL_DEPTH_TEST)\n", cull = "glEnable(GL_CULL_FACE)\n";
+    const auto function = [&](const char* name) { return depth + "glDepthFunc(GL_" + name + ")\n"; };
     const struct {
-        std::function<void(int)> set;
-        int first;
-        std::vector<std::string> calls;
+        void (*set)(int);
+        std::vector<std::pair<int, std::string>> calls;
     } settings[] = {
         {[](int mode) { QexRenderer_SetZTestFunc(static_cast<uint32_t>(mode)); },
-         0,
-         {depth + "NEVER)\n", depth + "LESS)\n", depth + "EQUAL)\n", depth + "LEQUAL)\n",
-          depth + "GREATER)\n", depth + "NOTEQUAL)\n", depth + "GEQUAL)\n", depth + "ALWAYS)\n",
-          "glEnable(GL_DEPTH_TEST)\n"}},
-        {[](int mode) { QexRenderer_SetZWrite(mode); },
-         -1,
-         {"glDepthMask(GL_TRUE)\n", "glDepthMask(GL_FALSE)\n", "glDepthMask(GL_TRUE)\n"}},
-        {[](int mode) { QexRenderer_SetBackFaceCulling(mode); },
-         -1,
-         {"", "glDisable(GL_CULL_FACE)\n", cull + "glCullFace(GL_BACK)\n", cull + "glCullFace(GL_FRONT)\n",
-          cull + "glCullFace(GL_FRONT_AND_BACK)\n", ""}},
+         {{QEX_DEPTH_NEVER, function("NEVER")},
+          {QEX_DEPTH_LESS, function("LESS")},
+          {QEX_DEPTH_EQUAL, function("EQUAL")},
+          {QEX_DEPTH_LESS_EQUAL, function("LEQUAL")},
+          {QEX_DEPTH_GREATER, function("GREATER")},
+          {QEX_DEPTH_NOT_EQUAL, function("NOTEQUAL")},
+          {QEX_DEPTH_GREATER_EQUAL, function("GEQUAL")},
+          {QEX_DEPTH_ALWAYS, function("ALWAYS")},
+          {8, depth}}},
+        {QexRenderer_SetZWrite,
+         {{-1, "glDepthMask(GL_TRUE)\n"}, {0, "glDepthMask(GL_FALSE)\n"}, {1, "glDepthMask(GL_TRUE)\n"}}},
+        {QexRenderer_SetBackFaceCulling,
+         {{-1, ""},
+          {QEX_CULL_NONE, "glDisable(GL_CULL_FACE)\n"},
+          {QEX_CULL_BACK, cull + "glCullFace(GL_BACK)\n"},
+          {QEX_CULL_FRONT, cull + "glCullFace(GL_FRONT)\n"},
+          {QEX_CULL_BOTH, cull + "glCullFace(GL_FRONT_AND_BACK)\n"},
+          {4, ""}}},
     };
     for (const auto& setting : settings)
-        for (size_t i = 0; i < setting.calls.size(); ++i) {
-            const int mode = setting.first + static_cast<int>(i);
-            EXPECT_EQ(GLCalls([&] { setting.set(mode); }).Text(), setting.calls[i]) << mode;
-        }
+        for (const auto& [mode, calls] : setting.calls)
+            EXPECT_EQ(GLCalls([&, mode = mode] { setting.set(mode); }).Text(), calls) << mode;
 }
 
 TEST_F(StateTest, BlendModes) {

@@ -74,12 +74,11 @@ class ModelTest : public RenderTest {
 };
 
 TEST_F(ModelTest, TexturesByNameAndSuffix) {
-    EXPECT_EQ(LoadFile(&model_, "scene.pod").substr(0, 2), "0 ");
-    EXPECT_EQ(Sizes(), "4/2 8/0 0/0 0/0 0/0 ");
+    for (int i = 0; i < 2; ++i) {  // the second load takes the place of the first
+        EXPECT_EQ(LoadFile(&model_, "scene.pod").substr(0, 2), "0 ");
+        EXPECT_EQ(Sizes(), "4/2 8/0 0/0 0/0 0/0 ");
+    }
     EXPECT_EQ(model_.scene.nodes[0].shader->render, QexTextureShader_Render);
-    // A second load takes the place of the first.
-    EXPECT_EQ(LoadFile(&model_, "scene.pod").substr(0, 2), "0 ");
-    EXPECT_EQ(Sizes(), "4/2 8/0 0/0 0/0 0/0 ");
     // From a cache the textures are borrowed, whether it holds pointers or records.
     QexTexture *wood = model_.textures[0], *alpha = model_.alphaTextures[0];
     const std::vector<uint8_t> file = pod::WritePod(Materials({"wood.pvr", "stone.pvr"}));
@@ -94,8 +93,9 @@ TEST_F(ModelTest, TexturesByNameAndSuffix) {
         QexModel_LoadContentFromCache(&borrower, file.data(), static_cast<uint32_t>(file.size()), &cache);
         ASSERT_TRUE(borrower.textures[0] && borrower.alphaTextures[0]);
         EXPECT_EQ(borrower.textures[0]->glName, wood->glName);
+        EXPECT_EQ(borrower.textures[0] == wood, !records);
+        EXPECT_EQ(borrower.textures[1], nullptr);
         EXPECT_EQ(borrower.alphaTextures[0]->glName, alpha->glName);
-        EXPECT_TRUE((borrower.textures[0] == wood) != records && !borrower.textures[1]);
         EXPECT_EQ(GLCalls([&] { QexModel_UnloadTextures(&borrower); }).Size(), 0u);
         QexModel_Unload(&borrower);
         QexNameCache_Release(&cache);
@@ -134,10 +134,7 @@ TEST_F(ModelTest, HooksOfLoading) {
 }
 
 TEST_F(ModelTest, SharedShadersLiveAsLongAsTheirModels) {
-    QexModel_SetShadowMapSize(64, 32);
-    const GLCalls calls([&] { LoadFile(&model_, "scene.pod"); });
-    QexModel_SetShadowMapSize(512, 512);
-    EXPECT_NE(calls.Text({"glRenderbufferStorage"}).find("GL_DEPTH_COMPONENT16, 64, 32"), std::string::npos);
+    LoadFile(&model_, "scene.pod");
     QexShaderModule* shared = model_.scene.nodes[0].shader;
     EXPECT_EQ(LoadedModel(Materials({nullptr})).Node().shader, shared);
     EXPECT_EQ(GLCalls([] { LoadedModel third(Materials({nullptr})); }).Text({"glCreateProgram"}), "");
@@ -157,15 +154,14 @@ TEST_F(ModelTest, FailedLoadsKeepNothingAndTakeNothing) {
     const std::vector<uint8_t> whole = pod::WritePod(Materials({nullptr}));
     pod::WriteFile(kFolder + "large.pod", pod::WritePod(SceneOf(pod::BuildMesh(many, true))));
     pod::WriteFile(kFolder + "cut.pod", {whole.begin(), whole.begin() + static_cast<long>(whole.size() / 2)});
-    const std::string read = "E/Qex: <QexModel_LoadContent> QexModel_LoadFromFile error.\n";
-    const std::string geometry = "E/Qex: <QexModel_LoadContent> download geometry failed!\n";
+    const std::string read = "QexModel_LoadFromFile error.\n", geometry = "download geometry failed!\n";
     const struct {
         const char* file;
-        std::string line, directory;
-    } cases[] = {{"missing.pod", read, kFolder},
-                 {"cut.pod", read, kFolder},
-                 {"large.pod", geometry, kFolder},
-                 {"a.pod", read, std::string(250, 'd') + "/"}};
+        std::string end, directory = kFolder;
+    } cases[] = {{"missing.pod", read},
+                 {"cut.pod", read},
+                 {"large.pod", geometry},
+                 {"a.pod", read, std::string(251, 'd')}};
     LoadedModel other(SceneOf(pod::BuildMesh(Rectangle(0, 0, 128, 96))));
     const std::string live = LiveObjects();
     for (const auto& c : cases) {
@@ -173,7 +169,8 @@ TEST_F(ModelTest, FailedLoadsKeepNothingAndTakeNothing) {
         QexModel_Create(&failed);
         const std::string load = LoadFile(&failed, c.file, c.directory);
         EXPECT_EQ(load.substr(0, 3), "-1 ") << c.file;
-        EXPECT_EQ(load.substr(load.size() - std::min(load.size(), c.line.size())), c.line);
+        const std::string end = "E/Qex: <QexModel_LoadContent> " + c.end;
+        EXPECT_EQ(load.substr(load.size() - std::min(load.size(), end.size())), end);
         EXPECT_EQ(LiveObjects(), live) << c.file;
         const GLCalls calls([&] {
             QexModel_RenderWithViewProjection(&failed, nullptr, nullptr, &g_sMatIdentity, &g_sMatIdentity, 0);
@@ -191,65 +188,53 @@ TEST_F(ModelTest, FailedLoadsKeepNothingAndTakeNothing) {
 // A normal map that leans everything towards the binormal, on a sphere in light from above, with and without
 // a mirrored texture. Normals of a file's own binormals must give what those made for it give.
 TEST_F(ModelTest, TangentsAloneGetBinormals) {
-    ScopedTexture leaning({128 + 76, 128, 128 + 102, 255});
+    static ScopedTexture* s_map;
+    ScopedTexture leaning({128 + 76, 128, 128 + 102, 255}), straight({128, 128, 255, 255});
     const QexLightSet lights = {1, {{QEX_LIGHT_DIRECTIONAL, {0, -1, -0.5f}, {1, 1, 1, 1}}}};
+    const QexMatrix projection = PixelProjection();
     QexShaderModule* module = QexGouraudNormalMapShader_CreateProgram();
-    static QexTexture* s_map;
-    const auto draw = [&](const pod::MeshArrays& arrays, QexTexture* map) {
-        LoadedModel model(SceneOf(pod::BuildMesh(arrays)));
-        for (int i = 0; i < 3; ++i) {
-            model.Material().diffuse[i] = 1;
-            model.Material().ambient[i] = 0;
-        }
+    const auto draw = [&](const pod::MeshArrays& arrays, ScopedTexture* map) {
+        pod::Scene scene = SceneOf(pod::BuildMesh(arrays));
+        scene.materials[0].ambient = {0, 0, 0};
+        LoadedModel model(scene);
         model.Node().shader = module;
         s_map = map;
-        if (map)
-            model.model.bindTextureHook = [](QexModel*, uint32_t) {
-                QexTexture_Set(s_map, 1);
-                return 0;
-            };
+        model.model.bindTextureHook = [](QexModel*, uint32_t) { return QexTexture_Set(s_map, 1), 0; };
         Clear();
-        const QexMatrix view = g_sMatIdentity, projection = PixelProjection();
-        QexModel_RenderWithViewProjection(&model.model, &lights, nullptr, &view, &projection, 0);
+        QexModel_RenderWithViewProjection(&model.model, &lights, nullptr, &g_sMatIdentity, &projection, 0);
         return Read();
     };
     pod::MeshArrays sphere = scenes::Sphere(12);
     for (pod::Vec3& p : sphere.positions) p = {64 + 40 * p[0], 48 + 40 * p[1], 0.5f * p[2]};
-    for (const bool mirrored : {false, true}) {
+    for (const float side : {1.0f, -1.0f}) {
         pod::MeshArrays tangents = sphere;
-        for (size_t v = 0; mirrored && v < sphere.uvs.size(); ++v) {
-            tangents.uvs[v][0] = -sphere.uvs[v][0];
-            for (size_t i = 0; i < 3; ++i) tangents.tangents[v][i] = -sphere.tangents[v][i];
-        }
+        for (auto& uv : tangents.uvs) uv[0] *= side;
+        for (pod::Vec3& tangent : tangents.tangents)
+            tangent = {side * tangent[0], side * tangent[1], side * tangent[2]};
         const Picture expected = draw(tangents, &leaning);
         tangents.binormals.clear();
         EXPECT_TRUE(SamePicture(draw(tangents, &leaning), expected, 1));
-        EXPECT_FALSE(SamePicture(draw(tangents, nullptr), expected, 1));
+        EXPECT_FALSE(SamePicture(draw(tangents, &straight), expected, 1));
     }
     QexGouraudNormalMapShader_Release(&module);
 }
 
 class ModelMemoryTest : public NullRenderTest {};
 
-TEST_F(ModelMemoryTest, FiftyLoadsLeaveNothing) {
+TEST_F(ModelMemoryTest, LoadsLeaveNothing) {
     WritePictures();
-    pod::WriteFile(kFolder + "fifty.pod", pod::WritePod(Materials({"wood.pvr", nullptr})));
-    const std::string live = LiveObjects();
-    Capture out(STDOUT_FILENO), log(STDERR_FILENO);
+    pod::WriteFile(kFolder + "again.pod", pod::WritePod(Materials({"wood.pvr", nullptr})));
     const auto load = [&] {
         QexModel model;
         QexModel_Create(&model);
-        EXPECT_EQ(QexModel_LoadContent(&model, kFolder.c_str(), "fifty.pod"), 0);
+        EXPECT_EQ(LoadFile(&model, "again.pod").substr(0, 2), "0 ");
         EXPECT_TRUE(model.textures[0] && model.alphaTextures[0]);
         QexModel_Unload(&model);
     };
     load();
-    const Allocations allocations = CountAllocations([&] {
-        for (int i = 0; i < 50; ++i) load();
-    });
-    EXPECT_EQ(LiveObjects(), live);
+    const Allocations allocations = CountAllocations(load);
     EXPECT_EQ(allocations.balance, 0);
-    EXPECT_TRUE(allocations.made > 50 || !kAllocationsAreCounted);
+    EXPECT_EQ(allocations.made > 1, kAllocationsAreCounted);
 }
 
 }  // namespace

@@ -14,7 +14,9 @@ TEST(SceneNode, LinksAreMadeAndTakenAway) {
     QexNode root, nodes[3];
     QexNode_Create(&root, "a name beyond the field", nullptr, nullptr);
     EXPECT_STREQ(root.name, "a name beyond t");
-    for (const size_t i : {0, 1, 2}) QexNode_Create(&nodes[i], i ? i == 1 ? "b" : "c" : "a", &root, nullptr);
+    QexNode_Create(&nodes[0], "a", &root, nullptr);
+    QexNode_Create(&nodes[1], "b", &root, nullptr);
+    QexNode_Create(&nodes[2], "c", &root, nullptr);
     EXPECT_EQ(Children(root), "abc");
     EXPECT_EQ(QexNode_GetPreviousSibling(&nodes[2]), &nodes[1]);
     EXPECT_EQ(QexNode_GetPreviousSibling(&nodes[0]), nullptr);

@@ -2,7 +2,6 @@
 
 #include <cmath>
 
-#include "support/RenderFixture.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -49,11 +48,9 @@ TEST_F(BillboardTest, ModesTurnAsDescribed) {
     ScopedTexture texture({255, 255, 255, 255});
     QexBillboard* billboard = QexBillboard_Create(&texture);
     *billboard = {&texture, 64, 32, 1, {0.5f, 2, 7}, {20, -50, 70}, {3, -4, 5}, 1, 1};
-    // About the billboard: in front, to the sides, behind, above and below.
-    const QexVec3 offsets[] = {
-        {0, 0, 9},   {0, 10, 10}, {8, 0, 0},  {-8, 0, 0}, {5, -6, 7}, {5, 6, 7},
-        {-5, 6, -7}, {-1, -9, 2}, {3, 1, -8}, {0, 9, 0},  {0, -9, 0}};  // from above and below there is no
-                                                                        // yaw
+    // About the billboard: in front, to the sides, behind, and, where there is no yaw, above and below.
+    const QexVec3 offsets[] = {{0, 0, 9},   {8, 0, 0},  {-8, 0, 0}, {5, -6, 7},
+                               {-5, 6, -7}, {3, 1, -8}, {0, 9, 0},  {0, -9, 0}};
     for (const QexVec3& offset : offsets) {
         QexCamera camera;
         QexCamera_Create(&camera, 0);
@@ -63,7 +60,6 @@ TEST_F(BillboardTest, ModesTurnAsDescribed) {
         QexCamera_LookAt(&camera, &eye, &target, nullptr);
         QexCamera_Project(&camera, 1, 1.5f, 1, 50);
         // A view with perspective of its own: its bottom row stays.
-        camera.viewMatrix.m[3] = 0.25f;
         for (const float bottom : {0.25f, 0.0f}) {
             camera.viewMatrix.m[3] = bottom;
             const glm::dmat4 view = glm::make_mat4(camera.viewMatrix.m),
@@ -81,10 +77,8 @@ TEST_F(BillboardTest, ModesTurnAsDescribed) {
 }
 
 TEST_F(BillboardTest, CoversItsTexels) {
-    const Rgba texels[] = {{255, 0, 0, 255}, {0, 255, 0, 200}, {0, 0, 255, 100}, {255, 255, 0, 0}};
-    uint8_t bytes[16];
-    for (size_t i = 0; i < 16; ++i) bytes[i] = static_cast<uint8_t>(texels[i / 4][i % 4]);
-    ScopedTexture texture(2, 2, bytes);
+    const uint8_t texels[4][4] = {{255, 0, 0, 255}, {0, 255, 0, 200}, {0, 0, 255, 100}, {255, 255, 0, 0}};
+    ScopedTexture texture(2, 2, texels[0]);
     const QexCamera camera = PixelCamera();
     QexBillboard* billboard = QexBillboard_Create(&texture);
     billboard->scale = {32, 16, 1};
@@ -97,10 +91,9 @@ TEST_F(BillboardTest, CoversItsTexels) {
     expected.Fill(0, 0, kWidth, kHeight, {51, 102, 153, 255});
     for (int i = 0; i < 4; ++i) {
         // The first row of texels is the lower one.
-        Rgba colour = texels[i];
-        colour[3] /= 2;
+        const uint8_t* t = texels[i];
         const int left = 60 - 32 + i % 2 * 32, top = 40 - i / 2 * 16;
-        expected.Fill(left, top, left + 32, top + 16, colour);
+        expected.Fill(left, top, left + 32, top + 16, {t[0], t[1], t[2], t[3] / 2});
     }
     EXPECT_TRUE(SamePicture(Read(), expected, 1));
     QexBillboard_Release(billboard);
@@ -115,7 +108,8 @@ TEST_F(BillboardTest, LifeAndStateLeftBehind) {
     for (int round = 0; round < 2; ++round) {
         QexBillboard* first = QexBillboard_Create(nullptr);
         QexBillboard* second = QexBillboard_Create(nullptr);
-        ASSERT_TRUE(first && second);
+        ASSERT_NE(first, nullptr);
+        ASSERT_NE(second, nullptr);
         EXPECT_EQ(g_BillboardCount, 2);
         EXPECT_EQ(g_VecUp.y, 1);
         EXPECT_EQ(g_VecNormal.z, 1);
@@ -130,12 +124,9 @@ TEST_F(BillboardTest, LifeAndStateLeftBehind) {
         QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
         EXPECT_EQ(StateChange([&] { QexBillboard_Draw(second, &camera); }),
                   "program: 0 -> " + program + "\nactiveUnit: 2 -> 0\ncullFace: 0 -> 1\n");
-        const GLCalls calls([&] {
-            QexBillboard_Release(first);
-            EXPECT_EQ(g_BillboardShaderProgramID, std::stoul(program));
-            QexBillboard_Release(second);
-        });
-        EXPECT_EQ(calls.Text({"glDeleteProgram"}), "glDeleteProgram(" + program + ")\n");
+        QexBillboard_Release(first);
+        EXPECT_EQ(std::to_string(g_BillboardShaderProgramID), program);
+        QexBillboard_Release(second);
         EXPECT_EQ(g_BillboardShaderProgramID, 0u);
         EXPECT_EQ(LiveObjects(), before);
     }

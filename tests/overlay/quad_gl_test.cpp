@@ -8,26 +8,17 @@ namespace {
 
 class QuadTest : public RenderTest {};
 
-// What a call has sent: x, y and texture coordinates of the four vertices, from the arrays.
-struct SentQuad {
-    const float* positions;
-    const float* texCoords;
-};
-
-SentQuad Sent(const GLCalls& calls) {
-    const auto pointers = calls.Of({"glVertexAttribPointer"});
-    EXPECT_EQ(pointers.size(), 3u);
-    return {static_cast<const float*>(pointers[0]->argument[5].p),
-            static_cast<const float*>(pointers[2]->argument[5].p)};
-}
-
+// Positions and texture coordinates of the four vertices that a call sent, which set no state.
 void ExpectQuad(const GLCalls& calls, std::array<float, 4> box, std::array<float, 4> uv) {
-    const SentQuad sent = Sent(calls);
+    const auto pointers = calls.Of({"glVertexAttribPointer"});
+    ASSERT_EQ(pointers.size(), 3u);
+    const auto* positions = static_cast<const float*>(pointers[0]->argument[5].p);
+    const auto* coords = static_cast<const float*>(pointers[2]->argument[5].p);
     for (int i = 0; i < 4; ++i) {
-        EXPECT_FLOAT_EQ(sent.positions[3 * i], box[i & 1 ? 1 : 0]);
-        EXPECT_FLOAT_EQ(sent.positions[3 * i + 1], box[i > 1 ? 3 : 2]);
-        EXPECT_FLOAT_EQ(sent.texCoords[2 * i], uv[i & 1 ? 1 : 0]);
-        EXPECT_FLOAT_EQ(sent.texCoords[2 * i + 1], uv[i > 1 ? 3 : 2]);
+        EXPECT_FLOAT_EQ(positions[3 * i], box[i & 1 ? 1 : 0]);
+        EXPECT_FLOAT_EQ(positions[3 * i + 1], box[i > 1 ? 3 : 2]);
+        EXPECT_FLOAT_EQ(coords[2 * i], uv[i & 1 ? 1 : 0]);
+        EXPECT_FLOAT_EQ(coords[2 * i + 1], uv[i > 1 ? 3 : 2]);
     }
     EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 1u);
     EXPECT_EQ(calls.Of({"glEnable", "glDisable", "glDepthFunc", "glBlendFunc"}).size(), 0u);
@@ -80,6 +71,7 @@ TEST_F(QuadTest, ColourAndAlphaOfThePixels) {
 
 TEST_F(QuadTest, TheFontIsMadeWhenItIsMissing) {
     QexFont_Release();
+    QexFont_CreateShader();  // alone is no font
     ScopedTexture texture({1, 2, 3, 255});
     Capture log(STDERR_FILENO);
     EXPECT_EQ(QexTexture_Draw2(&runtime_, &texture, nullptr, 0, 0, nullptr, 8, 8, 0xFFFFFFFF), 0);
@@ -103,14 +95,13 @@ TEST_F(QuadTest, TargetsNestAndComeBack) {
               "");
     glBindFramebuffer(GL_FRAMEBUFFER, outer.framebuffer);
     QexRenderTarget_Create(&inner, 16, 16, 0);
-    GLint bound;
-    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &bound);
-    EXPECT_EQ(static_cast<uint32_t>(bound), outer.framebuffer) << "creating leaves it bound";
+    gltapState state;
+    gltapGetState(&state);
+    EXPECT_EQ(state.framebuffer, outer.framebuffer) << "creating leaves it bound";
     EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum(GL_FRAMEBUFFER_COMPLETE));
     glBindFramebuffer(GL_FRAMEBUFFER, 0);
     EXPECT_EQ(inner.colorTexture.format, uint32_t{GL_RGBA});
     EXPECT_EQ(inner.colorTexture.flags, 1u);
-
     glDisable(GL_SCISSOR_TEST);
     glViewport(3, 4, 50, 60);
     EXPECT_EQ(StateChange([&] {
@@ -138,12 +129,13 @@ TEST_F(QuadTest, TargetsNestAndComeBack) {
     EXPECT_EQ(picture.Pixel(108, 18), (Rgba{0, 255, 0, 255}));
 
     QexRenderTarget_SetRenderTarget(&runtime_, &inner);
-    gltapState state;
     gltapGetState(&state);
-    EXPECT_TRUE(state.framebuffer == inner.framebuffer && state.viewport[2] == 16);
+    EXPECT_EQ(state.framebuffer, inner.framebuffer);
+    EXPECT_EQ(state.viewport[2], 16);
     QexRenderTarget_SetRenderTarget(&runtime_, nullptr);
     gltapGetState(&state);
-    EXPECT_TRUE(state.framebuffer == 0 && state.viewport[2] == kWidth && state.viewport[3] == kHeight);
+    EXPECT_EQ(state.framebuffer, 0u);
+    EXPECT_EQ(glm::make_vec2(state.viewport + 2), glm::ivec2(kWidth, kHeight));
     EXPECT_EQ(QexRenderTarget_CreateFromTexture(nullptr, nullptr), 0);
     for (int twice = 0; twice < 2; ++twice)
         for (QexRenderTarget* target : {&outer, &inner, static_cast<QexRenderTarget*>(nullptr)})

@@ -83,20 +83,6 @@ std::vector<const gltapCall*> GLCalls::Of(std::initializer_list<std::string> fun
     return calls;
 }
 
-std::string GLCalls::Sequence(std::initializer_list<std::string> functions) const {
-    std::string text;
-    bool shown = false;
-    for (size_t i = 0; i < Size(); ++i) {
-        const std::string name = gltapFunctionName(gltapRecordingCall(recording_.get(), i)->function);
-        const bool error = name == "glGetError";
-        if (!error)
-            shown =
-                !functions.size() || std::find(functions.begin(), functions.end(), name) != functions.end();
-        if (shown) text += error ? "! " : name.substr(2) + " ";
-    }
-    return text;
-}
-
 std::string GLCalls::Text(std::initializer_list<std::string> functions) const {
     std::string text;
     for (const gltapCall* call : Of(functions))

@@ -43,8 +43,6 @@ class GLCalls {
     explicit GLCalls(const std::function<void()>& draw);
     // The calls of these functions in order, one a line, or of all when none is named.
     std::string Text(std::initializer_list<std::string> functions = {}) const;
-    // The names of these functions' calls in order, or of all, "! " where the error was read behind one.
-    std::string Sequence(std::initializer_list<std::string> functions) const;
     // The calls belong to this recording.
     std::vector<const gltapCall*> Of(std::initializer_list<std::string> functions) const&;
     std::vector<const gltapCall*> Of(std::initializer_list<std::string> functions) const&& = delete;

@@ -1,7 +1,5 @@
 #include "support/RenderScenes.h"
 
-#include <algorithm>
-
 #include "support/Capture.h"
 
 pod::MeshArrays Rectangle(float left, float bottom, float right, float top) {
@@ -39,35 +37,15 @@ pod::Element IntegerElement(uint32_t type, uint32_t components, const std::vecto
 }
 
 pod::Mesh SkinnedMesh(const pod::MeshArrays& arrays, uint32_t influences, uint32_t weightType,
-                      const std::vector<std::vector<int>>& batches, const std::vector<int32_t>& firstFaces) {
+                      const std::vector<int32_t>& bones) {
     pod::Mesh mesh = pod::BuildMesh(arrays);
     mesh.boneIndices.components = mesh.boneWeights.components = influences;
     mesh.boneWeights.type = weightType;
-    for (const auto& bones : batches) mesh.batchBoneMax = std::max(mesh.batchBoneMax, int32_t(bones.size()));
-    for (const auto& bones : batches) {
-        mesh.bonesPerBatch.push_back(static_cast<int32_t>(bones.size()));
-        mesh.batchBones.insert(mesh.batchBones.end(), bones.begin(), bones.end());
-        mesh.batchBones.resize(mesh.bonesPerBatch.size() * static_cast<size_t>(mesh.batchBoneMax));
-    }
-    mesh.batchOffsets = firstFaces;
-    mesh.batchCount = static_cast<int32_t>(batches.size());
-    if (weightType != pod::kFloat32) return mesh;
-    std::vector<float> shares;
-    for (const auto& weights : arrays.boneWeights)
-        for (uint32_t i = 0; i < influences; ++i) shares.push_back(static_cast<float>(weights[i]) / 255);
-    mesh.boneWeights = {};
-    mesh.uvw.resize(1);
-    for (pod::Element* e :
-         {&mesh.vertices, &mesh.normals, &mesh.tangents, &mesh.binormals, &mesh.uvw[0], &mesh.boneIndices}) {
-        const uint32_t size = pod::DataTypeSize(e->type) * e->components;
-        for (auto at = mesh.vertexBlock.begin() + e->offset; size && at < mesh.vertexBlock.end();
-             at += std::min<long>(e->stride, mesh.vertexBlock.end() - at))
-            e->data.insert(e->data.end(), at, at + size);
-        e->stride = size;
-    }
-    mesh.boneWeights = pod::FloatElement(shares.data(), shares.size(), influences);
-    mesh.interleaved = false;
-    mesh.vertexBlock.clear();
+    mesh.batchBones = bones;
+    mesh.batchBoneMax = static_cast<int32_t>(bones.size());
+    mesh.bonesPerBatch = {mesh.batchBoneMax};
+    mesh.batchOffsets = {0};
+    mesh.batchCount = 1;
     return mesh;
 }
 

@@ -16,11 +16,10 @@ pod::Scene SceneOf(const pod::Mesh& mesh, const pod::Transform& place = {});
 // An element by itself, its values given as numbers of a type of 1, 2 or 4 bytes.
 pod::Element IntegerElement(uint32_t type, uint32_t components, const std::vector<double>& values);
 
-// A mesh of arrays with four bones and weights a vertex, of which the first `influences` are kept; weights of
-// kFloat32 come as separate elements. Batch i has those scene nodes for bones and begins at face
-// firstFaces[i].
+// A mesh of arrays with four bones and weights a vertex, of which the first `influences` are kept, in one
+// batch that has those scene nodes for bones.
 pod::Mesh SkinnedMesh(const pod::MeshArrays& arrays, uint32_t influences, uint32_t weightType,
-                      const std::vector<std::vector<int>>& batches, const std::vector<int32_t>& firstFaces);
+                      const std::vector<int32_t>& bones);
 
 // An unfiltered texture of w x h texels of four bytes.
 QexTexture MakeTexture(int w, int h, const uint8_t* rgba);
