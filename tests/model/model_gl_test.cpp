@@ -228,7 +228,8 @@ TEST_F(ModelMemoryTest, LoadsLeaveNothing) {
         QexModel model;
         QexModel_Create(&model);
         EXPECT_EQ(LoadFile(&model, "again.pod").substr(0, 2), "0 ");
-        EXPECT_TRUE(model.textures[0] && model.alphaTextures[0]);
+        EXPECT_NE(model.textures[0], nullptr);
+        EXPECT_NE(model.alphaTextures[0], nullptr);
         QexModel_Unload(&model);
     };
     load();

@@ -114,8 +114,7 @@ TEST_F(NodeTest, NodesFaceAndTouch) {
     QexModel* m = &model.model;
     QexMatrix world;
     const glm::vec3 place(1, -2, 3);
-    const glm::vec3 ways[] = {{4, 0, 0},  {-2, 0, 0},    {0, 5, 0}, {1, 2, 3},
-                              {3, 1, -9}, {.001f, 0, 1}, {0, 0, 2}, {0, 0, -7}};
+    const glm::vec3 ways[] = {{4, 0, 0}, {1, 2, 3}, {.001f, 0, 1}, {0, 0, 2}, {0, 0, -7}};
     QexModel_SetNodePosition(m, 0, place.x, place.y, place.z);
     for (const glm::vec3& way : ways) {
         // Along the Z axis, half a turn or none about Y.

@@ -8,47 +8,6 @@ namespace {
 
 class QuadTest : public RenderTest {};
 
-// Positions and texture coordinates of the four vertices that a call sent, which set no state.
-void ExpectQuad(const GLCalls& calls, std::array<float, 4> box, std::array<float, 4> uv) {
-    const auto pointers = calls.Of({"glVertexAttribPointer"});
-    ASSERT_EQ(pointers.size(), 3u);
-    const auto* positions = static_cast<const float*>(pointers[0]->argument[5].p);
-    const auto* coords = static_cast<const float*>(pointers[2]->argument[5].p);
-    for (int i = 0; i < 4; ++i) {
-        EXPECT_FLOAT_EQ(positions[3 * i], box[i & 1 ? 1 : 0]);
-        EXPECT_FLOAT_EQ(positions[3 * i + 1], box[i > 1 ? 3 : 2]);
-        EXPECT_FLOAT_EQ(coords[2 * i], uv[i & 1 ? 1 : 0]);
-        EXPECT_FLOAT_EQ(coords[2 * i + 1], uv[i > 1 ? 3 : 2]);
-    }
-    EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 1u);
-    EXPECT_EQ(calls.Of({"glEnable", "glDisable", "glDepthFunc", "glBlendFunc"}).size(), 0u);
-}
-
-// A surface 480 high; left, right, upper and lower edge, then s and t of them.
-TEST_F(QuadTest, VerticesOfTextureRectangleAndNothing) {
-    QexRuntimeContext screen = {};
-    screen.width = 640;
-    screen.height = 480;
-    std::vector<uint8_t> pixels(128 * 64 * 4, 255);
-    ScopedTexture texture(128, 64, pixels.data());
-    const QexRect part = {0, 0, 31, 15};
-    for (const bool two : {false, true}) {
-        const auto draw = [&](QexTexture* t, const QexRect* rectangle, float sx, float sy) {
-            return GLCalls([&, rectangle, sx, sy] {
-                const int32_t result =
-                    two ? QexTexture_Draw2(&screen, t, nullptr, 10, 20, rectangle, sx, sy, 0xFFFFFFFF)
-                        : QexTexture_Draw(&screen, t, 10, 20, rectangle, sx, sy, 0xFFFFFFFF);
-                EXPECT_EQ(result, 0);
-            });
-        };
-        ExpectQuad(draw(&texture, nullptr, 1, 1), {10, 139, 460, 395}, {0, 1, 1, 0});
-        ExpectQuad(draw(&texture, &part, 1, 1), {10, 42, 460, 444}, {0, 31.0f / 128, 1, 49.0f / 64});
-        ExpectQuad(draw(&texture, &part, 2, 3), {10, 74, 460, 412}, {0, 31.0f / 128, 1, 49.0f / 64});
-        ExpectQuad(draw(nullptr, nullptr, 64, 64), {10, 75, 460, 395}, {0, 1, 1, 0});
-        ExpectQuad(draw(nullptr, &part, 64, 64), {10, 75, 460, 395}, {0, 1, 1, 0});
-    }
-}
-
 // Rows of a texture's data count from below, so the last row is the upper one.
 TEST_F(QuadTest, ColourAndAlphaOfThePixels) {
     const uint8_t rows[] = {255, 0, 0, 255, 255, 0, 0, 255, 0, 255, 0, 255, 0, 255, 0, 255};
@@ -58,12 +17,15 @@ TEST_F(QuadTest, ColourAndAlphaOfThePixels) {
     Clear(0, 0, 1, 1);
     QexTexture_Draw(&runtime_, &texture, 20, 10, nullptr, 10, 10, 0xFFFFFFFF);
     QexTexture_Draw2(&runtime_, &texture, &half, 60, 10, nullptr, 10, 10, 0x80FF80FF);
-    QexTexture_Draw(&runtime_, nullptr, 100, 10, nullptr, 8, 8, 0xFF102030);
+    const GLCalls calls([&] { QexTexture_Draw(&runtime_, nullptr, 100, 10, nullptr, 8, 8, 0xFF102030); });
+    EXPECT_EQ(calls.Text({"glEnable", "glDisable", "glDepthFunc", "glBlendFuncSeparate"}), "");
     const Picture picture = Read();
     EXPECT_EQ(picture.Pixel(30, 12), (Rgba{0, 255, 0, 255}));
     EXPECT_EQ(picture.Pixel(30, 38), (Rgba{255, 0, 0, 255}));
     EXPECT_EQ(picture.Pixel(30, 41), (Rgba{0, 0, 255, 255})) << "below";
-    EXPECT_EQ(picture.Pixel(19, 20), (Rgba{0, 0, 255, 255})) << "beside";
+    // Drawn one texel larger than it is: from 20 to 50.
+    EXPECT_EQ(picture.Pixel(49, 12), (Rgba{0, 255, 0, 255}));
+    for (const int x : {19, 50}) EXPECT_EQ(picture.Pixel(x, 12), (Rgba{0, 0, 255, 255})) << "beside";
     // Half alpha of half: a quarter of the texel in the colour, over blue.
     EXPECT_TRUE(Near(picture.Pixel(75, 12), {0, 32, 191, 207}, 2));
     EXPECT_EQ(picture.Pixel(104, 14), (Rgba{0x10, 0x20, 0x30, 255}));
