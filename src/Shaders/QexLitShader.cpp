@@ -1,5 +1,6 @@
 // Lights, material and shadow as the lit modules' uniforms take them.
 #include "Shaders/QexLitShader.h"
+
 #include "Qex/math.h"
 #include "Qex/pod.h"
 #include "Qex/renderer.h"

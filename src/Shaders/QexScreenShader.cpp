@@ -1,5 +1,6 @@
 // Set-up of the modules that draw over the screen.
 #include "Shaders/QexScreenShader.h"
+
 #include "Qex/math.h"
 #include "Qex/shader_modules.h"
 

@@ -1,5 +1,6 @@
 // Unlit, alpha from the alpha texture.
 #include "Shaders/QexTextureShader.h"
+
 #include "Qex/math.h"
 #include "Qex/pod.h"
 #include "Qex/shader_modules.h"

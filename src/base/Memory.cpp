@@ -1,5 +1,6 @@
 // The process heap, and the pool whose statistics alone are kept.
 #include "base/Memory.h"
+
 #include "Qex/base.h"
 
 #include <cstdlib>

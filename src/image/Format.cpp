@@ -1,5 +1,6 @@
 // The table of pixel formats, and how many bytes their levels take.
 #include "image/Format.h"
+
 #include "Qex/images.h"
 
 namespace {

@@ -1,5 +1,6 @@
 // What holds for the sizes of textures in every kind of file.
 #include "image/Image.h"
+
 #include "Qex/math.h"
 
 uint32_t QexImage_ChainLength(uint32_t width, uint32_t height) {

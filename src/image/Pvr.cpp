@@ -1,5 +1,6 @@
 // Reads the headers of PVR files and finds their levels, which follow each other without gaps.
 #include "image/Pvr.h"
+
 #include "Qex/images.h"
 
 bool QexPvr_Is(const QexImageBytes& file) {

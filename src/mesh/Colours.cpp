@@ -4,6 +4,7 @@
 // filtering between texels of a colour that changes evenly is exact, so the triangle shows what interpolating
 // between its vertices would.
 #include "mesh/Colours.h"
+
 #include "base/Memory.h"
 #include "mesh/Mesh.h"
 #include "Qex/meshes.h"

@@ -1,6 +1,7 @@
 // The glyphs of the characters 160 to 255 (Latin-1), for a sheet of the same grid as the font's own: letters
 // with their marks are put together from that sheet, the rest is drawn here.
 #include "overlay/FontLatin.h"
+
 #include "Qex/overlay.h"
 
 #include <cstring>

@@ -45,27 +45,22 @@ T LoadKey(const float* data, uint64_t offset) {
     return key;
 }
 
+// A frame's key in a channel that moves.
+template <class T>
+T KeyAt(const QexPODNode* node, const QexPODChannel& channel, uint32_t frame) {
+    return LoadKey<T>(node->*channel.keys, KeyOffset(node->*channel.index, frame, channel.stride));
+}
+
 // Position or scale between two frames.
-inline QexVec3 InterpolateVec3(const QexPODNode* node, QexPODChannelNumber channel, const Frames& frames,
-                               const float* data, const uint32_t* index, uint32_t keyFloats,
-                               uint32_t animatedBit) {
-    if (!(node->animationFlags & animatedBit)) return LoadKey<QexVec3>(data, 0);
-    const Frames keyed = WithinKeys(node, channel, frames);
-    const QexVec3 a = LoadKey<QexVec3>(data, KeyOffset(index, keyed.a, keyFloats));
-    const QexVec3 b = LoadKey<QexVec3>(data, KeyOffset(index, keyed.b, keyFloats));
+inline QexVec3 InterpolateVec3(const QexPODNode* node, QexPODChannelNumber number, const Frames& frames) {
+    const QexPODChannel& channel = kPODChannelTable[number];
+    if (!(node->animationFlags & channel.animated)) return LoadKey<QexVec3>(node->*channel.keys, 0);
+    const Frames keyed = WithinKeys(node, number, frames);
+    const QexVec3 a = KeyAt<QexVec3>(node, channel, keyed.a);
+    const QexVec3 b = KeyAt<QexVec3>(node, channel, keyed.b);
     QexVec3 result;
     QexVec3_Lerp(&result, &a, &b, node->frameFraction);
     return result;
-}
-
-inline QexVec3 Position(const QexPODNode* node, const Frames& frames) {
-    return InterpolateVec3(node, kPODPosition, frames, node->position, node->positionIndex, 3,
-                           QEX_NODE_POSITION_ANIMATED);
-}
-
-inline QexVec3 Scale(const QexPODNode* node, const Frames& frames) {
-    return InterpolateVec3(node, kPODScale, frames, node->scale, node->scaleIndex, 7,
-                           QEX_NODE_SCALE_ANIMATED);
 }
 
 void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames) {
@@ -76,10 +71,8 @@ void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames
     QexQuaternion q = LoadKey<QexQuaternion>(node->rotation, 0);
     if (node->animationFlags & QEX_NODE_ROTATION_ANIMATED) {
         const Frames keyed = WithinKeys(node, kPODRotation, frames);
-        const QexQuaternion a =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, keyed.a, 4));
-        const QexQuaternion b =
-            LoadKey<QexQuaternion>(node->rotation, KeyOffset(node->rotationIndex, keyed.b, 4));
+        const QexQuaternion a = KeyAt<QexQuaternion>(node, kPODChannelTable[kPODRotation], keyed.a);
+        const QexQuaternion b = KeyAt<QexQuaternion>(node, kPODChannelTable[kPODRotation], keyed.b);
         QexQuaternion_Slerp(&q, &a, &b, node->frameFraction);
     }
     QexQuaternion_ToRotationMatrix(out, &q);
@@ -94,7 +87,7 @@ void LocalMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* nod
     const Frames frames = FindFrames(scene, node);
     RotationMatrix(out, node, frames);
     if (node->scale) {
-        const QexVec3 s = Scale(node, frames);
+        const QexVec3 s = InterpolateVec3(node, kPODScale, frames);
         for (int r = 0; r < 3; ++r) {
             out->m[r] *= s.x;
             out->m[4 + r] *= s.y;
@@ -102,7 +95,7 @@ void LocalMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* nod
         }
     }
     if (node->position) {
-        const QexVec3 p = Position(node, frames);
+        const QexVec3 p = InterpolateVec3(node, kPODPosition, frames);
         out->m[12] = p.x;
         out->m[13] = p.y;
         out->m[14] = p.z;
@@ -218,7 +211,7 @@ void QexPODModel_ResetNodeTransform(QexPODNode* node) {
 void QexPODModel_GetTranslationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
     if (!node->position) return;
-    const QexVec3 p = Position(node, FindFrames(scene, node));
+    const QexVec3 p = InterpolateVec3(node, kPODPosition, FindFrames(scene, node));
     QexMatrix_Translate(out, p.x, p.y, p.z);
 }
 
@@ -229,16 +222,17 @@ void QexPODModel_GetRotationMatrix(const QexPODModel* scene, QexMatrix* out, con
 void QexPODModel_GetScalingMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
     if (!node->scale) return;
-    const QexVec3 s = Scale(node, FindFrames(scene, node));
+    const QexVec3 s = InterpolateVec3(node, kPODScale, FindFrames(scene, node));
     QexMatrix_Scale(out, s.x, s.y, s.z);
 }
 
 void QexPODModel_GetTransformationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
     if (!node->matrix) return;
-    const bool animated = node->animationFlags & QEX_NODE_MATRIX_ANIMATED;
+    const QexPODChannel& channel = kPODChannelTable[kPODMatrix];
     const uint32_t frame = WithinKeys(node, kPODMatrix, FindFrames(scene, node)).a;
-    *out = LoadKey<QexMatrix>(node->matrix, animated ? KeyOffset(node->matrixIndex, frame, 16) : 0);
+    *out = node->animationFlags & channel.animated ? KeyAt<QexMatrix>(node, channel, frame)
+                                                   : LoadKey<QexMatrix>(node->matrix, 0);
 }
 
 void QexPODModel_GetWorldMatrixNoCache(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {

@@ -1,5 +1,6 @@
 // The tables that the reader walks: one row a block.
 #include "pod/Fields.h"
+
 #include "Qex/pod.h"
 
 namespace {

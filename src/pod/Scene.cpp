@@ -1,6 +1,7 @@
 // The records of a scene: what they begin with, what releasing them frees, the runtime part, and what
 // triangles and bones say.
 #include "pod/Scene.h"
+
 #include "Qex/base.h"
 #include "Qex/math.h"
 #include "Qex/pod.h"

@@ -1,5 +1,6 @@
 // The tables of what a POD scene is made of, and what follows from a row of them.
 #include "pod/Types.h"
+
 #include "Qex/pod.h"
 
 // clang-format off
@@ -35,16 +36,6 @@ const QexPODElement kPODElements[] = {
     {6012, "bone indices",        &QexPODMesh::boneIndices, QEX_ELEMENT_BONE_INDEX},
     {6013, "bone weights",        &QexPODMesh::boneWeights, QEX_ELEMENT_BONE_WEIGHT},
     {6010, "texture coordinates", nullptr,                  QEX_ELEMENT_UV0},
-};
-
-const QexPODChannel kPODChannelTable[] = {
-    {"position", QEX_NODE_POSITION_ANIMATED, QEX_NODE_SHARED_POSITION, 3, 3,
-     &QexPODNode::position, &QexPODNode::positionIndex},
-    {"rotation", QEX_NODE_ROTATION_ANIMATED, 0, 4, 4, &QexPODNode::rotation, &QexPODNode::rotationIndex},
-    // Some exporters cut the last key behind its first three floats, which are all that is read.
-    {"scale", QEX_NODE_SCALE_ANIMATED, QEX_NODE_SHARED_SCALE, 3, 7, &QexPODNode::scale, &QexPODNode::scaleIndex},
-    {"matrix", QEX_NODE_MATRIX_ANIMATED, QEX_NODE_SHARED_MATRIX, 16, 16,
-     &QexPODNode::matrix, &QexPODNode::matrixIndex},
 };
 // clang-format on
 

@@ -99,4 +99,14 @@ struct QexPODChannel {
     float* QexPODNode::*keys;
     uint32_t* QexPODNode::*index;
 };
-extern const QexPODChannel kPODChannelTable[kPODChannels];
+// clang-format off
+inline constexpr QexPODChannel kPODChannelTable[kPODChannels] = {
+    {"position", QEX_NODE_POSITION_ANIMATED, QEX_NODE_SHARED_POSITION, 3, 3,
+     &QexPODNode::position, &QexPODNode::positionIndex},
+    {"rotation", QEX_NODE_ROTATION_ANIMATED, 0, 4, 4, &QexPODNode::rotation, &QexPODNode::rotationIndex},
+    // Some exporters cut the last key behind its first three floats, which are all that is read.
+    {"scale", QEX_NODE_SCALE_ANIMATED, QEX_NODE_SHARED_SCALE, 3, 7, &QexPODNode::scale, &QexPODNode::scaleIndex},
+    {"matrix", QEX_NODE_MATRIX_ANIMATED, QEX_NODE_SHARED_MATRIX, 16, 16,
+     &QexPODNode::matrix, &QexPODNode::matrixIndex},
+};
+// clang-format on

@@ -1,5 +1,6 @@
 // KTX 1.1 textures: everything that is sound of a file is uploaded, natively or decoded, and made complete.
 #include "texture/LoadKtx.h"
+
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "image/Ktx.h"
