@@ -232,6 +232,8 @@ typedef struct SPVRTPODImpl {
     QexMatrix* inverseBindPose; /* per node: affine inverse of bindPose */
     QexMatrix* boneMatrices;    /* per node: its matrix as a bone of the mesh node named next */
     int32_t* boneMeshNodes;     /* per node: index of that mesh node, -1 while the matrix is not valid */
+    QexMatrix* meshToBone;      /* per node: inverseBindPose * bindPose of the mesh node named next */
+    int32_t* bindMeshNodes;     /* per node: index of that mesh node, -1 none */
 } SPVRTPODImpl;
 
 /** A scene. */

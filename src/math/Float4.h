@@ -44,3 +44,27 @@ inline Float4 Splat(Float4 a) {
 inline Float4 Combine3(Float4 c0, Float4 c1, Float4 c2, Float4 v) {
     return c0 * Splat<0>(v) + c1 * Splat<1>(v) + c2 * Splat<2>(v);
 }
+
+// A matrix by its columns.
+struct Float4x4 {
+    Float4 x, y, z, w;
+};
+
+inline Float4x4 Load4x4(const float* m) {
+    return {Load4(m), Load4(m + 4), Load4(m + 8), Load4(m + 12)};
+}
+
+inline void Store4x4(float* to, const Float4x4& m) {
+    Store4(to, m.x);
+    Store4(to + 4, m.y);
+    Store4(to + 8, m.z);
+    Store4(to + 12, m.w);
+}
+
+inline Float4 Transform(const Float4x4& m, Float4 v) {
+    return Combine3(m.x, m.y, m.z, v) + m.w * Splat<3>(v);
+}
+
+inline Float4x4 Product(const Float4x4& a, const Float4x4& b) {
+    return {Transform(a, b.x), Transform(a, b.y), Transform(a, b.z), Transform(a, b.w)};
+}

@@ -193,12 +193,9 @@ QexMatrix* QexMatrix_GetRotation(QexMatrix* out, const QexVec3* from, const QexV
 }
 
 void QexMatrix_Multiply(QexMatrix* out, const QexMatrix* a, const QexMatrix* b) {
-    const Float4 a0 = Load4(a->m), a1 = Load4(a->m + 4), a2 = Load4(a->m + 8), a3 = Load4(a->m + 12);
+    const Float4x4 left = Load4x4(a->m);
     // A column of the product needs the same column of b only, so out may be b.
-    for (int c = 0; c < 16; c += 4) {
-        const Float4 column = Load4(b->m + c);
-        Store4(out->m + c, Combine3(a0, a1, a2, column) + a3 * Splat<3>(column));
-    }
+    for (int c = 0; c < 16; c += 4) Store4(out->m + c, Transform(left, Load4(b->m + c)));
 }
 
 void QexMatrix_Transpose(QexMatrix* m) {
@@ -234,10 +231,7 @@ QexMatrix* QexMatrix_Inverse(QexMatrix* out, const QexMatrix* m) {
     const Float4 low2 = Shuffle<0, 4, 1, 5>(row2, zero), high2 = Shuffle<2, 6, 3, 7>(row2, zero);
     const Float4 o0 = Shuffle<0, 1, 4, 5>(low01, low2), o1 = Shuffle<2, 3, 6, 7>(low01, low2);
     const Float4 o2 = Shuffle<0, 1, 4, 5>(high01, high2);
-    Store4(out->m, o0);
-    Store4(out->m + 4, o1);
-    Store4(out->m + 8, o2);
-    Store4(out->m + 12, origin - Combine3(o0, o1, o2, t));
+    Store4x4(out->m, {o0, o1, o2, origin - Combine3(o0, o1, o2, t)});
     return out;
 }
 

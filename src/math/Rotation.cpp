@@ -1,29 +1,11 @@
 // Quaternions, Euler angles, decomposition.
 #include <cmath>
 
-#include "math/Float4.h"
 #include "math/Pi.h"
+#include "math/Rotation.h"
 #include "Qex/math.h"
 
 namespace {
-
-// Polynomials fitted at the Chebyshev points of the range; both are off by less than the last bit of a float.
-
-// asin(sqrt(x)) / sqrt(x) for x in [0, 1/2]. Summed in pairs, since the terms do not wait for each other
-// then.
-inline float ArcSineRatio(float x) {
-    const float x2 = x * x, x4 = x2 * x2;
-    const float low = (1.0f + 0.166666142f * x) + (0.0750275732f + 0.0440916167f * x) * x2;
-    const float high = (0.0358142393f - 0.00702057912f * x) + (0.107400021f - 0.135916271f * x) * x2;
-    return low + (high + 0.123913495f * x4) * x4;
-}
-
-// sin(sqrt(x)) / sqrt(x) for x in [0, (pi / 2)^2].
-inline float SineRatio(float x) {
-    const float x2 = x * x;
-    const float low = (1.0f - 0.166666666f * x) + (0.00833333097f - 0.000198408612f * x) * x2;
-    return low + (2.75252698e-6f - 2.38892177e-8f * x) * (x2 * x2);
-}
 
 struct Euler {
     double x, y, z;
@@ -98,46 +80,11 @@ void QexQuaternion_ToAxisAngle(const QexQuaternion* q, QexVec3* axis, float* ang
 }
 
 void QexQuaternion_ToRotationMatrix(QexMatrix* out, const QexQuaternion* q) {
-    const Float4 xyz = {q->x, q->y, q->z, 0}, one = {1, 1, 1, 0};
-    const Float4 yzx = Shuffle<1, 2, 0, 3>(xyz), zxy = Shuffle<2, 0, 1, 3>(xyz), twice = zxy + zxy;
-    const Float4 diagonal = one - (yzx + yzx) * yzx - twice * zxy;
-    const Float4 products = (xyz + xyz) * yzx, turns = twice * q->w;
-    const Float4 sums = products + turns, differences = products - turns;
-    const Float4 c0 = Shuffle<0, 1, 6, 7>(Shuffle<0, 4, 1, 5>(diagonal, sums), differences);
-    const Float4 c1 = Shuffle<0, 3, 5, 7>(Shuffle<0, 4, 1, 5>(differences, diagonal), sums);
-    const Float4 c2 = Shuffle<0, 2, 6, 7>(Shuffle<2, 2, 5, 5>(sums, differences), diagonal),
-                 c3 = {0, 0, 0, 1};
-    Store4(out->m, c0);
-    Store4(out->m + 4, c1);
-    Store4(out->m + 8, c2);
-    Store4(out->m + 12, c3);
+    Store4x4(out->m, QexRotation_Matrix(Load4(&q->x)));
 }
 
 void QexQuaternion_Slerp(QexQuaternion* out, const QexQuaternion* a, const QexQuaternion* b, float t) {
-    // Written so that a NaN is refused too.
-    if (!(t >= 0 && t <= 1)) return QexQuaternion_Identity(out);
-    float c = a->w * b->w + a->x * b->x + a->y * b->y + a->z * b->z;
-    float sign = 1;
-    if (c < 0) {
-        c = -c;
-        sign = -1;
-    }
-    if (!(c < 1)) {
-        *out = *a;
-        return;
-    }
-    // With h = (1 - c) / 2, the angle is 2 sqrt(h) asin(sqrt(h)) / sqrt(h), so its square needs no root. What
-    // sin(t * angle) and sin((1 - t) * angle) have in common goes with the normalisation.
-    const float h = (1 - c) * 0.5f;
-    const float ratio = ArcSineRatio(h);
-    const float angle2 = 4 * h * ratio * ratio;
-    const float s0 = (1 - t) * SineRatio((1 - t) * (1 - t) * angle2);
-    const float s1 = t * SineRatio(t * t * angle2);
-    const float sb = sign * s1;
-    const Float4 sum = s0 * Load4(&a->x) + sb * Load4(&b->x);
-    const Float4 squares = sum * sum;
-    const float length2 = (squares[0] + squares[1]) + (squares[2] + squares[3]);
-    Store4(&out->x, length2 > 0 ? sum / sqrtf(length2) : sum);
+    Store4(&out->x, QexRotation_Slerp(Load4(&a->x), Load4(&b->x), t));
 }
 
 void QexMatrix_ToEulerAnglesXYZ(const QexMatrix* m, float* out) {

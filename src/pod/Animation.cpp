@@ -3,6 +3,7 @@
 
 #include <cstring>
 
+#include "math/Rotation.h"
 #include "pod/Types.h"
 #include "Qex/math.h"
 #include "Qex/pod.h"
@@ -45,61 +46,56 @@ T LoadKey(const float* data, uint64_t offset) {
     return key;
 }
 
-// A frame's key in a channel that moves.
-template <class T>
-T KeyAt(const QexPODNode* node, const QexPODChannel& channel, uint32_t frame) {
-    return LoadKey<T>(node->*channel.keys, KeyOffset(node->*channel.index, frame, channel.stride));
+// The frame's key of a node that is moved by matrices, which are not interpolated.
+const float* MatrixKey(const QexPODNode* node, const Frames& frames) {
+    if (!(node->animationFlags & QEX_NODE_MATRIX_ANIMATED)) return node->matrix;
+    const uint32_t frame = WithinKeys(node, kPODMatrix, frames).a;
+    return node->matrix + KeyOffset(node->matrixIndex, frame, kPODChannelTable[kPODMatrix].stride);
 }
 
-// Position or scale between two frames.
-inline QexVec3 InterpolateVec3(const QexPODNode* node, QexPODChannelNumber number, const Frames& frames) {
-    const QexPODChannel& channel = kPODChannelTable[number];
-    if (!(node->animationFlags & channel.animated)) return LoadKey<QexVec3>(node->*channel.keys, 0);
+// The first three floats, and a fourth for the last lane.
+Float4 LoadVec3(const float* data, uint64_t offset, float w) {
+    const QexVec3 v = LoadKey<QexVec3>(data, offset);
+    return Float4{v.x, v.y, v.z, w};
+}
+
+// Position or scale between two frames, and 1 in the last lane.
+template <QexPODChannelNumber number>
+inline Float4 InterpolateVec3(const QexPODNode* node, const Frames& frames) {
+    constexpr QexPODChannel channel = kPODChannelTable[number];
+    const float* keys = node->*channel.keys;
+    if (!(node->animationFlags & channel.animated)) return LoadVec3(keys, 0, 1);
+    const uint32_t* index = node->*channel.index;
     const Frames keyed = WithinKeys(node, number, frames);
-    const QexVec3 a = KeyAt<QexVec3>(node, channel, keyed.a);
-    const QexVec3 b = KeyAt<QexVec3>(node, channel, keyed.b);
-    QexVec3 result;
-    QexVec3_Lerp(&result, &a, &b, node->frameFraction);
-    return result;
+    const Float4 a = LoadVec3(keys, KeyOffset(index, keyed.a, channel.stride), 1);
+    const Float4 b = LoadVec3(keys, KeyOffset(index, keyed.b, channel.stride), 1);
+    return a + (b - a) * node->frameFraction;
 }
 
-void RotationMatrix(QexMatrix* out, const QexPODNode* node, const Frames& frames) {
-    if (!node->rotation) {
-        QexMatrix_Identity(out);
-        return;
-    }
-    QexQuaternion q = LoadKey<QexQuaternion>(node->rotation, 0);
-    if (node->animationFlags & QEX_NODE_ROTATION_ANIMATED) {
-        const Frames keyed = WithinKeys(node, kPODRotation, frames);
-        const QexQuaternion a = KeyAt<QexQuaternion>(node, kPODChannelTable[kPODRotation], keyed.a);
-        const QexQuaternion b = KeyAt<QexQuaternion>(node, kPODChannelTable[kPODRotation], keyed.b);
-        QexQuaternion_Slerp(&q, &a, &b, node->frameFraction);
-    }
-    QexQuaternion_ToRotationMatrix(out, &q);
+Float4x4 RotationMatrix(const QexPODNode* node, const Frames& frames) {
+    if (!node->rotation) return Load4x4(g_sMatIdentity.m);
+    if (!(node->animationFlags & QEX_NODE_ROTATION_ANIMATED))
+        return QexRotation_Matrix(LoadKey<Float4>(node->rotation, 0));
+    const QexPODChannel& channel = kPODChannelTable[kPODRotation];
+    const Frames keyed = WithinKeys(node, kPODRotation, frames);
+    const Float4 a = LoadKey<Float4>(node->rotation, KeyOffset(node->rotationIndex, keyed.a, channel.stride));
+    const Float4 b = LoadKey<Float4>(node->rotation, KeyOffset(node->rotationIndex, keyed.b, channel.stride));
+    return QexRotation_Matrix(QexRotation_Slerp(a, b, node->frameFraction));
 }
 
 // translation * rotation * scale, without multiplying the zeros.
-void LocalMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
-    if (node->matrix) {
-        QexPODModel_GetTransformationMatrix(scene, out, node);
-        return;
-    }
+Float4x4 LocalMatrix(const QexPODModel* scene, const QexPODNode* node) {
     const Frames frames = FindFrames(scene, node);
-    RotationMatrix(out, node, frames);
+    if (node->matrix) return Load4x4(MatrixKey(node, frames));
+    Float4x4 local = RotationMatrix(node, frames);
     if (node->scale) {
-        const QexVec3 s = InterpolateVec3(node, kPODScale, frames);
-        for (int r = 0; r < 3; ++r) {
-            out->m[r] *= s.x;
-            out->m[4 + r] *= s.y;
-            out->m[8 + r] *= s.z;
-        }
+        const Float4 s = InterpolateVec3<kPODScale>(node, frames);
+        local.x *= Shuffle<0, 0, 0, 3>(s);
+        local.y *= Shuffle<1, 1, 1, 3>(s);
+        local.z *= Shuffle<2, 2, 2, 3>(s);
     }
-    if (node->position) {
-        const QexVec3 p = InterpolateVec3(node, kPODPosition, frames);
-        out->m[12] = p.x;
-        out->m[13] = p.y;
-        out->m[14] = p.z;
-    }
+    if (node->position) local.w = InterpolateVec3<kPODPosition>(node, frames);
+    return local;
 }
 
 // Rebuilds the parts of an override that have changed.
@@ -160,9 +156,11 @@ const QexMatrix* QexPODAnimation_BoneMatrix(QexPODModel* scene, const QexPODNode
     const size_t bone = static_cast<size_t>(boneNode - scene->nodes);
     const int32_t mesh = static_cast<int32_t>(meshNode - scene->nodes);
     if (impl->boneMeshNodes[bone] != mesh) {
-        QexMatrix* out = &impl->boneMatrices[bone];
-        QexMatrix_Multiply(out, &impl->inverseBindPose[bone], &impl->bindPose[mesh]);
-        QexMatrix_Multiply(out, world, out);
+        if (impl->bindMeshNodes[bone] != mesh) {
+            QexMatrix_Multiply(&impl->meshToBone[bone], &impl->inverseBindPose[bone], &impl->bindPose[mesh]);
+            impl->bindMeshNodes[bone] = mesh;
+        }
+        QexMatrix_Multiply(&impl->boneMatrices[bone], world, &impl->meshToBone[bone]);
         impl->boneMeshNodes[bone] = mesh;
     }
     return &impl->boneMatrices[bone];
@@ -211,38 +209,37 @@ void QexPODModel_ResetNodeTransform(QexPODNode* node) {
 void QexPODModel_GetTranslationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
     if (!node->position) return;
-    const QexVec3 p = InterpolateVec3(node, kPODPosition, FindFrames(scene, node));
-    QexMatrix_Translate(out, p.x, p.y, p.z);
+    const Float4 p = InterpolateVec3<kPODPosition>(node, FindFrames(scene, node));
+    QexMatrix_Translate(out, p[0], p[1], p[2]);
 }
 
 void QexPODModel_GetRotationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
-    RotationMatrix(out, node, FindFrames(scene, node));
+    Store4x4(out->m, RotationMatrix(node, FindFrames(scene, node)));
 }
 
 void QexPODModel_GetScalingMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
     if (!node->scale) return;
-    const QexVec3 s = InterpolateVec3(node, kPODScale, FindFrames(scene, node));
-    QexMatrix_Scale(out, s.x, s.y, s.z);
+    const Float4 s = InterpolateVec3<kPODScale>(node, FindFrames(scene, node));
+    QexMatrix_Scale(out, s[0], s[1], s[2]);
 }
 
 void QexPODModel_GetTransformationMatrix(const QexPODModel* scene, QexMatrix* out, const QexPODNode* node) {
     QexMatrix_Identity(out);
-    if (!node->matrix) return;
-    const QexPODChannel& channel = kPODChannelTable[kPODMatrix];
-    const uint32_t frame = WithinKeys(node, kPODMatrix, FindFrames(scene, node)).a;
-    *out = node->animationFlags & channel.animated ? KeyAt<QexMatrix>(node, channel, frame)
-                                                   : LoadKey<QexMatrix>(node->matrix, 0);
+    if (node->matrix) Store4x4(out->m, Load4x4(MatrixKey(node, FindFrames(scene, node))));
 }
 
 void QexPODModel_GetWorldMatrixNoCache(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {
-    LocalMatrix(scene, out, node);
+    Float4x4 world = LocalMatrix(scene, node);
     if (node->stateFlags & QEX_NODE_OVERRIDDEN) {
         UpdateOverride(node);
-        QexMatrix_Multiply(out, &node->overrideMatrix, out);
+        world = Product(Load4x4(node->overrideMatrix.m), world);
     }
-    if (node->parentIndex < 0 || static_cast<uint32_t>(node->parentIndex) >= scene->nodeCount) return;
-    QexMatrix_Multiply(out, QexPODAnimation_WorldMatrix(scene, &scene->nodes[node->parentIndex]), out);
+    if (node->parentIndex >= 0 && static_cast<uint32_t>(node->parentIndex) < scene->nodeCount) {
+        const QexMatrix* parent = QexPODAnimation_WorldMatrix(scene, &scene->nodes[node->parentIndex]);
+        world = Product(Load4x4(parent->m), world);
+    }
+    Store4x4(out->m, world);
 }
 
 void QexPODModel_GetWorldMatrix(QexPODModel* scene, QexMatrix* out, QexPODNode* node) {
@@ -258,6 +255,7 @@ void QexPODModel_FlushCache(QexPODModel* scene) {
         if (!QexMatrix_Inverse(&impl->inverseBindPose[i], &impl->bindPose[i]))
             QexMatrix_Identity(&impl->inverseBindPose[i]);
         impl->cacheKeys[i] = 0;
+        impl->bindMeshNodes[i] = kNoMeshNode;
     }
 }
 

@@ -116,6 +116,8 @@ void SPVRTPODImpl_Destructor(SPVRTPODImpl* impl) {
     QexMemory_FreeArray(impl->inverseBindPose);
     QexMemory_FreeArray(impl->boneMatrices);
     QexMemory_FreeArray(impl->boneMeshNodes);
+    QexMemory_FreeArray(impl->meshToBone);
+    QexMemory_FreeArray(impl->bindMeshNodes);
 }
 
 int32_t QexPODModel_InitImpl(QexPODModel* scene) {
@@ -130,8 +132,10 @@ int32_t QexPODModel_InitImpl(QexPODModel* scene) {
     impl->inverseBindPose = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
     impl->boneMatrices = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
     impl->boneMeshNodes = QexMemory_AllocZeroed<int32_t>(scene->nodeCount);
+    impl->meshToBone = QexMemory_AllocZeroed<QexMatrix>(scene->nodeCount);
+    impl->bindMeshNodes = QexMemory_AllocZeroed<int32_t>(scene->nodeCount);
     if (!impl->cacheKeys || !impl->cachedMatrices || !impl->bindPose || !impl->inverseBindPose ||
-        !impl->boneMatrices || !impl->boneMeshNodes) {
+        !impl->boneMatrices || !impl->boneMeshNodes || !impl->meshToBone || !impl->bindMeshNodes) {
         ReleaseImpl(scene);
         return -1;
     }
