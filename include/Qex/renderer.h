@@ -52,7 +52,8 @@ QEX_API extern float g_fAlphaTestCmpValue;
 QEX_API extern uint32_t g_bSpecularOn;
 #endif
 
-/** Forgets what is cached, so that the next choices reach GL.
+/** Forgets what is cached, so that the next choices reach GL; in lean drawing, everything that is known of
+ * the GL. To be called after GL calls of the application's own.
  *  @param context  not read, may be null */
 QEX_API void QexRenderState_Reset(QexRuntimeContext* context);
 
@@ -62,10 +63,55 @@ QEX_API void QexRenderState_UseProgram(uint32_t program);
 /** Makes a texture unit active unless it is. @param unit  GL_TEXTURE0 + n */
 QEX_API void QexRenderState_ActiveTexture(uint32_t unit);
 
-/** Binds a texture on the active unit; always reaches GL.
+/** Binds a texture on the active unit; in lean drawing only where it is not bound already.
  *  @param target  GL_TEXTURE_2D or GL_TEXTURE_CUBE_MAP
  *  @param name    GL name, 0 for none */
 QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
+
+/* ---- Ways of drawing ----
+ *
+ * Described drawing makes the GL calls that each function's description names: it reads the GL's error after
+ * nearly all of them and unbinds what it has bound. Lean drawing draws the same pictures, to within 1/255,
+ * with as few calls as there can be: it reads no errors, makes no call that changes nothing, sends what all
+ * nodes of a call share once, leaves out nodes outside the view, and draws opaque nodes that follow each
+ * other in the order that changes least. Opaque is a node whose material and global alpha are 1 and that has
+ * no alpha texture; where faces of two such nodes coincide, either may be seen.
+ *
+ * After a lean draw, program, textures, vertex array object, attribute arrays and buffers stay as the draw
+ * left them. An application that makes GL calls of its own says QexRenderState_Restore before them, which
+ * leaves no vertex array object, no enabled array and no buffer bound, and QexRenderState_Reset after them.
+ * Application modules and models with a texture hook are drawn in the described way, without the errors; what
+ * a hook or a module changed in GL is taken to be unknown after it, as if it had called QexRenderState_Reset.
+ */
+
+/** Ways of drawing. */
+#define QEX_DRAWING_DESCRIBED 0 /* at first */
+#define QEX_DRAWING_LEAN 1
+
+/** Chooses the way of drawing from now on. Another number changes nothing. @return the way before. */
+QEX_API int32_t QexRenderer_SetDrawing(int32_t drawing);
+/** @return the way of drawing, QEX_DRAWING_... */
+QEX_API int32_t QexRenderer_GetDrawing(void);
+
+/** Before GL calls of the application's own in lean drawing: leaves no vertex array object, no attribute
+ * array enabled and no buffer bound, as described drawing does after every draw, where this does nothing. */
+QEX_API void QexRenderState_Restore(void);
+
+/** Reads the GL's error once, as described drawing does after each call: a pending one is logged and ends the
+ *  process. For lean drawing, once a frame. */
+QEX_API void QexRenderer_CheckErrors(void);
+
+/** Whether lean drawing uses vertex array objects (GL_OES_vertex_array_object) where the GL has them; 1 at
+ * first. Some drivers forget a vertex array object's index buffer: pictures with missing or torn meshes go
+ * away with 0. */
+QEX_API void QexRenderer_AllowVertexArrays(int32_t allowed);
+
+/** Finds a GL function by name, null when there is none. */
+typedef void* (*QexGetProcAddress)(const char* name);
+
+/** Where functions beyond OpenGL ES 2.0 are looked up: eglGetProcAddress, SDL_GL_GetProcAddress and the like.
+ *  Without one, or with null, the process's own symbols and its eglGetProcAddress are asked. */
+QEX_API void QexRenderer_SetGetProcAddress(QexGetProcAddress function);
 
 /** Depth functions: how a pixel's depth has to compare with the one that is there for it to be drawn. */
 #define QEX_DEPTH_NEVER 0

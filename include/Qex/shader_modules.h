@@ -55,6 +55,7 @@ struct QexModel {
     QexMeshNodeLoadedHook meshNodeLoadedHook;
     uint32_t
         sharedGeneration; /* the engine's: which set of shared shaders its nodes were given, 0 for none */
+    struct QexModelDrawing* drawing; /* the engine's: what lean drawing keeps of the model, null at first */
 };
 
 /** Light types of QexLight. */

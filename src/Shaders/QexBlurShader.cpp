@@ -94,7 +94,7 @@ int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderMo
 }
 
 void QexBlurShader_Release(QexShaderModule** module) {
-    QexShaderModule_Release(module);
+    QexShaderModule_Release(&kType, module);
 }
 
 void QexBlurShader_SetParameters(QexShaderModule* module, const void*, float direction, float sigma,

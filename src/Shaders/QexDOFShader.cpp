@@ -62,7 +62,7 @@ int32_t QexDOFShader_SetupProgram(const QexRuntimeContext*, QexShaderModule* mod
 }
 
 void QexDOFShader_Release(QexShaderModule** module) {
-    QexShaderModule_Release(module);
+    QexShaderModule_Release(&kType, module);
 }
 
 void QexDOFShader_SetParameters(QexShaderModule* module, float focus, float range) {

@@ -86,24 +86,44 @@
     "    return sum;\n" \
     "}\n"
 
-// Alpha of the modules with an alpha texture.
-#define QEX_GLSL_ALPHA                                                         \
-    "uniform sampler2D sTexture;\n"                                            \
-    "uniform sampler2D alphaTexture;\n"                                        \
-    "uniform lowp float opacity;\n"                                            \
-    "uniform lowp float alphaThreshold;\n"                                     \
-    "varying mediump vec2 fTexCoord;\n"                                        \
-    "lowp float surfaceAlpha() {\n"                                            \
-    "    lowp float alpha = opacity * texture2D(alphaTexture, fTexCoord).r;\n" \
-    "    return alpha <= alphaThreshold ? 0.0 : alpha;\n"                      \
-    "}\n"
+// The diffuse texture's colour, white in the variants for nodes without one.
+#define QEX_GLSL_TEXEL                                 \
+    "varying mediump vec2 fTexCoord;\n"                \
+    "#ifdef QEX_NO_TEXTURE\n"                          \
+    "#define texel() vec4(1.0)\n"                      \
+    "#else\n"                                          \
+    "uniform sampler2D sTexture;\n"                    \
+    "#define texel() texture2D(sTexture, fTexCoord)\n" \
+    "#endif\n"
+
+// Opacity times `source`, 0 up to the threshold. In the variants for nodes whose alpha is the same
+// everywhere, that is what opacity holds.
+#define QEX_GLSL_ALPHA_OF(source)                         \
+    "uniform lowp float opacity;\n"                       \
+    "#ifdef QEX_CONSTANT_ALPHA\n"                         \
+    "#define surfaceAlpha() opacity\n"                    \
+    "#else\n"                                             \
+    "uniform lowp float alphaThreshold;\n"                \
+    "lowp float surfaceAlpha() {\n"                       \
+    "    lowp float alpha = opacity * " source            \
+    ";\n"                                                 \
+    "    return alpha <= alphaThreshold ? 0.0 : alpha;\n" \
+    "}\n"                                                 \
+    "#endif\n"
+
+// Colour and alpha of the modules with an alpha texture.
+#define QEX_GLSL_ALPHA                  \
+    QEX_GLSL_TEXEL                      \
+    "#ifndef QEX_CONSTANT_ALPHA\n"      \
+    "uniform sampler2D alphaTexture;\n" \
+    "#endif\n" QEX_GLSL_ALPHA_OF("texture2D(alphaTexture, fTexCoord).r")
 
 // Texture colour in diffuse and ambient light. Needs QEX_GLSL_ALPHA.
-#define QEX_GLSL_SURFACE                                                                        \
-    "uniform lowp vec3 sceneAmbient;\n"                                                         \
-    "uniform lowp vec3 sceneDiffuse;\n"                                                         \
-    "mediump vec4 surfaceColour(mediump vec3 light) {\n"                                        \
-    "    return texture2D(sTexture, fTexCoord) * vec4(light + sceneAmbient, surfaceAlpha());\n" \
+#define QEX_GLSL_SURFACE                                                 \
+    "uniform lowp vec3 sceneAmbient;\n"                                  \
+    "uniform lowp vec3 sceneDiffuse;\n"                                  \
+    "mediump vec4 surfaceColour(mediump vec3 light) {\n"                 \
+    "    return texel() * vec4(light + sceneAmbient, surfaceAlpha());\n" \
     "}\n"
 
 // Diffuse light per vertex; needs QEX_GLSL_ALPHA and QEX_GLSL_SURFACE.

@@ -17,7 +17,7 @@ void main() {
 constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
 
 constexpr QexLitShaderType kType = QexLitShader_Describe(
-    "src/Shaders/QexGouraudShader", kVertexSource, kFragmentSource, QexGouraudShader_Render, kLitStatic);
+    "src/Shaders/QexGouraudShader", kVertexSource, kFragmentSource, QexGouraudShader_Render, kTraitStatic);
 
 }  // namespace
 

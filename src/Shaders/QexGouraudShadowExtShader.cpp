@@ -20,7 +20,7 @@ void main() {
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexGouraudShadowExtShader", kVertexSource, kFragmentSource,
-                          QexGouraudShadowExtShader_Render, kLitStatic | kLitShadow | kLitShadowFade);
+                          QexGouraudShadowExtShader_Render, kTraitStatic | kTraitShadow | kTraitShadowFade);
 
 }  // namespace
 

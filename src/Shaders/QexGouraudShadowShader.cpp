@@ -18,7 +18,7 @@ void main() {
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexGouraudShadowShader", kVertexSource, kFragmentSource,
-                          QexGouraudShadowShader_Render, kLitStatic | kLitShadow);
+                          QexGouraudShadowShader_Render, kTraitStatic | kTraitShadow);
 
 }  // namespace
 

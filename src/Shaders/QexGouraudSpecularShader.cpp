@@ -16,7 +16,7 @@ void main() {
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexGouraudSpecularShader", kVertexSource, kFragmentSource,
-                          QexGouraudSpecularShader_Render, kLitStatic | kLitSpecular);
+                          QexGouraudSpecularShader_Render, kTraitStatic | kTraitSpecular);
 
 }  // namespace
 

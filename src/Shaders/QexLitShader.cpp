@@ -13,28 +13,6 @@
 
 namespace {
 
-// A light set as the shaders take it: one array a field.
-struct LightArrays {
-    GLint count;
-    GLint types[QEX_MAX_LIGHTS];
-    float vectors[QEX_MAX_LIGHTS][3];
-    float colours[QEX_MAX_LIGHTS][4];
-};
-
-// Null is the empty set.
-LightArrays ToArrays(const QexLightSet* lights) {
-    LightArrays arrays = {};
-    const uint32_t count = lights ? lights->count : 0;
-    arrays.count = static_cast<GLint>(count < QEX_MAX_LIGHTS ? count : QEX_MAX_LIGHTS);
-    for (GLint i = 0; i < arrays.count; ++i) {
-        const QexLight& light = lights->lights[i];
-        arrays.types[i] = light.type;
-        memcpy(arrays.vectors[i], light.vector, sizeof arrays.vectors[i]);
-        memcpy(arrays.colours[i], light.colour, sizeof arrays.colours[i]);
-    }
-    return arrays;
-}
-
 int32_t Location(const QexShaderDraw& draw, const QexLitShaderType* type, QexShaderUniform uniform) {
     return QexShaderModule_Location(draw.module, type->slots[uniform]);
 }
@@ -48,8 +26,8 @@ float Parameter(const QexShaderDraw& draw, uint32_t number) {
 void SetSurface(const QexShaderDraw& draw, const QexLitShaderType* type, const QexLightSet* lights,
                 const QexMatrix* view) {
     const QexPODMaterial& material = *draw.material;
-    const LightArrays set = ToArrays(lights);
-    const bool specular = type->features & kLitSpecular;
+    const QexLightArrays set = QexLitShader_ToArrays(lights);
+    const bool specular = type->module.traits & kTraitSpecular;
     if (specular)
         QEX_GL(
             glUniform3f(Location(draw, type, kUniform_cameraPos), -view->m[12], -view->m[13], -view->m[14]));
@@ -89,7 +67,7 @@ void SetShadow(const QexShaderDraw& draw, const QexLitShaderType* type, const Qe
         QEX_GL(glUniformMatrix4fv(Location(draw, type, kUniform_shadowSpaceMatrix), 1, GL_FALSE, space.m));
         QEX_GL(glUniform1f(Location(draw, type, kUniform_shadowIntensity), shadow->shadowIntensity));
         QEX_GL(glUniform1f(Location(draw, type, kUniform_biasValue), shadow->biasValue));
-        if (type->features & kLitShadowFade)
+        if (type->module.traits & kTraitShadowFade)
             QEX_GL(glUniform1f(Location(draw, type, kUniform_shadowFade), Parameter(draw, 1)));
     }
     QexRenderState_ActiveTexture(GL_TEXTURE0 + kShadowMapUnit);
@@ -98,11 +76,24 @@ void SetShadow(const QexShaderDraw& draw, const QexLitShaderType* type, const Qe
 }
 
 void BindTextures(const QexShaderDraw& draw, const QexLitShaderType* type) {
-    if (type->features & kLitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
+    if (type->module.traits & kTraitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
     QexShaderModule_BindMaterial(draw);
 }
 
 }  // namespace
+
+QexLightArrays QexLitShader_ToArrays(const QexLightSet* lights) {
+    QexLightArrays arrays = {};
+    const uint32_t count = lights ? lights->count : 0;
+    arrays.count = static_cast<GLint>(count < QEX_MAX_LIGHTS ? count : QEX_MAX_LIGHTS);
+    for (GLint i = 0; i < arrays.count; ++i) {
+        const QexLight& light = lights->lights[i];
+        arrays.types[i] = light.type;
+        memcpy(arrays.vectors[i], light.vector, sizeof arrays.vectors[i]);
+        memcpy(arrays.colours[i], light.colour, sizeof arrays.colours[i]);
+    }
+    return arrays;
+}
 
 void QexLitShader_Render(const QexLitShaderType* type, QexShaderModule* module, QexModel* model,
                          uint32_t nodeIndex, const QexLightSet* lights, const QexMatrix* modelMatrix,
@@ -113,7 +104,7 @@ void QexLitShader_Render(const QexLitShaderType* type, QexShaderModule* module, 
     QexShaderModule_World(draw, &world, modelMatrix);
     SetSurface(draw, type, lights, view);
     SetMatrices(draw, type, world, view, projection);
-    if (type->features & kLitShadow) SetShadow(draw, type, world, shadow);
+    if (type->module.traits & kTraitShadow) SetShadow(draw, type, world, shadow);
     BindTextures(draw, type);
     QexShaderModule_DrawMesh(&type->module, model, nodeIndex);
 }

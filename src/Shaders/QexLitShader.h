@@ -7,82 +7,82 @@
 #include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
-// What a module has beside diffuse light.
-enum QexLitFeature : uint32_t {
-    kLit = 0,  // that alone
-    kLitSkinned = 1,
-    kLitStatic = 2,
-    kLitNormalMap = 4,
-    kLitSpecular = 8,
-    kLitShadow = 16,
-    kLitShadowFade = 32  // the fade's value is in the slot behind the threshold
+// A light set as the shaders take it: one array a field.
+struct QexLightArrays {
+    GLint count;
+    GLint types[QEX_MAX_LIGHTS];
+    float vectors[QEX_MAX_LIGHTS][3];
+    float colours[QEX_MAX_LIGHTS][4];
 };
+// Null is the empty set.
+QexLightArrays QexLitShader_ToArrays(const QexLightSet* lights);
 
 struct QexLitShaderType {
     QexShaderModuleType module;
-    uint32_t features;               // kLit...
+    uint32_t features;               // 0...
     uint8_t slots[kShaderUniforms];  // of the uniforms that the module has
 };
 
-// A module from its sources and features. Threshold and fade, 0.5 and 1 at first, follow the uniforms.
+// A module from its sources and what it has beside diffuse light. Threshold and fade, 0.5 and 1 at first,
+// follow the uniforms.
 constexpr QexLitShaderType QexLitShader_Describe(const char* path, const char* vertexSource,
                                                  const char* fragmentSource, QexShaderRenderFn render,
-                                                 uint32_t features) {
+                                                 uint32_t traits) {
     constexpr struct {
         uint8_t item;
-        uint32_t feature;
-    } uniforms[] = {{kUniform_transMatrix, kLitStatic},
-                    {kUniform_normalMatrix, kLitStatic},
-                    {kUniform_mvpMatrix, kLitStatic},
-                    {kUniform_viewProjMatrix, kLitSkinned},
-                    {kUniform_boneCount, kLitSkinned},
-                    {kUniform_boneMatrixArray, kLitSkinned},
-                    {kUniform_boneVecMatrixArray, kLitSkinned},
-                    {kUniform_cameraPos, kLitSpecular},
-                    {kUniform_lightCount, kLit},
-                    {kUniform_lightType, kLit},
-                    {kUniform_lightPosDir, kLit},
-                    {kUniform_lightColor, kLit},
-                    {kUniform_sceneAmbient, kLit},
-                    {kUniform_sceneDiffuse, kLit},
-                    {kUniform_sceneSpecular, kLitSpecular},
-                    {kUniform_shininess, kLitSpecular},
-                    {kUniform_opacity, kLit},
-                    {kUniform_alphaThreshold, kLit},
-                    {kUniform_shadowLightDir, kLitShadow},
-                    {kUniform_shadowSpaceMatrix, kLitShadow},
-                    {kUniform_biasValue, kLitShadow},
-                    {kUniform_shadowIntensity, kLitShadow},
-                    {kUniform_shadowFade, kLitShadowFade}},
-      attributes[] = {{QEX_ELEMENT_POSITION, kLit},
-                      {QEX_ELEMENT_TANGENT, kLitNormalMap},
-                      {QEX_ELEMENT_BINORMAL, kLitNormalMap},
-                      {QEX_ELEMENT_NORMAL, kLit},
-                      {QEX_ELEMENT_UV0, kLit},
-                      {QEX_ELEMENT_BONE_INDEX, kLitSkinned},
-                      {QEX_ELEMENT_BONE_WEIGHT, kLitSkinned}},
-      units[] = {{kDiffuseUnit, kLit},
-                 {kNormalMapUnit, kLitNormalMap},
-                 {kShadowMapUnit, kLitShadow},
-                 {kAlphaUnit, kLit}};
+        uint32_t trait;
+    } uniforms[] = {{kUniform_transMatrix, kTraitStatic},
+                    {kUniform_normalMatrix, kTraitStatic},
+                    {kUniform_mvpMatrix, kTraitStatic},
+                    {kUniform_viewProjMatrix, kTraitSkinned},
+                    {kUniform_boneCount, kTraitSkinned},
+                    {kUniform_boneMatrixArray, kTraitSkinned},
+                    {kUniform_boneVecMatrixArray, kTraitSkinned},
+                    {kUniform_cameraPos, kTraitSpecular},
+                    {kUniform_lightCount, 0},
+                    {kUniform_lightType, 0},
+                    {kUniform_lightPosDir, 0},
+                    {kUniform_lightColor, 0},
+                    {kUniform_sceneAmbient, 0},
+                    {kUniform_sceneDiffuse, 0},
+                    {kUniform_sceneSpecular, kTraitSpecular},
+                    {kUniform_shininess, kTraitSpecular},
+                    {kUniform_opacity, 0},
+                    {kUniform_alphaThreshold, 0},
+                    {kUniform_shadowLightDir, kTraitShadow},
+                    {kUniform_shadowSpaceMatrix, kTraitShadow},
+                    {kUniform_biasValue, kTraitShadow},
+                    {kUniform_shadowIntensity, kTraitShadow},
+                    {kUniform_shadowFade, kTraitShadowFade}},
+      attributes[] = {{QEX_ELEMENT_POSITION, 0},
+                      {QEX_ELEMENT_TANGENT, kTraitNormalMap},
+                      {QEX_ELEMENT_BINORMAL, kTraitNormalMap},
+                      {QEX_ELEMENT_NORMAL, 0},
+                      {QEX_ELEMENT_UV0, 0},
+                      {QEX_ELEMENT_BONE_INDEX, kTraitSkinned},
+                      {QEX_ELEMENT_BONE_WEIGHT, kTraitSkinned}},
+      units[] = {{kDiffuseUnit, 0},
+                 {kNormalMapUnit, kTraitNormalMap},
+                 {kShadowMapUnit, kTraitShadow},
+                 {kAlphaUnit, 0}};
     QexLitShaderType type = {};
     type.module.path = path;
     type.module.vertexSource = vertexSource;
     type.module.fragmentSource = fragmentSource;
     type.module.render = render;
-    type.features = features;
+    type.module.traits = traits | kTraitLit | kTraitAlphaTexture | kTraitVariants;
     for (const auto& row : uniforms) {
-        if ((features & row.feature) != row.feature) continue;
+        if ((traits & row.trait) != row.trait) continue;
         type.slots[row.item] = type.module.uniforms.count;
         type.module.uniforms.Add(row.item);
     }
     for (const auto& row : attributes)
-        if ((features & row.feature) == row.feature) type.module.attributes.Add(row.item);
+        if ((traits & row.trait) == row.trait) type.module.attributes.Add(row.item);
     for (const auto& row : units)
-        if ((features & row.feature) == row.feature) type.module.units.Add(row.item);
+        if ((traits & row.trait) == row.trait) type.module.units.Add(row.item);
     type.module.hasThreshold = true;
     type.module.thresholdSlot = type.module.uniforms.count;
-    type.module.secondDefault = features & kLitShadowFade ? 1.0f : 0.0f;
+    type.module.secondDefault = traits & kTraitShadowFade ? 1.0f : 0.0f;
     return type;
 }
 

@@ -12,6 +12,7 @@
 #include "Qex/renderer.h"
 #include "Qex/shader_modules.h"
 #include "Qex/textures.h"
+#include "Shaders/QexShaderVariant.h"
 
 #define QEX_MODULE (type->path)
 
@@ -27,19 +28,6 @@ const char* const kUniformNames[kShaderUniforms] = {"",
                                                     QEX_SHADER_UNIFORMS(QEX_SHADER_UNIFORM_NAME)
 #undef QEX_SHADER_UNIFORM_NAME
 };
-
-// The attribute that each vertex element feeds.
-const char* AttributeName(uint8_t element) {
-    switch (element) {
-        case QEX_ELEMENT_POSITION: return "inVertex";
-        case QEX_ELEMENT_NORMAL: return "inNormal";
-        case QEX_ELEMENT_TANGENT: return "inTangent";
-        case QEX_ELEMENT_BINORMAL: return "inBiNormal";
-        case QEX_ELEMENT_BONE_INDEX: return "inBoneIndex";
-        case QEX_ELEMENT_BONE_WEIGHT: return "inBoneWeight";
-        default: return "inTexCoord";
-    }
-}
 
 // The samplers of the texture units.
 const char* const kSamplerNames[] = {"sTexture", "sNormalMap", "shadowTexture", "alphaTexture"};
@@ -90,6 +78,26 @@ QexProgramNames NamesOf(QexShaderModule* module) {
 
 }  // namespace
 
+const char* QexShaderModule_UniformName(uint8_t uniform) {
+    return kUniformNames[uniform];
+}
+
+const char* QexShaderModule_AttributeName(uint8_t element) {
+    switch (element) {
+        case QEX_ELEMENT_POSITION: return "inVertex";
+        case QEX_ELEMENT_NORMAL: return "inNormal";
+        case QEX_ELEMENT_TANGENT: return "inTangent";
+        case QEX_ELEMENT_BINORMAL: return "inBiNormal";
+        case QEX_ELEMENT_BONE_INDEX: return "inBoneIndex";
+        case QEX_ELEMENT_BONE_WEIGHT: return "inBoneWeight";
+        default: return "inTexCoord";
+    }
+}
+
+const char* QexShaderModule_SamplerName(uint8_t unit) {
+    return kSamplerNames[unit];
+}
+
 // ---- Lifetime ----
 
 QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type) {
@@ -110,13 +118,15 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
         module->slots[type->thresholdSlot + 1].value = type->secondDefault;
     }
     module->render = type->render;
+    QexShaderVariant_Retain(type);
     return module;
 }
 
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
     if (module->program) QexProgram_Delete(NamesOf(module));
     const char* names[sizeof type->attributes.items];
-    for (uint8_t i = 0; i < type->attributes.count; ++i) names[i] = AttributeName(type->attributes.items[i]);
+    for (uint8_t i = 0; i < type->attributes.count; ++i)
+        names[i] = QexShaderModule_AttributeName(type->attributes.items[i]);
     QexProgram_Compile({type->path, type->vertexSource, type->fragmentSource, names, type->attributes.count},
                        NamesOf(module));
     const QexProgramLookup lookup = {type->path, module->program, false};
@@ -129,9 +139,10 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
     return 0;
 }
 
-void QexShaderModule_Release(QexShaderModule** module) {
+void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {
     QexShaderModule* m = *module;
     if (!m) return;
+    QexShaderVariant_Release(type);
     QexProgram_Delete(NamesOf(m));
     QexMemory_Free(m);
     *module = nullptr;
@@ -201,6 +212,7 @@ void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw, QexBindHook hook
 
 void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
     const QexPODMesh& mesh = model->scene.meshes[meshIndex];
+    QexRenderState_Restore();
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[meshIndex]));
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[meshIndex]));
     const QexShaderList& elements = type->attributes;
@@ -226,11 +238,9 @@ void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* mo
     QEX_GL_UNLESS_CASTER(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
 }
 
-int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex) {
-    const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, nodeIndex);
-    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
+void QexShaderModule_DrawFaces(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex) {
+    const QexPODMesh* mesh = &model->scene.meshes[meshIndex];
     const bool indexed = model->indexBuffers[meshIndex] != 0;
-    QexShaderModule_BeginMesh(type, model, meshIndex);
     if (!mesh->stripCount) DrawRange(type, indexed, GL_TRIANGLES, 0, mesh->faceCount * 3);
     uint32_t first = 0;
     for (uint32_t i = 0; i < mesh->stripCount; ++i) {
@@ -238,20 +248,23 @@ int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* mode
         DrawRange(type, indexed, GL_TRIANGLE_STRIP, first, count);
         first += count;
     }
+}
+
+int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex) {
+    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
+    QexShaderModule_BeginMesh(type, model, meshIndex);
+    QexShaderModule_DrawFaces(type, model, meshIndex);
     QexShaderModule_EndMesh(type, model, meshIndex);
     return 0;
 }
 
-int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
-                                        const QexShaderBones& bones) {
+void QexShaderModule_DrawBatches(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
+                                 const QexShaderBones& bones) {
     QexPODModel* scene = &model->scene;
     QexPODNode* node = &scene->nodes[nodeIndex];
     const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, nodeIndex);
-    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
     const QexBoneBatches& batches = mesh->boneBatches;
     QexMatrix matrices[QEX_MAX_BATCH_BONES];
-    if (!mesh->skinned) return 0;
-    QexShaderModule_BeginMesh(type, model, meshIndex);
     for (int32_t batch = 0; batch < batches.batchCount; ++batch) {
         const int32_t* bone = batches.boneTable + static_cast<int64_t>(batch) * batches.maxBones;
         const int32_t count = batches.bonesPerBatch[batch];
@@ -276,6 +289,14 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
         }
         DrawRange(type, true, GL_TRIANGLES, first * 3, (end - first) * 3);
     }
+}
+
+int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
+                                        const QexShaderBones& bones) {
+    const uint32_t meshIndex = MeshIndexOf(model, nodeIndex);
+    if (!model->scene.meshes[meshIndex].skinned) return 0;
+    QexShaderModule_BeginMesh(type, model, meshIndex);
+    QexShaderModule_DrawBatches(type, model, nodeIndex, bones);
     QexShaderModule_EndMesh(type, model, meshIndex);
     return 0;
 }

@@ -78,6 +78,21 @@ constexpr QexShaderList QexShaderList_Of(Items... items) {
     return {sizeof...(items), {static_cast<uint8_t>(items)...}};
 }
 
+// What a module does, for those who draw with variants of its program.
+enum QexShaderTrait : uint32_t {
+    kTraitSkinned = 1,  // its meshes follow bones
+    kTraitStatic = 2,
+    kTraitNormalMap = 4,
+    kTraitSpecular = 8,
+    kTraitShadow = 16,         // it receives a shadow
+    kTraitShadowFade = 32,     // the fade's value is in the slot behind the threshold
+    kTraitLit = 64,            // it has lights
+    kTraitAlphaTexture = 128,  // alpha is the alpha texture's; else the diffuse texture's
+    kTraitKeepsPass = 256,     // an alpha texture does not make its nodes transparent ones
+    kTraitDisplaced = 512,     // its texture coordinates are shifted by the two slots before the threshold
+    kTraitVariants = 1024      // its sources know the variants, see QexShaderVariant.h
+};
+
 struct QexShaderModuleType {
     const char* path;  // of the module's source, without extension
     const char* vertexSource;
@@ -90,13 +105,19 @@ struct QexShaderModuleType {
     uint32_t thresholdSlot;
     float secondDefault = 0;  // of the slot behind the threshold, in modules that have a parameter there
     bool isCaster = false;    // draws what throws shadows, in the pass from the light
+    uint32_t traits = 0;      // kTrait...
 };
+
+// The names of a uniform, of the attribute that a vertex element feeds, of a texture unit's sampler.
+const char* QexShaderModule_UniformName(uint8_t uniform);
+const char* QexShaderModule_AttributeName(uint8_t element);
+const char* QexShaderModule_SamplerName(uint8_t unit);
 
 // Lifetime. Alloc gives a cleared record, or null with a line in the log; Create sets it up, too.
 QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type);
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type);
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module);
-void QexShaderModule_Release(QexShaderModule** module);
+void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module);
 
 inline int32_t QexShaderModule_Location(const QexShaderModule* module, uint32_t uniform) {
     return module->slots[uniform].location;
@@ -148,7 +169,10 @@ void QexShaderModule_BindDiffuseOnly(const QexShaderDraw& draw, QexBindHook hook
 void QexShaderModule_BeginMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);
 void QexShaderModule_EndMesh(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);
 
-// The whole draw of a mesh that follows no bones: triangles or strips, indexed or not.
+// The draw calls of a mesh whose buffers are bound: triangles or strips, indexed or not.
+void QexShaderModule_DrawFaces(const QexShaderModuleType* type, const QexModel* model, uint32_t meshIndex);
+
+// The whole draw of a mesh that follows no bones.
 int32_t QexShaderModule_DrawMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex);
 
 // The whole draw of a mesh that follows bones: for each bone batch it sets boneCount, boneMatrixArray and,
@@ -162,6 +186,9 @@ struct QexShaderBones {
 };
 int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
                                         const QexShaderBones& bones);
+// The same with the mesh's buffers bound.
+void QexShaderModule_DrawBatches(const QexShaderModuleType* type, QexModel* model, uint32_t nodeIndex,
+                                 const QexShaderBones& bones);
 
 // The operations that every module exports and that its description settles. `type` is a pointer to it.
 #define QEX_SHADER_MODULE_LIFETIME(Name, type)             \
@@ -172,7 +199,7 @@ int32_t QexShaderModule_DrawSkinnedMesh(const QexShaderModuleType* type, QexMode
         return QexShaderModule_Setup(type, module);        \
     }                                                      \
     void Name##_Release(QexShaderModule** module) {        \
-        QexShaderModule_Release(module);                   \
+        QexShaderModule_Release(type, module);             \
     }
 
 #define QEX_SHADER_MODULE_THRESHOLD(Name, slot)                               \

@@ -12,7 +12,7 @@ constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexSkinningGouraudNormalMapShader", kVertexSource, kFragmentSource,
-                          QexSkinningGouraudNormalMapShader_Render, kLitSkinned | kLitNormalMap);
+                          QexSkinningGouraudNormalMapShader_Render, kTraitSkinned | kTraitNormalMap);
 
 }  // namespace
 

@@ -19,7 +19,7 @@ constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexSkinningGouraudShader", kVertexSource, kFragmentSource,
-                          QexSkinningGouraudShader_Render, kLitSkinned);
+                          QexSkinningGouraudShader_Render, kTraitSkinned);
 
 }  // namespace
 

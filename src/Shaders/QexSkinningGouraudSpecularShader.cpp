@@ -18,7 +18,7 @@ void main() {
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexSkinningGouraudSpecularShader", kVertexSource, kFragmentSource,
-                          QexSkinningGouraudSpecularShader_Render, kLitSkinned | kLitSpecular);
+                          QexSkinningGouraudSpecularShader_Render, kTraitSkinned | kTraitSpecular);
 
 }  // namespace
 

@@ -18,6 +18,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit),
     true,
     kSkinningThreshold,
+    0,
+    false,
+    kTraitSkinned | kTraitVariants,
 };
 
 }  // namespace

@@ -28,6 +28,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kSkinningThreshold,
+    0,
+    false,
+    kTraitSkinned | kTraitAlphaTexture | kTraitKeepsPass | kTraitVariants,
 };
 
 }  // namespace

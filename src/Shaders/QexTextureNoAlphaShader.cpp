@@ -2,18 +2,15 @@
 #include "Qex/math.h"
 #include "Qex/pod.h"
 #include "Qex/shader_modules.h"
+#include "Shaders/QexGLSL.h"
 #include "Shaders/QexTextureShader.h"
 
-const char* const kQexTextureNoAlphaFragmentSource = R"(
-uniform sampler2D sTexture;
-uniform lowp float opacity;
-uniform lowp float alphaThreshold;
-varying mediump vec2 fTexCoord;
+// The texture is looked up once for both.
+const char* const kQexTextureNoAlphaFragmentSource =
+    QEX_GLSL_TEXEL "lowp vec4 surface;\n" QEX_GLSL_ALPHA_OF("surface.a") R"(
 void main() {
-    lowp vec4 texel = texture2D(sTexture, fTexCoord);
-    lowp float alpha = opacity * texel.a;
-    if (alpha <= alphaThreshold) alpha = 0.0;
-    gl_FragColor = vec4(texel.rgb, alpha);
+    surface = texel();
+    gl_FragColor = vec4(surface.rgb, surfaceAlpha());
 }
 )";
 
@@ -29,6 +26,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit),
     true,
     kTextureThreshold,
+    0,
+    false,
+    kTraitStatic | kTraitVariants,
 };
 
 }  // namespace

@@ -4,6 +4,7 @@
 #include "Qex/math.h"
 #include "Qex/pod.h"
 #include "Qex/shader_modules.h"
+#include "Shaders/QexGLSL.h"
 
 #define QEX_MODULE (type->path)
 
@@ -18,16 +19,9 @@ void main() {
 }
 )";
 
-const char* const kQexTextureFragmentSource = R"(
-uniform sampler2D sTexture;
-uniform sampler2D alphaTexture;
-uniform lowp float opacity;
-uniform lowp float alphaThreshold;
-varying mediump vec2 fTexCoord;
+const char* const kQexTextureFragmentSource = QEX_GLSL_ALPHA R"(
 void main() {
-    lowp float alpha = opacity * texture2D(alphaTexture, fTexCoord).r;
-    if (alpha <= alphaThreshold) alpha = 0.0;
-    gl_FragColor = vec4(texture2D(sTexture, fTexCoord).rgb, alpha);
+    gl_FragColor = vec4(texel().rgb, surfaceAlpha());
 }
 )";
 
@@ -43,6 +37,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kTextureThreshold,
+    0,
+    false,
+    kTraitStatic | kTraitAlphaTexture | kTraitVariants,
 };
 
 }  // namespace

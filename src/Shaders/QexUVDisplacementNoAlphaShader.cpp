@@ -18,6 +18,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit),
     true,
     kDisplacementThreshold,
+    0,
+    false,
+    kTraitStatic | kTraitDisplaced | kTraitVariants,
 };
 
 }  // namespace

@@ -33,6 +33,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kDisplacementThreshold,
+    0,
+    false,
+    kTraitStatic | kTraitAlphaTexture | kTraitDisplaced | kTraitVariants,
 };
 
 }  // namespace

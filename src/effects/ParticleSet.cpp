@@ -168,6 +168,7 @@ void QexParticleSet_Draw(QexParticleSet* set) {
     QexTexture_Set(set->texture, kDiffuseUnit);
     QexTexture_Set(set->alphaTexture, kAlphaUnit);
     QexRenderer_SetZWrite(0);
+    QexRenderState_Restore();
     PointAttribute(s_Program.lifetime, 1, &set->buffer->lifetime);
     PointAttribute(s_Program.endPosition, 3, &set->buffer->velocity);
     PointAttribute(s_Program.startPosition, 3, &set->buffer->startPosition);

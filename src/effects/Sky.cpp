@@ -106,6 +106,7 @@ void DrawSky(const QexSkyBox& box) {
     SetMatrix(g_QexSkyProgram.modelMatrix, model);
     SetMatrix(g_QexSkyProgram.mvpMatrix, mvp);
     QEX_GL(glDisable(GL_CULL_FACE));
+    QexRenderState_Restore();
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, s_SkyBuffer));
     QEX_GL(glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, 3 * sizeof(float), nullptr));
     QEX_GL(glEnableVertexAttribArray(0));
@@ -134,6 +135,7 @@ void DrawWaterPlane(const QexCamera& camera) {
     const int32_t count = QexMath_CalculateInfinitePlane(s_WaterVertices, 3 * sizeof(float), &s_Plane,
                                                          &inverse, &camera.eye, camera.farPlane);
     QEX_GL(glDisable(GL_CULL_FACE));
+    QexRenderState_Restore();
     QEX_GL(glEnableVertexAttribArray(0));
     if (count) {
         QEX_GL(glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, 3 * sizeof(float), s_WaterVertices));

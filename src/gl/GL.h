@@ -1,17 +1,19 @@
 // The GL interface as the engine's GL modules see it, and the check that follows nearly every call.
 //
 // QEX_GL(call) issues the call and reads glGetError once; an error ends the process. The file that uses it
-// defines QEX_MODULE first. A build with QEX_GL_CHECKS=0 issues the bare call.
+// defines QEX_MODULE first. Lean drawing reads no errors; a build with QEX_GL_CHECKS=0 never does.
 #pragma once
 
 #include <GLES2/gl2.h>
 
 #include "base/Diagnostics.h"
 
+extern uint32_t g_QexReadsErrors;
+
 #if QEX_GL_CHECKS
 #define QEX_GL_CHECK()                                                             \
     do {                                                                           \
-        const GLenum qexError = glGetError();                                      \
+        const GLenum qexError = g_QexReadsErrors ? glGetError() : GL_NO_ERROR;     \
         if (__builtin_expect(qexError != GL_NO_ERROR, 0))                          \
             QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __FILE__, __LINE__); \
     } while (0)

@@ -1,4 +1,5 @@
 // The state cache, and the renderer's settings.
+#include "gl/Drawing.h"
 #include "gl/GL.h"
 #include "Qex/renderer.h"
 
@@ -36,6 +37,7 @@ uint32_t g_bSpecularOn = 0;
 
 void QexRenderState_Reset(QexRuntimeContext*) {
     g_QexCachedRenderStates = {0, kUnknown, kUnknown};
+    QexDrawing_Forget();
 }
 
 void QexRenderState_UseProgram(uint32_t program) {
@@ -52,6 +54,7 @@ void QexRenderState_ActiveTexture(uint32_t unit) {
 }
 
 void QexRenderState_Bind(uint32_t target, uint32_t name) {
+    if (QexDrawing_IsLean() && QexDrawing_HasTexture(target, name)) return;
     QEX_GL(glBindTexture(target, name));
 }
 

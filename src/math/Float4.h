@@ -40,6 +40,16 @@ inline Float4 Splat(Float4 a) {
     return Shuffle<lane, lane, lane, lane>(a);
 }
 
+// The lanes without their signs.
+inline Float4 Magnitude(Float4 a) {
+    typedef int Int4 __attribute__((vector_size(16)));
+    Int4 bits;
+    memcpy(&bits, &a, sizeof bits);
+    bits &= 0x7FFFFFFF;
+    memcpy(&a, &bits, sizeof bits);
+    return a;
+}
+
 // c0 * v.x + c1 * v.y + c2 * v.z
 inline Float4 Combine3(Float4 c0, Float4 c1, Float4 c2, Float4 v) {
     return c0 * Splat<0>(v) + c1 * Splat<1>(v) + c2 * Splat<2>(v);

@@ -1,5 +1,6 @@
 // Loading models: the scene, its geometry, textures and modules, and what unloading gives back.
 #include "model/Geometry.h"
+#include "model/Lean.h"
 #include "model/SharedShaders.h"
 
 #include <cstdio>
@@ -11,6 +12,7 @@
 #include "Qex/geometry.h"
 #include "Qex/models.h"
 #include "Qex/pod.h"
+#include "Qex/renderer.h"
 #include "Qex/resources.h"
 #include "Qex/shader_modules.h"
 #include "Qex/textures.h"
@@ -159,6 +161,7 @@ int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_
 int32_t QexModel_DownloadGeometry(QexModel* model) {
     const uint32_t count = model->scene.meshCount;
     QexModel_UnloadGeometry(model);
+    QexRenderState_Restore();
     model->vertexBuffers = AllocZeroed<uint32_t>(count);
     model->indexBuffers = AllocZeroed<uint32_t>(count);
     if (!model->vertexBuffers || !model->indexBuffers) return -1;
@@ -171,6 +174,7 @@ int32_t QexModel_DownloadGeometry(QexModel* model) {
 }
 
 void QexModel_UnloadGeometry(QexModel* model) {
+    QexModel_ReleaseLean(model);
     if (model->vertexBuffers || model->indexBuffers) {
         QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
         QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));

@@ -4,6 +4,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "gl/Drawing.h"
+#include "model/Lean.h"
 #include "model/SharedShaders.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
@@ -52,7 +54,10 @@ bool IsGone(QexModel* model) {
 void DrawNode(QexModel* model, uint32_t node, const QexLightSet* lights, const QexMatrix* modelMatrix,
               const QexMatrix* view, const QexMatrix* projection, const QexShadowInfo* shadow = nullptr) {
     QexShaderModule* module = model->scene.nodes[node].shader;
-    if (module && !IsGone(model))
+    if (!module || IsGone(model)) return;
+    if (QexDrawing_IsLean())
+        QexModel_DrawNodeLean(model, node, {lights, modelMatrix, view, projection, shadow});
+    else
         module->render(module, model, node, lights, modelMatrix, view, projection, shadow);
 }
 
@@ -65,6 +70,11 @@ bool ModeAllows(const QexPODNode& node, uint32_t mode) {
 bool IsOpaque(QexModel* model, uint32_t node) {
     const QexPODMaterial* material = MaterialOf(model, node);
     return (!material || material->opacity >= 1.0f) && g_fQexGlobalAlpha >= 1.0f;
+}
+
+// Whether a call that draws nodes of a mode draws this one, and lists it for later otherwise.
+bool IsDrawnNow(QexModel* model, uint32_t node, uint32_t mode) {
+    return IsOpaque(model, node) && ModeAllows(model->scene.nodes[node], mode);
 }
 
 // Whether a node's name is one of those given.
@@ -130,6 +140,10 @@ void QexModel_RenderFromViewPerspectiveWithShadow(QexModel* model, const QexLigh
                                                   const QexMatrix* modelMatrix, const QexMatrix* view,
                                                   const QexMatrix* projection, const QexShadowInfo* info,
                                                   uint32_t pass) {
+    if (QexDrawing_IsLean()) {
+        if (!IsGone(model)) QexModel_DrawLean(model, {lights, modelMatrix, view, projection, info, pass});
+        return;
+    }
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i)
         if (InPass(model, i, pass)) DrawNode(model, i, lights, modelMatrix, view, projection, info);
 }
@@ -156,8 +170,8 @@ void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lig
                                          uint32_t mode, TransparentSPODNodeInfo* list, uint32_t* count) {
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
         if (!InPass(model, i, pass)) continue;
-        if (IsOpaque(model, i) && ModeAllows(model->scene.nodes[i], mode)) {
-            DrawNode(model, i, lights, modelMatrix, view, projection);
+        if (IsDrawnNow(model, i, mode)) {
+            if (!QexDrawing_IsLean()) DrawNode(model, i, lights, modelMatrix, view, projection);
             continue;
         }
         if (!list || !count) continue;
@@ -174,6 +188,8 @@ void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lig
         entry->projection = *projection;
         entry->passID = static_cast<int32_t>(pass);
     }
+    if (QexDrawing_IsLean() && !IsGone(model))
+        QexModel_DrawLean(model, {lights, modelMatrix, view, projection, nullptr, pass, IsDrawnNow, mode});
 }
 
 void QexModel_RenderAlphaBlendingNodes(TransparentSPODNodeInfo* list, uint32_t count, uint32_t pass) {

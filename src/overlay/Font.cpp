@@ -277,6 +277,7 @@ void BindTextures(const Glyphs& glyphs) {
 void DrawGlyphs(const Glyphs& glyphs) {
     const int32_t arrays[] = {s_Program.position, s_Program.colour, s_Program.texCoord};
     uint8_t bound = glyphs.sheets[0];
+    QexRenderState_Restore();
     for (const int32_t array : arrays) QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(array)));
     for (uint32_t first = 0, run; first < glyphs.count; first += run) {
         run = RunLength(glyphs, first);

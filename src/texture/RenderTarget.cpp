@@ -1,6 +1,7 @@
 // Framebuffers that a scene is drawn into, with a colour texture and a depth buffer.
 #include <cstring>
 
+#include "gl/Drawing.h"
 #include "gl/GL.h"
 #include "Qex/base.h"
 #include "Qex/renderer.h"
@@ -14,7 +15,7 @@ namespace {
 void CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {
     QexRenderState_ActiveTexture(GL_TEXTURE0);
     QEX_GL(glGenTextures(1, &texture->glName));
-    QEX_GL(glBindTexture(GL_TEXTURE_2D, texture->glName));
+    QexRenderState_Bind(GL_TEXTURE_2D, texture->glName);
     QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, width, height, 0, GL_RGBA, GL_UNSIGNED_BYTE, nullptr));
     glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_NEAREST);
     glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MAG_FILTER, GL_NEAREST);
@@ -101,6 +102,7 @@ int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context, QexRen
 void QexRenderTarget_Release(QexRenderTarget* target) {
     if (!target) return;
     if (target->colorTexture.glName) glDeleteTextures(1, &target->colorTexture.glName);
+    QexDrawing_ForgetTextures();
     if (target->depthRenderbuffer) glDeleteRenderbuffers(1, &target->depthRenderbuffer);
     if (target->framebuffer) glDeleteFramebuffers(1, &target->framebuffer);
     target->colorTexture.glName = target->depthRenderbuffer = target->framebuffer = 0;

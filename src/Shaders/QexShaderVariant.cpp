@@ -1,0 +1,231 @@
+// Building variants, and giving them what is new.
+#include "Shaders/QexShaderVariant.h"
+
+#include <cstring>
+
+#include "base/Memory.h"
+#include "gl/Program.h"
+#include "Qex/base.h"
+#include "Qex/renderer.h"
+#include "Shaders/QexLitShader.h"
+
+#define QEX_MODULE (variant->type->path)
+
+namespace {
+
+constexpr uint32_t kMaxTypes = 16;  // there are 14 modules with variants
+
+struct TypeVariants {
+    const QexShaderModuleType* type;
+    int32_t users;
+    QexShaderVariant* variants[kShaderVariants];
+    bool failed[kShaderVariants];
+};
+
+TypeVariants s_Types[kMaxTypes];
+uint32_t s_Generation = 1;
+QexShaderFrame s_Frame;
+
+// In the order of the flags.
+const char* const kDefines[kShaderVariants] = {
+    "",
+    "#define QEX_NO_TEXTURE\n",
+    "#define QEX_CONSTANT_ALPHA\n",
+    "#define QEX_NO_TEXTURE\n#define QEX_CONSTANT_ALPHA\n",
+};
+
+TypeVariants* Find(const QexShaderModuleType* type) {
+    for (TypeVariants& row : s_Types)
+        if (row.type == type) return &row;
+    return nullptr;
+}
+
+QexProgramNames NamesOf(QexShaderVariant* variant) {
+    return {&variant->program, &variant->vertexShader, &variant->fragmentShader};
+}
+
+void LookUp(QexShaderVariant* variant) {
+    const QexShaderModuleType* type = variant->type;
+    const QexProgramLookup lookup = {type->path, variant->program, false};
+    for (int32_t& location : variant->locations) location = -1;
+    for (const uint8_t uniform : type->uniforms)
+        if (uniform != kUniform_none)
+            variant->locations[uniform] = lookup.Uniform(QexShaderModule_UniformName(uniform));
+    for (const uint8_t unit : type->units) lookup.SetSampler({QexShaderModule_SamplerName(unit), unit});
+}
+
+bool Build(QexShaderVariant* variant) {
+    const QexShaderModuleType* type = variant->type;
+    const char* names[QEX_ELEMENT_COUNT];
+    for (uint8_t i = 0; i < QEX_ELEMENT_COUNT; ++i) names[i] = QexShaderModule_AttributeName(i);
+    for (const uint8_t element : type->attributes) variant->elements |= 1u << element;
+    // Without a texture there is nothing to look up at a coordinate.
+    const uint32_t bare = kVariantNoTexture | kVariantConstantAlpha;
+    if ((variant->flags & bare) == bare && !(type->traits & kTraitNormalMap))
+        variant->elements &= ~(1u << QEX_ELEMENT_UV0);
+    if (!QexProgram_Build({type->path, type->vertexSource, type->fragmentSource, names, QEX_ELEMENT_COUNT,
+                           kDefines[variant->flags]},
+                          NamesOf(variant)))
+        return false;
+    LookUp(variant);
+    return true;
+}
+
+void Delete(QexShaderVariant** variant) {
+    if (!*variant) return;
+    QexProgram_Delete(NamesOf(*variant));
+    QexMemory_Free(*variant);
+    *variant = nullptr;
+}
+
+void SendVector(int32_t location, const float* value, const float* given, bool all) {
+    if (location >= 0 && (all || memcmp(value, given, 3 * sizeof(float)) != 0))
+        glUniform3fv(location, 1, value);
+}
+
+void SendFloat(int32_t location, float value, float given, bool all) {
+    if (location >= 0 && (all || value != given)) glUniform1f(location, value);
+}
+
+void SendSurface(QexShaderVariant* variant, const QexShaderSurface& surface) {
+    const int32_t* at = variant->locations;
+    const QexShaderSurface& given = variant->surface;
+    const bool all = !variant->hasSurface;
+    SendVector(at[kUniform_sceneAmbient], surface.ambient, given.ambient, all);
+    SendVector(at[kUniform_sceneDiffuse], surface.diffuse, given.diffuse, all);
+    SendVector(at[kUniform_sceneSpecular], surface.specular, given.specular, all);
+    SendFloat(at[kUniform_shininess], surface.shininess, given.shininess, all);
+    SendFloat(at[kUniform_opacity], surface.opacity, given.opacity, all);
+    SendFloat(at[kUniform_alphaThreshold], surface.threshold, given.threshold, all);
+    SendFloat(at[kUniform_shadowFade], surface.shadowFade, given.shadowFade, all);
+    if (at[kUniform_displacement] >= 0) glUniform2fv(at[kUniform_displacement], 1, surface.displacement);
+    variant->surface = surface;
+    variant->hasSurface = true;
+}
+
+void SendView(QexShaderVariant* variant, const QexShaderFrame& frame) {
+    const int32_t* at = variant->locations;
+    const float* v = frame.view.m;
+    if (at[kUniform_cameraPos] >= 0) glUniform3f(at[kUniform_cameraPos], -v[12], -v[13], -v[14]);
+    if (at[kUniform_viewProjMatrix] >= 0)
+        glUniformMatrix4fv(at[kUniform_viewProjMatrix], 1, GL_FALSE, frame.viewProjection.m);
+    variant->viewStamp = frame.viewStamp;
+}
+
+void SendLights(QexShaderVariant* variant, const QexShaderFrame& frame) {
+    const int32_t* at = variant->locations;
+    const QexLightArrays set = QexLitShader_ToArrays(&frame.lights);
+    // Of lights that do not count nothing need be known.
+    const GLsizei count = set.count ? set.count : 1;
+    glUniform1i(at[kUniform_lightCount], set.count);
+    glUniform1iv(at[kUniform_lightType], count, set.types);
+    glUniform3fv(at[kUniform_lightPosDir], count, set.vectors[0]);
+    glUniform4fv(at[kUniform_lightColor], count, set.colours[0]);
+    variant->lightStamp = frame.lightStamp;
+}
+
+void SendShadow(QexShaderVariant* variant, const QexShaderFrame& frame) {
+    const int32_t* at = variant->locations;
+    glUniform3fv(at[kUniform_shadowLightDir], 1, &frame.shadowLightDirection.x);
+    glUniform1f(at[kUniform_shadowIntensity], frame.shadowIntensity);
+    glUniform1f(at[kUniform_biasValue], frame.shadowBias);
+    variant->shadowStamp = frame.shadowStamp;
+}
+
+template <class T>
+bool Replace(T* kept, const T& value) {
+    if (memcmp(kept, &value, sizeof value) == 0) return false;
+    memcpy(kept, &value, sizeof value);
+    return true;
+}
+
+}  // namespace
+
+const QexShaderFrame* QexShaderFrame_Set(const QexMatrix* view, const QexMatrix* projection,
+                                         const QexLightSet* lights, const QexShadowInfo* shadow) {
+    static const QexLightSet none = {};
+    QexShaderFrame& f = s_Frame;
+    const bool newView = Replace(&f.view, *view), newProjection = Replace(&f.projection, *projection);
+    if (newView || newProjection || !f.viewStamp) {
+        QexMatrix_Multiply(&f.viewProjection, projection, view);
+        ++f.viewStamp;
+    }
+    if (Replace(&f.lights, lights ? *lights : none) || !f.lightStamp) ++f.lightStamp;
+    if (!shadow) return &f;
+    bool newShadow = Replace(&f.shadowLightDirection, shadow->lightDir);
+    newShadow |= Replace(&f.shadowIntensity, shadow->shadowIntensity);
+    newShadow |= Replace(&f.shadowBias, shadow->biasValue);
+    if (newShadow || !f.shadowStamp) ++f.shadowStamp;
+    return &f;
+}
+
+QexShaderVariant* QexShaderVariant_Get(const QexShaderModuleType* type, uint32_t flags) {
+    TypeVariants* row = Find(type);
+    if (!row || row->failed[flags]) return nullptr;
+    QexShaderVariant*& variant = row->variants[flags];
+    if (variant) return variant;
+    variant = QexMemory_AllocZeroed<QexShaderVariant>(1);
+    if (variant) {
+        variant->type = type;
+        variant->flags = flags;
+        variant->boneCount = -1;
+        if (Build(variant)) return variant;
+        Delete(&variant);
+    }
+    row->failed[flags] = true;
+    return nullptr;
+}
+
+const QexShaderModuleType* QexShaderVariant_TypeOf(const QexShaderModule* module) {
+    for (const TypeVariants& row : s_Types)
+        if (module && row.type && row.type->render == module->render) return row.type;
+    return nullptr;
+}
+
+uint32_t QexShaderVariant_Generation() {
+    return s_Generation;
+}
+
+void QexShaderVariant_Retain(const QexShaderModuleType* type) {
+    if (!(type->traits & kTraitVariants)) return;
+    TypeVariants* row = Find(type);
+    if (!row) row = Find(nullptr);
+    if (!row) return;
+    row->type = type;
+    ++row->users;
+}
+
+void QexShaderVariant_Release(const QexShaderModuleType* type) {
+    TypeVariants* row = type ? Find(type) : nullptr;
+    if (!row || --row->users > 0) return;
+    for (QexShaderVariant*& variant : row->variants) Delete(&variant);
+    *row = {};
+    ++s_Generation;
+}
+
+void QexShaderVariant_Surface(const QexShaderVariant* variant, const QexShaderModule* module,
+                              const QexPODMaterial* material, QexShaderSurface* out) {
+    const QexShaderModuleType* type = variant->type;
+    const QexShaderSlot* parameters = module->slots + type->thresholdSlot;
+    memcpy(out->ambient, material->ambient, sizeof out->ambient);
+    memcpy(out->diffuse, material->diffuse, sizeof out->diffuse);
+    memcpy(out->specular, material->specular, sizeof out->specular);
+    out->shininess = material->shininess * 256.0f;
+    out->opacity = material->opacity * g_fQexGlobalAlpha;
+    out->threshold = parameters[0].value;
+    if (variant->flags & kVariantConstantAlpha && out->opacity <= out->threshold) out->opacity = 0;
+    out->shadowFade = type->traits & kTraitShadowFade ? parameters[1].value : 0;
+    const bool displaced = type->traits & kTraitDisplaced;
+    for (int i = 0; i < 2; ++i) out->displacement[i] = displaced ? parameters[i - 2].value : 0;
+}
+
+void QexShaderVariant_Use(QexShaderVariant* variant, const QexShaderFrame* frame,
+                          const QexShaderSurface& surface) {
+    const uint32_t traits = variant->type->traits;
+    QexRenderState_UseProgram(variant->program);
+    if (variant->viewStamp != frame->viewStamp) SendView(variant, *frame);
+    if (traits & kTraitLit && variant->lightStamp != frame->lightStamp) SendLights(variant, *frame);
+    if (traits & kTraitShadow && variant->shadowStamp != frame->shadowStamp) SendShadow(variant, *frame);
+    if (!variant->hasSurface || memcmp(&variant->surface, &surface, sizeof surface) != 0)
+        SendSurface(variant, surface);
+}

@@ -1,0 +1,354 @@
+// Which node is drawn when and with what, kept from call to call, and the draw itself.
+#include "model/Lean.h"
+
+#include <cstdlib>
+#include <cstring>
+
+#include "base/Memory.h"
+#include "gl/Drawing.h"
+#include "math/Float4.h"
+#include "pod/Animation.h"
+#include "Qex/base.h"
+#include "Qex/pod.h"
+#include "Qex/renderer.h"
+#include "Qex/textures.h"
+#include "Shaders/QexShaderVariant.h"
+#include "texture/Texture.h"
+
+namespace {
+
+// What a material's opacity and textures allow.
+enum Look : uint8_t { kOpaque = 1, kTextured = 2, kAlphaTextured = 4 };
+
+// A mesh node as it was when the order was made.
+struct Entry {
+    uint32_t node;
+    uint32_t mesh;
+    int32_t material;  // below 0: none
+    uint32_t run;      // nodes of the same run may change places
+    QexShaderModule* module;
+    const QexShaderModuleType* type;  // null: drawn in the described way
+    uint32_t flags;                   // kVariant...
+    QexShaderVariant* variant;        // found when first drawn
+};
+
+}  // namespace
+
+// Beside a model: its nodes in the order in which they are drawn.
+struct QexModelDrawing {
+    uint32_t nodeCount, meshCount, materialCount;
+    uint32_t generation;  // of the variants
+    Entry* entries;
+    uint32_t* places;  // of the nodes among them
+    uint8_t* looks;    // Look, of no material and of each material
+    GLuint* vertexArrays;
+};
+
+namespace {
+
+constexpr QexPODMaterial MakeWhite() {
+    QexPODMaterial material = {};
+    material.opacity = 1;
+    for (int i = 0; i < 3; ++i) {
+        material.ambient[i] = 0.3f;
+        material.diffuse[i] = 1;
+    }
+    return material;
+}
+
+// A call while it is drawn.
+struct Drawing {
+    QexModel* model;
+    QexModelDrawing* kept;
+    const QexLeanCall* call;
+    const QexShaderFrame* frame;
+    Float4x4 viewProjection;
+    const Entry* given;  // whose program, material and textures are set
+};
+
+// ---- Order ----
+
+QexTexture* TextureOf(QexTexture** textures, int32_t material) {
+    return textures && material >= 0 ? textures[material] : nullptr;
+}
+
+const QexPODMaterial* MaterialOf(const QexModel* model, int32_t index) {
+    static constexpr QexPODMaterial kNone = MakeWhite();
+    return index < 0 ? &kNone : &model->scene.materials[index];
+}
+
+uint8_t LookOf(const QexModel* model, int32_t material) {
+    const bool opaque = MaterialOf(model, material)->opacity * g_fQexGlobalAlpha >= 1;
+    return static_cast<uint8_t>((opaque ? kOpaque : 0) |
+                                (TextureOf(model->textures, material) ? kTextured : 0) |
+                                (TextureOf(model->alphaTextures, material) ? kAlphaTextured : 0));
+}
+
+// The module's description where it has variants and they draw the node. A module that takes alpha from the
+// diffuse texture draws nodes without material with whatever is bound.
+const QexShaderModuleType* LeanType(const QexModel* model, const QexPODNode& node) {
+    const QexShaderModuleType* type = QexShaderVariant_TypeOf(node.shader);
+    if (!type || model->bindTextureHook) return nullptr;
+    return type->traits & kTraitAlphaTexture || node.materialIndex >= 0 ? type : nullptr;
+}
+
+uint32_t FlagsOf(const QexShaderModuleType* type, uint8_t look) {
+    const uint8_t alphaSource = type->traits & kTraitAlphaTexture ? kAlphaTextured : kTextured;
+    return (look & kTextured ? 0u : kVariantNoTexture) | (look & alphaSource ? 0u : kVariantConstantAlpha);
+}
+
+int CompareEntries(const void* a, const void* b) {
+    const Entry &x = *static_cast<const Entry*>(a), &y = *static_cast<const Entry*>(b);
+    const uint64_t keys[][2] = {
+        {x.run, y.run},
+        {reinterpret_cast<uintptr_t>(x.type), reinterpret_cast<uintptr_t>(y.type)},
+        {x.flags, y.flags},
+        {reinterpret_cast<uintptr_t>(x.module), reinterpret_cast<uintptr_t>(y.module)},
+        {static_cast<uint64_t>(x.material + 1), static_cast<uint64_t>(y.material + 1)},
+        {x.mesh, y.mesh},
+        {x.node, y.node},
+    };
+    for (const auto& key : keys)
+        if (key[0] != key[1]) return key[0] < key[1] ? -1 : 1;
+    return 0;
+}
+
+void MakeOrder(QexModel* model, QexModelDrawing* kept) {
+    uint32_t run = 0;
+    bool movable = false;
+    for (uint32_t i = 0; i <= kept->materialCount; ++i)
+        kept->looks[i] = LookOf(model, static_cast<int32_t>(i) - 1);
+    for (uint32_t i = 0; i < kept->nodeCount; ++i) {
+        const QexPODNode& node = model->scene.nodes[i];
+        Entry& entry = kept->entries[i];
+        entry = {i,
+                 static_cast<uint32_t>(node.objectIndex),
+                 node.materialIndex,
+                 0,
+                 node.shader,
+                 LeanType(model, node),
+                 0,
+                 nullptr};
+        const uint8_t look = kept->looks[node.materialIndex + 1];
+        if (entry.type) entry.flags = FlagsOf(entry.type, look);
+        const bool moves = look & kOpaque && entry.flags & kVariantConstantAlpha;
+        if (!moves || !movable) ++run;
+        movable = moves;
+        entry.run = run;
+    }
+    qsort(kept->entries, kept->nodeCount, sizeof *kept->entries, CompareEntries);
+    for (uint32_t i = 0; i < kept->nodeCount; ++i) kept->places[kept->entries[i].node] = i;
+    kept->generation = QexShaderVariant_Generation();
+}
+
+bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
+    if (kept.generation != QexShaderVariant_Generation()) return false;
+    for (uint32_t i = 0; i <= kept.materialCount; ++i)
+        if (kept.looks[i] != LookOf(model, static_cast<int32_t>(i) - 1)) return false;
+    for (uint32_t i = 0; i < kept.nodeCount; ++i) {
+        const Entry& entry = kept.entries[i];
+        const QexPODNode& node = model->scene.nodes[entry.node];
+        if (node.shader != entry.module || node.materialIndex != entry.material ||
+            static_cast<uint32_t>(node.objectIndex) != entry.mesh)
+            return false;
+        if (entry.type && model->bindTextureHook) return false;
+    }
+    return true;
+}
+
+// What is kept of the model, in order; null when there is no memory for it.
+QexModelDrawing* Keep(QexModel* model) {
+    const QexPODModel& scene = model->scene;
+    QexModelDrawing* kept = model->drawing;
+    if (kept && IsInOrder(model, *kept)) return kept;
+    if (!kept) {
+        kept = model->drawing = QexMemory_AllocZeroed<QexModelDrawing>(1);
+        if (!kept) return nullptr;
+        kept->nodeCount = scene.meshNodeCount;
+        kept->meshCount = scene.meshCount;
+        kept->materialCount = scene.materialCount;
+        kept->entries = QexMemory_AllocZeroed<Entry>(kept->nodeCount);
+        kept->places = QexMemory_AllocZeroed<uint32_t>(kept->nodeCount);
+        kept->looks = QexMemory_AllocZeroed<uint8_t>(kept->materialCount + 1);
+        kept->vertexArrays = QexMemory_AllocZeroed<GLuint>(kept->meshCount);
+        if (!kept->entries || !kept->places || !kept->looks || !kept->vertexArrays) {
+            QexModel_ReleaseLean(model);
+            return nullptr;
+        }
+    }
+    MakeOrder(model, kept);
+    return kept;
+}
+
+// ---- Drawing ----
+
+void DrawAsDescribed(Drawing* drawing, uint32_t node) {
+    const QexLeanCall& call = *drawing->call;
+    QexModel* model = drawing->model;
+    QexShaderModule* module = model->scene.nodes[node].shader;
+    drawing->given = nullptr;
+    if (!module) return;
+    QexRenderState_Restore();
+    module->render(module, model, node, call.lights, call.modelMatrix, call.view, call.projection,
+                   call.shadow);
+    // A module or a hook of the application may have changed anything.
+    QexRenderState_Reset(nullptr);
+}
+
+void BindTexture(QexTexture* texture, uint32_t unit) {
+    if (!texture) texture = Qextexture_GetDefault();
+    texture->stage = static_cast<uint8_t>(unit);
+    QexDrawing_BindTexture(unit, QexTexture_Target(texture), texture->glName);
+}
+
+void BindTextures(const Drawing& drawing, const Entry& entry) {
+    const QexModel* model = drawing.model;
+    const uint32_t traits = entry.type->traits;
+    if (traits & kTraitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
+    if (traits & kTraitShadow) {
+        const QexShadowInfo* shadow = drawing.call->shadow;
+        QexDrawing_BindTexture(
+            kShadowMapUnit, GL_TEXTURE_2D,
+            shadow && shadow->shadowTexture ? shadow->shadowTexture : Qextexture_GetDefault()->glName);
+    }
+    if (!(entry.flags & kVariantConstantAlpha) && traits & kTraitAlphaTexture)
+        BindTexture(TextureOf(model->alphaTextures, entry.material), kAlphaUnit);
+    if (!(entry.flags & kVariantNoTexture))
+        BindTexture(TextureOf(model->textures, entry.material), kDiffuseUnit);
+}
+
+// Makes program, material and textures the entry's; false when its variant cannot be had.
+bool Give(Drawing* drawing, Entry* entry) {
+    const Entry* given = drawing->given;
+    if (given && given->variant == entry->variant && given->material == entry->material &&
+        given->module == entry->module)
+        return true;
+    if (!entry->variant) entry->variant = QexShaderVariant_Get(entry->type, entry->flags);
+    if (!entry->variant) return false;
+    QexShaderSurface surface;
+    QexShaderVariant_Surface(entry->variant, entry->module, MaterialOf(drawing->model, entry->material),
+                             &surface);
+    QexShaderVariant_Use(entry->variant, drawing->frame, surface);
+    BindTextures(*drawing, *entry);
+    drawing->given = entry;
+    return true;
+}
+
+void BindMesh(const Drawing& drawing, const Entry& entry) {
+    const QexModel* model = drawing.model;
+    QexDrawing_BindMesh({model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
+                         model->scene.meshes[entry.mesh].attributes, &drawing.kept->vertexArrays[entry.mesh]},
+                        entry.variant->elements);
+}
+
+// Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
+// once, and rather kept than left out.
+bool IsOutside(const QexBoundingBox& box, const Float4x4& mvp) {
+    const QexVec3 &c = box.centre, &h = box.halfExtent;
+    const Float4 at = mvp.x * c.x + mvp.y * c.y + mvp.z * c.z + mvp.w;
+    const Float4 reach = Magnitude(mvp.x) * h.x + Magnitude(mvp.y) * h.y + Magnitude(mvp.z) * h.z;
+    const Float4 limit = Splat<3>(at) + Splat<3>(reach) + reach;
+    const Float4 over = Magnitude(at) - limit * 1.0001f;
+    return over[0] > 0 || over[1] > 0 || over[2] > 0;
+}
+
+void DrawStatic(Drawing* drawing, Entry* entry) {
+    QexPODModel* scene = &drawing->model->scene;
+    const QexLeanCall& call = *drawing->call;
+    const QexMatrix* world = QexPODAnimation_WorldMatrix(scene, &scene->nodes[entry->node]);
+    QexMatrix placed;
+    if (call.modelMatrix) {
+        QexMatrix_Multiply(&placed, call.modelMatrix, world);
+        world = &placed;
+    }
+    const Float4x4 mvp = Product(drawing->viewProjection, Load4x4(world->m));
+    if (IsOutside(scene->meshes[entry->mesh].localBox, mvp)) return;
+    if (!Give(drawing, entry)) {
+        DrawAsDescribed(drawing, entry->node);
+        return;
+    }
+    BindMesh(*drawing, *entry);
+    const int32_t* at = entry->variant->locations;
+    QexMatrix matrix;
+    Store4x4(matrix.m, mvp);
+    glUniformMatrix4fv(at[kUniform_mvpMatrix], 1, GL_FALSE, matrix.m);
+    if (entry->type->traits & kTraitLit) {
+        QexMatrix3 normal;
+        QexShaderModule_NormalMatrix(&normal, world);
+        glUniformMatrix4fv(at[kUniform_transMatrix], 1, GL_FALSE, world->m);
+        glUniformMatrix3fv(at[kUniform_normalMatrix], 1, GL_FALSE, normal.m);
+    }
+    if (entry->type->traits & kTraitShadow && call.shadow) {
+        QexMatrix_Multiply(&matrix, &call.shadow->shadowSpaceMatrix, world);
+        glUniformMatrix4fv(at[kUniform_shadowSpaceMatrix], 1, GL_FALSE, matrix.m);
+    }
+    QexShaderModule_DrawFaces(entry->type, drawing->model, entry->mesh);
+}
+
+void DrawSkinned(Drawing* drawing, Entry* entry) {
+    if (!drawing->model->scene.meshes[entry->mesh].skinned) return;
+    if (!Give(drawing, entry)) {
+        DrawAsDescribed(drawing, entry->node);
+        return;
+    }
+    BindMesh(*drawing, *entry);
+    const int32_t* at = entry->variant->locations;
+    const bool lit = entry->type->traits & kTraitLit;
+    QexShaderModule_DrawBatches(entry->type, drawing->model, entry->node,
+                                {at[kUniform_boneCount], at[kUniform_boneMatrixArray], lit,
+                                 at[kUniform_boneVecMatrixArray], drawing->call->modelMatrix});
+}
+
+void DrawEntry(Drawing* drawing, Entry* entry) {
+    QexPODNode* node = &drawing->model->scene.nodes[entry->node];
+    if (!entry->type) {
+        DrawAsDescribed(drawing, entry->node);
+        return;
+    }
+    if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return;
+    const uint32_t traits = entry->type->traits;
+    if (traits & kTraitAlphaTexture && !(entry->flags & kVariantConstantAlpha) && !(traits & kTraitKeepsPass))
+        node->blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
+    (traits & kTraitSkinned ? DrawSkinned : DrawStatic)(drawing, entry);
+}
+
+bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call) {
+    if (!model->vertexBuffers) return false;
+    QexModelDrawing* kept = Keep(model);
+    if (!kept) return false;
+    const QexShaderFrame* frame = QexShaderFrame_Set(call.view, call.projection, call.lights, call.shadow);
+    *drawing = {model, kept, &call, frame, Load4x4(frame->viewProjection.m), nullptr};
+    return true;
+}
+
+}  // namespace
+
+void QexModel_DrawLean(QexModel* model, const QexLeanCall& call) {
+    Drawing drawing;
+    if (!Begin(&drawing, model, call)) return;
+    const QexPODMesh* meshes = model->scene.meshes;
+    for (uint32_t i = 0; i < drawing.kept->nodeCount; ++i) {
+        Entry* entry = &drawing.kept->entries[i];
+        if (meshes[entry->mesh].passID != call.pass) continue;
+        if (call.wants && !call.wants(model, entry->node, call.mode)) continue;
+        DrawEntry(&drawing, entry);
+    }
+}
+
+void QexModel_DrawNodeLean(QexModel* model, uint32_t node, const QexLeanCall& call) {
+    Drawing drawing;
+    if (Begin(&drawing, model, call)) DrawEntry(&drawing, &drawing.kept->entries[drawing.kept->places[node]]);
+}
+
+void QexModel_ReleaseLean(QexModel* model) {
+    QexModelDrawing* kept = model->drawing;
+    if (!kept) return;
+    QexRenderState_Restore();
+    if (kept->vertexArrays) QexDrawing_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
+    QexMemory_FreeArray(kept->entries);
+    QexMemory_FreeArray(kept->places);
+    QexMemory_FreeArray(kept->looks);
+    QexMemory_FreeArray(kept->vertexArrays);
+    QexMemory_Free(kept);
+    model->drawing = nullptr;
+}
