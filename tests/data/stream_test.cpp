@@ -26,9 +26,8 @@ TEST(SourceStream, WordsAreLittleEndianAndBounded) {
     uint32_t word32 = 0;
     uint8_t byte = 0;
     EXPECT_EQ(QexSourceStream_Read16(&stream, &word16), 1);
-    EXPECT_EQ(word16, 0x0201);
     EXPECT_EQ(QexSourceStream_Read32(&stream, &word32), 1);
-    EXPECT_EQ(word32, 0x06050403u);
+    EXPECT_EQ(word16 + (uint64_t{word32} << 16), 0x060504030201u);
     Capture errors(STDERR_FILENO);
     EXPECT_EQ(QexSourceStream_Read16(&stream, &word16), 0);
     EXPECT_EQ(QexSourceStream_Read32(&stream, &word32), 0);

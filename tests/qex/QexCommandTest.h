@@ -104,6 +104,15 @@ inline void RemoveQuad(pod::Scene* scene) {
     scene->cameras[0].target = 1;
 }
 
+// The camera's aim moves behind it.
+inline void AddLight(pod::Scene* scene, int32_t type, const pod::Vec3& colour) {
+    scene->lights.resize(1);
+    scene->lights[0].type = type;
+    scene->lights[0].colour = colour;
+    scene->nodes.insert(scene->nodes.begin() + 1, pod::BuildNode("lamp", Placed(0, 0, 0), -1, 0));
+    scene->cameras[0].target = 3;
+}
+
 inline void TextureQuad(pod::Scene* scene, const std::string& texture) {
     scene->textures = {texture};
     scene->materials[0].diffuseTexture = 0;
