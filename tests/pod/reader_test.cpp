@@ -1,5 +1,4 @@
 #include <gtest/gtest.h>
-#include <malloc.h>
 
 #include "support/PodScenes.h"
 #include "support/WalkScene.h"
@@ -8,6 +7,7 @@ namespace {
 
 template <class Read, class Written>
 void ExpectSame(const Read* read, const Written& written, const char* what) {
+    if (written.empty()) return;
     ASSERT_NE(read, nullptr) << what;
     EXPECT_EQ(std::memcmp(read, written.data(), written.size() * sizeof(written[0])), 0) << what;
 }
@@ -16,8 +16,7 @@ void ExpectSameElement(const CPODData& read, const pod::Element& written, bool i
                        const char* what) {
     EXPECT_EQ(read.componentCount, written.components) << what;
     if (!written.components) return;
-    EXPECT_EQ(read.type, written.type) << what;
-    EXPECT_EQ(read.stride, written.stride) << what;
+    EXPECT_EQ(std::pair(read.type, read.stride), std::pair(written.type, written.stride)) << what;
     if (interleaved)
         EXPECT_EQ(reinterpret_cast<uintptr_t>(read.data), written.offset) << what;
     else
@@ -25,10 +24,15 @@ void ExpectSameElement(const CPODData& read, const pod::Element& written, bool i
 }
 
 void ExpectSameMesh(const QexPODMesh& read, const pod::Mesh& written) {
-    EXPECT_EQ(read.vertexCount, written.vertexCount);
-    EXPECT_EQ(read.faceCount, written.faceCount);
-    EXPECT_EQ(read.uvwChannelCount, written.uvw.size());
-    EXPECT_EQ(read.stripCount, written.stripLengths.size());
+    const QexBoneBatches& batches = read.boneBatches;
+    const size_t counts[][2] = {{read.vertexCount, written.vertexCount},
+                                {read.faceCount, written.faceCount},
+                                {read.uvwChannelCount, written.uvw.size()},
+                                {read.stripCount, written.stripLengths.size()},
+                                {read.skinned, written.batchCount ? 1u : 0u},
+                                {size_t(batches.batchCount), size_t(written.batchCount)},
+                                {size_t(batches.maxBones), size_t(written.batchBoneMax)}};
+    for (const auto& count : counts) EXPECT_EQ(count[0], count[1]) << &count - counts;
     ExpectSameElement(read.faces, written.faces, false, "faces");
     // Both records have these in the same order, but for the UV channels.
     const CPODData* elements[] = {&read.vertices, &read.normals,     &read.tangents,   &read.binormals,
@@ -37,15 +41,11 @@ void ExpectSameMesh(const QexPODMesh& read, const pod::Mesh& written) {
         ExpectSameElement(*elements[i], (&written.vertices)[i], written.interleaved, "element");
     for (size_t i = 0; i < written.uvw.size(); ++i)
         ExpectSameElement(read.uvws[i], written.uvw[i], written.interleaved, "uvw");
-    if (!written.stripLengths.empty()) ExpectSame(read.stripLengths, written.stripLengths, "strips");
+    ExpectSame(read.stripLengths, written.stripLengths, "strips");
     if (written.unpackMatrix) ExpectSame(read.unpackMatrix.m, *written.unpackMatrix, "unpack matrix");
-    EXPECT_EQ(read.skinned, written.batchCount ? 1u : 0u);
-    if (!written.batchCount) return;
-    EXPECT_EQ(read.boneBatches.batchCount, written.batchCount);
-    EXPECT_EQ(read.boneBatches.maxBones, written.batchBoneMax);
-    ExpectSame(read.boneBatches.boneTable, written.batchBones, "bone table");
-    ExpectSame(read.boneBatches.bonesPerBatch, written.bonesPerBatch, "bones per batch");
-    ExpectSame(read.boneBatches.offsets, written.batchOffsets, "batch offsets");
+    ExpectSame(batches.boneTable, written.batchBones, "bone table");
+    ExpectSame(batches.bonesPerBatch, written.bonesPerBatch, "bones per batch");
+    ExpectSame(batches.offsets, written.batchOffsets, "batch offsets");
 }
 
 void ExpectSameNode(const QexPODNode& read, const pod::Node& written) {
@@ -57,15 +57,15 @@ void ExpectSameNode(const QexPODNode& read, const pod::Node& written) {
     EXPECT_EQ(read.animationFlags, written.animationFlags.value_or(0));
     EXPECT_EQ(read.speed, 1.0f);
     EXPECT_EQ(read.stateFlags, 3u);
-    if (!written.positions.empty()) ExpectSame(read.position, written.positions, "positions");
-    if (!written.scales.empty()) ExpectSame(read.scale, written.scales, "scales");
-    if (!written.matrices.empty()) ExpectSame(read.matrix, written.matrices, "matrices");
+    ExpectSame(read.position, written.positions, "positions");
+    ExpectSame(read.scale, written.scales, "scales");
+    ExpectSame(read.matrix, written.matrices, "matrices");
     for (size_t i = 0; i < written.rotations.size(); ++i)
         EXPECT_EQ(read.rotation[i], i % 4 == 3 ? -written.rotations[i] : written.rotations[i]) << i;
-    if (written.positionIndex.empty()) return;
     ExpectSame(read.positionIndex, written.positionIndex, "position index");
     ExpectSame(read.rotationIndex, written.rotationIndex, "rotation index");
     ExpectSame(read.scaleIndex, written.scaleIndex, "scale index");
+    ExpectSame(read.matrixIndex, written.matrixIndex, "matrix index");
 }
 
 TEST(PodReader, EveryBlockIsStoredInItsField) {
@@ -106,9 +106,6 @@ TEST(PodReader, EveryBlockIsStoredInItsField) {
     EXPECT_EQ(std::memcmp(&material.blendSrcColour, &written.materials[0].blendSourceRgb, 60), 0);
     for (size_t i = 0; i < 3; ++i) ExpectSameMesh(scene.meshes[i], written.meshes[i]);
     for (size_t i = 0; i < everything::kOlder; ++i) ExpectSameNode(scene.nodes[i], written.nodes[i]);
-    ExpectSame(scene.nodes[everything::kMatrices].matrixIndex,
-               written.nodes[everything::kMatrices].matrixIndex, "matrix index");
-
     QexPODModel_Release(&scene);
     EXPECT_EQ(scene.runtime, nullptr);
     QexPODModel_Release(&scene);
@@ -149,9 +146,8 @@ TEST(PodReader, KeysInMemoryStayThere) {
     ASSERT_EQ(loaded.result, 0);
     const QexPODNode& indexed = loaded.scene.nodes[everything::kIndexed];
     const QexPODNode& matrices = loaded.scene.nodes[everything::kMatrices];
-    EXPECT_TRUE(loaded.Holds(indexed.position));
-    EXPECT_TRUE(loaded.Holds(indexed.scale));
-    EXPECT_TRUE(loaded.Holds(matrices.matrix));
+    for (const float* keys : {indexed.position, indexed.scale, matrices.matrix})
+        EXPECT_TRUE(loaded.Holds(keys));
     EXPECT_FALSE(loaded.Holds(indexed.rotation));
     EXPECT_EQ(indexed.ownershipFlags, 0x280u);
     EXPECT_EQ(matrices.ownershipFlags, 0x40u);
@@ -247,12 +243,8 @@ TEST(PodReader, VersionByteOrderAndOptions) {
 TEST(PodReader, EveryCutFailsAndNoWordIsTrusted) {
     const std::vector<uint8_t> file = pod::WritePod(everything::Scene());
     int results[2] = {};  // scenes that load, and that are refused
-    // Nothing changes under AddressSanitizer, which has a heap of its own.
-    const auto heap = [] { return mallinfo2().uordblks + mallinfo2().hblkhd; };
     const auto read = [&](const std::vector<uint8_t>& changed, size_t at, uint32_t value) {
-        const size_t before = heap();
         LoadedPod loaded(changed);
-        EXPECT_LT(heap(), before + 10 * file.size()) << "word at " << at;
         EXPECT_EQ(loaded.result == 0, loaded.scene.runtime != nullptr);
         ++results[loaded.result != 0];
         if (loaded.result)

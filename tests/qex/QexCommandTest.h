@@ -8,6 +8,7 @@
 
 #include <cmath>
 
+#include "common/ImageFile.h"
 #include "PodBuild.h"
 #include "PvrWriter.h"
 #include "support/FolderTest.h"
@@ -41,6 +42,18 @@ class QexCommandTest : public FolderTest {
         waitpid(child, &status, 0);
         return {WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status),
                 std::filesystem::is_regular_file(out) ? ReadText(out) : "", ReadText(err)};
+    }
+
+    Image LoadPicture(const std::string& name) const {
+        Image image;
+        std::string error;
+        EXPECT_TRUE(LoadImage(Path(name), &image, &error)) << name << " " << error;
+        if (image.pixels.empty()) image = {1, 1, Bytes(4), false};
+        return image;
+    }
+    void SavePicture(const std::string& name, const Image& image) const {
+        std::string error;
+        EXPECT_TRUE(SavePng(Path(name), image.width, image.height, image.pixels.data(), &error)) << error;
     }
 
     // One line on standard error that contains `part`, nothing on standard output.

@@ -8,7 +8,6 @@
 
 #include <nlohmann/json.hpp>
 
-#include "common/ImageFile.h"
 #include "qex/QexCommandTest.h"
 
 namespace {
@@ -27,15 +26,8 @@ class QexCli : public QexCommandTest {
         return Path("a.pod");
     }
     std::string Png(const std::string& name, int width, int height, const Bytes& pixels) const {
-        std::string error;
-        EXPECT_TRUE(SavePng(Path(name), width, height, pixels.data(), &error)) << error;
+        SavePicture(name, {width, height, pixels, false});
         return Path(name);
-    }
-    Image Load(const std::string& path) const {
-        Image image;
-        std::string error;
-        EXPECT_TRUE(LoadImage(path, &image, &error)) << error;
-        return image;
     }
 };
 
@@ -134,10 +126,9 @@ TEST_F(QexCli, FilesThatCannotBeReadAreOneLineAndStatus1) {
         std::istringstream verbs(c.verbs);
         if (c.content != none) WriteText(Path(c.name), c.content);
         for (std::string verb; verbs >> verb;) {
-            if (verb == "info")
-                ExpectRefused({"info", "--json", Path(c.name)}, 1, c.part);
-            else
-                ExpectRefused({verb, Path(c.name), "-o", Path("out.png")}, 1, c.part);
+            Words arguments = {verb, Path(c.name), "--json"};
+            if (verb != "info") arguments = {verb, Path(c.name), "-o", Path("out.png")};
+            ExpectRefused(arguments, 1, c.part);
         }
     }
     EXPECT_FALSE(std::filesystem::exists(Path("out.png")));
@@ -223,7 +214,7 @@ TEST_F(QexCli, AnOutputIsNoneOfTheInputs) {
     for (const bool exists : {true, false}) {
         EXPECT_EQ(Run({"sheet", png, "-o", link}).err, "");
         EXPECT_TRUE(std::filesystem::is_symlink(link));
-        EXPECT_EQ(Load(target).width, 9);
+        EXPECT_EQ(LoadPicture("target.png").width, 9);
         struct stat status = {};
         stat(target.c_str(), &status);
         EXPECT_EQ((status.st_mode & 0777) == 0640u, exists);
@@ -235,9 +226,8 @@ TEST_F(QexCli, SheetPutsPicturesSideBySide) {
     const std::string left = Png("left.png", 2, 1, {255, 0, 0, 255, 255, 0, 0, 255}),
                       right = Png("right.png", 1, 2, {0, 0, 255, 255, 0, 0, 255, 255}), out = Path("out.png");
     EXPECT_EQ(Run({"sheet", left, right, "-o", out, "--gap", "1"}).err, "");
-    Image sheet = Load(out);
-    ASSERT_EQ(sheet.width, 7);
-    ASSERT_EQ(sheet.height, 4);
+    Image sheet = LoadPicture("out.png");
+    ASSERT_EQ(std::pair(sheet.width, sheet.height), std::pair(7, 4));
     // Cells of 2 x 2 with a white pixel around each.
     const char* rows[] = {"wwwwwww", "wrrwbww", "wwwwbww", "wwwwwww"};
     for (int y = 0; y < 4; ++y)
@@ -246,9 +236,8 @@ TEST_F(QexCli, SheetPutsPicturesSideBySide) {
             EXPECT_EQ(p[0] ? p[2] ? 'w' : 'r' : 'b', rows[y][x]) << x << ", " << y;
         }
     EXPECT_EQ(Run({"sheet", left, left, left, "-o", out, "--columns", "2", "--gap", "1"}).err, "");
-    sheet = Load(out);
-    EXPECT_EQ(sheet.width, 7);
-    ASSERT_EQ(sheet.height, 5);
+    sheet = LoadPicture("out.png");
+    ASSERT_EQ(std::pair(sheet.width, sheet.height), std::pair(7, 5));
     EXPECT_EQ(sheet.Pixel(1, 3)[2], 0);  // the third is red
     ExpectRefused({"sheet", left, Path("gone.png"), "-o", out}, 1, "gone.png");
 }
@@ -260,7 +249,7 @@ TEST_F(QexCli, StandardStreamsStandForFiles) {
         const CommandResult piped = Run(verb, png);
         ASSERT_EQ(piped.status, 0) << verb[0] << piped.err;
         WriteText(Path("piped.png"), piped.out);
-        EXPECT_EQ(Load(Path("piped.png")).pixels, pixels) << verb[0];
+        EXPECT_EQ(LoadPicture("piped.png").pixels, pixels) << verb[0];
     }
     WriteText(Path("a.emitter"), Run({"emitter", "-o", "-"}).out);
     EXPECT_EQ(Run({"emitter", "-"}, Path("a.emitter")).out, Run({"emitter"}).out);

@@ -211,8 +211,8 @@ TEST_F(QexInfo, TellsWhatTexturesHold) {
         tga[at] = static_cast<uint8_t>(value);
         WriteBytes(Path("a.tga"), tga);
         const Json document = Info(Path("a.tga"));
-        EXPECT_EQ(document["loads"], value == 2) << at << " " << value;
-        EXPECT_EQ(document["problems"].empty(), value == 2) << document;
+        for (const bool sound : {bool(document["loads"]), document["problems"].empty()})
+            EXPECT_EQ(sound, value == 2) << document;
         EXPECT_EQ(document["origin"], "upper left");
         ExpectTextAgrees(Path("a.tga"), document);
     }
@@ -230,16 +230,15 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
     };
     for (uint32_t type = 0; type < 0x40; ++type)
         add("type" + std::to_string(type) + ".pvr", UniformPvr(type, 16, Bytes(4)));
-    const Bytes ktx = UniformKtx(4, {1, 2, 3, 4}), pvr = UniformPvr(pod::kPvrRgba8888, 4, {1, 2, 3, 4});
     // Header words, each set to values that fit and that do not.
     for (const uint32_t value : {0u, 1u, 2u, 7u, 0x1907u, 0x8034u, 0xFFFFFFFFu})
         for (size_t at = 4; at < 64; at += 4) {
-            Bytes changedKtx = ktx, changedPvr = pvr;
-            PutWord(&changedKtx, at, value);
-            PutWord(&changedPvr, at, value);
+            Bytes ktx = UniformKtx(4, {1, 2, 3, 4}), pvr = UniformPvr(pod::kPvrRgba8888, 4, {1, 2, 3, 4});
+            PutWord(&ktx, at, value);
+            PutWord(&pvr, at, value);
             const std::string name = std::to_string(at) + "_" + std::to_string(value);
-            if (at >= 12) add(name + ".ktx", changedKtx);
-            if (at < 52) add(name + ".pvr", changedPvr);
+            if (at >= 12) add(name + ".ktx", ktx);
+            if (at < 52) add(name + ".pvr", pvr);
         }
     std::vector<std::string> arguments = {"info", "--json"};
     arguments.insert(arguments.end(), files.begin(), files.end());
@@ -260,7 +259,7 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
 
 TEST_F(QexInfo, DamagedScenesAreShownOrRefusedInOneLine) {
     const Bytes whole = pod::WritePod(FullScene());
-    size_t refused = 0, shown = 0;
+    int results[2] = {};  // shown and refused
     for (size_t at = 0; at + 4 <= whole.size(); at += 28) {
         Bytes file = whole;
         PutWord(&file, at, 0xFFFFFFFF);
@@ -268,8 +267,7 @@ TEST_F(QexInfo, DamagedScenesAreShownOrRefusedInOneLine) {
         const CommandResult result = Run({"info", Path("damaged.pod")});
         EXPECT_EQ(CountLines(result.err), result.status) << "word at " << at << "\n" << result.err;
         EXPECT_EQ(result.out.empty(), result.status == 1) << "word at " << at;
-        ++(result.status ? refused : shown);
+        ++results[result.status != 0];
     }
-    EXPECT_GT(refused, 5u);
-    EXPECT_GT(shown, 5u);
+    EXPECT_GT(std::min(results[0], results[1]), 5);
 }

@@ -3,7 +3,6 @@
 #include <functional>
 #include <tuple>
 
-#include "common/ImageFile.h"
 #include "qex/QexCommandTest.h"
 
 namespace {
@@ -65,13 +64,6 @@ Words With(Words arguments, const Words& more) {
 
 class QexRender : public QexCommandTest {
   protected:
-    Image Load(const std::string& name) const {
-        Image image;
-        std::string error;
-        EXPECT_TRUE(LoadImage(Path(name), &image, &error)) << name << " " << error;
-        if (image.pixels.empty()) image = {1, 1, std::vector<uint8_t>(4), false};
-        return image;
-    }
     CommandResult Render(const std::string& scene, const std::string& png, const Words& more = {}) const {
         const CommandResult result = Run(With({"render", scene, "-o", Path(png), "--size", "200x100"}, more));
         EXPECT_EQ(result.status, 0) << result.err;
@@ -85,17 +77,16 @@ class QexRender : public QexCommandTest {
     // Draws the scene written last.
     Image Redrawn(const Words& more) const {
         EXPECT_EQ(Render(Path("scene.pod"), "out.png", more).err, "");
-        return Load("out.png");
+        return LoadPicture("out.png");
     }
     void WritePng(const std::string& name, int width, int height,
                   const std::function<Rgb(int x, int y)>& colour) const {
-        std::vector<uint8_t> pixels;
-        std::string error;
+        Image image = {width, height, {}, false};
         for (int i = 0; i < width * height; ++i) {
-            for (const int c : colour(i % width, i / width)) pixels.push_back(static_cast<uint8_t>(c));
-            pixels.push_back(255);
+            for (const int c : colour(i % width, i / width)) image.pixels.push_back(static_cast<uint8_t>(c));
+            image.pixels.push_back(255);
         }
-        ASSERT_TRUE(SavePng(Path(name), width, height, pixels.data(), &error)) << error;
+        SavePicture(name, image);
     }
     // Six pictures, and the words that make a sky of them.
     Words WriteSky(const std::function<Rgb(int face, int x, int y)>& colour) const {
@@ -195,13 +186,14 @@ TEST_F(QexRender, FramesAreNumberedAndMove) {
     EXPECT_EQ(Render(pod, "out.png", {"--frames", "0:3:1"}).err, "");
     for (int frame = 0; frame < 4; ++frame) {
         const Box shifted = {100 - 10 * frame, 30, 140 - 10 * frame, 50};
-        EXPECT_EQ(Covered(Load("out-000" + std::to_string(frame) + ".png")), shifted) << "frame " << frame;
+        EXPECT_EQ(Covered(LoadPicture("out-000" + std::to_string(frame) + ".png")), shifted)
+            << "frame " << frame;
     }
     EXPECT_FALSE(std::filesystem::exists(Path("out-0004.png")));
     EXPECT_FALSE(std::filesystem::exists(Path("out.png")));
     // Between two frames the quad stands between their places.
     EXPECT_EQ(Render(pod, "half.png", {"--frame", "1.5"}).err, "");
-    EXPECT_EQ(Covered(Load("half.png")), (Box{85, 30, 125, 50}));
+    EXPECT_EQ(Covered(LoadPicture("half.png")), (Box{85, 30, 125, 50}));
     // Names with the number's place in them; frames that there are not.
     EXPECT_EQ(Render(pod, "a%03db.jpg", {"--turn", "2"}).err, "");
     EXPECT_EQ(ReadText(Path("a001b.jpg")).substr(0, 2), "\xFF\xD8");
@@ -211,7 +203,7 @@ TEST_F(QexRender, FramesAreNumberedAndMove) {
     EXPECT_TRUE(Contains(Render(pod, "still.png", {"--frame", "5"}).err, "has no animation"));
     // From standard input to standard output.
     WriteText(Path("piped.png"), Run({"render", "-", "-o", "-", "--size", "200x100"}, pod).out);
-    EXPECT_EQ(Covered(Load("piped.png")), kQuad);
+    EXPECT_EQ(Covered(LoadPicture("piped.png")), kQuad);
     ExpectRefused({"render", "-", "-o", Path("x.png")}, 1, "standard input: is empty");
     ExpectRefused({"render", pod, "-o", "-", "--turn", "2"}, 2, "file name is expected");
     ExpectRefused({"render", pod, "-o", Path("x.gif")}, 2, ".png, .jpg, .bmp or .tga");
@@ -230,8 +222,8 @@ TEST_F(QexRender, SamePictureHoweverItIsAskedFor) {
                                                   {"side.png", {"--camera", "auto", "--up", "-X"}},
                                                   {"lower.png", {"--camera", "auto", "--up=-x"}}};
     for (const auto& [name, arguments] : runs) Render(Path("scene.pod"), name, arguments);
-    EXPECT_GT(Count(Load("one.png"), kWhite), 50u);  // the letters
-    EXPECT_EQ(Count(Load("first.png"), kWhite), 0u);
+    EXPECT_GT(Count(LoadPicture("one.png"), kWhite), 50u);  // the letters
+    EXPECT_EQ(Count(LoadPicture("first.png"), kWhite), 0u);
     const std::tuple<const char*, const char*, bool> pairs[] = {
         {"one.png", "run-0002.png", true},    {"first.png", "short-0000.png", true},
         {"orbit.png", "turn-0001.png", true}, {"side.png", "lower.png", true},
@@ -276,12 +268,12 @@ TEST_F(QexRender, SaysWhyNothingShows) {
         std::string err = Render(Path("scene.pod"), "out.png", {"--camera", "0"}).err;
         EXPECT_EQ(CountLines(err), 1) << err;
         for (const char* part : {"warning: ", c.part}) EXPECT_TRUE(Contains(err, part)) << part << err;
-        EXPECT_EQ(Count(Load("out.png"), kBackground), 20000u) << c.part;
+        EXPECT_EQ(Count(LoadPicture("out.png"), kBackground), 20000u) << c.part;
         // Unless it is asked for, a camera that looks away gives way to one that does not.
         err = Render(Path("scene.pod"), "auto.png").err;
         EXPECT_EQ(CountLines(err), 1) << err;
         EXPECT_EQ(Contains(err, "the automatic camera is used"), c.away) << err;
-        EXPECT_EQ(Covered(Load("auto.png"))[2] > 0, c.away) << c.part;
+        EXPECT_EQ(Covered(LoadPicture("auto.png"))[2] > 0, c.away) << c.part;
     }
     // A part of a sequence.
     pod::Scene moving = MovingScene();
@@ -332,7 +324,7 @@ TEST_F(QexRender, DepthOfFieldIsSharpAtItsFocus) {
     // The nodes have their own modules again for the next picture.
     WriteScene(Path("scene.pod"), MovingScene());
     EXPECT_EQ(Render(Path("scene.pod"), "run.png", {"--frames", "0:1:1", "--dof", "0.09,1"}).err, "");
-    for (const Image& image : {near, Load("run-0001.png")}) ExpectSeen(image, {{110, 40, kRed}}, 4);
+    for (const Image& image : {near, LoadPicture("run-0001.png")}) ExpectSeen(image, {{110, 40, kRed}}, 4);
 }
 
 TEST_F(QexRender, SkyIsSeenFromInsideAndMirroredInWater) {
@@ -405,9 +397,9 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     WriteScene(Path("scene.pod"), MovingScene());
     Render(Path("scene.pod"), "run.png",
            {"--frames", "0:60:30", "--emitter", Path("near.txt"), "--emitter-time", "1"});
-    for (const Image& image : {inSky, outside, Load("run-0001.png")})
+    for (const Image& image : {inSky, outside, LoadPicture("run-0001.png")})
         ExpectSeen(image, {{60, 40, kWhite}}, 12);
-    ExpectSeen(Load("run-0002.png"), {{80, 40, kWhite}}, 12);
+    ExpectSeen(LoadPicture("run-0002.png"), {{80, 40, kWhite}}, 12);
     // Of files of other programs: the first animation is drawn where none is in use, and odd values are said.
     ASSERT_EQ(Run({"emitter", Path("near.txt"), "-o", Path("odd.emitter")}).status, 0);
     Bytes odd = ReadBytes(Path("odd.emitter"));
@@ -418,7 +410,7 @@ TEST_F(QexRender, EmittersDrawTheirParticlesWithTheScene) {
     const Words other = With(halves, {"--emitter", Path("odd.emitter"), "--emitter-time", "2"});
     const std::string err = Render(Path("scene.pod"), "odd.png", other).err;
     EXPECT_TRUE(Contains(err, "warning: " + Path("odd.emitter") + ": emitting: 7 is not")) << err;
-    ExpectSeen(Load("odd.png"), {{60, 33, kGreen}});
+    ExpectSeen(LoadPicture("odd.png"), {{60, 33, kGreen}});
     const Words render = {"render", Path("scene.pod"), "-o", Path("no.png")};
     WriteText(Path("bad.txt"), "lifetime 1 2\nemitting 2");
     ExpectRefused(With(render, {"--emitter", Path("bad.txt")}), 1, "bad.txt: line 2: emitting: 2 is not");

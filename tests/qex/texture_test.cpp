@@ -1,5 +1,4 @@
 // qex texture writes what it was given, bit by bit where the format keeps it, and reads what others wrote.
-#include "common/ImageFile.h"
 #include "Headless.h"
 #include "Qex.h"
 #include "qex/QexCommandTest.h"
@@ -19,10 +18,6 @@ Image Uniform(int size, const Bytes& rgba) {
 
 class QexTextureVerb : public QexCommandTest {
   protected:
-    void Save(const std::string& name, const Image& image) const {
-        std::string error;
-        ASSERT_TRUE(SavePng(Path(name), image.width, image.height, image.pixels.data(), &error)) << error;
-    }
     // In this process; what it says is kept.
     int Convert(const std::string& in, const std::string& out, TextureOptions options = {}) {
         if (options.faces.empty()) options.input = in[0] == '/' ? in : Path(in);
@@ -41,11 +36,8 @@ class QexTextureVerb : public QexCommandTest {
         TextureOptions options;
         options.level = level;
         options.face = face;
-        Image image;
-        std::string error;
         EXPECT_EQ(Convert(texture, "read.png", options), 0) << said_;
-        EXPECT_TRUE(LoadImage(Path("read.png"), &image, &error)) << texture << " " << error;
-        return image.pixels;
+        return LoadPicture("read.png").pixels;
     }
 
     std::string said_;
@@ -82,9 +74,9 @@ TEST_F(QexTextureVerb, KeepsTheBitsOfEachFormatAndTheEngineLoadsThem) {
     ASSERT_TRUE(context) << error;
     Image colours = Picture(5, 3, Noise(60)), greys = colours;
     for (size_t i = 0; i < 60; i += 4) greys.pixels[i + 1] = greys.pixels[i + 2] = greys.pixels[i];
-    Save("colours.png", colours);
-    Save("greys.png", greys);
-    Save("pixel.png", Uniform(1, {51, 102, 204, 136}));
+    SavePicture("colours.png", colours);
+    SavePicture("greys.png", greys);
+    SavePicture("pixel.png", Uniform(1, {51, 102, 204, 136}));
     const struct {
         const char* format;
         int bits[4];
@@ -123,8 +115,8 @@ TEST_F(QexTextureVerb, KeepsTheBitsOfEachFormatAndTheEngineLoadsThem) {
 
 // Red, green, blue over white, black, grey in 565, and the mean of the four at the left.
 TEST_F(QexTextureVerb, WritesHeadersRowsAndLevels) {
-    Save("six.png", Picture(3, 2, {255, 0,   0,   255, 0, 255, 0, 255, 0,   0,   255, 255,
-                                   255, 255, 255, 255, 0, 0,   0, 255, 128, 128, 128, 255}));
+    SavePicture("six.png", Picture(3, 2, {255, 0,   0,   255, 0, 255, 0, 255, 0,   0,   255, 255,
+                                          255, 255, 255, 255, 0, 0,   0, 255, 128, 128, 128, 255}));
     const Bytes top = {0x00, 0xF8, 0xE0, 0x07, 0x1F, 0x00}, bottom = {0xFF, 0xFF, 0, 0, 0x10, 0x84};
     for (const bool flip : {false, true}) {
         TextureOptions options = Format("rgb565", true);
@@ -166,7 +158,7 @@ TEST_F(QexTextureVerb, Etc1HasBlocksForEveryLevelAndAlphaBesideIt) {
         image.pixels[4 * i + 3] = i / 18 == 4 ? 51 : 204;
     }
     for (size_t x = 16; x < 18; ++x) image.pixels[4 * (72 + x)] = 230;
-    Save("a.png", image);
+    SavePicture("a.png", image);
     for (const std::string extension : {".pvr", ".ktx"}) {
         ASSERT_EQ(Convert("a.png", "a" + extension, Format("etc1")), 0);
         EXPECT_EQ(said_, "");
@@ -180,7 +172,7 @@ TEST_F(QexTextureVerb, Etc1HasBlocksForEveryLevelAndAlphaBesideIt) {
     EXPECT_EQ(ReadBytes(Path("a.pvr")).size(), 52u + 5 * 2 * 8);
     EXPECT_EQ(GetWord(ReadBytes(Path("a.ktx")), 28), 0x8D64u);
     // 16 x 4, 8 x 2, 4 x 1, 2 x 1, 1 x 1 in blocks; and an old alpha texture lies about.
-    Save("b.png", Picture(16, 4, Bytes(256, 255)));
+    SavePicture("b.png", Picture(16, 4, Bytes(256, 255)));
     for (const auto& [name, header] : {std::pair("a.pvr", 52u), {"a.ktx", 64u + 28 + 5 * 4}}) {
         ASSERT_EQ(Convert("b.png", name, Format("etc1", true)), 0);
         ExpectSaid("taken for its alpha");
@@ -192,7 +184,7 @@ TEST_F(QexTextureVerb, Etc1HasBlocksForEveryLevelAndAlphaBesideIt) {
 TEST_F(QexTextureVerb, CubeMapsKeepTheirFaces) {
     TextureOptions options;
     for (uint8_t face = 0; face < 6; ++face) {
-        Save(std::string(1, 'a' + face), Uniform(2, {face, 100, 200, 255}));
+        SavePicture(std::string(1, 'a' + face), Uniform(2, {face, 100, 200, 255}));
         options.faces.push_back(Path(std::string(1, 'a' + face)));
     }
     ASSERT_EQ(Convert("", "cube.pvr", options), 0) << said_;
@@ -213,9 +205,9 @@ TEST_F(QexTextureVerb, CubeMapsKeepTheirFaces) {
         ExpectSaid(part);
         EXPECT_FALSE(std::filesystem::exists(Path("no.pvr")));
     };
-    Save("d", Uniform(4, {0, 0, 0, 255}));
+    SavePicture("d", Uniform(4, {0, 0, 0, 255}));
     refused("/d: is not of the size of ");
-    Save("d", Picture(2, 1, Bytes(8)));
+    SavePicture("d", Picture(2, 1, Bytes(8)));
     refused("/d: is not square");
     options.faces[3] = Path("cube.ktx");
     refused("is a cube map already");
@@ -282,7 +274,7 @@ TEST_F(QexTextureVerb, DamagedTexturesAreRefusedOrDecoded) {
 }
 
 TEST_F(QexTextureVerb, RefusesWhatDoesNotGoTogether) {
-    Save("a.png", Uniform(2, {1, 2, 3, 4}));
+    SavePicture("a.png", Uniform(2, {1, 2, 3, 4}));
     WriteBytes(Path("new.pvr"), {'P', 'V', 'R', 3, 0, 0, 0, 0});
     WriteBytes(Path("r555.pvr"), Pvr(pod::kPvrRgb555, 4, 4));
     WriteBytes(Path("large.pvr"), Pvr(pod::kPvrAlpha8, 8193, 1));
