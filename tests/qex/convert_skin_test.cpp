@@ -212,34 +212,8 @@ TEST_F(ConvertSkin, CharactersMoveAsTheImporterSays) {
     }
 }
 
-// Two triangles with an edge in common, which follow two bones; six vertices in the file.
-TEST_F(ConvertSkin, JoinsVerticesThatFollowTheSameBones) {
-    struct {
-        float vertices[6][3] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}};
-        QexMatrix matrices[2] = {g_sMatIdentity, g_sMatIdentity};
-        float weights[6][4] = {{1}, {1}, {1}, {1}, {1}, {1}};
-        uint8_t joints[6][4] = {};
-    } data;
-    static_assert(sizeof data == 320);
-    for (const uint8_t joint : {1, 0}) {
-        for (int v = 3; v < 6; ++v) data.joints[v][0] = joint;
-        WriteText(Path("s.bin"), std::string(reinterpret_cast<const char*>(&data), sizeof data));
-        WriteText(Path("s.gltf"), R"({"asset":{"version":"2.0"},"scene":0,"scenes":[{"nodes":[0,1,2]}],
- "nodes":[{"mesh":0,"skin":0},{"name":"j0"},{"name":"j1"}],"skins":[{"joints":[1,2],"inverseBindMatrices":1}],
- "meshes":[{"primitives":[{"attributes":{"POSITION":0,"WEIGHTS_0":2,"JOINTS_0":3}}]}],
- "accessors":[{"bufferView":0,"componentType":5126,"count":6,"type":"VEC3","min":[0,0,0],"max":[1,1,0]},
-  {"bufferView":0,"byteOffset":72,"componentType":5126,"count":2,"type":"MAT4"},
-  {"bufferView":0,"byteOffset":200,"componentType":5126,"count":6,"type":"VEC4"},
-  {"bufferView":0,"byteOffset":296,"componentType":5121,"count":6,"type":"VEC4"}],
- "bufferViews":[{"buffer":0,"byteLength":320}],"buffers":[{"byteLength":320,"uri":"s.bin"}]})");
-        const QexPODMesh& mesh = Convert(Path("s.gltf")).meshes[0];
-        EXPECT_EQ(mesh.vertexCount, joint ? 6u : 4u);
-        EXPECT_EQ(mesh.faceCount, 2u);
-        EXPECT_EQ(mesh.boneBatches.maxBones, joint ? 2 : 1);
-    }
-}
-
-// A root with nodes "a" and "b", b below a, and one mesh node of a triangle for each list of bones.
+// A root with nodes "a" and "b", b below a, and one mesh node of triangles for each list of bones, a larger
+// one each time.
 struct MadeBone {
     const char* node;
     aiMatrix4x4 offset;
@@ -272,7 +246,9 @@ aiAnimation* MakeClip(const aiQuaternion& turn) {
     return clip;
 }
 
-std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& meshes) {
+std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& meshes,
+                                   const std::vector<aiVector3D>& corners = {
+                                       {1, 0, 0}, {0, 1, 0}, {0, 0, 1}}) {
     auto scene = std::make_unique<aiScene>();
     const aiVector3D one(1, 1, 1);
     const auto node = [](const char* name, aiNode* parent, const aiMatrix4x4& matrix) {
@@ -290,10 +266,12 @@ std::unique_ptr<aiScene> MakeScene(const std::vector<std::vector<MadeBone>>& mes
         aiMesh* mesh = scene->mMeshes[m] = new aiMesh;
         mesh->mName = "mesh" + std::to_string(m);
         mesh->mPrimitiveTypes = aiPrimitiveType_TRIANGLE;
-        const float size = 1 + float(m);
-        mesh->mVertices = Array<aiVector3D>({{size, 0, 0}, {0, size, 0}, {0, 0, size}}, &mesh->mNumVertices);
-        mesh->mFaces = new aiFace[mesh->mNumFaces = 1];
-        mesh->mFaces[0].mIndices = Array<unsigned>({0, 1, 2}, &mesh->mFaces[0].mNumIndices);
+        mesh->mVertices = Array(corners, &mesh->mNumVertices);
+        for (size_t i = 0; i < corners.size(); ++i) mesh->mVertices[i] *= 1 + float(m);
+        mesh->mFaces = new aiFace[mesh->mNumFaces = mesh->mNumVertices / 3];
+        for (unsigned f = 0; f < mesh->mNumFaces; ++f)
+            mesh->mFaces[f].mIndices =
+                Array<unsigned>({3 * f, 3 * f + 1, 3 * f + 2}, &mesh->mFaces[f].mNumIndices);
         std::vector<aiBone*> bones;
         for (const MadeBone& from : meshes[m]) {
             aiBone* bone = bones.emplace_back(new aiBone);
@@ -363,6 +341,20 @@ TEST_F(ConvertSkin, BadWeightsAndBonesAreDefinedAndTold) {
     const QexPODModel& still = Read();
     EXPECT_FALSE(still.meshes[0].skinned);
     EXPECT_EQ(still.nodes[0].parentIndex, 1);
+}
+
+// Two triangles with an edge in common.
+TEST_F(ConvertSkin, JoinsVerticesThatFollowTheSameBones) {
+    for (const char* other : {"a", "b"}) {
+        const auto scene =
+            MakeScene({{{"a", {}, {{0, 1}, {1, 1}, {2, 1}}}, {other, {}, {{3, 1}, {4, 1}, {5, 1}}}}},
+                      {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}, {0, 1, 0}, {1, 0, 0}, {1, 1, 0}});
+        ASSERT_EQ(ConvertMade(*scene), kDone) << error_;
+        const QexPODMesh& mesh = Read().meshes[0];
+        EXPECT_EQ(mesh.vertexCount, *other == 'a' ? 4u : 6u);
+        EXPECT_EQ(mesh.faceCount, 2u);
+        EXPECT_EQ(mesh.boneBatches.maxBones, *other == 'a' ? 1 : 2);
+    }
 }
 
 TEST_F(ConvertSkin, MaxBonesHasToHoldATriangle) {
