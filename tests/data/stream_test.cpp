@@ -57,8 +57,8 @@ TEST(SourceStream, ArraysAreReadAsFarAsTheyGo) {
         Capture errors16(STDERR_FILENO);
         EXPECT_EQ(QexSourceStream_ReadArray16(&halves, array16, count), count <= 2);
         const std::string text = errors16.Text();
-        const auto lines = std::count(text.begin(), text.end(), '\n');
-        EXPECT_EQ(lines, count <= 2 ? 0 : std::min(count - 2, 32u)) << "one for each missing element";
+        EXPECT_EQ(std::count(text.begin(), text.end(), '\n'), count <= 2 ? 0 : std::min(count - 2, 32u))
+            << "one for each missing element";
         EXPECT_EQ(array16[1], count >= 2 ? 0x0403 : 0);
         EXPECT_EQ(array16[2], 0);
     }

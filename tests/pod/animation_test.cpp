@@ -222,6 +222,7 @@ TEST_F(PodAnimation, OverridesComeBeforeTheAnimation) {
     QexPODModel_SetFrame(scene_, 3);
     ExpectNear(World(kMover), local, "reset");
     ExpectNear(World(kChild), Still() * local, "reset");
+    QexPODModel_SetNodePosition(scene_, kNodes, 1, 1, 1);
     QexPODModel_SetNodeMatrix(scene_, UINT32_MAX, &shear);
 }
 

@@ -238,6 +238,7 @@ TEST(PodReader, VersionByteOrderAndOptions) {
                   stray >= 4);
     }
     EXPECT_EQ(LoadedPod(swapped.bytes).out, "  - POD endianness mismatch!\n");
+    EXPECT_EQ(LoadedPod(empty.bytes).out, "  - POD version string AB.POD.2.0\n");
 }
 
 TEST(PodReader, EveryCutFailsAndNoWordIsTrusted) {
