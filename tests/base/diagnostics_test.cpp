@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "Qex.h"
@@ -11,8 +12,7 @@ namespace {
 
 TEST(Diagnostics, PrioritiesAndTagsAreToldApartAndTextsArriveWhole) {
     const std::string text(100000, 'x');
-    Capture errors(STDERR_FILENO);
-    Capture output(STDOUT_FILENO);
+    Capture errors(STDERR_FILENO), output(STDOUT_FILENO);
     EXPECT_GT(QexLog("Qex", "%s %d", "loaded", 7), 0);
     EXPECT_GT(QexError("Emitter", "own newline\n"), 0);
     QexLog(nullptr, "no tag");
@@ -26,14 +26,10 @@ TEST(Diagnostics, PrioritiesAndTagsAreToldApartAndTextsArriveWhole) {
     EXPECT_EQ(errors.Text(), expected);
 }
 
-struct Message {
-    int32_t weight;
-    std::string tag, text;
-    bool operator==(const Message& m) const { return weight == m.weight && tag == m.tag && text == m.text; }
-};
+using Message = std::tuple<int32_t, std::string, std::string>;  // weight, tag, text
 
 void Keep(void* user, int32_t weight, const char* tag, const char* text) {
-    static_cast<std::vector<Message>*>(user)->push_back({weight, tag, text});
+    static_cast<std::vector<Message>*>(user)->emplace_back(weight, tag, text);
 }
 
 // In a process of its own, as a program that has chosen its log keeps it.
@@ -61,9 +57,8 @@ TEST(DiagnosticsDeathTest, LevelAndSinkTakeAllThatIsWritten) {
             kept.clear();
             QexLog_SetLevel(level);
             writeAll();
-            expected.erase(std::remove_if(expected.begin(), expected.end(),
-                                          [level](const Message& m) { return m.weight < level; }),
-                           expected.end());
+            const auto below = [level](const Message& m) { return std::get<0>(m) < level; };
+            expected.erase(std::remove_if(expected.begin(), expected.end(), below), expected.end());
             good = good && kept == expected;
         }
         good = good && QexLog_SetLevel(QEX_LOG_WARNING) == QEX_LOG_NONE && QexLog("Qex", "not written") == 0;

@@ -22,12 +22,9 @@ std::unique_ptr<char[]> Block(uint32_t size) {
 
 TEST(MemoryPool, RefusesUnusableBlocksAndLeavesThemAlone) {
     auto block = Block(4096);
-    const std::pair<void*, uint32_t> refused[] = {{nullptr, 4096},
-                                                  {block.get(), 0},
-                                                  {block.get(), 3251},
-                                                  {block.get() + 1, 4000},
-                                                  {block.get() + 2, 4000}};
-    for (const auto& [start, size] : refused) {
+    char* p = block.get();
+    for (const auto& [start, size] :
+         {std::pair<char*, uint32_t>{nullptr, 4096}, {p, 0}, {p, 3251}, {p + 1, 4000}, {p + 2, 4000}}) {
         EXPECT_EQ(QexMemory_Init(start, size), 0);
         EXPECT_EQ(QexMemory_GetIsInitialized(), 0u);
     }
@@ -46,18 +43,18 @@ TEST(MemoryPool, LaysOutTheControlStructureAndOneFreeBlock) {
     const uint32_t base = sizeof(void*) == 4 ? static_cast<uint32_t>(reinterpret_cast<uintptr_t>(pool)) : 0;
     constexpr uint32_t kFree = 1045352;
     // 2^19 <= kFree < 2^20: first-level class 13; second-level class floor(kFree / 2^14) - 32 = 31.
-    const std::pair<uint32_t, uint32_t> words[] = {{0, 0x2A59FA59},
-                                                   {12, base + 3200},
-                                                   {16, 1u << 13},
-                                                   {20 + 4 * 13, 1u << 31},
-                                                   {116 + 4 * (13 * 32 + 31), base + 3208},
-                                                   {3196, 8},
-                                                   {3200, base + 3216 + kFree},
-                                                   {3204, 0},
-                                                   {3208, 0},
-                                                   {3212, kFree | 1},
-                                                   {3216 + kFree, base + 3208},
-                                                   {3220 + kFree, 2}};
+    const uint32_t words[][2] = {{0, 0x2A59FA59},
+                                 {12, base + 3200},
+                                 {16, 1u << 13},
+                                 {20 + 4 * 13, 1u << 31},
+                                 {116 + 4 * (13 * 32 + 31), base + 3208},
+                                 {3196, 8},
+                                 {3200, base + 3216 + kFree},
+                                 {3204, 0},
+                                 {3208, 0},
+                                 {3212, kFree | 1},
+                                 {3216 + kFree, base + 3208},
+                                 {3220 + kFree, 2}};
     for (const auto& [offset, value] : words) EXPECT_EQ(Word(pool, offset), value) << "offset " << offset;
     QexMemory_Shutdown(pool);
     EXPECT_EQ(QexMemory_GetIsInitialized(), 0u);

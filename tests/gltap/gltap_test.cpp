@@ -23,13 +23,12 @@ Recording Record(const std::function<void()>& calls) {
     return Recording(gltapEndRecording(), gltapReleaseRecording);
 }
 
-class GLTap : public testing::Test {
-  protected:
-    void SetUp() override {
+struct GLTap : testing::Test {
+    GLTap() {
         gltapReset();
         gltapSetMode(GLTAP_FORWARD);
     }
-    void TearDown() override { gltapReset(); }
+    ~GLTap() override { gltapReset(); }
 };
 
 TEST_F(GLTap, ExportsEveryFunctionOfTheHeader) {
@@ -89,17 +88,14 @@ TEST_F(GLTap, FollowsTheStateThatTheDriverHas) {
     std::string error;
     const auto context = qex::HeadlessContext::Create(5, 3, &error);
     ASSERT_TRUE(context) << error;
-    GLuint texture, buffers[2], framebuffer, renderbuffer;
-    glGenTextures(1, &texture);
-    glGenBuffers(2, buffers);
-    glGenFramebuffers(1, &framebuffer);
-    glGenRenderbuffers(1, &renderbuffer);
     SetUnusualState();
-    glBindTexture(GL_TEXTURE_2D, texture);
-    glBindBuffer(GL_ARRAY_BUFFER, buffers[0]);
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, buffers[1]);
-    glBindRenderbuffer(GL_RENDERBUFFER, renderbuffer);
-    glDeleteBuffers(1, buffers);
+    // To bind a name makes the object.
+    const GLuint buffer = 7;
+    glBindTexture(GL_TEXTURE_2D, 5);
+    glBindBuffer(GL_ARRAY_BUFFER, buffer);
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 8);
+    glBindRenderbuffer(GL_RENDERBUFFER, 6);
+    glDeleteBuffers(1, &buffer);
 
     // clang-format off
     for (const GLenum query : {
@@ -116,7 +112,7 @@ TEST_F(GLTap, FollowsTheStateThatTheDriverHas) {
         ExpectDriverAgrees(query);
     // clang-format on
     // Last, since the driver clamps the stencil reference to the bits of the bound framebuffer.
-    glBindFramebuffer(GL_FRAMEBUFFER, framebuffer);
+    glBindFramebuffer(GL_FRAMEBUFFER, 9);
     ExpectDriverAgrees(GL_FRAMEBUFFER_BINDING);
     EXPECT_EQ(GLenum(GL_NO_ERROR), glGetError());
 }

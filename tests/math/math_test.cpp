@@ -20,7 +20,6 @@ mat4 RandomMatrix(Random& random) {
     for (int i = 0; i < 16; ++i) glm::value_ptr(m)[i] = random();
     return m;
 }
-// The last row is that of an affine transform.
 mat4 RandomAffine(Random& random) {
     return glm::row(RandomMatrix(random), 3, glm::vec4(0, 0, 0, 1));
 }
@@ -37,10 +36,8 @@ TEST(Matrix, BuildersAgreeWithGlm) {
     ExpectNear(*QexMatrixRotateZ(&m, degrees), glm::rotate(one, angle, z), 1e-6f, "Z");
     const mat4 turnZ = glm::rotate(one, glm::radians(110.0f), z),
                turnYZ = glm::rotate(turnZ, glm::radians(-50.0f), y);
-    ExpectNear(*QexMatrix_RotateXYZ(&m, 30, -50, 110), glm::rotate(turnYZ, glm::radians(30.0f), x), 1e-6f,
-               "XYZ");
-    ExpectNear(*QexMatrix_RotateAngelAxis(&m, degrees, axis.x, axis.y, axis.z), glm::rotate(one, angle, axis),
-               1e-6f, "axis");
+    ExpectNear(*QexMatrix_RotateXYZ(&m, 30, -50, 110), glm::rotate(turnYZ, glm::radians(30.0f), x), 1e-6f);
+    ExpectNear(*QexMatrix_RotateAngelAxis(&m, degrees, 1, -2, 0.5f), glm::rotate(one, angle, axis), 1e-6f);
     ExpectNear(*QexMatrix_Translate(&m, 1, 2, 3), glm::translate(one, {1, 2, 3}), 0, "translate");
     ExpectNear(*QexMatrix_Scale(&m, 1, 2, 3), glm::scale(one, {1, 2, 3}), 0, "scale");
     ExpectNear(*QexMatrix_LookAtRH(&m, &e, &t, &u), glm::lookAtRH(eye, target, up), 1e-5f, "look-at");
@@ -88,24 +85,19 @@ TEST(Matrix, ProductsAndInversesAgreeWithGlm) {
 }
 
 TEST(Matrix, InverseRefusesSingularMatricesOfEverySizeAndNoOthers) {
-    const auto invert = [](const QexMatrix& m, float scale) {
-        QexMatrix scaled = m, out = g_sMatIdentity;
-        for (int i = 0; i < 11; ++i) scaled.m[i] *= scale;
-        if (QexMatrix_Inverse(&out, &scaled)) return true;
-        EXPECT_EQ(memcmp(&out, &g_sMatIdentity, sizeof out), 0) << "left as it was";
-        return false;
-    };
     Random random;
-    for (const float scale : {1e-6f, 1.0f, 1e6f}) {
+    const mat4 turn = glm::rotate(mat4(1), 0.5f, vec3(1, 2, 3));
+    for (const float scale : {1e-6f, 1.0f, 1e6f})
         for (int i = 0; i < 50; ++i) {
             mat4 flat = RandomAffine(random);
-            flat[1] = flat[0];
-            EXPECT_FALSE(invert(FromGlm(flat), scale));
+            flat[1] = i ? flat[0] : glm::vec4(0);
+            for (const mat4& g : {flat, turn}) {
+                const QexMatrix m = FromGlm(glm::scale(g, vec3(scale)));
+                QexMatrix out = g_sMatIdentity;
+                EXPECT_EQ(QexMatrix_Inverse(&out, &m) != nullptr, g == turn);
+                EXPECT_EQ(memcmp(&out, &g_sMatIdentity, sizeof out) != 0, g == turn) << "left as it was";
+            }
         }
-        QexMatrix m;
-        EXPECT_FALSE(invert(*QexMatrix_Scale(&m, 1, 0, 1), scale));
-        EXPECT_TRUE(invert(*QexMatrix_RotateXYZ(&m, 10, 20, 30), scale));
-    }
 }
 
 TEST(Matrix, TransformsAgreeWithGlm) {
@@ -132,20 +124,18 @@ TEST(Matrix, ArrayTransformsKeepToTheirStride) {
     QexMatrix move;
     QexMatrix_Translate(&move, 10, 20, 30);
     // Records of three floats and two bytes: unaligned from the second on.
-    unsigned char bytes[3 * 14], moved[sizeof bytes];
+    unsigned char bytes[2 * 14], moved[sizeof bytes];
     memset(moved, 0x77, sizeof moved);
-    for (int i = 0; i < 3; ++i) {
-        const float v[3] = {1.0f + i, 2, -3};
-        memcpy(bytes + 14 * i, v, sizeof v);
-    }
-    QexMatrix_TransformVec3Array(&move, bytes, moved, 2, 3, 14);
-    QexMatrix_TransformHomoVec3Array(&move, bytes, bytes, 123, 3, 14);
-    for (int i = 0; i < 3; ++i) {
-        const float expected[3] = {11.0f + i, 22, 27};
-        EXPECT_EQ(memcmp(bytes + 14 * i, expected, sizeof expected), 0);
-        QexVec3 v;
-        memcpy(&v, moved + 14 * i, sizeof v);
-        ExpectNear(v, {21.0f + i, 42, 57});
+    const QexVec3 points[2] = {{1, 2, -3}, {4, 5, 6}};
+    for (int i = 0; i < 2; ++i) memcpy(bytes + 14 * i, &points[i], 12);
+    QexMatrix_TransformVec3Array(&move, bytes, moved, 2, 2, 14);
+    QexMatrix_TransformHomoVec3Array(&move, bytes, bytes, 123, 2, 14);
+    for (int i = 0; i < 2; ++i) {
+        QexVec3 once, twice;
+        memcpy(&once, bytes + 14 * i, 12);
+        memcpy(&twice, moved + 14 * i, 12);
+        ExpectNear(once, vec3(points[i].x + 10, points[i].y + 20, points[i].z + 30));
+        ExpectNear(twice, vec3(points[i].x + 20, points[i].y + 40, points[i].z + 60));
         EXPECT_EQ(moved[14 * i + 12], 0x77);
     }
 }
@@ -185,8 +175,7 @@ TEST(Matrix, GetRotationTurnsOneDirectionOntoTheOther) {
 
 TEST(Scalar, RootsAndArcsAreCloseToTheCLibrary) {
     EXPECT_EQ(Qex_Sqrt(-4), 0);
-    EXPECT_EQ(Qex_Sqrt(0), 0);
-    for (const float a : {1e-4f, 0.3f, 1.0f, 2.0f, 1000.0f, 1e10f, 3e38f})
+    for (const float a : {0.0f, 1e-4f, 0.3f, 1.0f, 2.0f, 1000.0f, 1e10f, 3e38f})
         EXPECT_NEAR(Qex_Sqrt(a), std::sqrt(a), 2e-6f + 1e-6f * std::sqrt(a));
     EXPECT_TRUE(std::isinf(Qex_Sqrt(std::numeric_limits<float>::infinity())));
     EXPECT_TRUE(std::isnan(Qex_Sqrt(std::nanf(""))));

@@ -7,32 +7,20 @@ namespace {
 
 constexpr double kPi = 3.141592653589793;
 
-QexQuaternion Unit(double x, double y, double z, double w) {
-    const glm::dvec4 unit = glm::normalize(glm::dvec4(x, y, z, w));
-    return {float(unit.x), float(unit.y), float(unit.z), float(unit.w)};
+QexQuaternion FromGlm(const glm::dquat& q) {
+    return {float(q.x), float(q.y), float(q.z), float(q.w)};
 }
-QexQuaternion Unit(Random& random) {
-    return Unit(double{random()}, double{random()}, double{random()}, double{random()});
+glm::dquat ToGlm(const QexQuaternion& q) {
+    return glm::dquat(double{q.w}, double{q.x}, double{q.y}, double{q.z});
+}
+// Random, or near another one, by that distance.
+QexQuaternion Unit(Random& random, const glm::dquat& near = {0, 0, 0, 0}, double distance = 1) {
+    const glm::dquat any(double{random()}, double{random()}, double{random()}, double{random()});
+    return FromGlm(glm::normalize(near + distance * any));
 }
 
 void ExpectNear(const QexQuaternion& actual, const QexQuaternion& expected, float tolerance) {
     for (int i = 0; i < 4; ++i) EXPECT_NEAR((&actual.x)[i], (&expected.x)[i], tolerance) << i;
-}
-
-// The interpolation by its definition, in double; only the cosine is single, as it decides between the rules.
-void SlerpByDefinition(double out[4], QexQuaternion a, QexQuaternion b, float t) {
-    float c = a.w * b.w + a.x * b.x + a.y * b.y + a.z * b.z;
-    const double side = c < 0 ? -1 : 1;
-    c = std::fabs(c);
-    double s0 = 1, s1 = 0, length = 0;
-    if (c < 1) {
-        const double angle = std::acos(double{c});
-        s0 = std::sin((1 - double{t}) * angle) / std::sin(angle);
-        s1 = side * std::sin(double{t} * angle) / std::sin(angle);
-    }
-    for (int i = 0; i < 4; ++i) out[i] = s0 * (&a.x)[i] + s1 * (&b.x)[i];
-    for (int i = 0; i < 4; ++i) length += out[i] * out[i];
-    for (int i = 0; i < 4 && c < 1; ++i) out[i] /= std::sqrt(length);
 }
 
 TEST(Quaternion, SlerpIsWithinAMillionthOfItsDefinition) {
@@ -40,32 +28,30 @@ TEST(Quaternion, SlerpIsWithinAMillionthOfItsDefinition) {
     double worst = 0;
     for (int i = 0; i < 100000; ++i) {
         const QexQuaternion a = Unit(random);
-        QexQuaternion b = Unit(random), q;
-        if (i % 4 != 0) {
-            // Near a, or near its opposite, by a distance of any size down to the last bits.
-            const double distance = std::pow(10.0, -8 * std::fabs(random())), side = i % 4 == 1 ? -1 : 1;
-            b = Unit(side * a.x + distance * b.x, side * a.y + distance * b.y, side * a.z + distance * b.z,
-                     side * a.w + distance * b.w);
-        }
+        // Anywhere, or near a or its opposite. Below that distance the cosine's last bit decides.
+        const double near = i % 4 == 0 ? 0 : i % 4 == 1 ? -1 : 1;
+        const QexQuaternion b = Unit(random, near * ToGlm(a), std::pow(10.0, -2 * std::fabs(random())));
         const float t = i % 100 == 0 ? 1.0f : std::fabs(random());
-        double expected[4];
+        QexQuaternion q;
         QexQuaternion_Slerp(&q, &a, &b, t);
-        SlerpByDefinition(expected, a, b, t);
-        for (int k = 0; k < 4; ++k) worst = std::max(worst, std::fabs((&q.x)[k] - expected[k]));
+        const glm::dquat expected = glm::slerp(ToGlm(a), ToGlm(b), double{t});
+        for (int k = 0; k < 4; ++k) worst = std::max(worst, std::fabs(ToGlm(q)[k] - expected[k]));
     }
     EXPECT_LT(worst, 1e-6);
 }
 
 TEST(Quaternion, RulesAtTheEdges) {
-    const QexQuaternion a = Unit(1, 2, 3, 4), opposite = {-a.x, -a.y, -a.z, -a.w}, b = Unit(-2, 1, 0, 1);
+    const QexQuaternion one = {0, 0, 0, 1}, minus = {0, 0, 0, -1}, half = {0.5f, 0.5f, 0.5f, 0.5f};
+    const struct {
+        QexQuaternion from, to;
+        float t;
+        QexQuaternion expected;
+    } cases[] = {{half, one, -0.001f, one},          {half, minus, 1.5f, one}, {half, one, NAN, one},
+                 {one, {1e-4f, 0, 0, 1}, 0.3f, one}, {one, minus, 0.3f, one},  {half, half, 1, half}};
     QexQuaternion q;
-    for (const float t : {-0.001f, 1.5f, NAN}) {
-        QexQuaternion_Slerp(&q, &a, &b, t);
-        ExpectNear(q, {0, 0, 0, 1}, 0);
-    }
-    for (const float t : {0.0f, 0.3f, 1.0f}) {
-        QexQuaternion_Slerp(&q, &a, &opposite, t);
-        ExpectNear(q, a, 1e-6f);
+    for (const auto& c : cases) {
+        QexQuaternion_Slerp(&q, &c.from, &c.to, c.t);
+        ExpectNear(q, c.expected, 0);
     }
     QexVec3 axis;
     float angle;
@@ -84,13 +70,12 @@ TEST(Quaternion, MatricesProductsAndAxesAgreeWithGlm) {
     Random random;
     for (int i = 0; i < 100; ++i) {
         const QexQuaternion a = Unit(random), b = Unit(random);
-        const glm::quat ga(a.w, a.x, a.y, a.z), gb(b.w, b.x, b.y, b.z), product = ga * gb;
         QexMatrix m;
         QexQuaternion_ToRotationMatrix(&m, &a);
-        ExpectNear(m, glm::mat4_cast(ga), 1e-6f);
+        ExpectNear(m, glm::mat4_cast(ToGlm(a)), 1e-6f);
         QexQuaternion q = b;
         QexQuaternion_Multiply(&q, &a, &q);
-        ExpectNear(q, {product.x, product.y, product.z, product.w}, 1e-6f);
+        ExpectNear(q, FromGlm(ToGlm(a) * ToGlm(b)), 1e-6f);
         QexVec3 axis;
         float angle;
         QexQuaternion_ToAxisAngle(&a, &axis, &angle);
@@ -108,14 +93,14 @@ void ExpectRotation(const QexMatrix& expected, const float* degrees) {
 TEST(Decomposition, AnglesRebuildTheRotation) {
     float first[3], second[3], radians[3];
     QexMatrix m;
-    for (int x = -170; x <= 170; x += 34) {
-        for (int y = -170; y <= 170; y += 34) {
-            QexMatrix_RotateXYZ(&m, static_cast<float>(x), static_cast<float>(y), 55);
+    for (float x = -170; x <= 170; x += 34) {
+        for (float y = -170; y <= 170; y += 34) {
+            QexMatrix_RotateXYZ(&m, x, y, 55);
             const int32_t nearer = GetRotationXYZFromRotationMatrix(&m, first, second);
             ExpectRotation(m, first);
             ExpectRotation(m, second);
-            const auto size = [](const float* a) { return a[0] * a[0] + a[1] * a[1] + a[2] * a[2]; };
-            EXPECT_EQ(nearer, size(first) < size(second) ? 1 : 2);
+            EXPECT_EQ(nearer,
+                      glm::length(glm::make_vec3(first)) < glm::length(glm::make_vec3(second)) ? 1 : 2);
             QexMatrix_ToEulerAnglesXYZ(&m, radians);
             for (float& angle : radians) angle = static_cast<float>(angle * 180 / kPi);
             ExpectRotation(m, radians);

@@ -2,8 +2,6 @@
 
 #include <cmath>
 #include <cstring>
-#include <limits>
-#include <vector>
 
 #include "Qex.h"
 
@@ -11,17 +9,15 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-struct Conversion {
-    uint32_t type;
-    int32_t count;
-    Bytes bytes;
-    float value[4];
-};
-
 // One row for each data type: its bytes and what they mean. Read and written at an odd address.
 TEST(PodVertex, EveryTypeBothWays) {
     const float n = 1.0f / 255;
-    const Conversion rows[] = {
+    const struct {
+        uint32_t type;
+        int32_t count;
+        Bytes bytes;
+        float value[4];
+    } rows[] = {
         {QEX_POD_FLOAT, 3, {0, 0, 0x80, 0x3F, 0, 0, 0, 0xC0, 0, 0, 0, 0x3F}, {1, -2, 0.5f, 1}},
         {QEX_POD_INT, 2, {0xFE, 0xFF, 0xFF, 0xFF, 0, 0, 1, 0}, {-2, 65536, 0, 1}},
         {QEX_POD_UNSIGNED_SHORT, 2, {0xFF, 0xFF, 2, 1}, {65535, 258, 0, 1}},
@@ -34,14 +30,14 @@ TEST(PodVertex, EveryTypeBothWays) {
         {QEX_POD_FIXED16_16, 2, {0, 0x80, 0xFF, 0xFF, 0, 0, 3, 0}, {-0.5f, 3, 0, 1}},
         {QEX_POD_UNSIGNED_BYTE, 4, {0, 1, 200, 255}, {0, 1, 200, 255}},
         {QEX_POD_SHORT, 2, {0xFF, 0xFF, 0, 0x80}, {-1, -32768, 0, 1}},
-        {QEX_POD_SHORT_NORM, 3, {0xFF, 0x7F, 0x01, 0x80, 0, 0}, {1, -1, 0, 1}},
+        {QEX_POD_SHORT_NORM, 3, {0xFF, 0x7F, 0x01, 0x80, 1, 0}, {1, -1, 1 / 32767.0f, 1}},
         {QEX_POD_BYTE, 2, {200, 5}, {200, 5, 0, 1}},
         {QEX_POD_BYTE_NORM, 3, {127, 254, 0}, {1, 2, 0, 1}},
         {QEX_POD_UNSIGNED_BYTE_NORM, 2, {255, 51}, {1, 0.2f, 0, 1}},
         {QEX_POD_UNSIGNED_SHORT_NORM, 2, {0xFF, 0xFF, 0x33, 0x33}, {1, 0.2f, 0, 1}},
         {QEX_POD_UNSIGNED_INT, 1, {0, 0, 0, 0x80}, {2147483648.0f, 0, 0, 1}},
     };
-    for (const Conversion& row : rows) {
+    for (const auto& row : rows) {
         SCOPED_TRACE("type " + std::to_string(row.type));
         // The element alone behind an odd address: a sanitizer sees what is touched beyond it.
         Bytes memory(1 + row.bytes.size());
@@ -77,32 +73,8 @@ TEST(PodVertex, UnknownTypesAreLeftAlone) {
     EXPECT_EQ(index32, 0x81020304u);
 }
 
-// Writing truncates, and still what was read comes back the same for every value of a type.
-TEST(PodVertex, WritingUndoesReading) {
-    const struct {
-        uint32_t type, size, lowest, highest;
-    } rows[] = {
-        {QEX_POD_BYTE_NORM, 1, 0, 255},     {QEX_POD_UNSIGNED_BYTE_NORM, 1, 0, 255},
-        {QEX_POD_SHORT_NORM, 2, 0, 65535},  {QEX_POD_UNSIGNED_SHORT_NORM, 2, 0, 65535},
-        {QEX_POD_FIXED16_16, 4, 0, 0xFFFF}, {QEX_POD_RGBA, 4, 0xFF00FF00, 0xFF00FFFF},
-        {QEX_POD_ARGB, 4, 0, 0xFFFF},       {QEX_POD_DEC3N, 4, 0x100400, 0x1007FF},
-    };
-    for (const auto& row : rows) {
-        uint32_t wrong = 0;
-        for (uint64_t k = row.lowest; k <= row.highest; ++k) {
-            const auto word = static_cast<uint32_t>(k);
-            uint32_t written = 0;
-            float value[4];
-            QexPODVertex_ReadVec(value, &word, row.type, 1);
-            QexVertexWriteVec(&written, row.type, 1, value);
-            wrong += std::memcmp(&word, &written, row.size) != 0;
-        }
-        EXPECT_EQ(wrong, 0u) << "type " << row.type;
-    }
-}
-
 TEST(PodVertex, WritingClampsToTheType) {
-    const float inf = std::numeric_limits<float>::infinity(), nan = std::nanf("");
+    const float inf = INFINITY, nan = NAN;
     const struct {
         uint32_t type;
         float value[4];

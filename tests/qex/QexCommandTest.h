@@ -8,6 +8,7 @@
 
 #include <cmath>
 
+#include "common/ImageFile.h"
 #include "PodBuild.h"
 #include "PvrWriter.h"
 #include "support/FolderTest.h"
@@ -41,6 +42,18 @@ class QexCommandTest : public FolderTest {
         waitpid(child, &status, 0);
         return {WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status),
                 std::filesystem::is_regular_file(out) ? ReadText(out) : "", ReadText(err)};
+    }
+
+    Image LoadPicture(const std::string& name) const {
+        Image image;
+        std::string error;
+        EXPECT_TRUE(LoadImage(Path(name), &image, &error)) << name << " " << error;
+        if (image.pixels.empty()) image = {1, 1, Bytes(4), false};
+        return image;
+    }
+    void SavePicture(const std::string& name, const Image& image) const {
+        std::string error;
+        EXPECT_TRUE(SavePng(Path(name), image.width, image.height, image.pixels.data(), &error)) << error;
     }
 
     // One line on standard error that contains `part`, nothing on standard output.
@@ -102,6 +115,15 @@ inline void RemoveQuad(pod::Scene* scene) {
     scene->meshNodeCount = 0;
     scene->nodes.erase(scene->nodes.begin());
     scene->cameras[0].target = 1;
+}
+
+// The camera's aim moves behind it.
+inline void AddLight(pod::Scene* scene, int32_t type, const pod::Vec3& colour) {
+    scene->lights.resize(1);
+    scene->lights[0].type = type;
+    scene->lights[0].colour = colour;
+    scene->nodes.insert(scene->nodes.begin() + 1, pod::BuildNode("lamp", Placed(0, 0, 0), -1, 0));
+    scene->cameras[0].target = 3;
 }
 
 inline void TextureQuad(pod::Scene* scene, const std::string& texture) {

@@ -1,6 +1,5 @@
 // qex info tells of scenes and textures what was written into them, and what of it would draw wrong.
 #include <functional>
-#include <limits>
 #include <map>
 
 #include <nlohmann/json.hpp>
@@ -24,11 +23,9 @@ class QexInfo : public QexCommandTest {
   protected:
     Json Info(const std::string& path) const {
         const CommandResult result = Run({"info", "--json", path});
-        EXPECT_EQ(result.status, 0) << path << " " << result.err;
+        EXPECT_EQ(result.status, 0) << path;
         EXPECT_EQ(result.err, "") << path;
-        const Json document = Json::parse(result.out, nullptr, false);
-        EXPECT_FALSE(document.is_discarded()) << result.out;
-        return document;
+        return Json::parse(result.out, nullptr, false);
     }
     Json Info(const pod::Scene& scene) const {
         WriteScene(Path("scene.pod"), scene);
@@ -37,7 +34,6 @@ class QexInfo : public QexCommandTest {
     // The text holds every problem of the JSON and no other.
     std::string ExpectTextAgrees(const std::string& path, const Json& document) const {
         const CommandResult result = Run({"info", path});
-        EXPECT_EQ(result.status, 0) << result.err;
         EXPECT_EQ(result.err, "");
         size_t lines = 0;
         for (size_t at = 0; (at = result.out.find("\n  - ", at)) != std::string::npos; ++at) ++lines;
@@ -125,8 +121,6 @@ TEST_F(QexInfo, TellsWhatASceneHolds) {
 }
 
 TEST_F(QexInfo, NamesEveryProblem) {
-    const float nan = std::numeric_limits<float>::quiet_NaN(),
-                infinite = std::numeric_limits<float>::infinity();
     Bytes cut = UniformPvr(pod::kPvrRgba8888, 8, {1, 2, 3, 4});
     cut.pop_back();
     WriteBytes(Path("bgra.pvr"), UniformPvr(pod::kPvrBgra8888, 8, {1, 2, 3, 4}));
@@ -135,10 +129,14 @@ TEST_F(QexInfo, NamesEveryProblem) {
     WriteText(Path("broken.png"), "no picture");
     WriteBytes(Path("photo.tga"), TgaFile(1, 1, 32, {1, 2, 3, 128}));
     WriteBytes(Path("sound.pvr"), UniformPvr(pod::kPvrRgba8888, 8, {1, 2, 3, 4}));
-    const struct {
-        std::function<void(pod::Scene*)> change;
-        const char* part;
-    } cases[] = {
+    pod::MeshArrays many;
+    many.positions.resize(70000);
+    many.indices = {0, 1, 2};
+    pod::Mesh wide = everything::SkinnedMesh();
+    wide.batchBoneMax = wide.bonesPerBatch[0] = 17;
+    wide.batchBones.assign(34, 2);
+    const std::pair<std::function<void(pod::Scene*)>, const char*> cases[] = {
+        // clang-format off
         {[](auto* s) { TextureQuad(s, "gone.png"); }, "texture 0 (gone.png) is missing"},
         {[](auto* s) { TextureQuad(s, "bgra.png"); }, "BGRA 8888 pixels"},
         {[](auto* s) { TextureQuad(s, "cut.pvr"); }, "cut short: 255 bytes of pixels instead of 256"},
@@ -146,44 +144,20 @@ TEST_F(QexInfo, NamesEveryProblem) {
         {[](auto* s) { s->meshes[0].vertices.components = 0; }, "mesh 0 has no positions"},
         {[](auto* s) { s->meshes[0].normals.components = 0; }, "mesh 0 has no normals"},
         {[](auto* s) { s->meshes[0].faceCount = 0; }, "mesh 0 has no faces"},
-        {[](auto* s) {
-             TextureQuad(s, "gone.png");
-             s->meshes[0].uvw.clear();
-         },
-         "mesh 0 has no UVs"},
-        {[=](auto* s) { s->meshes = {pod::BuildMesh(Quad(nan, 0, infinite, 1))}; },
+        {[](auto* s) { TextureQuad(s, "gone.png"); s->meshes[0].uvw.clear(); }, "mesh 0 has no UVs"},
+        {[](auto* s) { s->meshes = {pod::BuildMesh(Quad(NAN, 0, INFINITY, 1))}; },
          "mesh 0: 4 of 4 positions are not finite"},
-        {[](auto* s) {
-             pod::MeshArrays many;
-             many.positions.resize(70000);
-             many.indices = {0, 1, 2};
-             s->meshes = {pod::BuildMesh(many, true)};
-         },
+        {[&](auto* s) { s->meshes = {pod::BuildMesh(many, true)}; },
          "70000 vertices, at most 65,536 can be drawn: the scene is refused"},
-        {[](auto* s) {
-             pod::Mesh& mesh = s->meshes[0] = everything::SkinnedMesh();
-             mesh.batchBoneMax = 17;
-             mesh.batchBones.assign(34, 2);
-             mesh.bonesPerBatch[0] = 17;
-         },
-         "a batch of 17 bones, at most 16"},
+        {[&](auto* s) { s->meshes[0] = wide; }, "a batch of 17 bones, at most 16"},
         {FlattenQuad, "mesh node 0 (quad) is scaled to 0: it is not drawn"},
-        {[](auto* s) {
-             PlaceQuad(s, {{}, {}, {{0, 0, 0}, {1, 1, 1}}, {}});
-             s->frameCount = 2;
-         },
+        {[](auto* s) { PlaceQuad(s, {{}, {}, {{0, 0, 0}, {1, 1, 1}}, {}}); s->frameCount = 2; },
          "scaled to 0 at frame 0"},
         {[](auto* s) { s->materials[0].opacity = 0.5f; }, "material 0 (paint) has an opacity of 0.5"},
         {[](auto* s) { s->nodes[0].material = -1; }, "mesh node 0 (quad) has no material"},
         {[](auto* s) { s->nodes[0].material = 9; }, "1 node(s) name a material that is not there"},
         {[](auto* s) { s->cameras[0].target = 9; }, "1 camera(s) have a target that is not there"},
-        {[](auto* s) {
-             s->lights.resize(1);
-             s->lights[0].type = pod::kSpotLight;
-             s->nodes.insert(s->nodes.begin() + 1, pod::BuildNode("lamp", {}, -1, 0));
-             s->cameras[0].target = 3;
-         },
-         "light 0 is a spot light"},
+        {[](auto* s) { AddLight(s, pod::kSpotLight, {1, 1, 1}); }, "light 0 is a spot light"},
         {[](auto* s) { s->cameras.clear(); }, "it has no camera"},
         {[](auto* s) { s->cameras[0].nearPlane = 0; }, "camera 0 has its near plane at 0"},
         {RemoveQuad, "it has no mesh nodes"},
@@ -192,24 +166,16 @@ TEST_F(QexInfo, NamesEveryProblem) {
         {[](auto* s) { s->textures = {"sound.pvr"}; }, "texture 0 (sound.pvr) belongs to no material"},
         {[](auto* s) { TextureQuad(s, "Photo.PNG"); }, "texture 0 (Photo.PNG) is there as a picture only"},
         {[](auto* s) { TextureQuad(s, "broken.png"); }, "broken.png: is no PNG, JPEG, TGA"},
-        {[](auto* s) {
-             PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}});
-             s->nodes[2] = s->nodes[1] = s->nodes[0];
-             s->meshNodeCount = 3;
-             s->cameras.clear();
-             s->frameCount = 12;
-         },
+        {[](auto* s) { PlaceQuad(s, {{{0, 0, 0}, {1, 0, 0}}, {}, {}, {}}); s->nodes.assign(3, s->nodes[0]);
+                       s->meshNodeCount = 3; s->cameras.clear(); s->frameCount = 12; },
          "node 0: position has fewer keys than frames; it holds the last key (and 2 more like this)"},
+        // clang-format on
     };
-    for (const auto& c : cases) {
+    for (const auto& [change, part] : cases) {
         pod::Scene scene = QuadScene();
-        c.change(&scene);
-        const Json document = Info(scene);
-        bool found = false;
-        for (const Json& problem : document["problems"])
-            found |= Contains(problem.get<std::string>(), c.part);
-        EXPECT_TRUE(found) << c.part << "\n" << document["problems"];
-        ExpectTextAgrees(Path("scene.pod"), document);
+        change(&scene);
+        const std::string text = ExpectTextAgrees(Path("scene.pod"), Info(scene));
+        EXPECT_TRUE(Contains(text.substr(text.find("\n  - ")), part)) << part << "\n" << text;
     }
 }
 
@@ -245,8 +211,8 @@ TEST_F(QexInfo, TellsWhatTexturesHold) {
         tga[at] = static_cast<uint8_t>(value);
         WriteBytes(Path("a.tga"), tga);
         const Json document = Info(Path("a.tga"));
-        EXPECT_EQ(document["loads"], value == 2) << at << " " << value;
-        EXPECT_EQ(document["problems"].empty(), value == 2) << document;
+        for (const bool sound : {bool(document["loads"]), document["problems"].empty()})
+            EXPECT_EQ(sound, value == 2) << document;
         EXPECT_EQ(document["origin"], "upper left");
         ExpectTextAgrees(Path("a.tga"), document);
     }
@@ -264,16 +230,15 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
     };
     for (uint32_t type = 0; type < 0x40; ++type)
         add("type" + std::to_string(type) + ".pvr", UniformPvr(type, 16, Bytes(4)));
-    const Bytes ktx = UniformKtx(4, {1, 2, 3, 4}), pvr = UniformPvr(pod::kPvrRgba8888, 4, {1, 2, 3, 4});
     // Header words, each set to values that fit and that do not.
     for (const uint32_t value : {0u, 1u, 2u, 7u, 0x1907u, 0x8034u, 0xFFFFFFFFu})
         for (size_t at = 4; at < 64; at += 4) {
-            Bytes changedKtx = ktx, changedPvr = pvr;
-            PutWord(&changedKtx, at, value);
-            PutWord(&changedPvr, at, value);
+            Bytes ktx = UniformKtx(4, {1, 2, 3, 4}), pvr = UniformPvr(pod::kPvrRgba8888, 4, {1, 2, 3, 4});
+            PutWord(&ktx, at, value);
+            PutWord(&pvr, at, value);
             const std::string name = std::to_string(at) + "_" + std::to_string(value);
-            if (at >= 12) add(name + ".ktx", changedKtx);
-            if (at < 52) add(name + ".pvr", changedPvr);
+            if (at >= 12) add(name + ".ktx", ktx);
+            if (at < 52) add(name + ".pvr", pvr);
         }
     std::vector<std::string> arguments = {"info", "--json"};
     arguments.insert(arguments.end(), files.begin(), files.end());
@@ -294,7 +259,7 @@ TEST_F(QexInfo, JudgesTexturesAsTheEngineDoes) {
 
 TEST_F(QexInfo, DamagedScenesAreShownOrRefusedInOneLine) {
     const Bytes whole = pod::WritePod(FullScene());
-    size_t refused = 0, shown = 0;
+    int results[2] = {};  // shown and refused
     for (size_t at = 0; at + 4 <= whole.size(); at += 28) {
         Bytes file = whole;
         PutWord(&file, at, 0xFFFFFFFF);
@@ -302,8 +267,7 @@ TEST_F(QexInfo, DamagedScenesAreShownOrRefusedInOneLine) {
         const CommandResult result = Run({"info", Path("damaged.pod")});
         EXPECT_EQ(CountLines(result.err), result.status) << "word at " << at << "\n" << result.err;
         EXPECT_EQ(result.out.empty(), result.status == 1) << "word at " << at;
-        ++(result.status ? refused : shown);
+        ++results[result.status != 0];
     }
-    EXPECT_GT(refused, 5u);
-    EXPECT_GT(shown, 5u);
+    EXPECT_GT(std::min(results[0], results[1]), 5);
 }

@@ -1,5 +1,4 @@
 // Where textures come from: what qex render finds for the names in a scene, and which way up it lays them.
-#include "common/ImageFile.h"
 #include "qex/QexCommandTest.h"
 
 namespace {
@@ -10,12 +9,12 @@ constexpr char kUpright[] = "green above blue", kTurned[] = "blue above green", 
 class QexLookup : public QexCommandTest {
   protected:
     void WritePicture(const std::string& name) const {
-        std::filesystem::create_directories(std::filesystem::path(Path(name)).parent_path());
-        std::vector<uint8_t> pixels;
-        std::string error;
+        WriteText(Path(name), "");  // makes the folder
+        Image image = {8, 8, {}, false};
         for (int i = 0; i < 64; ++i)
-            pixels.insert(pixels.end(), {0, uint8_t(i < 32 ? 255 : 0), uint8_t(i < 32 ? 0 : 255), 255});
-        ASSERT_TRUE(SavePng(Path(name), 8, 8, pixels.data(), &error)) << error;
+            image.pixels.insert(image.pixels.end(),
+                                {0, uint8_t(i < 32 ? 255 : 0), uint8_t(i < 32 ? 0 : 255), 255});
+        SavePicture(name, image);
     }
     std::string Draw(const std::vector<std::string>& more = {}, bool piped = false) const {
         std::vector<std::string> arguments = {
@@ -23,9 +22,8 @@ class QexLookup : public QexCommandTest {
             "texture"};
         arguments.insert(arguments.end(), more.begin(), more.end());
         const CommandResult result = Run(arguments, piped ? Path("s.pod") : "/dev/null");
-        Image image;
-        std::string error = result.err;
-        if (result.status || !LoadImage(Path("out.png"), &image, &error)) return error;
+        if (result.status) return result.err;
+        const Image image = LoadPicture("out.png");
         const auto at = [&](int y) -> std::string {
             const uint8_t* p = image.Pixel(120, y);
             if (p[0] > 200 && p[1] > 200) return "white";
@@ -68,17 +66,11 @@ TEST_F(QexLookup, NamesMayDifferInCaseAndFolder) {
     WritePicture("Maps/Wood.PNG");
     WritePicture("stone.png");
     WriteBytes(Path("Grass.PVR"), UniformPvr(pod::kPvrRgb565, 8, {0x00, 0xF8}));
-    const struct {
-        const char *name, *drawn;
-    } rows[] = {{"maps/wood.png", kUpright},
-                {"MAPS\\WOOD.tga", kUpright},
-                {"C:\\old\\Stone.bmp", kUpright},
-                {"../x/STONE.png", kUpright},
-                {"textures/grass.png", kPlain}};
-    for (const auto& row : rows) {
-        WriteQuad(row.name);
-        EXPECT_EQ(Draw(), row.drawn) << row.name;
-        EXPECT_FALSE(Contains(Run({"info", Path("s.pod")}).out, "is missing")) << row.name;
+    for (const char* name :
+         {"maps/wood.png", "MAPS\\WOOD.tga", "C:\\old\\Stone.bmp", "../x/STONE.png", "textures/grass.png"}) {
+        WriteQuad(name);
+        EXPECT_EQ(Draw(), Contains(name, "grass") ? kPlain : kUpright) << name;
+        EXPECT_FALSE(Contains(Run({"info", Path("s.pod")}).out, "is missing")) << name;
     }
 }
 
@@ -100,15 +92,14 @@ TEST_F(QexLookup, PvrGoesBeforeKtxAndKtxBeforePictures) {
 TEST_F(QexLookup, MaterialsTakeTexturesOfOnesChoice) {
     WritePicture("mine.png");
     WriteBytes(Path("mine.pvr"), UniformPvr(pod::kPvrRgb565, 8, {0x1F, 0x00}));
+    const std::string mine = "paint=" + Path("mine.png"), none = "x=" + Path("mine.png");
     for (const char* own : {"", "gone.png"}) {
         WriteQuad(own);
-        EXPECT_EQ(Draw({"--texture", "paint=" + Path("mine.png")}), kUpright);
-        EXPECT_EQ(Draw({"--texture", "x=" + Path("mine.png"), "--texture", "paint=" + Path("mine.png")}),
+        EXPECT_EQ(Draw({"--texture", mine}), kUpright);
+        EXPECT_EQ(Draw({"--texture", none, "--texture", mine}),
                   "qex render: " + Path("s.pod") + ": no material 'x'; the scene has paint\n");
     }
     EXPECT_EQ(Draw({"--texture", "paint=" + Path("mine.pvr")}), "blue");
-    ExpectRefused({"render", Path("s.pod"), "-o", Path("o.png"), "--texture", "paint=" + Path("none.png")}, 2,
-                  "none.png: no such file");
     ExpectRefused({"render", Path("s.pod"), "-o", Path("o.png"), "--texture", "paint"}, 2,
                   "expected MATERIAL=FILE");
     // Of a model that is converted, too.
@@ -119,6 +110,6 @@ TEST_F(QexLookup, MaterialsTakeTexturesOfOnesChoice) {
     EXPECT_EQ(Run({"convert", Path("q.obj"), "-o", out, "--texture", "m=" + Path("mine.png")}).err, "");
     EXPECT_TRUE(Contains(Run({"info", out}).out, "mine.pvr"));
     EXPECT_GT(ReadBytes(Path("folder/mine.pvr")).size(), 52u);
-    ExpectRefused({"convert", Path("q.obj"), "-o", out, "--texture", "x=" + Path("mine.png")}, 2,
+    ExpectRefused({"convert", Path("q.obj"), "-o", out, "--texture", none}, 2,
                   "no material 'x'; the scene has ");
 }

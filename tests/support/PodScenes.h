@@ -71,9 +71,8 @@ struct LoadedPod {
     std::string Error() const {
         const std::string prefix = "E/Qex: <QexPODModel_ReadFromSourceStream> ";
         const size_t at = log.find(prefix);
-        return at == std::string::npos
-                   ? ""
-                   : log.substr(at + prefix.size(), log.find('\n', at) - at - prefix.size());
+        if (at == std::string::npos) return "";
+        return log.substr(at + prefix.size(), log.find('\n', at) - at - prefix.size());
     }
 
     size_t size;
