@@ -15,7 +15,7 @@ const glm::vec3 kPlace = kPatch - kExtra;
 
 // The shares of one to four bones, in 255ths.
 constexpr std::array<uint8_t, 4> kWeights[] = {
-    {255, 0, 0, 0}, {155, 100, 0, 0}, {100, 80, 75, 0}, {90, 70, 55, 40}};
+    {255, 0, 0, 0}, {155, 100, 0, 0}, {100, 115, 40, 0}, {90, 40, 100, 25}};
 
 // A quarter turn about Z, and scales that are uneven: in the world the normal is (0.6, 0, 0.8), the tangent
 // (0.8, 0, -0.6) and the binormal (0, 1, 0).
@@ -106,8 +106,8 @@ TEST_F(LitTest, EveryModuleFollowsItsFormula) {
         {QEX_SHADER_SKINNING_TEXTURE, 2, texel, texel},
         {QEX_SHADER_SKINNING_GOURAUD, 1, {53, 70, 13, 92}},
         {QEX_SHADER_SKINNING_GOURAUD, 2, {55, 79, 13, 92}},
-        {QEX_SHADER_SKINNING_GOURAUD, 3, {57, 87, 13, 92}},
-        {QEX_SHADER_SKINNING_GOURAUD, 4, {58, 83, 13, 92}},
+        {QEX_SHADER_SKINNING_GOURAUD, 3, {56, 86, 13, 92}},
+        {QEX_SHADER_SKINNING_GOURAUD, 4, {59, 87, 13, 92}},
         {QEX_SHADER_SKINNING_GOURAUD_SPECULAR, 2, {112, 108, 114, 92}},
         {QEX_SHADER_SKINNING_GOURAUD_NORMALMAP, 2, {52, 81, 60, 92}},
     };

@@ -54,7 +54,7 @@ constexpr Skeleton::Bone Skeleton::kBones[];
 // Two batches of three squares of 6 x 6 pixels, every one with its own texel of a palette, bones and weights.
 constexpr int kQuads = 6;
 const glm::vec2 kCentres[kQuads] = {{10, 20}, {30, 15}, {55, 20}, {80, 10}, {15, 50}, {65, 55}};
-constexpr int kWeights[4][4] = {{255, 0, 0, 0}, {155, 100, 0, 0}, {100, 80, 75, 0}, {90, 70, 55, 40}};
+constexpr int kWeights[4][4] = {{255, 0, 0, 0}, {155, 100, 0, 0}, {60, 45, 150, 0}, {90, 40, 105, 20}};
 const std::vector<int> kBatches[] = {{1, 3, 2}, {4, 2}};  // scene nodes by index in the batch
 
 size_t BoneOf(int quad, uint32_t influence) {

@@ -54,24 +54,25 @@ TEST_F(ParticleSetTest, PointsMoveShrinkAndFade) {
     const QexMatrix model = ToQex(glm::translate(glm::mat4(1), {10, -6, 0}));
     QexParticleSet_Trigger(&set_);
     Update(0, &model);
-    for (const float time : {0.0f, 1.0f, 1.5f}) {
+    struct Point {
+        int x, y, half;  // the middle from the upper left, half the size
+        Rgba colour;     // of the lower left half of the mask
+    };
+    const std::pair<float, std::vector<Point>> frames[] = {
+        {0,
+         {{34, 74, 16, {255, 128, 0, 204}},
+          {74, 34, 16, {255, 128, 0, 204}},
+          {104, 54, 16, {255, 128, 0, 204}}}},
+        {1, {{42, 74, 9, {191, 96, 64, 134}}, {74, 50, 4, {128, 64, 128, 77}}}},
+        {1.5f, {{46, 74, 6, {159, 80, 96, 104}}, {74, 58, 1, {64, 32, 191, 32}}}}};
+    for (const auto& [time, points] : frames) {
         if (time > 0) Update(time - set_.time, &model);
         Clear();
         QexParticleSet_Draw(&set_);
         Picture expected;
-        for (const QexParticleSetEntry& e : entries) {
-            const float v = 1 - time / e.lifetime;
-            if (v <= 0) continue;
-            const int half = static_cast<int>(std::lround(16 * v * v));
-            const int x = static_cast<int>(e.startPosition.x + time * e.velocity.x) + 14,
-                      y = kHeight - static_cast<int>(e.startPosition.y + time * e.velocity.y) - 2;
-            const auto colour = [&](float alpha) -> Rgba {
-                const float a = (0.5f * (1 - v) + v) * 0.8f * v * alpha;
-                const auto byte = [](float c) { return static_cast<int>(std::lround(255 * c)); };
-                return {byte(v), byte(v * 128 / 255), byte(1 - v), byte(a)};
-            };
-            expected.Fill(x, y - half, x + half, y, colour(128 / 255.0f));
-            expected.Fill(x - half, y, x + half, y + half, colour(1));
+        for (const auto& [x, y, half, c] : points) {
+            expected.Fill(x, y - half, x + half, y, {c[0], c[1], c[2], c[3] * 128 / 255});
+            expected.Fill(x - half, y, x + half, y + half, c);
         }
         EXPECT_TRUE(SamePicture(Read(), expected, 2)) << "at " << time;
     }

@@ -4,8 +4,8 @@
 #include <cmath>
 
 #include "KtxWriter.h"
-#include "PvrWriter.h"
 #include "support/Capture.h"
+#include "support/ImageFiles.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -220,8 +220,8 @@ TEST_F(MeshTest, BadMeshesAreRefusedWithALine) {
 }
 
 // A file of three rows: red above, green, blue below.
-std::vector<uint8_t> Rows(bool topFirst, bool bgr = false) {
-    std::vector<uint8_t> bytes;
+Bytes Rows(bool topFirst, bool bgr = false) {
+    Bytes bytes;
     for (const int row : {0, 1, 2})
         for (int i = 0; i < 8; ++i) {
             const int at = topFirst ? row : 2 - row, c = i % 4;
@@ -230,32 +230,26 @@ std::vector<uint8_t> Rows(bool topFirst, bool bgr = false) {
     return bytes;
 }
 
-std::vector<uint8_t> PvrFile(bool topFirst) {
+Bytes PvrFile(bool topFirst) {
     return pod::WritePvr({pod::kPvrRgba8888, 2, 3, topFirst ? 0u : pod::kPvrFlipped, {{Rows(topFirst)}}});
 }
 
-std::vector<uint8_t> KtxFile(bool topFirst, const char* orientation) {
+Bytes KtxFile(bool topFirst, const char* orientation) {
     pod::KtxImage image = {GL_UNSIGNED_BYTE, GL_RGBA, GL_RGBA, GL_RGBA, 4, 2, 3, {}, {{Rows(topFirst)}}};
     if (orientation) image.keyValues = {{"author", std::string(301, 'x')}, {"KTXorientation", orientation}};
     return pod::WriteKtx(image);
 }
 
-std::vector<uint8_t> TgaFile(bool topFirst) {
-    std::vector<uint8_t> file = {0, 0, 2, 0, 0, 0, 0, 0,  0,
-                                 0, 0, 0, 2, 0, 3, 0, 32, uint8_t(topFirst ? 40 : 8)};
-    const std::vector<uint8_t> rows = Rows(topFirst, true);
-    file.insert(file.end(), rows.begin(), rows.end());
+Bytes UprightTga(bool topFirst) {
+    Bytes file = TgaFile(2, 3, 32, Rows(topFirst, true));
+    file[17] = topFirst ? 40 : 8;
     return file;
 }
 
 TEST_F(PictureTest, StandUprightWhicheverRowComesFirst) {
-    const std::vector<uint8_t> files[] = {PvrFile(true),
-                                          PvrFile(false),
-                                          KtxFile(true, "S=r,T=d"),
-                                          KtxFile(false, "S=r,T=u"),
-                                          KtxFile(true, nullptr),
-                                          TgaFile(true),
-                                          TgaFile(false)};
+    const Bytes files[] = {
+        PvrFile(true),          PvrFile(false),   KtxFile(true, "S=r,T=d"), KtxFile(false, "S=r,T=u"),
+        KtxFile(true, nullptr), UprightTga(true), UprightTga(false)};
     const Rgba red = {255, 0, 0, 255}, green = {0, 255, 0, 255}, blue = {0, 0, 255, 255};
     const QexRect lower = {0, 1, 1, 2}, middle = {1, 1, 1, 1};
     for (const auto& bytes : files) {
@@ -307,7 +301,7 @@ TEST_F(PictureTest, AlphaFileRectanglesAndErrors) {
     EXPECT_EQ(QexPicture_Draw(nullptr, &picture, nullptr, 0, 0, 1, 1, 0), -1);
     QexPicture_Release(&picture);
     EXPECT_EQ(QexPicture_Draw(&runtime_, &picture, nullptr, 0, 0, 1, 1, 0), -1);
-    const MemoryFile nothing(std::vector<uint8_t>(7, 1));
+    const MemoryFile nothing(Bytes(7, 1));
     EXPECT_EQ(QexPicture_Load(&picture, nothing.Path()), -1);
     EXPECT_EQ(QexPicture_Load(&picture, "/nonexistent"), -1);
     QexPicture_Release(&picture);

@@ -118,22 +118,15 @@ TEST_P(Decoder, SizesAndPointersThatCannotBe) {
     const Decoders& decode = GetParam();
     const Bytes block(8, 0xFF), untouched(64, 0x5A);
     Bytes pixels = untouched;
-    const struct {
-        const void* source;
-        int32_t width, height;
-        void* destination;
-        int32_t result;
-    } cases[] = {
-        {block.data(), 0, 4, pixels.data(), 0},
-        {block.data(), 4, -4, pixels.data(), 0},
-        {nullptr, 4, 4, pixels.data(), -1},
-        {block.data(), 4, 4, nullptr, -1},
-        {block.data(), INT32_MAX, INT32_MAX, pixels.data(), -1},
-        {block.data(), 65536, 65536, pixels.data(), -1},
-        {block.data(), 3, 1 << 28, pixels.data(), -1},  // a temporary image of 4 GiB
-    };
-    for (const auto& c : cases)
-        EXPECT_EQ(decode.etc(c.source, c.width, c.height, c.destination, 0), c.result) << c.width;
+    const std::array<int32_t, 3> sizes[] = {{0, 4, 0},
+                                            {4, -4, 0},
+                                            {INT32_MAX, INT32_MAX, -1},
+                                            {65536, 65536, -1},
+                                            {3, 1 << 28, -1}};  // a temporary image of 4 GiB
+    for (const auto& [width, height, result] : sizes)
+        EXPECT_EQ(decode.etc(block.data(), width, height, pixels.data(), 0), result) << width;
+    EXPECT_EQ(decode.etc(nullptr, 4, 4, pixels.data(), 0), -1);
+    EXPECT_EQ(decode.etc(block.data(), 4, 4, nullptr, 0), -1);
     for (const int twoBits : {0, 1}) {
         decode.pvrtc(block.data(), twoBits, 0, 4, pixels.data());
         decode.pvrtc(block.data(), twoBits, 4, INT32_MIN, pixels.data());
