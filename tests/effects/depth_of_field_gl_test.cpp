@@ -38,8 +38,7 @@ bool Inside(double coordinate) {
     return within > 0.05 && within < 0.95;
 }
 
-// The place of the first pixel that is not black in the third row or column, and the values up to the last
-// one.
+// The place of the first pixel of the third row or column that is not black, and the values from there.
 std::vector<int> Profile(const Texels& texels, bool column) {
     std::vector<int> values;
     for (int i = 0; i < (column ? texels.height : texels.width); ++i) {

@@ -18,8 +18,6 @@ QexCamera PixelCamera() {
     return camera;
 }
 
-// ---- Sets ----
-
 class ParticleSetTest : public RenderTest {
   protected:
     void Create(uint32_t count, float pointSize, float duration, QexTexture* texture = nullptr,
@@ -138,8 +136,6 @@ TEST_F(ParticleSetTest, LifeAndStateLeftBehind) {
     QexParticleSet_Release(&other);
     EXPECT_EQ(LiveObjects(), before);
 }
-
-// ---- Emitters ----
 
 constexpr long kSeed = 20240229;
 

@@ -64,10 +64,6 @@ TEST_F(ResizeTest, TextQuadsAndEffectsFollow) {
     EXPECT_EQ(runtime_.width, kWidth);
 }
 
-glm::vec3 Glm(const QexVec3& v) {
-    return {v.x, v.y, v.z};
-}
-
 // Closed shapes have the volume that geometry says, which takes every triangle, wound outwards; textures are
 // not mirrored; normals are of unit length and on the outer side.
 TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
@@ -93,8 +89,8 @@ TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
             glm::vec3 p[3];
             glm::vec2 t[3];
             for (int c = 0; c < 3; ++c) {
-                p[c] = Glm(mesh.positions[corner[c]]);
-                t[c] = {mesh.uvs[corner[c]].x, mesh.uvs[corner[c]].y};
+                p[c] = glm::make_vec3(&mesh.positions[corner[c]].x);
+                t[c] = glm::make_vec2(&mesh.uvs[corner[c]].x);
             }
             const glm::vec3 face = glm::cross(p[1] - p[0], p[2] - p[0]);
             const glm::vec2 s = t[1] - t[0], u = t[2] - t[0];
@@ -103,7 +99,7 @@ TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
             if (glm::length(face) < 1e-6f) continue;  // at a pole
             EXPECT_GT(s.x * u.y - u.x * s.y, 0) << i;
             for (int c = 0; c < 3; ++c) {
-                const glm::vec3 normal = Glm(mesh.normals[corner[c]]);
+                const glm::vec3 normal = glm::make_vec3(&mesh.normals[corner[c]].x);
                 EXPECT_NEAR(glm::length(normal), 1, 1e-5f);
                 EXPECT_GT(glm::dot(normal, glm::normalize(face)), 0.9f) << i;
             }
@@ -190,7 +186,7 @@ TEST_F(MeshTest, TangentsFollowTheTexture) {
     for (uint32_t v = 0; v < box.vertexCount; ++v) {
         QexVec4 t;
         QexPODVertex_ReadVec(&t.x, tangents.data + v * tangents.stride, tangents.type, 3);
-        EXPECT_LT(glm::distance(glm::vec3(t.x, t.y, t.z), expected[v / 4]), 1e-5f) << v;
+        EXPECT_LT(glm::distance(glm::make_vec3(&t.x), expected[v / 4]), 1e-5f) << v;
     }
     QexModel_Unload(&model);
     QexMesh_Release(&box);

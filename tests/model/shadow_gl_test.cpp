@@ -176,8 +176,6 @@ TEST_F(ShadowTest, StateAfterThePass) {
     glDisable(GL_SCISSOR_TEST);
 }
 
-// ---- Reflection ----
-
 class ReflectionTest : public RenderTest {
   protected:
     // The camera stands low and looks north over the floor.
@@ -198,8 +196,7 @@ class ReflectionTest : public RenderTest {
     QexCamera camera_;
 };
 
-// The square hangs over the middle of the floor, and so far aside that its image lies partly beside the
-// floor.
+// The square hangs over the middle of the floor, or its image lies partly beside the floor.
 TEST_F(ReflectionTest, ShowsTheMirroredSceneWithinThePlane) {
     ScopedTexture green({0, 255, 0, 255});
     const glm::mat4 mirror = glm::scale(glm::mat4(1), {1, -1, 1});

@@ -4,17 +4,9 @@ namespace {
 
 using KtxLoader = LoaderTest;
 
-enum Header : size_t {
-    kType = 16,
-    kFormat = 24,
-    kInternal = 28,
-    kBase = 32,
-    kWidth = 36,
-    kHeight = 40,
-    kFaces = 52,
-    kLevels = 56,
-    kKeyValues = 60
-};
+// Offsets in the header.
+constexpr size_t kType = 16, kFormat = 24, kInternal = 28, kBase = 32, kWidth = 36, kHeight = 40, kFaces = 52,
+                 kLevels = 56, kKeyValues = 60;
 
 constexpr TryFunction TryFile = ::TryFile<QexTexture_LoadKTXFromFile>;
 
