@@ -10,14 +10,6 @@
 
 namespace {
 
-QexCamera PixelCamera() {
-    QexCamera camera;
-    QexCamera_Create(&camera, 0);
-    camera.viewMatrix = g_sMatIdentity;
-    camera.projectionMatrix = PixelProjection();
-    return camera;
-}
-
 class ParticleSetTest : public RenderTest {
   protected:
     void Create(uint32_t count, float pointSize, float duration, QexTexture* texture = nullptr,

@@ -269,8 +269,13 @@ TEST_F(SkyTest, WhatIsUnderWaterIsNotReflected) {
     }
     s_model = nullptr;
     s_calls.clear();
+    Look({30, 22, 60}, {0, 5, 0});
+    QexCamera_Project(&camera_, 0.9f, float{kWidth} / kHeight, 2, 500);
     Update();
     ASSERT_EQ(s_calls.size(), 2u);
+    // Lengyel's formula with the transposed inverse, in doubles.
+    const glm::vec4 depth = 500.0f * glm::transpose(s_calls[0].projection)[2];
+    EXPECT_LT(glm::distance(depth, {0, -0.2101923f, 0.9467328f, -3.794644f}), 1e-3f);
     EXPECT_TRUE(SameMatrix(&s_calls[1].view, View()));
     EXPECT_TRUE(SameMatrix(&s_calls[1].projection, Projection()));
     for (const size_t i : {0, 1}) {

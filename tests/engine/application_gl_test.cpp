@@ -160,9 +160,7 @@ TEST_F(MeshTest, ModelsShowTextureColoursAndLightAndArePicked) {
         EXPECT_TRUE(Near(Read().Pixel(30, kHeight - 1 - 25), c.lower, 3));
         EXPECT_TRUE(Near(Read().Pixel(50, kHeight - 1 - 55), c.upper, 3));
 
-        QexCamera camera = {};
-        camera.viewMatrix = g_sMatIdentity;
-        camera.projectionMatrix = projection;
+        const QexCamera camera = PixelCamera();
         QexModel_UpdateModelBoundingBox(&model, nullptr);
         QexModel_CalcScreenBBox(&runtime_, &model, &camera);
         const QexVec2 inside = {25, kHeight - 55.0f};

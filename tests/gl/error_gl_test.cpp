@@ -78,6 +78,7 @@ TEST_F(UncheckedCalls, ReadNoError) {
     EXPECT_EQ(reads([&] { QexRenderTarget_EndScene(&target); }), 1u);
     EXPECT_EQ(reads([&] { QexRenderTarget_SetRenderTarget(&runtime_, nullptr); }), 2u);
     EXPECT_EQ(reads([&] { QexRenderTarget_Release(&target), QexBillboard_Release(billboard); }), 0u);
+    EXPECT_EQ(reads([] { QexModel_RenderFromShadowCamera(nullptr, nullptr); }), 0u);
     QexParticleSet_Release(&set);
     QexGouraudShader_Release(&module);
 }

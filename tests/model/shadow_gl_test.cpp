@@ -36,13 +36,13 @@ pod::Scene FloorAndSquare(const Square& wanted) {
     return scene;
 }
 
-// Looks straight down from height 50 on the floor; north is -z. One unit is two pixels and more.
-QexCamera Above() {
+// Looks at the origin.
+QexCamera CameraAt(QexVec3 eye, QexVec3 up, float near, float far) {
     QexCamera camera;
-    const QexVec3 eye = {0, 50, 0}, target = {0, 0, 0}, up = {0, 0, -1};
+    const QexVec3 target = {0, 0, 0};
     QexCamera_Create(&camera, 0);
     QexCamera_LookAt(&camera, &eye, &target, &up);
-    QexCamera_Project(&camera, 0.8f, float{kWidth} / kHeight, 5, 60);
+    QexCamera_Project(&camera, 0.8f, float{kWidth} / kHeight, near, far);
     return camera;
 }
 
@@ -51,7 +51,8 @@ class ShadowTest : public RenderTest {
     void SetUp() override {
         RenderTest::SetUp();
         module_ = QexShaders_CreateShaderProgram(QEX_SHADER_GOURAUD_SHADOW);
-        camera_ = Above();
+        // Straight down; north is -z, and one unit two pixels and more.
+        camera_ = CameraAt({0, 50, 0}, {0, 0, -1}, 5, 60);
     }
     void TearDown() override {
         QexShaders_ReleaseShaderProgram(module_, QEX_SHADER_GOURAUD_SHADOW);
@@ -178,14 +179,6 @@ TEST_F(ShadowTest, StateAfterThePass) {
 
 class ReflectionTest : public RenderTest {
   protected:
-    // The camera stands low and looks north over the floor.
-    void SetUp() override {
-        RenderTest::SetUp();
-        const QexVec3 eye = {0, 24, 80}, target = {0, 0, 0}, up = {0, 1, 0};
-        QexCamera_Create(&camera_, 0);
-        QexCamera_LookAt(&camera_, &eye, &target, &up);
-        QexCamera_Project(&camera_, 0.8f, float{kWidth} / kHeight, 1, 200);
-    }
     void Begin() {
         glClearStencil(0);
         glClear(GL_STENCIL_BUFFER_BIT);
@@ -193,7 +186,7 @@ class ReflectionTest : public RenderTest {
         QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     }
 
-    QexCamera camera_;
+    QexCamera camera_ = CameraAt({0, 24, 80}, {0, 1, 0}, 1, 200);  // low, looking north over the floor
 };
 
 // The square hangs over the middle of the floor, or its image lies partly beside the floor.

@@ -4,15 +4,6 @@
 
 namespace {
 
-// One unit is one pixel, the origin in the middle of the surface.
-QexCamera PixelCamera() {
-    QexCamera camera;
-    QexCamera_Create(&camera, 0);
-    camera.viewMatrix = ToQex(glm::translate(glm::mat4(1), {kWidth / 2, kHeight / 2, 0}));
-    camera.projectionMatrix = PixelProjection();
-    return camera;
-}
-
 class BillboardTest : public RenderTest {};
 
 TEST_F(BillboardTest, ModesTurnAsDescribed) {
@@ -67,7 +58,7 @@ TEST_F(BillboardTest, ModesTurnAsDescribed) {
 TEST_F(BillboardTest, CoversItsTexels) {
     const uint8_t texels[4][4] = {{255, 0, 0, 255}, {0, 255, 0, 200}, {0, 0, 255, 100}, {255, 255, 0, 0}};
     ScopedTexture texture(2, 2, texels[0]);
-    const QexCamera camera = PixelCamera();
+    const QexCamera camera = PixelCamera({kWidth / 2, kHeight / 2, 0});
     QexBillboard* billboard = QexBillboard_Create(&texture);
     billboard->scale = {32, 16, 1};
     billboard->rotation = {30, 40, 50};
@@ -89,7 +80,7 @@ TEST_F(BillboardTest, CoversItsTexels) {
 
 TEST_F(BillboardTest, LifeAndStateLeftBehind) {
     const std::string before = LiveObjects();
-    const QexCamera camera = PixelCamera();
+    const QexCamera camera = PixelCamera({kWidth / 2, kHeight / 2, 0});
     QexBillboard_Release(nullptr);
     QexBillboard_SetTexture(nullptr, nullptr);
     QexBillboard_Draw(nullptr, &camera);
