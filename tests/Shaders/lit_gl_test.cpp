@@ -204,9 +204,13 @@ const Order kOrders[] = {
     {MODULE(QexSkinningDepthShader), true, "near far " + kSkinned},
 };
 
-TEST_F(LitTest, SlotsAndStateOfEveryModule) {
-    const QexLightSet lights = Lights(2);
+void DrawNode(QexShaderModule* module, LoadedModel& model, uint32_t node = 0) {
+    const QexLightSet lights = Lights(4);
     const QexShadowInfo shadow = {};
+    module->render(module, &model.model, node, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity, &shadow);
+}
+
+TEST_F(LitTest, SlotsAndStateOfEveryModule) {
     for (const Order& order : kOrders) {
         LoadedModel model(PatchScene(order.skinned ? 2 : 0));
         QexShaderModule* module = order.create();
@@ -215,16 +219,12 @@ TEST_F(LitTest, SlotsAndStateOfEveryModule) {
         const auto slotCount = std::count(order.slots.begin(), order.slots.end(), ' ');
         for (long i = 0; i < slotCount; ++i) slots.push_back(module->slots[i].location);
         EXPECT_EQ(Names(module->program, slots), order.slots);
-        const auto draw = [&](uint32_t node) {
-            module->render(module, &model.model, node, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
-                           &shadow);
-        };
         for (const GLenum unit : {3, 2, 1, 0}) {
             QexRenderState_ActiveTexture(GL_TEXTURE0 + unit);
             glBindTexture(GL_TEXTURE_2D, 0);
         }
         QexRenderState_UseProgram(0);
-        const std::string change = StateChange([&] { draw(0); });
+        const std::string change = StateChange([&] { DrawNode(module, model); });
         EXPECT_EQ(change.find("program: 0 -> " + std::to_string(module->program) + "\n"), 0u);
         for (const char unit : std::string("0123"))
             EXPECT_EQ(change.find(std::string("texture2D[") + unit) != std::string::npos,
@@ -234,7 +234,8 @@ TEST_F(LitTest, SlotsAndStateOfEveryModule) {
         EXPECT_EQ(size_t(std::count(change.begin(), change.end(), '\n')), lines) << change;
         // No mesh node, and one that is hidden.
         model.Node().stateFlags &= ~QEX_NODE_RENDERING_ENABLED;
-        for (const uint32_t node : {0u, 1u, 7u}) EXPECT_EQ(GLCalls([&] { draw(node); }).Size(), 0u);
+        for (const uint32_t node : {0u, 1u, 7u})
+            EXPECT_EQ(GLCalls([&] { DrawNode(module, model, node); }).Size(), 0u);
         order.release(&module);
         order.release(&module);
     }
@@ -243,18 +244,12 @@ TEST_F(LitTest, SlotsAndStateOfEveryModule) {
 class SteadyModuleTest : public NullRenderTest {};
 
 TEST_F(SteadyModuleTest, NoModuleAllocatesOrCreates) {
-    const QexLightSet lights = Lights(4);
-    const QexShadowInfo shadow = {};
     for (const Order& order : kOrders) {
         LoadedModel model(PatchScene(order.skinned ? 2 : 0));
         QexShaderModule* module = order.create();
         const std::string live = LiveObjects();
         gltapResetCounts();
-        const auto draw = [&] {
-            module->render(module, &model.model, 0, &lights, nullptr, &g_sMatIdentity, &g_sMatIdentity,
-                           &shadow);
-        };
-        EXPECT_EQ(CountAllocations(draw).made, 0) << order.slots;
+        EXPECT_EQ(CountAllocations([&] { DrawNode(module, model); }).made, 0) << order.slots;
         EXPECT_EQ(gltapCount("glDrawElements"), 1u) << order.slots;
         EXPECT_EQ(LiveObjects(), live) << order.slots;
         order.release(&module);

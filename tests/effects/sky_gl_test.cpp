@@ -29,12 +29,33 @@ constexpr float kSky = 4000, kWaterLevel = 2;
 const Rgba kWhite = {255, 255, 255, 255};
 const char kLine[] = "T0:1.000000, S0:0.001200, T1:0.000000, S1:0.000500\n";
 
-// What a ray from a place in the cube, counted from its centre, meets: the opposite direction, as far as
-// positive.
+// A cube map whose texels hold their direction; the GL's own table of faces: major axis, s and t.
+QexTexture DirectionCube() {
+    constexpr int kSize = 32;
+    const glm::vec3 faces[6][3] = {{{1, 0, 0}, {0, 0, -1}, {0, -1, 0}}, {{-1, 0, 0}, {0, 0, 1}, {0, -1, 0}},
+                                   {{0, 1, 0}, {1, 0, 0}, {0, 0, 1}},   {{0, -1, 0}, {1, 0, 0}, {0, 0, -1}},
+                                   {{0, 0, 1}, {1, 0, 0}, {0, -1, 0}},  {{0, 0, -1}, {-1, 0, 0}, {0, -1, 0}}};
+    QexTexture cube = {};
+    QexTexture_GenerateNormalisationCubeMap(&cube, kSize);
+    for (GLenum face = 0; face < 6; ++face) {
+        std::vector<uint8_t> texels;
+        for (int i = 0; i < kSize * kSize; ++i) {
+            const float s = (float(i % kSize) + 0.5f) * 2 / kSize - 1,
+                        t = (float(i / kSize) + 0.5f) * 2 / kSize - 1;
+            const glm::vec3 d = glm::normalize(faces[face][0] + s * faces[face][1] + t * faces[face][2]);
+            for (int c = 0; c < 3; ++c) texels.push_back(static_cast<uint8_t>(127.5f + 127.5f * d[c]));
+        }
+        glTexImage2D(GL_TEXTURE_CUBE_MAP_POSITIVE_X + face, 0, GL_RGB, kSize, kSize, 0, GL_RGB,
+                     GL_UNSIGNED_BYTE, texels.data());
+    }
+    return cube;
+}
+
+// What a ray from a place in the cube, counted from its centre, meets.
 Rgba SkyColour(const glm::vec3& ray, const glm::vec3& from = glm::vec3(0)) {
     const glm::vec3 walls = (glm::sign(ray) * kSky / 2.0f - from) / ray;
     const glm::vec3 wall = from + ray * std::min({walls.x, walls.y, walls.z});
-    const glm::ivec3 c(glm::max(-255.0f * glm::normalize(wall), 0.0f));
+    const glm::ivec3 c(127.5f - 127.5f * glm::normalize(wall));
     return {c.x, c.y, c.z, 255};
 }
 
@@ -69,7 +90,7 @@ class SkyTest : public RenderTest {
     void SetUp() override {
         RenderTest::SetUp();
         before_ = LiveObjects();
-        QexTexture_GenerateNormalisationCubeMap(&cube_, 128);
+        cube_ = DirectionCube();
         Look({30, 22, 60}, {0, 5, 0});
         QexCamera_Project(&camera_, 0.9f, float{kWidth} / kHeight, 1, kSky);
         sky_.skyTexture = &cube_;

@@ -115,10 +115,7 @@ inline Ktx Etc1Ktx() {
 inline Bytes TgaFile(uint32_t width, uint32_t height, uint32_t bits, const Bytes& pixels) {
     Bytes file(18 + pixels.size());
     file[2] = 2;
-    file[12] = static_cast<uint8_t>(width);
-    file[13] = static_cast<uint8_t>(width >> 8);
-    file[14] = static_cast<uint8_t>(height);
-    file[15] = static_cast<uint8_t>(height >> 8);
+    PutWord(&file, 12, (width & 0xFFFF) | height << 16);
     file[16] = static_cast<uint8_t>(bits);
     std::copy(pixels.begin(), pixels.end(), file.begin() + 18);
     return file;
