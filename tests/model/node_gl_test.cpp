@@ -198,29 +198,19 @@ TEST_F(NodeTest, ScreenBoxesAndPicking) {
         EXPECT_EQ(QexModel_IsNodeInScreen(&runtime_, m, i), cases[i].whole) << i;
     }
     EXPECT_LT(m->screenBoxes[0].centre.z, m->screenBoxes[1].centre.z);
-    // Beside each edge of the box in the middle, and where the one behind it is, too.
-    const glm::vec4& r = rects[0];
-    const glm::vec2 middle = {(r.x + r.z) / 2, (r.y + r.w) / 2};
-    const struct {
-        glm::vec2 point;
-        int32_t capacity;
-        std::vector<uint32_t> hits;
-    } picks[] = {{middle, 9, {0, 1}},
-                 {middle, 1, {0}},
-                 {middle, 0, {}},
-                 {{r.x - 1, middle.y}, 9, {}},
-                 {{r.x + 1, middle.y}, 9, {0}},
-                 {{r.z + 1, middle.y}, 9, {}},
-                 {{middle.x, r.y - 1}, 9, {}},
-                 {{middle.x, r.y + 1}, 9, {0}},
-                 {{middle.x, r.w + 1}, 9, {}}};
-    for (const auto& pick : picks) {
-        const QexVec2 point = {pick.point.x, pick.point.y};
-        int32_t count = 99;
-        std::vector<uint32_t> hits(kCount);
-        QexModel_Pick(m, nullptr, &point, &count, hits.data(), pick.capacity);
-        hits.resize(static_cast<size_t>(count));
-        EXPECT_EQ(hits, pick.hits) << point.x << " " << point.y;
+    for (int i = 0; i < 600; ++i) {
+        const QexVec2 point = {static_cast<float>(i % 30 * 5), static_cast<float>(i / 30 * 5)};
+        std::vector<uint32_t> expected, hits(kCount);
+        for (uint32_t n = 0; n < kCount; ++n)
+            if (rects[n].x < point.x && point.x < rects[n].z && rects[n].y < point.y && point.y < rects[n].w)
+                expected.push_back(n);
+        for (const size_t capacity : {size_t{kCount}, size_t{1}, size_t{0}}) {
+            int32_t count = 99;
+            QexModel_Pick(m, nullptr, &point, &count, hits.data(), static_cast<int32_t>(capacity));
+            hits.resize(static_cast<size_t>(count));
+            expected.resize(std::min(expected.size(), capacity));
+            EXPECT_EQ(hits, expected) << point.x << " " << point.y;
+        }
     }
 }
 
