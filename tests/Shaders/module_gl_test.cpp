@@ -59,19 +59,6 @@ TEST_F(ModuleTest, AlphaRuleAndPassOfTheNode) {
     QexRenderer_SetGlobalAlpha(1);
 }
 
-QexTexture* g_hookTexture;
-int32_t g_hookResult;
-
-int32_t BindHook(QexModel*, uint32_t) {
-    QexTexture_Set(g_hookTexture, 0);
-    return g_hookResult;
-}
-
-// What the first set-up made is gone; the end of each test finds what is left.
-TEST_F(ModuleTest, SetUpTwiceLeavesNothing) {
-    EXPECT_EQ(QexTextureShader_SetupProgram(texture), 0);
-}
-
 // By half a picture.
 TEST_F(ModuleTest, TexelsAreDisplaced) {
     const uint8_t texels[] = {255, 0, 0, 255, 0, 255, 0, 100};
@@ -100,10 +87,16 @@ TEST_F(ModuleTest, TexelsAreDisplaced) {
 }
 
 TEST_F(ModuleTest, HookMaterialAndMissingTextures) {
+    // What the first set-up made is gone; the end of each test finds what is left.
+    EXPECT_EQ(QexTextureShader_SetupProgram(texture), 0);
     const Rgba white = {255, 255, 255, 255}, isBlue = {0, 0, 255, 255}, isGreen = {0, 255, 0, 255};
     const Rgba asBefore = {9, 9, 9, 255};
     ScopedTexture blue(isBlue), green(isGreen), grey(asBefore);
     LoadedModel model(SceneOf(Quad()));
+    static QexTexture* s_bound;
+    static int32_t s_result;
+    s_bound = &green;
+    const QexBindTextureHook hook = [](QexModel*, uint32_t) { return QexTexture_Set(s_bound, 0), s_result; };
     const struct {
         QexShaderModule* module;
         QexBindTextureHook hook;
@@ -112,15 +105,14 @@ TEST_F(ModuleTest, HookMaterialAndMissingTextures) {
         Rgba expected;
     } cases[] = {
         {texture, nullptr, 0, 0, &blue, isBlue},    {texture, nullptr, 0, 0, nullptr, white},
-        {texture, nullptr, 0, -1, &blue, white},    {texture, BindHook, 1, 0, &blue, isGreen},
-        {texture, BindHook, 0, 0, &blue, isBlue},   {texture, BindHook, 1, -1, &blue, isGreen},
-        {noAlpha, BindHook, 1, 0, &blue, isGreen},  {noAlpha, BindHook, 0, 0, &blue, isBlue},
+        {texture, nullptr, 0, -1, &blue, white},    {texture, hook, 1, 0, &blue, isGreen},
+        {texture, hook, 0, 0, &blue, isBlue},       {texture, hook, 1, -1, &blue, isGreen},
+        {noAlpha, hook, 1, 0, &blue, isGreen},      {noAlpha, hook, 0, 0, &blue, isBlue},
         {noAlpha, nullptr, 0, -1, &blue, asBefore},
     };
-    g_hookTexture = &green;
     for (const auto& c : cases) {
         QexTexture_Set(&grey, 0);
-        g_hookResult = c.hookResult;
+        s_result = c.hookResult;
         model.model.bindTextureHook = c.hook;
         model.model.textures[0] = c.diffuse;
         model.Node().materialIndex = c.material;

@@ -51,15 +51,14 @@ struct Skeleton {
 };
 constexpr Skeleton::Bone Skeleton::kBones[];
 
-// 150 triangles in batches of 100 and 50, in pairs: squares of 6 x 6 pixels. Of each batch three show, every
-// one with its own texel of a palette, bones and weights; the others have no area.
-constexpr int kQuads = 75, kShown = 6, kFirstOfSecondBatch = 50;
-const glm::vec2 kCentres[kShown] = {{10, 20}, {30, 15}, {55, 20}, {80, 10}, {15, 50}, {65, 55}};
-constexpr int kWeights[4][4] = {{255, 0, 0, 0}, {155, 100, 0, 0}, {100, 80, 75, 0}, {90, 70, 55, 40}};
+// Two batches of three squares of 6 x 6 pixels, every one with its own texel of a palette, bones and weights.
+constexpr int kQuads = 6;
+const glm::vec2 kCentres[kQuads] = {{10, 20}, {30, 15}, {55, 20}, {80, 10}, {15, 50}, {65, 55}};
+constexpr int kWeights[4][4] = {{255, 0, 0, 0}, {155, 100, 0, 0}, {60, 45, 150, 0}, {90, 40, 105, 20}};
 const std::vector<int> kBatches[] = {{1, 3, 2}, {4, 2}};  // scene nodes by index in the batch
 
-size_t BoneOf(int shown, uint32_t influence) {
-    return (static_cast<size_t>(shown) + influence) % kBatches[shown / 3].size();
+size_t BoneOf(int quad, uint32_t influence) {
+    return (static_cast<size_t>(quad) + influence) % kBatches[quad / 3].size();
 }
 
 pod::Mesh Squares(uint32_t influences) {
@@ -67,13 +66,11 @@ pod::Mesh Squares(uint32_t influences) {
     std::vector<double> bones, weights;
     std::vector<uint32_t> indices;
     for (int q = 0; q < kQuads; ++q) {
-        const int inBatch = q % kFirstOfSecondBatch, shown = inBatch % 3 + q / kFirstOfSecondBatch * 3;
-        const float half = inBatch < 3 ? 3 : 0;
         for (int corner = 0; corner < 4; ++corner) {
-            positions.insert(positions.end(), {kCentres[shown].x + (corner % 2 ? half : -half),
-                                               kCentres[shown].y + (corner / 2 ? half : -half), 0});
-            uvs.insert(uvs.end(), {(static_cast<float>(shown) + 0.5f) / 8, 0.5f});
-            for (uint32_t i = 0; i < influences; ++i) bones.push_back(double(BoneOf(shown, i)));
+            positions.insert(positions.end(), {kCentres[q].x + (corner % 2 ? 3.0f : -3.0f),
+                                               kCentres[q].y + (corner / 2 ? 3.0f : -3.0f), 0});
+            uvs.insert(uvs.end(), {(static_cast<float>(q) + 0.5f) / 8, 0.5f});
+            for (uint32_t i = 0; i < influences; ++i) bones.push_back(double(BoneOf(q, i)));
             weights.insert(weights.end(), kWeights[influences - 1], kWeights[influences - 1] + influences);
         }
         for (const int i : {0, 1, 2, 2, 1, 3}) indices.push_back(static_cast<uint32_t>(4 * q + i));
@@ -88,7 +85,7 @@ pod::Mesh Squares(uint32_t influences) {
     mesh.boneWeights = IntegerElement(pod::kUint8, influences, weights);
     mesh.batchBones = {1, 3, 2, 4, 2, 0};
     mesh.bonesPerBatch = {3, 2};
-    mesh.batchOffsets = {0, 2 * kFirstOfSecondBatch};
+    mesh.batchOffsets = {0, 6};
     mesh.batchBoneMax = 3;
     mesh.batchCount = 2;
     return mesh;
@@ -118,7 +115,7 @@ pod::Mesh WithoutBatches(uint32_t influences) {
     for (size_t v = 0; v < mesh.vertexCount; ++v)
         for (size_t i = 0; i < influences; ++i) {
             uint8_t& bone = mesh.boneIndices.data[v * influences + i];
-            bone = static_cast<uint8_t>(kBatches[v < 4 * kFirstOfSecondBatch ? 0 : 1][bone]);
+            bone = static_cast<uint8_t>(kBatches[v < 12 ? 0 : 1][bone]);
         }
     mesh.batchBones = mesh.bonesPerBatch = mesh.batchOffsets = {};
     mesh.batchBoneMax = mesh.batchCount = 0;
@@ -158,7 +155,7 @@ TEST_F(SkinningTest, VerticesFollowTheirBonesWhateverTheBatches) {
     for (uint32_t influences = 1; influences <= 4; ++influences) {
         SCOPED_TRACE(influences);
         const Picture expected = draw(Squares(influences));
-        for (int q = 0; q < kShown; ++q) {
+        for (int q = 0; q < kQuads; ++q) {
             glm::vec4 at(0);
             for (uint32_t i = 0; i < influences; ++i)
                 at += placed * skeleton.Skinning(kBatches[q / 3][BoneOf(q, i)]) *

@@ -1,11 +1,11 @@
 #include <gtest/gtest.h>
-#include <unistd.h>
 
 #include <cstring>
 #include <memory>
 
 #include "Qex.h"
 #include "support/Capture.h"
+#include "support/FolderTest.h"
 
 namespace {
 
@@ -16,14 +16,10 @@ EmitterPointer NewEmitter() {
 }
 
 std::vector<uint8_t> Written(const QexParticleEmitter& emitter) {
-    const std::string path = testing::TempDir() + "emitter_test." + std::to_string(getpid());
-    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(&emitter, path.c_str()), 0);
-    std::vector<uint8_t> bytes(100000);
-    FILE* file = fopen(path.c_str(), "rb");
-    bytes.resize(fread(bytes.data(), 1, bytes.size(), file));
-    fclose(file);
-    remove(path.c_str());
-    return bytes;
+    const MemoryFile file({});
+    EXPECT_EQ(QexParticleEmitter_WriteToBinFile(&emitter, file.Path()), 0);
+    const std::string text = ReadText(file.Path());
+    return {text.begin(), text.end()};
 }
 
 EmitterPointer ReadBack(const std::vector<uint8_t>& bytes) {
@@ -117,42 +113,37 @@ TEST(EmitterFile, BrokenFilesAreRefused) {
     EXPECT_EQ(QexParticleEmitter_CreateFromBinFile("/"), nullptr);
     EXPECT_NE(full.Text().find("/dev/full cannot be written"), std::string::npos);
     const std::vector<uint8_t> whole = Written(*emitter);
-    for (const size_t size : {0, 100, 45300, 45303}) {
+    for (const int size : {0, 100, 45300, 45303}) {
         Capture log(STDERR_FILENO);
-        EXPECT_FALSE(ReadBack({whole.begin(), whole.begin() + static_cast<long>(size)})) << size;
+        EXPECT_FALSE(ReadBack({whole.begin(), whole.begin() + size})) << size;
         EXPECT_NE(log.Text().find(std::to_string(size) + " bytes, not 45304\n"), std::string::npos);
     }
     constexpr int32_t kNan = 0x7FC00000, kInfinity = 0x7F800000;
-    struct Case {
-        size_t offset;
-        int32_t value;
-        bool loads;
-        const char* line;
-    };
-    std::vector<Case> cases = {{184, 11, false, "a colour count is not 0 to 10\n"},
-                               {184, -1, false, "a colour count"},
-                               {888, 11, false, "an animation count"},
-                               {888, INT32_MIN, false, "an animation count"},
-                               {408, 11, false, "frame count"},
-                               {45292, 301, false, "particle count"},
-                               {45292, -1, false, "particle count"},
-                               {45292, 300, true, "300 living particles are left out\n"},
-                               {412, kNan, false, "frame duration"},
-                               // Of an animation and a colour that are not in use, and of a dead particle.
-                               {408 + 52, -7, true, ""},
-                               {40, kNan, true, ""},
-                               {900, kNan, true, ""}};
+    std::vector<std::tuple<size_t, int32_t, bool, const char*>> cases = {
+        {184, 11, false, "a colour count is not 0 to 10\n"},
+        {184, -1, false, "a colour count"},
+        {888, 11, false, "an animation count"},
+        {888, INT32_MIN, false, "an animation count"},
+        {408, 11, false, "frame count"},
+        {45292, 301, false, "particle count"},
+        {45292, -1, false, "particle count"},
+        {45292, 300, true, "300 living particles are left out\n"},
+        {412, kNan, false, "frame duration"},
+        // Of an animation and a colour that are not in use, and of a dead particle.
+        {408 + 52, -7, true, ""},
+        {40, kNan, true, ""},
+        {900, kNan, true, ""}};
     for (const size_t offset : {4, 20, 36, 188, 364, 45296, 45300})
         cases.push_back({offset, offset % 8 ? kNan : kInfinity, false, "a setting is not a finite number"});
-    for (const auto& c : cases) {
+    for (const auto& [offset, value, loads, line] : cases) {
         std::vector<uint8_t> bytes = whole;
-        Put(&bytes, c.offset, c.value);
+        Put(&bytes, offset, value);
         Capture log(STDERR_FILENO);
         const EmitterPointer read = ReadBack(bytes);
         const std::string text = log.Text();
-        EXPECT_EQ(read != nullptr, c.loads) << c.offset;
-        EXPECT_NE(text.find(c.line), std::string::npos) << c.offset << ": " << text;
-        EXPECT_EQ(text.empty(), !*c.line) << text;
+        EXPECT_EQ(read != nullptr, loads) << offset;
+        EXPECT_NE(text.find(line), std::string::npos) << offset << ": " << text;
+        EXPECT_EQ(text.empty(), !*line) << text;
         EXPECT_EQ(read ? read->particleCount : 0, 0);
     }
 }

@@ -4,8 +4,8 @@
 #include <cmath>
 
 #include "KtxWriter.h"
-#include "PvrWriter.h"
 #include "support/Capture.h"
+#include "support/ImageFiles.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -64,10 +64,6 @@ TEST_F(ResizeTest, TextQuadsAndEffectsFollow) {
     EXPECT_EQ(runtime_.width, kWidth);
 }
 
-glm::vec3 Glm(const QexVec3& v) {
-    return {v.x, v.y, v.z};
-}
-
 // Closed shapes have the volume that geometry says, which takes every triangle, wound outwards; textures are
 // not mirrored; normals are of unit length and on the outer side.
 TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
@@ -93,8 +89,8 @@ TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
             glm::vec3 p[3];
             glm::vec2 t[3];
             for (int c = 0; c < 3; ++c) {
-                p[c] = Glm(mesh.positions[corner[c]]);
-                t[c] = {mesh.uvs[corner[c]].x, mesh.uvs[corner[c]].y};
+                p[c] = glm::make_vec3(&mesh.positions[corner[c]].x);
+                t[c] = glm::make_vec2(&mesh.uvs[corner[c]].x);
             }
             const glm::vec3 face = glm::cross(p[1] - p[0], p[2] - p[0]);
             const glm::vec2 s = t[1] - t[0], u = t[2] - t[0];
@@ -103,7 +99,7 @@ TEST_F(MeshTest, ShapesAreWholeAndTheirTexturesUnmirrored) {
             if (glm::length(face) < 1e-6f) continue;  // at a pole
             EXPECT_GT(s.x * u.y - u.x * s.y, 0) << i;
             for (int c = 0; c < 3; ++c) {
-                const glm::vec3 normal = Glm(mesh.normals[corner[c]]);
+                const glm::vec3 normal = glm::make_vec3(&mesh.normals[corner[c]].x);
                 EXPECT_NEAR(glm::length(normal), 1, 1e-5f);
                 EXPECT_GT(glm::dot(normal, glm::normalize(face)), 0.9f) << i;
             }
@@ -164,9 +160,7 @@ TEST_F(MeshTest, ModelsShowTextureColoursAndLightAndArePicked) {
         EXPECT_TRUE(Near(Read().Pixel(30, kHeight - 1 - 25), c.lower, 3));
         EXPECT_TRUE(Near(Read().Pixel(50, kHeight - 1 - 55), c.upper, 3));
 
-        QexCamera camera = {};
-        camera.viewMatrix = g_sMatIdentity;
-        camera.projectionMatrix = projection;
+        const QexCamera camera = PixelCamera();
         QexModel_UpdateModelBoundingBox(&model, nullptr);
         QexModel_CalcScreenBBox(&runtime_, &model, &camera);
         const QexVec2 inside = {25, kHeight - 55.0f};
@@ -190,7 +184,7 @@ TEST_F(MeshTest, TangentsFollowTheTexture) {
     for (uint32_t v = 0; v < box.vertexCount; ++v) {
         QexVec4 t;
         QexPODVertex_ReadVec(&t.x, tangents.data + v * tangents.stride, tangents.type, 3);
-        EXPECT_LT(glm::distance(glm::vec3(t.x, t.y, t.z), expected[v / 4]), 1e-5f) << v;
+        EXPECT_LT(glm::distance(glm::make_vec3(&t.x), expected[v / 4]), 1e-5f) << v;
     }
     QexModel_Unload(&model);
     QexMesh_Release(&box);
@@ -220,8 +214,8 @@ TEST_F(MeshTest, BadMeshesAreRefusedWithALine) {
 }
 
 // A file of three rows: red above, green, blue below.
-std::vector<uint8_t> Rows(bool topFirst, bool bgr = false) {
-    std::vector<uint8_t> bytes;
+Bytes Rows(bool topFirst, bool bgr = false) {
+    Bytes bytes;
     for (const int row : {0, 1, 2})
         for (int i = 0; i < 8; ++i) {
             const int at = topFirst ? row : 2 - row, c = i % 4;
@@ -230,32 +224,26 @@ std::vector<uint8_t> Rows(bool topFirst, bool bgr = false) {
     return bytes;
 }
 
-std::vector<uint8_t> PvrFile(bool topFirst) {
+Bytes PvrFile(bool topFirst) {
     return pod::WritePvr({pod::kPvrRgba8888, 2, 3, topFirst ? 0u : pod::kPvrFlipped, {{Rows(topFirst)}}});
 }
 
-std::vector<uint8_t> KtxFile(bool topFirst, const char* orientation) {
+Bytes KtxFile(bool topFirst, const char* orientation) {
     pod::KtxImage image = {GL_UNSIGNED_BYTE, GL_RGBA, GL_RGBA, GL_RGBA, 4, 2, 3, {}, {{Rows(topFirst)}}};
     if (orientation) image.keyValues = {{"author", std::string(301, 'x')}, {"KTXorientation", orientation}};
     return pod::WriteKtx(image);
 }
 
-std::vector<uint8_t> TgaFile(bool topFirst) {
-    std::vector<uint8_t> file = {0, 0, 2, 0, 0, 0, 0, 0,  0,
-                                 0, 0, 0, 2, 0, 3, 0, 32, uint8_t(topFirst ? 40 : 8)};
-    const std::vector<uint8_t> rows = Rows(topFirst, true);
-    file.insert(file.end(), rows.begin(), rows.end());
+Bytes UprightTga(bool topFirst) {
+    Bytes file = TgaFile(2, 3, 32, Rows(topFirst, true));
+    file[17] = topFirst ? 40 : 8;
     return file;
 }
 
 TEST_F(PictureTest, StandUprightWhicheverRowComesFirst) {
-    const std::vector<uint8_t> files[] = {PvrFile(true),
-                                          PvrFile(false),
-                                          KtxFile(true, "S=r,T=d"),
-                                          KtxFile(false, "S=r,T=u"),
-                                          KtxFile(true, nullptr),
-                                          TgaFile(true),
-                                          TgaFile(false)};
+    const Bytes files[] = {
+        PvrFile(true),          PvrFile(false),   KtxFile(true, "S=r,T=d"), KtxFile(false, "S=r,T=u"),
+        KtxFile(true, nullptr), UprightTga(true), UprightTga(false)};
     const Rgba red = {255, 0, 0, 255}, green = {0, 255, 0, 255}, blue = {0, 0, 255, 255};
     const QexRect lower = {0, 1, 1, 2}, middle = {1, 1, 1, 1};
     for (const auto& bytes : files) {
@@ -307,7 +295,7 @@ TEST_F(PictureTest, AlphaFileRectanglesAndErrors) {
     EXPECT_EQ(QexPicture_Draw(nullptr, &picture, nullptr, 0, 0, 1, 1, 0), -1);
     QexPicture_Release(&picture);
     EXPECT_EQ(QexPicture_Draw(&runtime_, &picture, nullptr, 0, 0, 1, 1, 0), -1);
-    const MemoryFile nothing(std::vector<uint8_t>(7, 1));
+    const MemoryFile nothing(Bytes(7, 1));
     EXPECT_EQ(QexPicture_Load(&picture, nothing.Path()), -1);
     EXPECT_EQ(QexPicture_Load(&picture, "/nonexistent"), -1);
     QexPicture_Release(&picture);

@@ -90,8 +90,7 @@ TEST(Engine, NeedsAContext) {
     EXPECT_EQ(Flags(), "00");
 }
 
-// A model that outlives the engine takes nothing from the next start, and is not drawn with modules that are
-// gone.
+// A model that outlives the engine takes nothing from the next start, and is not drawn.
 TEST_F(EngineTest, ModelsOfAnEarlierStart) {
     QexRuntimeContext runtime = {};
     QexEngineConfig config = SurfaceConfig();

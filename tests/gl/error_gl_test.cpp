@@ -70,17 +70,15 @@ TEST_F(UncheckedCalls, ReadNoError) {
         }
     }
     QexRenderState_UseProgram(0);
-    const std::pair<std::function<void()>, size_t> cases[] = {
-        {[&] { QexRenderTarget_BeginScene(&target); }, 1},
-        {[&] { QexRenderTarget_EndScene(&target); }, 1},
-        {[&] { QexRenderTarget_SetRenderTarget(&runtime_, nullptr); }, 2},
-        {[&] { QexRenderTarget_Release(&target); }, 0},
-        {[&] { QexBillboard_Release(billboard); }, 0},
-        {[&] { QexModel_RenderFromShadowCamera(nullptr, nullptr); }, 0}};
-    for (const auto& [code, reads] : cases) {
+    const auto reads = [](const std::function<void()>& code) {
         const GLCalls calls(code);
-        EXPECT_EQ(calls.Of({"glGetError"}).size(), reads) << calls.Text();
-    }
+        return calls.Of({"glGetError"}).size();
+    };
+    EXPECT_EQ(reads([&] { QexRenderTarget_BeginScene(&target); }), 1u);
+    EXPECT_EQ(reads([&] { QexRenderTarget_EndScene(&target); }), 1u);
+    EXPECT_EQ(reads([&] { QexRenderTarget_SetRenderTarget(&runtime_, nullptr); }), 2u);
+    EXPECT_EQ(reads([&] { QexRenderTarget_Release(&target), QexBillboard_Release(billboard); }), 0u);
+    EXPECT_EQ(reads([] { QexModel_RenderFromShadowCamera(nullptr, nullptr); }), 0u);
     QexParticleSet_Release(&set);
     QexGouraudShader_Release(&module);
 }

@@ -35,7 +35,7 @@ pod::Scene Materials(std::initializer_list<const char*> textures) {
     return scene;
 }
 
-// Loads a file; returns the result and the errors reported, "-1 E/Qex: ...".
+// Loads a file; returns the result and the errors, "-1 E/Qex: ...".
 std::string LoadFile(QexModel* model, const char* name, const std::string& directory = kFolder) {
     Capture out(STDOUT_FILENO), log(STDERR_FILENO);
     const int32_t result = QexModel_LoadContent(model, directory.c_str(), name);

@@ -1,4 +1,5 @@
 // Drawing a model's nodes: which, in what order, with what; animation, lights, boxes.
+#include "support/Capture.h"
 #include "support/RenderScenes.h"
 
 namespace {
@@ -204,6 +205,44 @@ TEST_F(SteadyFrameTest, AllocatesAndCreatesNothing) {
     EXPECT_EQ(gltapCount("glDrawElements"), 6u);
     for (const char* name : {"glBufferData", "glTexImage2D", "glGetUniformLocation", "glGetIntegerv"})
         EXPECT_EQ(gltapCount(name), 0u) << name;
+}
+
+TEST_F(SteadyFrameTest, EffectsAllocateNothing) {
+    Capture out(STDOUT_FILENO), log(STDERR_FILENO);
+    QexCamera camera;
+    QexCamera_Create(&camera, 0);
+    QexSkyBox sky = {};
+    sky.skyTexture = Qextexture_GetDefault();
+    sky.camera = &camera;
+    sky.waterEnabled = 1;
+    QexSkyBox_Create(&sky);
+    QexPostProcessing_Initialize(&runtime_);
+    QexParticleSet set;
+    QexParticleSet_Create(&set, nullptr, nullptr, 10, 1, 9);
+    QexParticleSet_Trigger(&set);
+    QexParticleEmitter* emitter = QexParticleEmitter_Create();
+    emitter->currentRate = 3;
+    QexParticleEmitter_Update(emitter, 0, nullptr);
+    emitter->emitting = 0;
+    const auto frame = [&] {
+        QexSkyBox_Update(&runtime_, &sky, 0);
+        const QexSceneCallback nothing = [](QexRuntimeContext*, void*, void*, void*, QexShaderModule*,
+                                            QexShaderModule*, const float*) { return 0; };
+        for (const int mode : {0, 2})
+            QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, nothing, 0, 1, 0.1f, 0.1f, 5, 9,
+                                      mode, 0, 1);
+        QexParticleEmitter_Update(emitter, 1, nullptr);
+        QexParticleEmitter_Draw(emitter, &camera);
+        QexParticleSet_Update(&set, 0.5f, &camera, nullptr);
+        QexParticleSet_Draw(&set);
+    };
+    frame();
+    EXPECT_EQ(CountAllocations(frame).made, 0);
+    EXPECT_EQ(emitter->particleCount, 3);
+    QexParticleEmitter_Release(emitter);
+    QexParticleSet_Release(&set);
+    QexPostProcessing_Finalize();
+    QexSkyBox_Release();
 }
 
 }  // namespace

@@ -91,8 +91,7 @@ TEST_F(SceneNodeTest, MatricesFollowTheTreeAndModelsDrawWithThem) {
 }
 
 TEST(SceneNode, WideAndDeepTreesAreVisitedAndFreedOnce) {
-    // Each node is 1 along X from its parent; its model's frame counts the updates of one second that it
-    // gets.
+    // Each node is 1 along X from its parent; its model's frame counts the updates that it gets.
     static constexpr uint32_t kMany = 200000;
     const auto visit = [](bool deep) {
         QexModel counter;

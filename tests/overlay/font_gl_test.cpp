@@ -69,8 +69,8 @@ TEST_F(FontTest, EveryGlyphLandsOnItsPixels) {
     for (size_t i = 0; i < all.size(); i += 16) strings.push_back({0, 112, all.substr(i, 16), 0xFF20C0FF});
     for (const auto& s : strings) {
         Picture expected = background_;
-        const auto channel = [&](int shift) { return static_cast<int>(s.colour >> shift & 255); };
-        const Rgba colour = {channel(16), channel(8), channel(0), channel(24)};
+        const uint32_t argb = s.colour;
+        const Rgba colour = {int(argb >> 16 & 255), int(argb >> 8 & 255), int(argb & 255), int(argb >> 24)};
         Stamp(&expected, s.x, s.y, s.text, colour);
         EXPECT_TRUE(SamePicture(Temporary(s.x, s.y, s.text, s.colour), expected, 1)) << s.text;
         EXPECT_EQ(QexFont_ReplaceString(&runtime_, s.x, s.y, s.text.c_str(), colour[0], colour[1], colour[2],

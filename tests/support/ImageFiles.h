@@ -44,15 +44,12 @@ struct Ktx {
     Bytes keyValues;
 
     Bytes File() const {
-        const uint8_t identifier[12] = {0xAB, 'K', 'T', 'X', ' ', '1', '1', 0xBB, '\r', '\n', 0x1A, '\n'};
-        Bytes file(identifier, identifier + 12);
         const auto count = levelCount.value_or(static_cast<uint32_t>(levels.size()));
         const auto extra = static_cast<uint32_t>(keyValues.size());
-        const uint32_t typeSize = type > GL_UNSIGNED_BYTE ? 2 : 1;
-        // clang-format off
-        const uint32_t words[] = {0x04030201, type, typeSize, format, internal, base, width, height, 0, 0, faces, count, extra};
-        // clang-format on
-        for (const uint32_t word : words) PutWord(&file, file.size(), word);
+        Bytes file = {0xAB, 'K', 'T', 'X', ' ', '1', '1', 0xBB, '\r', '\n', 0x1A, '\n'};
+        for (const uint32_t word : {0x04030201u, type, type > GL_UNSIGNED_BYTE ? 2u : 1u, format, internal,
+                                    base, width, height, 0u, 0u, faces, count, extra})
+            PutWord(&file, file.size(), word);
         file.insert(file.end(), keyValues.begin(), keyValues.end());
         for (const auto& level : levels) {
             PutWord(&file, file.size(), static_cast<uint32_t>(level[0].size()));
@@ -118,10 +115,7 @@ inline Ktx Etc1Ktx() {
 inline Bytes TgaFile(uint32_t width, uint32_t height, uint32_t bits, const Bytes& pixels) {
     Bytes file(18 + pixels.size());
     file[2] = 2;
-    file[12] = static_cast<uint8_t>(width);
-    file[13] = static_cast<uint8_t>(width >> 8);
-    file[14] = static_cast<uint8_t>(height);
-    file[15] = static_cast<uint8_t>(height >> 8);
+    PutWord(&file, 12, (width & 0xFFFF) | height << 16);
     file[16] = static_cast<uint8_t>(bits);
     std::copy(pixels.begin(), pixels.end(), file.begin() + 18);
     return file;

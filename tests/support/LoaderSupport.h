@@ -2,7 +2,6 @@
 #pragma once
 
 #include <GLES2/gl2.h>
-#include <gtest/gtest.h>
 
 #include <cstring>
 #include <functional>
@@ -10,11 +9,9 @@
 #include <string>
 #include <vector>
 
-#include "gltap.h"
-#include "Headless.h"
-#include "Qex.h"
+#include "support/Capture.h"
 #include "support/ImageFiles.h"
-#include "support/PodScenes.h"
+#include "support/RenderFixture.h"
 
 struct Upload {
     GLenum target;
@@ -28,34 +25,20 @@ struct Upload {
 };
 
 // The GL calls of one piece of code.
-class Recorded {
-  public:
-    explicit Recorded(const std::function<void()>& code) {
-        gltapBeginRecording();
-        code();
-        recording_.reset(gltapEndRecording());
-    }
-
-    std::vector<const gltapCall*> Calls(const char* name) const {
-        std::vector<const gltapCall*> calls;
-        for (size_t i = 0; i < gltapRecordingSize(recording_.get()); ++i) {
-            const gltapCall* call = gltapRecordingCall(recording_.get(), i);
-            if (call->function == gltapFunctionNumber(name)) calls.push_back(call);
-        }
-        return calls;
-    }
+struct Recorded : GLCalls {
+    using GLCalls::GLCalls;
 
     std::vector<Upload> Uploads() const {
         std::vector<Upload> uploads;
         int64_t alignment = 4;
-        for (size_t i = 0; i < gltapRecordingSize(recording_.get()); ++i) {
-            const gltapCall* call = gltapRecordingCall(recording_.get(), i);
-            const std::string name = gltapFunctionName(call->function);
-            if (name == "glPixelStorei" && call->argument[0].i == GL_UNPACK_ALIGNMENT)
-                alignment = call->argument[1].i;
-            const bool compressed = name == "glCompressedTexImage2D";
-            if (!compressed && name != "glTexImage2D") continue;
+        for (const gltapCall* call : Of({"glPixelStorei", "glCompressedTexImage2D", "glTexImage2D"})) {
             const auto argument = [&](int k) { return static_cast<GLenum>(call->argument[k].i); };
+            const std::string name = gltapFunctionName(call->function);
+            if (name == "glPixelStorei") {
+                if (argument(0) == GL_UNPACK_ALIGNMENT) alignment = call->argument[1].i;
+                continue;
+            }
+            const bool compressed = name == "glCompressedTexImage2D";
             const auto* data = static_cast<const uint8_t*>(call->data);
             uploads.push_back(
                 {argument(0), static_cast<GLint>(argument(1)), argument(2), compressed ? 0 : argument(7),
@@ -68,37 +51,21 @@ class Recorded {
     // The last value given to a texture parameter of a target; 0 when there was none.
     GLenum Parameter(GLenum target, GLenum parameter) const {
         GLenum value = 0;
-        for (const gltapCall* call : Calls("glTexParameteri"))
+        for (const gltapCall* call : Of({"glTexParameteri"}))
             if (static_cast<GLenum>(call->argument[0].i) == target &&
                 static_cast<GLenum>(call->argument[1].i) == parameter)
                 value = static_cast<GLenum>(call->argument[2].i);
         return value;
     }
-
-  private:
-    std::unique_ptr<gltapRecording, decltype(&gltapReleaseRecording)> recording_{nullptr,
-                                                                                 gltapReleaseRecording};
 };
 
-class LoaderTest : public testing::Test {
+class LoaderTest : public ContextTest {
   protected:
-    void SetUp() override {
-        gltapReset();
-        gltapSetMode(GLTAP_FORWARD);
-        std::string error;
-        context_ = qex::HeadlessContext::Create(4, 4, &error);
-        ASSERT_TRUE(context_) << error;
-        QexRenderState_Reset(nullptr);
-    }
     void TearDown() override {
-        if (context_) {
-            EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
-        }
-        gltapReset();
+        EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
+        ContextTest::TearDown();
     }
     static size_t LiveTextures() { return gltapLiveObjects(GLTAP_TEXTURE, nullptr, 0); }
-
-    std::unique_ptr<qex::HeadlessContext> context_;
 };
 
 // What a loader returned, printed, called and left behind.

@@ -25,12 +25,6 @@ int Difference(Rgba a, Rgba b) {
     return most;
 }
 
-std::string Describe(Rgba c) {
-    std::ostringstream text;
-    text << "(" << c[0] << ", " << c[1] << ", " << c[2] << ", " << c[3] << ")";
-    return text.str();
-}
-
 }  // namespace
 
 void Picture::Fill(int left, int top, int right, int bottom, Rgba colour) {
@@ -41,7 +35,8 @@ void Picture::Fill(int left, int top, int right, int bottom, Rgba colour) {
 
 testing::AssertionResult Near(Rgba actual, Rgba expected, int tolerance) {
     if (Difference(actual, expected) <= tolerance) return testing::AssertionSuccess();
-    return testing::AssertionFailure() << Describe(actual) << " is not " << Describe(expected);
+    return testing::AssertionFailure()
+           << testing::PrintToString(actual) << " is not " << testing::PrintToString(expected);
 }
 
 testing::AssertionResult SamePicture(const Picture& actual, const Picture& expected, int tolerance) {
@@ -51,7 +46,8 @@ testing::AssertionResult SamePicture(const Picture& actual, const Picture& expec
         for (int x = 0; x < kWidth; ++x) {
             const Rgba a = actual.Pixel(x, y), e = expected.Pixel(x, y);
             if (Difference(a, e) <= tolerance || wrong++) continue;
-            first << x << ", " << y << ": " << Describe(a) << ", not " << Describe(e);
+            first << x << ", " << y << ": " << testing::PrintToString(a) << ", not "
+                  << testing::PrintToString(e);
         }
     if (!wrong) return testing::AssertionSuccess();
     return testing::AssertionFailure() << wrong << " pixels differ, the first at " << first.str();

@@ -63,6 +63,14 @@ QexTexture SolidTexture(Rgba colour) {
     return MakeTexture(1, 1, pixel.data());
 }
 
+QexCamera PixelCamera(glm::vec3 origin) {
+    QexCamera camera;
+    QexCamera_Create(&camera, 0);
+    camera.viewMatrix = ToQex(glm::translate(glm::mat4(1), origin));
+    camera.projectionMatrix = PixelProjection();
+    return camera;
+}
+
 LoadedModel::LoadedModel(const pod::Scene& scene) : file(pod::WritePod(scene)) {
     Capture out(STDOUT_FILENO), errors(STDERR_FILENO);
     QexModel_Create(&model);

@@ -25,6 +25,9 @@ pod::Mesh SkinnedMesh(const pod::MeshArrays& arrays, uint32_t influences, uint32
 QexTexture MakeTexture(int w, int h, const uint8_t* rgba);
 QexTexture SolidTexture(Rgba colour);
 
+// One unit is one pixel of the surface, the origin at that pixel, counted from below.
+QexCamera PixelCamera(glm::vec3 origin = glm::vec3(0));
+
 // A texture that is released at the end of the scope.
 struct ScopedTexture : QexTexture {
     explicit ScopedTexture(Rgba colour) : QexTexture(SolidTexture(colour)) {}

@@ -4,16 +4,9 @@ namespace {
 
 using PvrLoader = LoaderTest;
 
-enum Header : size_t {
-    kSize = 0,
-    kHeight = 4,
-    kWidth = 8,
-    kMipmaps = 12,
-    kFlags = 16,
-    kDataSize = 20,
-    kBits = 24,
-    kSurfaces = 48
-};
+// Offsets in the header.
+constexpr size_t kSize = 0, kHeight = 4, kWidth = 8, kMipmaps = 12, kFlags = 16, kDataSize = 20, kBits = 24,
+                 kSurfaces = 48;
 
 Outcome TryMemory(const Bytes& file, uint32_t firstLevel, QexPVRHeader* header,
                   const QexTexture& before = {}) {

@@ -81,8 +81,7 @@ TEST_F(TextureTest, ReadyMadeProgramsDraw) {
     EXPECT_TRUE(Near(Read().Pixel(x, y), {122, 31, 31, 102}, 2));
 }
 
-// Rows of three texels are no multiple of four bytes in three of the formats, whatever the application's
-// unpack alignment.
+// Rows of three texels are no multiple of four bytes in three of the formats.
 TEST_F(TextureTest, EveryFormatKeepsItsTexels) {
     uint8_t four[] = {255, 0,  0,  255, 0,   255, 0,   255, 0, 0, 255, 255,
                       136, 68, 17, 204, 255, 255, 255, 255, 0, 0, 0,   0};
