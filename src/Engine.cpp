@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "gl/Extensions.h"
 #include "overlay/Font.h"
 #include "Qex/base.h"
 #include "Qex/effects.h"
@@ -93,6 +94,7 @@ int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSi
     CopyWindowWords(context, *config);
     QexMemory_Init(context->poolBase, context->poolSize);
     context->startTime = QexTime_Init();
+    QexExtensions_Forget();
     QexRenderState_Reset(context);
     QexTexture_CreateDefault();
     QexFont_Create(context->width, context->height);

@@ -74,8 +74,11 @@ QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
  * nearly all of them and unbinds what it has bound. Lean drawing draws the same pictures, to within 1/255,
  * with as few calls as there can be: it reads no errors, makes no call that changes nothing, sends what all
  * nodes of a call share once, leaves out nodes outside the view, and draws opaque nodes that follow each
- * other in the order that changes least. Opaque is a node whose material and global alpha are 1 and that has
- * no alpha texture; where faces of two such nodes coincide, either may be seen.
+ * other in the order that changes least. Opaque is every node while GL does not blend; while it does, one
+ * whose opacity and the global alpha are 1 and whose alpha does not come from a texture. Where faces of two
+ * such nodes coincide, either may be seen. Without depth test or depth writes, or with a depth function that
+ * QexRenderer_SetZTestFunc made another than QEX_DEPTH_LESS and QEX_DEPTH_LESS_EQUAL, nodes keep the scene's
+ * order.
  *
  * After a lean draw, program, textures, vertex array object, attribute arrays and buffers stay as the draw
  * left them. An application that makes GL calls of its own says QexRenderState_Restore before them, which

@@ -23,6 +23,7 @@ struct {
 } s_State;
 
 bool s_VertexArrays = true;  // allowed
+uint32_t s_DepthFunction = QEX_DEPTH_LESS;
 
 void Enable(uint32_t wanted) {
     const uint32_t changed = s_State.enabled ^ wanted;
@@ -138,6 +139,14 @@ void QexDrawing_BindTexture(uint32_t unit, GLenum target, GLuint name) {
     if ((target == GL_TEXTURE_2D ? s_State.texture2D : s_State.textureCube)[unit] == name) return;
     QexRenderState_ActiveTexture(GL_TEXTURE0 + unit);
     QexRenderState_Bind(target, name);
+}
+
+bool QexDrawing_NearerIsSeen() {
+    return s_DepthFunction == QEX_DEPTH_LESS || s_DepthFunction == QEX_DEPTH_LESS_EQUAL;
+}
+
+void QexDrawing_SetDepthFunction(uint32_t mode) {
+    s_DepthFunction = mode;
 }
 
 void QexDrawing_DeleteVertexArrays(uint32_t count, GLuint* names) {

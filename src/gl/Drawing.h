@@ -40,5 +40,9 @@ void QexDrawing_BindTexture(uint32_t unit, GLenum target, GLuint name);
 // The same name may soon be another texture's.
 void QexDrawing_ForgetTextures();
 
+// Whether the depth function chosen last lets the nearer of two be seen.
+bool QexDrawing_NearerIsSeen();
+void QexDrawing_SetDepthFunction(uint32_t mode);
+
 // Deletes the objects of a model that goes. Names are 0 where there is none.
 void QexDrawing_DeleteVertexArrays(uint32_t count, GLuint* names);

@@ -61,7 +61,9 @@ void QexRenderState_Bind(uint32_t target, uint32_t name) {
 void QexRenderer_SetZTestFunc(uint32_t mode) {
     glEnable(GL_DEPTH_TEST);
     // GL_NEVER to GL_ALWAYS are consecutive, in the order of the modes.
-    if (mode <= QEX_DEPTH_ALWAYS) glDepthFunc(GL_NEVER + mode);
+    if (mode > QEX_DEPTH_ALWAYS) return;
+    glDepthFunc(GL_NEVER + mode);
+    QexDrawing_SetDepthFunction(mode);
 }
 
 void QexRenderer_SetZWrite(int32_t flag) {

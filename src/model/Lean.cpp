@@ -38,6 +38,8 @@ struct Entry {
 struct QexModelDrawing {
     uint32_t nodeCount, meshCount, materialCount;
     uint32_t generation;  // of the variants
+    bool blends;          // whether the order is for blending, where what has alpha keeps its place
+    bool moved;           // whether the order is another than the scene's
     Entry* entries;
     uint32_t* places;  // of the nodes among them
     uint8_t* looks;    // Look, of no material and of each material
@@ -64,6 +66,7 @@ struct Drawing {
     const QexShaderFrame* frame;
     Float4x4 viewProjection;
     const Entry* given;  // whose program, material and textures are set
+    const Entry* mesh;   // whose mesh is bound
 };
 
 // ---- Order ----
@@ -113,6 +116,12 @@ int CompareEntries(const void* a, const void* b) {
     return 0;
 }
 
+// Whether a node hides what lies behind it. Modules with lights take alpha from both textures.
+bool Hides(const Entry& entry, uint8_t look) {
+    const uint32_t bare = kVariantConstantAlpha | (entry.type->traits & kTraitLit ? kVariantNoTexture : 0u);
+    return look & kOpaque && (entry.flags & bare) == bare;
+}
+
 void MakeOrder(QexModel* model, QexModelDrawing* kept) {
     uint32_t run = 0;
     bool movable = false;
@@ -131,13 +140,17 @@ void MakeOrder(QexModel* model, QexModelDrawing* kept) {
                  nullptr};
         const uint8_t look = kept->looks[node.materialIndex + 1];
         if (entry.type) entry.flags = FlagsOf(entry.type, look);
-        const bool moves = look & kOpaque && entry.flags & kVariantConstantAlpha;
+        const bool moves = entry.type && (!kept->blends || Hides(entry, look));
         if (!moves || !movable) ++run;
         movable = moves;
         entry.run = run;
     }
     qsort(kept->entries, kept->nodeCount, sizeof *kept->entries, CompareEntries);
-    for (uint32_t i = 0; i < kept->nodeCount; ++i) kept->places[kept->entries[i].node] = i;
+    kept->moved = false;
+    for (uint32_t i = 0; i < kept->nodeCount; ++i) {
+        kept->places[kept->entries[i].node] = i;
+        kept->moved |= kept->entries[i].node != i;
+    }
     kept->generation = QexShaderVariant_Generation();
 }
 
@@ -156,11 +169,20 @@ bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
     return true;
 }
 
+// Whether what is nearer is seen, whatever is drawn first.
+bool DepthDecides() {
+    GLboolean writes = GL_FALSE;
+    if (!glIsEnabled(GL_DEPTH_TEST) || !QexDrawing_NearerIsSeen()) return false;
+    glGetBooleanv(GL_DEPTH_WRITEMASK, &writes);
+    return writes;
+}
+
 // What is kept of the model, in order; null when there is no memory for it.
-QexModelDrawing* Keep(QexModel* model) {
+QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
     const QexPODModel& scene = model->scene;
     QexModelDrawing* kept = model->drawing;
-    if (kept && IsInOrder(model, *kept)) return kept;
+    const bool blends = anyOrder ? kept && kept->blends : glIsEnabled(GL_BLEND);
+    if (kept && kept->blends == blends && IsInOrder(model, *kept)) return kept;
     if (!kept) {
         kept = model->drawing = QexMemory_AllocZeroed<QexModelDrawing>(1);
         if (!kept) return nullptr;
@@ -176,6 +198,7 @@ QexModelDrawing* Keep(QexModel* model) {
             return nullptr;
         }
     }
+    kept->blends = blends;
     MakeOrder(model, kept);
     return kept;
 }
@@ -186,7 +209,7 @@ void DrawAsDescribed(Drawing* drawing, uint32_t node) {
     const QexLeanCall& call = *drawing->call;
     QexModel* model = drawing->model;
     QexShaderModule* module = model->scene.nodes[node].shader;
-    drawing->given = nullptr;
+    drawing->given = drawing->mesh = nullptr;
     if (!module) return;
     QexRenderState_Restore();
     module->render(module, model, node, call.lights, call.modelMatrix, call.view, call.projection,
@@ -234,11 +257,15 @@ bool Give(Drawing* drawing, Entry* entry) {
     return true;
 }
 
-void BindMesh(const Drawing& drawing, const Entry& entry) {
-    const QexModel* model = drawing.model;
-    QexDrawing_BindMesh({model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
-                         model->scene.meshes[entry.mesh].attributes, &drawing.kept->vertexArrays[entry.mesh]},
-                        entry.variant->elements);
+void BindMesh(Drawing* drawing, const Entry& entry) {
+    const Entry* bound = drawing->mesh;
+    if (bound && bound->mesh == entry.mesh && bound->variant == entry.variant) return;
+    drawing->mesh = &entry;
+    const QexModel* model = drawing->model;
+    QexDrawing_BindMesh(
+        {model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
+         model->scene.meshes[entry.mesh].attributes, &drawing->kept->vertexArrays[entry.mesh]},
+        entry.variant->elements);
 }
 
 // Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
@@ -267,7 +294,7 @@ void DrawStatic(Drawing* drawing, Entry* entry) {
         DrawAsDescribed(drawing, entry->node);
         return;
     }
-    BindMesh(*drawing, *entry);
+    BindMesh(drawing, *entry);
     const int32_t* at = entry->variant->locations;
     QexMatrix matrix;
     Store4x4(matrix.m, mvp);
@@ -291,7 +318,7 @@ void DrawSkinned(Drawing* drawing, Entry* entry) {
         DrawAsDescribed(drawing, entry->node);
         return;
     }
-    BindMesh(*drawing, *entry);
+    BindMesh(drawing, *entry);
     const int32_t* at = entry->variant->locations;
     const bool lit = entry->type->traits & kTraitLit;
     QexShaderModule_DrawBatches(entry->type, drawing->model, entry->node,
@@ -312,12 +339,12 @@ void DrawEntry(Drawing* drawing, Entry* entry) {
     (traits & kTraitSkinned ? DrawSkinned : DrawStatic)(drawing, entry);
 }
 
-bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call) {
+bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call, bool anyOrder) {
     if (!model->vertexBuffers) return false;
-    QexModelDrawing* kept = Keep(model);
+    QexModelDrawing* kept = Keep(model, anyOrder || model->scene.meshNodeCount < 2);
     if (!kept) return false;
     const QexShaderFrame* frame = QexShaderFrame_Set(call.view, call.projection, call.lights, call.shadow);
-    *drawing = {model, kept, &call, frame, Load4x4(frame->viewProjection.m), nullptr};
+    *drawing = {model, kept, &call, frame, Load4x4(frame->viewProjection.m), nullptr, nullptr};
     return true;
 }
 
@@ -325,10 +352,12 @@ bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call) {
 
 void QexModel_DrawLean(QexModel* model, const QexLeanCall& call) {
     Drawing drawing;
-    if (!Begin(&drawing, model, call)) return;
+    if (!Begin(&drawing, model, call, false)) return;
     const QexPODMesh* meshes = model->scene.meshes;
-    for (uint32_t i = 0; i < drawing.kept->nodeCount; ++i) {
-        Entry* entry = &drawing.kept->entries[i];
+    const QexModelDrawing& kept = *drawing.kept;
+    const bool inPlace = kept.moved && !DepthDecides();
+    for (uint32_t i = 0; i < kept.nodeCount; ++i) {
+        Entry* entry = &kept.entries[inPlace ? kept.places[i] : i];
         if (meshes[entry->mesh].passID != call.pass) continue;
         if (call.wants && !call.wants(model, entry->node, call.mode)) continue;
         DrawEntry(&drawing, entry);
@@ -337,7 +366,8 @@ void QexModel_DrawLean(QexModel* model, const QexLeanCall& call) {
 
 void QexModel_DrawNodeLean(QexModel* model, uint32_t node, const QexLeanCall& call) {
     Drawing drawing;
-    if (Begin(&drawing, model, call)) DrawEntry(&drawing, &drawing.kept->entries[drawing.kept->places[node]]);
+    if (Begin(&drawing, model, call, true))
+        DrawEntry(&drawing, &drawing.kept->entries[drawing.kept->places[node]]);
 }
 
 void QexModel_ReleaseLean(QexModel* model) {

@@ -1,4 +1,5 @@
-// The 142 functions of OpenGL ES 2.0, generated from the list, and the way of a call through the tap.
+// The 142 functions of OpenGL ES 2.0 and the four of vertex array objects, generated from the list, and the
+// way of a call through the tap.
 //
 // A call counts itself, goes to the driver or the null driver, and lets the state tracker see it. Recording,
 // logging and errors to inject hide behind one branch on `tap.watch`.
@@ -33,12 +34,20 @@ const FunctionInfo kFunctions[kFunctionCount] = {
 
 namespace {
 
+// Functions of extensions are asked for by name.
+void* FindExtension(const char* name) {
+    static void* library = dlopen("libEGL.so.1", RTLD_NOW | RTLD_LOCAL);
+    void* find = library ? dlsym(library, "eglGetProcAddress") : nullptr;
+    return find ? reinterpret_cast<void* (*)(const char*)>(find)(name) : nullptr;
+}
+
 // Looks a function up in the driver's library. Without one every call goes to the null driver, and one line
 // says so.
 void* FindInDriver(Fn function) {
     static void* library = dlopen("libGLESv2.so.2", RTLD_NOW | RTLD_LOCAL);
     const char* name = kFunctions[Index(function)].name;
     void* found = library ? dlsym(library, name) : nullptr;
+    if (!found && library) found = FindExtension(name);
     tap.driver[Index(function)] = found;
     if (found) return found;
     std::fprintf(stderr, "gltap: %s is not in libGLESv2.so.2 (%s); using the null driver\n", name,

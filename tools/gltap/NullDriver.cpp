@@ -96,7 +96,9 @@ const GLubyte* NullString(GLenum name) {
         case GL_RENDERER: text = "gltap null driver"; break;
         case GL_VERSION: text = "OpenGL ES 2.0 gltap"; break;
         case GL_SHADING_LANGUAGE_VERSION: text = "OpenGL ES GLSL ES 1.00 gltap"; break;
-        case GL_EXTENSIONS: text = "GL_OES_rgb8_rgba8 GL_OES_depth24 GL_OES_packed_depth_stencil"; break;
+        case GL_EXTENSIONS:
+            text = "GL_OES_rgb8_rgba8 GL_OES_depth24 GL_OES_packed_depth_stencil GL_OES_vertex_array_object";
+            break;
         default: break;
     }
     return reinterpret_cast<const GLubyte*>(text);

@@ -55,6 +55,12 @@ NULL_CALL(void, glDeleteProgram, GLuint program) {
     NullDeleteProgram(program);
 }
 
+NULL_CALL(void, glGenVertexArraysOES, GLsizei n, GLuint* names) {
+    NullNames(GLTAP_VERTEX_ARRAY, n, names);
+}
+NULL_CALL(GLboolean, glIsVertexArrayOES, GLuint name) {
+    return IsLive(GLTAP_VERTEX_ARRAY, name);
+}
 NULL_CALL(GLboolean, glIsTexture, GLuint name) {
     return IsLive(GLTAP_TEXTURE, name);
 }

@@ -15,8 +15,8 @@ Names& LiveNames(gltapObject kind) {
     return live[kind];
 }
 
-constexpr const char* kKindNames[GLTAP_OBJECT_KINDS] = {"textures",      "buffers", "framebuffers",
-                                                        "renderbuffers", "shaders", "programs"};
+constexpr const char* kKindNames[GLTAP_OBJECT_KINDS] = {
+    "textures", "buffers", "framebuffers", "renderbuffers", "shaders", "programs", "vertex arrays"};
 
 }  // namespace
 

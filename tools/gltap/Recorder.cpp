@@ -49,6 +49,7 @@ constexpr CopyRule kCopyRules[] = {
     {Fn::glCompressedTexSubImage2D, Copy::kElements, 8, 7, 1},
     {Fn::glTexImage2D, Copy::kImage, 8, 3, 0},            {Fn::glTexSubImage2D, Copy::kImage, 8, 4, 0},
     {Fn::glGenTextures, Copy::kElements, 1, 0, 4},        {Fn::glDeleteTextures, Copy::kElements, 1, 0, 4},
+    {Fn::glGenVertexArraysOES, Copy::kElements, 1, 0, 4}, {Fn::glDeleteVertexArraysOES, Copy::kElements, 1, 0, 4},
     {Fn::glGenBuffers, Copy::kElements, 1, 0, 4},         {Fn::glDeleteBuffers, Copy::kElements, 1, 0, 4},
     {Fn::glGenFramebuffers, Copy::kElements, 1, 0, 4},    {Fn::glDeleteFramebuffers, Copy::kElements, 1, 0, 4},
     {Fn::glGenRenderbuffers, Copy::kElements, 1, 0, 4},   {Fn::glDeleteRenderbuffers, Copy::kElements, 1, 0, 4},
@@ -136,6 +137,7 @@ size_t OutputBytes(const gltapCall& call) {
     switch (static_cast<Fn>(call.function)) {
         case Fn::glReadPixels: return ImageBytes(a[2].i, a[3].i, a[4].i, a[5].i, 8);
         case Fn::glGenTextures:
+        case Fn::glGenVertexArraysOES:
         case Fn::glGenBuffers:
         case Fn::glGenFramebuffers:
         case Fn::glGenRenderbuffers: return Size(a[0]) * sizeof(GLuint);

@@ -2,6 +2,7 @@
 
 #include <cstdio>
 #include <cstring>
+#include <map>
 
 #include "Tap.h"
 
@@ -31,6 +32,7 @@ constexpr StateField kFields[] = {
     FIELD(activeUnit, 0, kNumber),
     FIELD(texture2D, 0, kNumber),
     FIELD(textureCube, 0, kNumber),
+    FIELD(vertexArray, GL_VERTEX_ARRAY_BINDING_OES, kNumber),
     FIELD(arrayBuffer, GL_ARRAY_BUFFER_BINDING, kNumber),
     FIELD(elementBuffer, GL_ELEMENT_ARRAY_BUFFER_BINDING, kNumber),
     FIELD(framebuffer, GL_FRAMEBUFFER_BINDING, kNumber),
@@ -157,12 +159,38 @@ std::string DiffText(const gltapState& before, const gltapState& after) {
     return text;
 }
 
+// What vertex array objects hold while they are not bound. Never destroyed, as live objects are not.
+struct VertexArray {
+    uint32_t elementBuffer, attributeArrays;
+};
+std::map<GLuint, VertexArray>& VertexArrays() {
+    static auto* arrays = new std::map<GLuint, VertexArray>;
+    return *arrays;
+}
+
 }  // namespace
+
+void BindVertexArray(GLuint name) {
+    gltapState& s = tap.state;
+    VertexArrays()[s.vertexArray] = {s.elementBuffer, s.attributeArrays};
+    const VertexArray& bound = VertexArrays()[name];
+    s.vertexArray = name;
+    s.elementBuffer = bound.elementBuffer;
+    s.attributeArrays = bound.attributeArrays;
+}
+
+void DeleteVertexArrays(GLsizei count, const GLuint* names) {
+    for (GLsizei i = 0; i < count; ++i) {
+        if (names[i] && names[i] == tap.state.vertexArray) BindVertexArray(0);
+        if (names[i]) VertexArrays().erase(names[i]);
+    }
+}
 
 Tap tap = {GLTAP_FORWARD, 0, GL_NO_ERROR, {}, {}, InitialState()};
 
 void ResetState() {
     tap.state = InitialState();
+    VertexArrays().clear();
 }
 
 size_t QueryState(GLenum name, double values[4]) {

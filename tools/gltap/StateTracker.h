@@ -74,6 +74,17 @@ TRACK(glDeleteRenderbuffers, GLsizei n, const GLuint* names) {
     for (GLsizei i = 0; i < n; ++i) Forget(tap.state.renderbuffer, names[i]);
 }
 
+TRACK(glGenVertexArraysOES, GLsizei n, GLuint* names) {
+    AddObjects(GLTAP_VERTEX_ARRAY, n, names);
+}
+TRACK(glDeleteVertexArraysOES, GLsizei n, const GLuint* names) {
+    RemoveObjects(GLTAP_VERTEX_ARRAY, n, names);
+    DeleteVertexArrays(n, names);
+}
+TRACK(glBindVertexArrayOES, GLuint name) {
+    BindVertexArray(name);
+}
+
 TRACK(glUseProgram, GLuint program) {
     tap.state.program = program;
 }

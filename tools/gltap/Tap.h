@@ -6,7 +6,9 @@
 #pragma once
 
 #define GL_APICALL __attribute__((visibility("default")))
+#define GL_GLEXT_PROTOTYPES
 #include <GLES2/gl2.h>
+#include <GLES2/gl2ext.h>
 
 #include <cstddef>
 #include <cstdint>
@@ -106,6 +108,8 @@ void LogLine(const std::string& line);
 
 // State.cpp
 void ResetState();
+void BindVertexArray(GLuint name);
+void DeleteVertexArrays(GLsizei count, const GLuint* names);
 // The values of a state query, as doubles; 0 when the tap does not follow that state.
 size_t QueryState(GLenum name, double values[4]);
 

@@ -1,4 +1,4 @@
-/* GL tap: stands between a program and OpenGL ES 2.0.
+/* GL tap: stands between a program and OpenGL ES 2.0 (with GL_OES_vertex_array_object).
  *
  * libgltap.so defines every function of OpenGL ES 2.0. Linked before libGLESv2, or preloaded, it receives a
  * program's calls and forwards them to the driver, or answers them itself (the null driver). It counts the
@@ -126,6 +126,7 @@ typedef enum gltapObject {
     GLTAP_RENDERBUFFER,
     GLTAP_SHADER,
     GLTAP_PROGRAM,
+    GLTAP_VERTEX_ARRAY,
     GLTAP_OBJECT_KINDS
 } gltapObject;
 
@@ -147,7 +148,9 @@ typedef struct gltapState {
     uint32_t activeUnit; /* 0, 1, ... */
     uint32_t texture2D[GLTAP_UNITS];
     uint32_t textureCube[GLTAP_UNITS];
-    uint32_t arrayBuffer, elementBuffer;
+    uint32_t vertexArray;
+    uint32_t arrayBuffer;
+    uint32_t elementBuffer; /* of the bound vertex array object, as attributeArrays */
     uint32_t framebuffer, renderbuffer;
     uint32_t attributeArrays; /* bit i: attribute array i is enabled */
     /* capabilities, 0 or 1 */

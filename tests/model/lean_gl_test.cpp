@@ -1,0 +1,372 @@
+// Lean drawing: the calls that are left, the same pictures, and what it takes from applications.
+#include <GLES2/gl2.h>
+
+#include "Scenes.h"
+#include "support/RenderScenes.h"
+
+namespace {
+
+constexpr uint32_t kKinds[] = {QEX_SHADER_TEXTURE,
+                               QEX_SHADER_TEXTURE_NOALPHA,
+                               QEX_SHADER_UV_DISPLACEMENT,
+                               QEX_SHADER_GOURAUD,
+                               QEX_SHADER_GOURAUD_SHADOW,
+                               QEX_SHADER_GOURAUD_NORMALMAP,
+                               QEX_SHADER_GOURAUD_SPECULAR,
+                               QEX_SHADER_GOURAUD_SHADOW_EXT,
+                               QEX_SHADER_SKINNING_TEXTURE,
+                               QEX_SHADER_SKINNING_GOURAUD,
+                               QEX_SHADER_SKINNING_GOURAUD_NORMALMAP,
+                               QEX_SHADER_SKINNING_GOURAUD_SPECULAR,
+                               QEX_SHADER_SKINNING_TEXTURE_NOALPHA};
+
+struct Lean {
+    Lean() { QexRenderer_SetDrawing(QEX_DRAWING_LEAN); }
+    ~Lean() { QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED); }
+};
+
+// Without vertex array objects: those of the GL are hidden, or they are not to be used.
+struct WithoutVertexArrays {
+    WithoutVertexArrays() { QexRenderer_AllowVertexArrays(0); }
+    ~WithoutVertexArrays() { QexRenderer_AllowVertexArrays(1); }
+};
+
+// An instance of a module, by number.
+struct Module {
+    explicit Module(uint32_t number) : kind(number), module(QexShaders_CreateShaderProgram(number)) {}
+    ~Module() { QexShaders_ReleaseShaderProgram(module, kind); }
+    Module(const Module&) = delete;
+    Module& operator=(const Module&) = delete;
+    uint32_t kind;
+    QexShaderModule* module;
+};
+
+QexLightSet TwoLights() {
+    QexLightSet lights = {};
+    lights.count = 2;
+    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-0.4f, 0.3f, -1}, {0.7f, 0.5f, 0.3f, 1}};
+    lights.lights[1] = {QEX_LIGHT_POINT, {20, 80, 60}, {0.2f, 0.3f, 0.6f, 1}};
+    return lights;
+}
+
+// A mesh whose vertices have everything, over a rectangle, on one bone where it is to be skinned.
+pod::Mesh RichMesh(float left, float bottom, bool skinned) {
+    pod::MeshArrays arrays = Rectangle(left, bottom, left + 60, bottom + 50);
+    const size_t count = arrays.positions.size();
+    arrays.tangents.assign(count, {1, 0, 0});
+    arrays.binormals.assign(count, {0, 1, 0});
+    for (size_t i = 0; i < count; ++i) arrays.normals.push_back({0.1f * static_cast<float>(i), 0, 1});
+    if (!skinned) return pod::BuildMesh(arrays);
+    arrays.boneIndices.assign(count, {0, 0, 0, 0});
+    arrays.boneWeights.assign(count, {255, 0, 0, 0});
+    return SkinnedMesh(arrays, 1, pod::kUint8Norm, {0});
+}
+
+// Four nodes of two meshes that lie over each other, each with a material of its own.
+pod::Scene Overlapping(bool skinned) {
+    pod::Scene scene = SceneOf(RichMesh(8, 8, skinned));
+    scene.meshes.push_back(RichMesh(40, 30, skinned));
+    scene.materials.resize(4, scene.materials[0]);
+    scene.nodes.clear();
+    for (int i = 0; i < 4; ++i) {
+        const float f = static_cast<float>(i);
+        scene.materials[static_cast<size_t>(i)].diffuse = {0.2f + 0.2f * f, 0.8f, 0.5f};
+        scene.nodes.push_back(pod::BuildNode("n", {{{4 * f, 3, f}}, {}, {}, {}}, -1, i % 2, i));
+    }
+    scene.meshNodeCount = 4;
+    return scene;
+}
+
+class LeanTest : public RenderTest {
+  protected:
+    // What is drawn in the described way, and in lean drawing with and without vertex array objects, twice
+    // each, since what is kept shows in the second frame.
+    void ExpectSamePictures(const std::function<void()>& draw, const std::string& what) {
+        const auto picture = [&] {
+            for (int i = 0; i < 2; ++i) {
+                Clear(0.1f, 0.2f, 0.3f);
+                draw();
+            }
+            return Read();
+        };
+        const Picture described = picture();
+        const Lean lean;
+        EXPECT_TRUE(SamePicture(picture(), described, 1)) << what;
+        const WithoutVertexArrays without;
+        EXPECT_TRUE(SamePicture(picture(), described, 1)) << what << ", without vertex array objects";
+        EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
+    }
+};
+
+TEST_F(LeanTest, EveryModuleDrawsTheSame) {
+    const uint8_t texels[] = {255, 80, 30, 255, 90, 250, 20, 120, 10, 90, 255, 200, 255, 255, 90, 30};
+    ScopedTexture diffuse(2, 2, texels), alpha(2, 2, texels), shadowMap({90, 90, 90, 255});
+    const QexLightSet lights = TwoLights();
+    const QexMatrix projection = PixelProjection(), placed = ToQex(glm::scale(glm::mat4(1), {1.1f, 0.9f, 1}));
+    QexShadowInfo shadow = {};
+    shadow.lightDir = {0, 0, -1};
+    shadow.shadowSpaceMatrix = ToQex(glm::scale(glm::mat4(1), {0.01f, 0.01f, 0.5f}));
+    shadow.shadowIntensity = 0.4f;
+    shadow.shadowTexture = shadowMap.glName;
+    for (const uint32_t kind : kKinds) {
+        const Module module(kind);
+        LoadedModel model(
+            Overlapping(kind >= QEX_SHADER_SKINNING_TEXTURE && kind != QEX_SHADER_GOURAUD_SHADOW_EXT));
+        QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
+        QexShaders_SetShaderUVDisplacement(module.module, kind, 0.3f, 0.1f);
+        // A bare node, one with a texture, one with an alpha texture, one with both, which is translucent.
+        model.model.textures[1] = model.model.textures[3] = &diffuse;
+        model.model.alphaTextures[2] = model.model.alphaTextures[3] = &alpha;
+        model.Material(3).opacity = 0.9f;
+        QexShaders_SetShaderAlphaThreshold(module.module, kind, 0.4f);
+        for (const bool blends : {true, false}) {
+            if (!blends && kind != QEX_SHADER_GOURAUD) continue;
+            QexRenderer_SetZTestFunc(blends ? QEX_DEPTH_LESS_EQUAL : QEX_DEPTH_ALWAYS);
+            QexRenderer_SetAlphaBlendMode(blends ? QEX_BLEND_ALPHA : QEX_BLEND_NONE);
+            ExpectSamePictures(
+                [&] {
+                    QexModel_RenderFromViewPerspectiveWithShadow(&model.model, &lights, &placed,
+                                                                 &g_sMatIdentity, &projection,
+                                                                 blends ? &shadow : nullptr, 0);
+                },
+                "module " + std::to_string(kind) + (blends ? ", blending" : ""));
+        }
+        for (int i = 0; i < 4; ++i) model.model.textures[i] = model.model.alphaTextures[i] = nullptr;
+    }
+}
+
+// Everything else that the engine draws, between nodes, in the same frame.
+TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
+    ScopedTexture blue({20, 40, 250, 255});
+    LoadedModel model(Overlapping(false));
+    QexBillboard* billboard = QexBillboard_Create(&blue);
+    billboard->position = {90, 20, 5};
+    billboard->scale = {20, 20, 1};
+    const QexCamera camera = PixelCamera();
+    ExpectSamePictures(
+        [&] {
+            model.Draw();
+            QexFont_DrawTempString(&runtime_, 5, 60, "lean", 0xFF20FF20u);
+            model.DrawNode(model.Node().shader, 1);
+            QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
+            QexBillboard_Draw(billboard, &camera);
+            glEnable(GL_CULL_FACE);
+            model.Draw();
+            glDisable(GL_CULL_FACE);
+        },
+        "a frame of many things");
+    QexBillboard_Release(billboard);
+}
+
+// What an application changes between frames, in records that are its own.
+TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
+    ScopedTexture red({250, 20, 20, 255});
+    const Module lit(QEX_SHADER_GOURAUD);
+    const QexLightSet lights = TwoLights();
+    const QexMatrix projection = PixelProjection();
+    LoadedModel model(Overlapping(false));
+    QexPODModel& scene = model.model.scene;
+    const std::function<void()> changes[] = {
+        [&] { model.Node(1).shader = lit.module; },
+        [&] { model.Material(2).opacity = 0.75f; },
+        [&] { QexRenderer_SetGlobalAlpha(0.8f); },
+        [&] { QexRenderer_SetGlobalAlpha(1); },
+        [&] { QexModel_ReplaceTextureByIdx(&model.model, &red, 0); },
+        [&] { QexModel_ReplaceAlphaTextureByIdx(&model.model, &red, 1); },
+        [&] { QexModel_SetNodePosition(&model.model, 0, 30, -2, 0); },
+        [&] { model.Node(2).materialIndex = 1; },
+        [&] { model.Node(3).objectIndex = 0; },
+        [&] { scene.nodes[1].stateFlags &= ~QEX_NODE_RENDERING_ENABLED; },
+        [&] { QexShaders_SetShaderAlphaThreshold(lit.module, lit.kind, 0.9f); },
+        [&] { QexPODModel_SetPassID(&scene, &scene.meshes[1], 3); },
+        [&] { model.Node(0).shader = nullptr; },
+    };
+    int number = 0;
+    const Lean lean;
+    for (const auto& change : changes) {
+        change();
+        const auto draw = [&] {
+            Clear();
+            QexModel_RenderWithViewProjection(&model.model, &lights, nullptr, &g_sMatIdentity, &projection,
+                                              0);
+            return Read();
+        };
+        const Picture picture = draw();
+        QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
+        EXPECT_TRUE(SamePicture(picture, draw(), 1)) << "change " << number;
+        QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
+        draw();
+        ++number;
+    }
+    model.model.textures[0] = model.model.alphaTextures[1] = nullptr;
+}
+
+// Translucent nodes are drawn where they stand in the scene; the opaque ones around them may change places.
+TEST_F(LeanTest, TranslucentNodesKeepTheirPlaces) {
+    pod::Scene scene = Overlapping(false);
+    while (scene.nodes.size() < 8) scene.nodes.push_back(scene.nodes[scene.nodes.size() - 4]);
+    scene.meshNodeCount = 8;
+    LoadedModel model(scene);
+    model.Material(1).opacity = 0.6f;
+    QexModel_SetAlphaTestCmpValue(0.1f);
+    glEnable(GL_BLEND);
+    glBlendFunc(GL_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    for (uint32_t i = 0; i < 8; ++i) model.Node(i).stateFlags |= QEX_NODE_RENDERING_ENABLED;
+    ExpectSamePictures([&] { model.Draw(); }, "translucent nodes between opaque ones");
+    glDisable(GL_BLEND);
+    QexModel_SetAlphaTestCmpValue(0.5f);
+}
+
+// A hook and a module of the application that leave GL in disorder.
+TEST_F(LeanTest, ApplicationsMayCallGL) {
+    ScopedTexture green({20, 250, 20, 255});
+    static GLuint s_texture;
+    s_texture = green.glName;
+    const auto disorder = [] {
+        glUseProgram(0);
+        glActiveTexture(GL_TEXTURE5);
+        glBindBuffer(GL_ARRAY_BUFFER, 0);
+        glBindTexture(GL_TEXTURE_2D, s_texture);
+    };
+    LoadedModel hooked(Overlapping(false)), own(Overlapping(false)), plain(Overlapping(false));
+    hooked.model.bindTextureHook = [](QexModel*, uint32_t node) {
+        if (node % 2) return 0;
+        QexRenderState_ActiveTexture(GL_TEXTURE0);
+        glBindTexture(GL_TEXTURE_2D, s_texture);
+        return 1;
+    };
+    QexShaderModule module = {};
+    static void (*s_disorder)();
+    s_disorder = disorder;
+    module.render = [](QexShaderModule*, QexModel*, uint32_t, const QexLightSet*, const QexMatrix*,
+                       const QexMatrix*, const QexMatrix*, const QexShadowInfo*) { s_disorder(); };
+    own.Node(1).shader = &module;
+    ExpectSamePictures(
+        [&] {
+            plain.Draw();
+            hooked.Draw();
+            if (QexRenderer_GetDrawing() == QEX_DRAWING_LEAN) own.Draw();
+            plain.Draw();
+            QexRenderState_Restore();
+            disorder();
+            QexRenderState_Reset(nullptr);
+            own.DrawNode(own.Node().shader, 0);
+        },
+        "hooks and modules");
+}
+
+class LeanCallsTest : public NullRenderTest {
+  protected:
+    static QexCamera Camera() {
+        QexCamera camera;
+        const QexVec3 eye = {16, 16, 60}, target = {16, 16, 0};
+        QexCamera_Create(&camera, 0);
+        QexCamera_LookAt(&camera, &eye, &target, nullptr);
+        QexCamera_Project(&camera, 0.785f, 4.0f / 3, 1, 100);
+        return camera;
+    }
+
+    // GL calls of a steady frame.
+    static uint64_t CallsOf(const std::function<void()>& draw) {
+        draw();
+        gltapResetCounts();
+        draw();
+        return gltapCountAll();
+    }
+};
+
+constexpr uint32_t kNodes = 1000;
+
+TEST_F(LeanCallsTest, OfAThousandNodes) {
+    const QexCamera camera = Camera();
+    const QexLightSet lights = TwoLights();
+    const struct {
+        uint32_t kind;
+        bool ownMeshes, vertexArrays;
+        uint64_t aNode;
+    } cases[] = {
+        {QEX_SHADER_TEXTURE, false, true, 2},  {QEX_SHADER_TEXTURE, true, true, 3},
+        {QEX_SHADER_TEXTURE, false, false, 2}, {QEX_SHADER_TEXTURE, true, false, 5},
+        {QEX_SHADER_GOURAUD, false, true, 4},  {QEX_SHADER_GOURAUD, true, true, 5},
+    };
+    for (const auto& c : cases) {
+        pod::Scene scene = scenes::Grid(kNodes);
+        if (c.ownMeshes) {
+            scene.meshes.resize(kNodes, scene.meshes[0]);
+            for (uint32_t i = 0; i < kNodes; ++i) scene.nodes[i].object = static_cast<int32_t>(i);
+        }
+        const Module module(c.kind);
+        LoadedModel model(scene);
+        QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
+        const Lean lean;
+        QexRenderer_AllowVertexArrays(c.vertexArrays);
+        const auto draw = [&] { QexModel_RenderWithCamera(&model.model, &lights, &camera, nullptr, 0); };
+        EXPECT_LE(CallsOf(draw), c.aNode * kNodes + 10) << c.kind << (c.ownMeshes ? ", own meshes" : "");
+        EXPECT_EQ(gltapCount("glDrawElements"), kNodes);
+        EXPECT_EQ(gltapCount("glGetError"), 0u);
+        EXPECT_EQ(CountAllocations(draw).made, 0);
+        QexRenderer_AllowVertexArrays(1);
+    }
+}
+
+TEST_F(LeanCallsTest, OneModelByItsMatrix) {
+    const QexCamera camera = Camera();
+    const QexLightSet lights = TwoLights();
+    const Module module(QEX_SHADER_GOURAUD);
+    LoadedModel model(scenes::Grid(1));
+    QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
+    const Lean lean;
+    EXPECT_EQ(CallsOf([&] {
+                  for (int i = 0; i < 100; ++i) {
+                      const QexMatrix place = ToQex(glm::translate(glm::mat4(1), {i % 10, i / 10, 0}));
+                      QexModel_RenderWithCamera(&model.model, &lights, &camera, &place, 0);
+                  }
+              }),
+              400u);
+}
+
+TEST_F(LeanCallsTest, NodesOutsideTheViewAreNotDrawn) {
+    const Lean lean;
+    const QexMatrix projection = PixelProjection();
+    pod::Scene scene = SceneOf(pod::BuildMesh(Rectangle(0, 0, 10, 10)));
+    const QexVec3 places[] = {{50, 50, 0}, {-9, 50, 0}, {-12, 50, 0}, {127, 0, 0},  {129, 0, 0},
+                              {0, -11, 0}, {0, 97, 0},  {0, 0, 101},  {0, 0, -101}, {0, 0, 99}};
+    scene.nodes.clear();
+    for (const QexVec3& at : places)
+        scene.nodes.push_back(pod::BuildNode("n", {{{at.x, at.y, at.z}}, {}, {}, {}}, -1, 0, 0));
+    scene.meshNodeCount = static_cast<uint32_t>(scene.nodes.size());
+    LoadedModel model(scene);
+    CallsOf([&] {
+        QexModel_RenderWithViewProjection(&model.model, nullptr, nullptr, &g_sMatIdentity, &projection, 0);
+    });
+    EXPECT_EQ(gltapCount("glDrawElements"), 4u) << "of the ten";
+}
+
+TEST_F(LeanCallsTest, WhatIsLeftAndHowItIsRestored) {
+    LoadedModel model(Overlapping(false));
+    const QexMatrix projection = PixelProjection();
+    const auto draw = [&] {
+        QexModel_RenderWithViewProjection(&model.model, nullptr, nullptr, &g_sMatIdentity, &projection, 0);
+    };
+    for (const int32_t vertexArrays : {1, 0}) {
+        const Lean lean;
+        QexRenderer_AllowVertexArrays(vertexArrays);
+        gltapState state;
+        draw();
+        gltapGetState(&state);
+        EXPECT_EQ(state.vertexArray != 0, vertexArrays != 0);
+        EXPECT_NE(state.elementBuffer, 0u);
+        QexRenderState_Restore();
+        gltapGetState(&state);
+        EXPECT_EQ(state.vertexArray, 0u);
+        EXPECT_EQ(state.attributeArrays, 0u);
+        EXPECT_EQ(state.arrayBuffer, 0u);
+        EXPECT_EQ(state.elementBuffer, 0u);
+        QexRenderer_AllowVertexArrays(1);
+    }
+    EXPECT_EQ(QexRenderer_SetDrawing(7), QEX_DRAWING_DESCRIBED) << "there is no such way";
+    EXPECT_EQ(QexRenderer_GetDrawing(), QEX_DRAWING_DESCRIBED);
+}
+
+}  // namespace
