@@ -109,8 +109,10 @@ int Window_Open(Window* window, const char* title, int argc, char** argv) {
     config.width = window->width;
     config.height = window->height;
     QexLog_SetLevel(QEX_LOG_WARNING);
-    if (QexEngine_Init(&window->engine, sizeof config, &config) == 0) return 0;
-    return Fail("the engine", "cannot start");
+    if (QexEngine_Init(&window->engine, sizeof config, &config) != 0)
+        return Fail("the engine", "cannot start");
+    QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
+    return 0;
 }
 
 /* 0 when the window is to be closed. */

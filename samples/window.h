@@ -21,7 +21,7 @@ typedef struct Window {
     int frames;          /* counted by Window_Frame */
 } Window;
 
-/* Opens a window and starts the engine. 0, or 1 with a line on standard error. */
+/* Opens a window and starts the engine, which draws lean. 0, or 1 with a line on standard error. */
 int Window_Open(Window* window, const char* title, int argc, char** argv);
 
 /* Ends the frame before and begins the next one: shows what was drawn, follows the window's size. 0 once the

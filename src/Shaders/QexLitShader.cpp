@@ -13,6 +13,28 @@
 
 namespace {
 
+// A light set as the shaders take it: one array a field.
+struct LightArrays {
+    GLint count;
+    GLint types[QEX_MAX_LIGHTS];
+    float vectors[QEX_MAX_LIGHTS][3];
+    float colours[QEX_MAX_LIGHTS][4];
+};
+
+// Null is the empty set.
+LightArrays ToArrays(const QexLightSet* lights) {
+    LightArrays arrays = {};
+    const uint32_t count = lights ? lights->count : 0;
+    arrays.count = static_cast<GLint>(count < QEX_MAX_LIGHTS ? count : QEX_MAX_LIGHTS);
+    for (GLint i = 0; i < arrays.count; ++i) {
+        const QexLight& light = lights->lights[i];
+        arrays.types[i] = light.type;
+        memcpy(arrays.vectors[i], light.vector, sizeof arrays.vectors[i]);
+        memcpy(arrays.colours[i], light.colour, sizeof arrays.colours[i]);
+    }
+    return arrays;
+}
+
 int32_t Location(const QexShaderDraw& draw, const QexLitShaderType* type, QexShaderUniform uniform) {
     return QexShaderModule_Location(draw.module, type->slots[uniform]);
 }
@@ -26,7 +48,7 @@ float Parameter(const QexShaderDraw& draw, uint32_t number) {
 void SetSurface(const QexShaderDraw& draw, const QexLitShaderType* type, const QexLightSet* lights,
                 const QexMatrix* view) {
     const QexPODMaterial& material = *draw.material;
-    const QexLightArrays set = QexLitShader_ToArrays(lights);
+    const LightArrays set = ToArrays(lights);
     const bool specular = type->module.traits & kTraitSpecular;
     if (specular)
         QEX_GL(
@@ -82,17 +104,13 @@ void BindTextures(const QexShaderDraw& draw, const QexLitShaderType* type) {
 
 }  // namespace
 
-QexLightArrays QexLitShader_ToArrays(const QexLightSet* lights) {
-    QexLightArrays arrays = {};
-    const uint32_t count = lights ? lights->count : 0;
-    arrays.count = static_cast<GLint>(count < QEX_MAX_LIGHTS ? count : QEX_MAX_LIGHTS);
-    for (GLint i = 0; i < arrays.count; ++i) {
-        const QexLight& light = lights->lights[i];
-        arrays.types[i] = light.type;
-        memcpy(arrays.vectors[i], light.vector, sizeof arrays.vectors[i]);
-        memcpy(arrays.colours[i], light.colour, sizeof arrays.colours[i]);
-    }
-    return arrays;
+void QexLitShader_SendLights(const int32_t* locations, const QexLightSet& lights) {
+    const LightArrays set = ToArrays(&lights);
+    const GLsizei count = set.count ? set.count : 1;
+    glUniform1i(locations[kUniform_lightCount], set.count);
+    glUniform1iv(locations[kUniform_lightType], count, set.types);
+    glUniform3fv(locations[kUniform_lightPosDir], count, set.vectors[0]);
+    glUniform4fv(locations[kUniform_lightColor], count, set.colours[0]);
 }
 
 void QexLitShader_Render(const QexLitShaderType* type, QexShaderModule* module, QexModel* model,

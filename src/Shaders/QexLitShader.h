@@ -7,15 +7,8 @@
 #include "Qex/shader_modules.h"
 #include "Shaders/QexShaderModule.h"
 
-// A light set as the shaders take it: one array a field.
-struct QexLightArrays {
-    GLint count;
-    GLint types[QEX_MAX_LIGHTS];
-    float vectors[QEX_MAX_LIGHTS][3];
-    float colours[QEX_MAX_LIGHTS][4];
-};
-// Null is the empty set.
-QexLightArrays QexLitShader_ToArrays(const QexLightSet* lights);
+// Sends lights to uniforms by number, -1 where there is none; of lights that do not count nothing is sent.
+void QexLitShader_SendLights(const int32_t* locations, const QexLightSet& lights);
 
 struct QexLitShaderType {
     QexShaderModuleType module;

@@ -112,18 +112,6 @@ void SendView(QexShaderVariant* variant, const QexShaderFrame& frame) {
     variant->viewStamp = frame.viewStamp;
 }
 
-void SendLights(QexShaderVariant* variant, const QexShaderFrame& frame) {
-    const int32_t* at = variant->locations;
-    const QexLightArrays set = QexLitShader_ToArrays(&frame.lights);
-    // Of lights that do not count nothing need be known.
-    const GLsizei count = set.count ? set.count : 1;
-    glUniform1i(at[kUniform_lightCount], set.count);
-    glUniform1iv(at[kUniform_lightType], count, set.types);
-    glUniform3fv(at[kUniform_lightPosDir], count, set.vectors[0]);
-    glUniform4fv(at[kUniform_lightColor], count, set.colours[0]);
-    variant->lightStamp = frame.lightStamp;
-}
-
 void SendShadow(QexShaderVariant* variant, const QexShaderFrame& frame) {
     const int32_t* at = variant->locations;
     glUniform3fv(at[kUniform_shadowLightDir], 1, &frame.shadowLightDirection.x);
@@ -224,7 +212,10 @@ void QexShaderVariant_Use(QexShaderVariant* variant, const QexShaderFrame* frame
     const uint32_t traits = variant->type->traits;
     QexRenderState_UseProgram(variant->program);
     if (variant->viewStamp != frame->viewStamp) SendView(variant, *frame);
-    if (traits & kTraitLit && variant->lightStamp != frame->lightStamp) SendLights(variant, *frame);
+    if (traits & kTraitLit && variant->lightStamp != frame->lightStamp) {
+        QexLitShader_SendLights(variant->locations, frame->lights);
+        variant->lightStamp = frame->lightStamp;
+    }
     if (traits & kTraitShadow && variant->shadowStamp != frame->shadowStamp) SendShadow(variant, *frame);
     if (!variant->hasSurface || memcmp(&variant->surface, &surface, sizeof surface) != 0)
         SendSurface(variant, surface);

@@ -1,6 +1,6 @@
 // The state cache, and the renderer's settings.
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexRuntimeContext"
@@ -37,7 +37,7 @@ uint32_t g_bSpecularOn = 0;
 
 void QexRenderState_Reset(QexRuntimeContext*) {
     g_QexCachedRenderStates = {0, kUnknown, kUnknown};
-    QexDrawing_Forget();
+    QexLeanState_Forget();
 }
 
 void QexRenderState_UseProgram(uint32_t program) {
@@ -54,7 +54,7 @@ void QexRenderState_ActiveTexture(uint32_t unit) {
 }
 
 void QexRenderState_Bind(uint32_t target, uint32_t name) {
-    if (QexDrawing_IsLean() && QexDrawing_HasTexture(target, name)) return;
+    if (QexLeanState_IsLean() && QexLeanState_HasTexture(target, name)) return;
     QEX_GL(glBindTexture(target, name));
 }
 
@@ -63,7 +63,7 @@ void QexRenderer_SetZTestFunc(uint32_t mode) {
     // GL_NEVER to GL_ALWAYS are consecutive, in the order of the modes.
     if (mode > QEX_DEPTH_ALWAYS) return;
     glDepthFunc(GL_NEVER + mode);
-    QexDrawing_SetDepthFunction(mode);
+    QexLeanState_SetDepthFunction(mode);
 }
 
 void QexRenderer_SetZWrite(int32_t flag) {

@@ -1,6 +1,6 @@
 // Loading models: the scene, its geometry, textures and modules, and what unloading gives back.
 #include "model/Geometry.h"
-#include "model/Lean.h"
+#include "model/LeanRender.h"
 #include "model/SharedShaders.h"
 
 #include <cstdio>

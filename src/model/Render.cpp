@@ -4,8 +4,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
-#include "gl/Drawing.h"
-#include "model/Lean.h"
+#include "gl/LeanState.h"
+#include "model/LeanRender.h"
 #include "model/SharedShaders.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
@@ -55,7 +55,7 @@ void DrawNode(QexModel* model, uint32_t node, const QexLightSet* lights, const Q
               const QexMatrix* view, const QexMatrix* projection, const QexShadowInfo* shadow = nullptr) {
     QexShaderModule* module = model->scene.nodes[node].shader;
     if (!module || IsGone(model)) return;
-    if (QexDrawing_IsLean())
+    if (QexLeanState_IsLean())
         QexModel_DrawNodeLean(model, node, {lights, modelMatrix, view, projection, shadow});
     else
         module->render(module, model, node, lights, modelMatrix, view, projection, shadow);
@@ -140,7 +140,7 @@ void QexModel_RenderFromViewPerspectiveWithShadow(QexModel* model, const QexLigh
                                                   const QexMatrix* modelMatrix, const QexMatrix* view,
                                                   const QexMatrix* projection, const QexShadowInfo* info,
                                                   uint32_t pass) {
-    if (QexDrawing_IsLean()) {
+    if (QexLeanState_IsLean()) {
         if (!IsGone(model)) QexModel_DrawLean(model, {lights, modelMatrix, view, projection, info, pass});
         return;
     }
@@ -171,7 +171,7 @@ void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lig
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
         if (!InPass(model, i, pass)) continue;
         if (IsDrawnNow(model, i, mode)) {
-            if (!QexDrawing_IsLean()) DrawNode(model, i, lights, modelMatrix, view, projection);
+            if (!QexLeanState_IsLean()) DrawNode(model, i, lights, modelMatrix, view, projection);
             continue;
         }
         if (!list || !count) continue;
@@ -188,7 +188,7 @@ void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lig
         entry->projection = *projection;
         entry->passID = static_cast<int32_t>(pass);
     }
-    if (QexDrawing_IsLean() && !IsGone(model))
+    if (QexLeanState_IsLean() && !IsGone(model))
         QexModel_DrawLean(model, {lights, modelMatrix, view, projection, nullptr, pass, IsDrawnNow, mode});
 }
 

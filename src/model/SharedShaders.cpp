@@ -1,8 +1,8 @@
 // The shader modules and the shadow pass that all models share: made with the first, gone with the last.
 #include <cstring>
 
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "gl/Program.h"
 #include "model/SharedShaders.h"
 #include "Qex/base.h"
@@ -143,7 +143,7 @@ void DeleteShadowTarget() {
     if (s_Shared.shadowDepth) QEX_GL(glDeleteRenderbuffers(1, &s_Shared.shadowDepth));
     if (s_Shared.shadowFramebuffer) QEX_GL(glDeleteFramebuffers(1, &s_Shared.shadowFramebuffer));
     if (s_Shared.shadowTexture) QEX_GL(glDeleteTextures(1, &s_Shared.shadowTexture));
-    QexDrawing_ForgetTextures();
+    QexLeanState_ForgetTextures();
     s_Shared.shadowDepth = s_Shared.shadowFramebuffer = s_Shared.shadowTexture = 0;
 }
 

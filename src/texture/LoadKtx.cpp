@@ -2,8 +2,8 @@
 #include "texture/LoadKtx.h"
 
 #include "base/Memory.h"
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "image/Ktx.h"
 #include "Qex/base.h"
 #include "Qex/images.h"
@@ -168,7 +168,7 @@ int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file) {
     QexTextureLoad_Begin(texture, &texture->glName, image.faces == 6);
     if (!UploadLevels(&ktx, decodes, file)) {
         QEX_GL(glDeleteTextures(1, &texture->glName));
-        QexDrawing_ForgetTextures();
+        QexLeanState_ForgetTextures();
         texture->glName = 0;
         return -1;
     }

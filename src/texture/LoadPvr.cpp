@@ -1,6 +1,6 @@
 // PVR textures with the legacy header: all levels of a file, from one of them on, as they are or decoded.
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "image/Ktx.h"
 #include "image/Pvr.h"
 #include "Qex/base.h"
@@ -193,7 +193,7 @@ int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* heade
     if (result == Upload::kGLError) return QexTextureLoad_Refuse(kFunction, "glTexImage2D() failed.");
     if (result == Upload::kOutOfMemory) {
         QEX_GL(glDeleteTextures(1, &name));
-        QexDrawing_ForgetTextures();
+        QexLeanState_ForgetTextures();
         return QexTextureLoad_Refuse(kFunction, "out of memory.");
     }
     texture->glName = name;

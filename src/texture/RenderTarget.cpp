@@ -1,8 +1,8 @@
 // Framebuffers that a scene is drawn into, with a colour texture and a depth buffer.
 #include <cstring>
 
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "Qex/base.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
@@ -102,7 +102,7 @@ int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context, QexRen
 void QexRenderTarget_Release(QexRenderTarget* target) {
     if (!target) return;
     if (target->colorTexture.glName) glDeleteTextures(1, &target->colorTexture.glName);
-    QexDrawing_ForgetTextures();
+    QexLeanState_ForgetTextures();
     if (target->depthRenderbuffer) glDeleteRenderbuffers(1, &target->depthRenderbuffer);
     if (target->framebuffer) glDeleteFramebuffers(1, &target->framebuffer);
     target->colorTexture.glName = target->depthRenderbuffer = target->framebuffer = 0;

@@ -6,8 +6,8 @@
 
 #include "base/Memory.h"
 #include "data/ResFile.h"
-#include "gl/Drawing.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "image/Tga.h"
 #include "Qex/base.h"
 #include "Qex/images.h"
@@ -226,7 +226,7 @@ void QexTexture_Set(QexTexture* texture, uint32_t stage) {
 
 void QexTexture_Release(QexTexture* texture) {
     QEX_GL(glDeleteTextures(1, &texture->glName));
-    QexDrawing_ForgetTextures();
+    QexLeanState_ForgetTextures();
     texture->glName = 0;
     if (!(texture->flags & QEX_TEXFLAG_OWNS_PIXELS)) return;
     QexMemory_Free(texture->pixels);

@@ -53,7 +53,7 @@ std::string NodesOf(const TransparentSPODNodeInfo* list, uint32_t count) {
 TEST_F(RenderingTest, WhatIsDrawnAndWhatIsPutOff) {
     NotedModel model({0, 0, 0, 0});
     // A is opaque, B translucent, C in the blend list, D without a material.
-    EXPECT_EQ(QexModel_SetOpacity(&model.model, 1, 0.5f), 1.0f);
+    EXPECT_EQ(QexModel_SetOpacity(&model.model, 1, 0.95f), 1.0f);
     const char* const names[] = {"C", "nobody"};
     QexModel_SetAlphaBlendingNodes(&model.model, names, 2);
     model.Node(3).materialIndex = -1;

@@ -161,6 +161,8 @@ TEST_F(ShadowTest, StateAfterThePass) {
     const QexShadowCaster all = {&model.model, 1, nullptr, 0};
     const QexVec3 down = {0, -1, 0};
     QexShadowInfo* info = QexModel_InitShadowInfo(&camera_, &down, &all, 1, 0.5f, 0);
+    const glm::mat4 half = glm::scale(glm::translate(glm::mat4(1), glm::vec3(0.5f)), glm::vec3(0.5f));
+    EXPECT_TRUE(SameMatrix(&info->shadowSpaceMatrix, half * glm::make_mat4(info->lightViewProj.m)));
     ASSERT_EQ(info->casters[0].nodeCount, 2u);
     glViewport(3, 4, 5, 6);
     glDisable(GL_SCISSOR_TEST);

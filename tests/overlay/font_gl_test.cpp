@@ -130,8 +130,8 @@ TEST_F(FontTest, NumbersAndUnknownCharacters) {
         EXPECT_TRUE(SamePicture(Drawn([&] { QexFont_DrawNum(&runtime_, 4, 60, number, ~0u); }),
                                 Temporary(4, 60, std::to_string(number))));
     Picture expected = background_;
-    Stamp(&expected, 4, 60, "a\x7F\x7F\x7F\x7F", {255, 255, 255, 255});
-    EXPECT_TRUE(SamePicture(Temporary(4, 60, "a\x01\x80\xFF\u20AC"), expected, 1));
+    Stamp(&expected, 4, 60, "a\x7F\x7F\x7F\x7F\x7Fz", {255, 255, 255, 255});
+    EXPECT_TRUE(SamePicture(Temporary(4, 60, "a\x01\x80\xFF\u20AC\U0001F600z"), expected, 1));
 }
 
 TEST_F(FontTest, LinesScaleAndLatin) {

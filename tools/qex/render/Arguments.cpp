@@ -223,6 +223,12 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
         },
         kMostRepeats);
     SetUpTextureChoices(app, &options->textures);
+    AddParsed(app, "--drawing", "lean, or described, with the GL's errors read after each call (lean)",
+              [=](const std::string& text) {
+                  options->lean = text == "lean";
+                  return options->lean || text == "described" ? ""
+                                                              : "'" + text + "' is not lean or described";
+              });
     app->add_flag("--stats", options->stats, "print time, draw calls, GL calls, triangles and memory");
     app->add_flag("-q,--quiet", options->quiet, "no progress bar: nothing but warnings and errors");
 }

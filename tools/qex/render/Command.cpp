@@ -73,6 +73,7 @@ bool Renderer::Start() {
     config.height = context_->Height();
     if (options_.effects.shadow && options_.antialias > 1) QexModel_SetShadowMapSize(kFineMap, kFineMap);
     engineStarted_ = QexEngine_Init(&engine_, sizeof config, &config) == 0;
+    if (options_.lean) QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
     if (options_.effects.depthOfField) QexPostProcessing_Initialize(&engine_);
     return engineStarted_;
 }
@@ -241,6 +242,17 @@ int Renderer::Run() {
     return DrawAll();
 }
 
+// GL calls of the first picture in the other way of drawing, once what it needs is made.
+uint64_t Renderer::CallsOfOtherDrawing() {
+    EngineOutput quiet;
+    const int32_t drawing = QexRenderer_SetDrawing(options_.lean ? QEX_DRAWING_DESCRIBED : QEX_DRAWING_LEAN);
+    DrawNumber(0);
+    gltapResetCounts();
+    DrawNumber(0);
+    QexRenderer_SetDrawing(drawing);
+    return gltapCountAll();
+}
+
 int Renderer::DrawAll() {
     const size_t count = PictureCount();
     size_t blank = 0;
@@ -268,7 +280,12 @@ int Renderer::DrawAll() {
     }
     if (blank > 1)
         Warn(std::to_string(blank) + " of " + std::to_string(count) + " pictures show nothing of the scene");
-    if (options_.stats) ReportStats({model_, *context_, count, loadTime_, drawTime_});
+    if (options_.stats) {
+        const uint64_t draws = gltapCount("glDrawElements") + gltapCount("glDrawArrays");
+        const uint64_t calls = gltapCountAll();
+        ReportStats({model_, *context_, count, loadTime_, drawTime_, draws, calls, options_.lean,
+                     CallsOfOtherDrawing()});
+    }
     return 0;
 }
 

@@ -33,6 +33,7 @@ struct RenderOptions {
     std::string text;
     EffectOptions effects;
     TextureChoices textures;
+    bool lean = true;  // drawing, else the described one
     bool stats = false;
     bool quiet = false;
 };

@@ -50,6 +50,7 @@ class Renderer {
     void DrawBlended(const QexCamera& camera);
     void DrawDepth(QexShaderModule* module, QexShaderModule* skinned);
     void DrawBothEyes();
+    uint64_t CallsOfOtherDrawing();
     void DrawText();
     std::vector<uint8_t> Pixels(bool text);
     bool UsesAutoCamera() const { return autoCamera_ || options_.autoCamera || options_.turn; }

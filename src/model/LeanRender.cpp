@@ -1,11 +1,11 @@
 // Which node is drawn when and with what, kept from call to call, and the draw itself.
-#include "model/Lean.h"
+#include "model/LeanRender.h"
 
 #include <cstdlib>
 #include <cstring>
 
 #include "base/Memory.h"
-#include "gl/Drawing.h"
+#include "gl/LeanState.h"
 #include "math/Float4.h"
 #include "pod/Animation.h"
 #include "Qex/base.h"
@@ -172,7 +172,7 @@ bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
 // Whether what is nearer is seen, whatever is drawn first.
 bool DepthDecides() {
     GLboolean writes = GL_FALSE;
-    if (!glIsEnabled(GL_DEPTH_TEST) || !QexDrawing_NearerIsSeen()) return false;
+    if (!glIsEnabled(GL_DEPTH_TEST) || !QexLeanState_NearerIsSeen()) return false;
     glGetBooleanv(GL_DEPTH_WRITEMASK, &writes);
     return writes;
 }
@@ -221,7 +221,7 @@ void DrawAsDescribed(Drawing* drawing, uint32_t node) {
 void BindTexture(QexTexture* texture, uint32_t unit) {
     if (!texture) texture = Qextexture_GetDefault();
     texture->stage = static_cast<uint8_t>(unit);
-    QexDrawing_BindTexture(unit, QexTexture_Target(texture), texture->glName);
+    QexLeanState_BindTexture(unit, QexTexture_Target(texture), texture->glName);
 }
 
 void BindTextures(const Drawing& drawing, const Entry& entry) {
@@ -230,7 +230,7 @@ void BindTextures(const Drawing& drawing, const Entry& entry) {
     if (traits & kTraitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
     if (traits & kTraitShadow) {
         const QexShadowInfo* shadow = drawing.call->shadow;
-        QexDrawing_BindTexture(
+        QexLeanState_BindTexture(
             kShadowMapUnit, GL_TEXTURE_2D,
             shadow && shadow->shadowTexture ? shadow->shadowTexture : Qextexture_GetDefault()->glName);
     }
@@ -262,7 +262,7 @@ void BindMesh(Drawing* drawing, const Entry& entry) {
     if (bound && bound->mesh == entry.mesh && bound->variant == entry.variant) return;
     drawing->mesh = &entry;
     const QexModel* model = drawing->model;
-    QexDrawing_BindMesh(
+    QexLeanState_BindMesh(
         {model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
          model->scene.meshes[entry.mesh].attributes, &drawing->kept->vertexArrays[entry.mesh]},
         entry.variant->elements);
@@ -374,7 +374,7 @@ void QexModel_ReleaseLean(QexModel* model) {
     QexModelDrawing* kept = model->drawing;
     if (!kept) return;
     QexRenderState_Restore();
-    if (kept->vertexArrays) QexDrawing_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
+    if (kept->vertexArrays) QexLeanState_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
     QexMemory_FreeArray(kept->entries);
     QexMemory_FreeArray(kept->places);
     QexMemory_FreeArray(kept->looks);

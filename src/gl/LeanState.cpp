@@ -1,5 +1,5 @@
 // The GL's state in lean drawing: textures by unit, vertices, buffers.
-#include "gl/Drawing.h"
+#include "gl/LeanState.h"
 
 #include "gl/Extensions.h"
 #include "Qex/renderer.h"
@@ -97,7 +97,7 @@ void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
 uint32_t g_QexLean = 0;
 uint32_t g_QexReadsErrors = 1;
 
-void QexDrawing_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
+void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
     const uint32_t elements = ElementsOf(mesh.attributes);
     SetConstants(needed & ~elements);
     if (s_VertexArrays && QexExtensions_Get()->bindVertexArray)
@@ -106,7 +106,7 @@ void QexDrawing_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
         BindBuffers(mesh, needed & elements);
 }
 
-void QexDrawing_Leave() {
+void QexLeanState_Leave() {
     if (s_State.vertexArray) QexExtensions_Get()->bindVertexArray(0);
     Enable(0);
     if (s_State.vertexBuffer) glBindBuffer(GL_ARRAY_BUFFER, 0);
@@ -115,18 +115,18 @@ void QexDrawing_Leave() {
     s_State.attributes = nullptr;
 }
 
-void QexDrawing_Forget() {
+void QexLeanState_Forget() {
     s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = 0;
     s_State.attributes = nullptr;
     s_State.enabled = s_State.constants = 0;
-    QexDrawing_ForgetTextures();
+    QexLeanState_ForgetTextures();
 }
 
-void QexDrawing_ForgetTextures() {
+void QexLeanState_ForgetTextures() {
     for (uint32_t i = 0; i < kUnits; ++i) s_State.texture2D[i] = s_State.textureCube[i] = kUnknown;
 }
 
-bool QexDrawing_HasTexture(GLenum target, GLuint name) {
+bool QexLeanState_HasTexture(GLenum target, GLuint name) {
     const uint32_t unit = g_QexCachedRenderStates.activeTexture - GL_TEXTURE0;
     if (unit >= kUnits) return false;
     GLuint* bound = target == GL_TEXTURE_2D ? &s_State.texture2D[unit] : &s_State.textureCube[unit];
@@ -135,21 +135,21 @@ bool QexDrawing_HasTexture(GLenum target, GLuint name) {
     return has;
 }
 
-void QexDrawing_BindTexture(uint32_t unit, GLenum target, GLuint name) {
+void QexLeanState_BindTexture(uint32_t unit, GLenum target, GLuint name) {
     if ((target == GL_TEXTURE_2D ? s_State.texture2D : s_State.textureCube)[unit] == name) return;
     QexRenderState_ActiveTexture(GL_TEXTURE0 + unit);
     QexRenderState_Bind(target, name);
 }
 
-bool QexDrawing_NearerIsSeen() {
+bool QexLeanState_NearerIsSeen() {
     return s_DepthFunction == QEX_DEPTH_LESS || s_DepthFunction == QEX_DEPTH_LESS_EQUAL;
 }
 
-void QexDrawing_SetDepthFunction(uint32_t mode) {
+void QexLeanState_SetDepthFunction(uint32_t mode) {
     s_DepthFunction = mode;
 }
 
-void QexDrawing_DeleteVertexArrays(uint32_t count, GLuint* names) {
+void QexLeanState_DeleteVertexArrays(uint32_t count, GLuint* names) {
     for (uint32_t i = 0; i < count; ++i)
         if (names[i]) QexExtensions_Get()->deleteVertexArrays(1, &names[i]);
 }
@@ -177,7 +177,7 @@ void QexRenderer_AllowVertexArrays(int32_t allowed) {
 }
 
 void QexRenderState_Restore(void) {
-    if (g_QexLean) QexDrawing_Leave();
+    if (g_QexLean) QexLeanState_Leave();
 }
 
 void QexRenderer_CheckErrors(void) {

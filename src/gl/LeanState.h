@@ -2,7 +2,7 @@
 //
 // Described drawing makes every call and unbinds what it has bound. Lean drawing leaves programs, textures,
 // vertices and buffers as they are after a draw. What is drawn in the described way while lean drawing is on
-// begins with QexDrawing_Leave, which puts vertex arrays and buffers where described drawing expects them.
+// begins with QexLeanState_Leave, which puts vertex arrays and buffers where described drawing expects them.
 #pragma once
 
 #include "gl/GL.h"
@@ -10,7 +10,7 @@
 
 extern uint32_t g_QexLean;  // whether lean drawing is on
 
-inline bool QexDrawing_IsLean() {
+inline bool QexLeanState_IsLean() {
     return g_QexLean;
 }
 
@@ -23,26 +23,26 @@ struct QexMeshBuffers {
 };
 
 // Feeds the elements in `needed`, bits by number, from a mesh; those that it lacks are (0, 0, 0, 1).
-void QexDrawing_BindMesh(const QexMeshBuffers& mesh, uint32_t needed);
+void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed);
 
 // Puts vertex array object, attribute arrays and buffers where described drawing has them.
-void QexDrawing_Leave();
+void QexLeanState_Leave();
 
-// Nothing is known any more; the GL's vertex arrays are as QexDrawing_Leave leaves them.
-void QexDrawing_Forget();
+// Nothing is known any more; the GL's vertex arrays are as QexLeanState_Leave leaves them.
+void QexLeanState_Forget();
 
 // Whether a texture is bound on the active unit; if not, it is taken to be from now on.
-bool QexDrawing_HasTexture(GLenum target, GLuint name);
+bool QexLeanState_HasTexture(GLenum target, GLuint name);
 
 // Binds a texture to a unit, unless it is bound there.
-void QexDrawing_BindTexture(uint32_t unit, GLenum target, GLuint name);
+void QexLeanState_BindTexture(uint32_t unit, GLenum target, GLuint name);
 
 // The same name may soon be another texture's.
-void QexDrawing_ForgetTextures();
+void QexLeanState_ForgetTextures();
 
 // Whether the depth function chosen last lets the nearer of two be seen.
-bool QexDrawing_NearerIsSeen();
-void QexDrawing_SetDepthFunction(uint32_t mode);
+bool QexLeanState_NearerIsSeen();
+void QexLeanState_SetDepthFunction(uint32_t mode);
 
 // Deletes the objects of a model that goes. Names are 0 where there is none.
-void QexDrawing_DeleteVertexArrays(uint32_t count, GLuint* names);
+void QexLeanState_DeleteVertexArrays(uint32_t count, GLuint* names);
