@@ -299,6 +299,22 @@ QEX_API int32_t QexModel_UpdateCamera(QexModel* model, QexVec3* eye, QexVec3* ta
  *  @return 1, or 0 when the scene has no such camera. */
 QEX_API int32_t QexModel_GetCameraNearFar(const QexModel* model, float* zNear, float* zFar, uint32_t index);
 
+/** Draws a model many times in few draws: each mesh node of the pass once for each matrix, as if
+ *  QexModel_RenderWithCamera were called with it as modelMatrix, but node by node. Small meshes are put into
+ * buffers of their own as often as the vertex uniforms hold matrices (25 on the least GL), at the first call;
+ * instances outside the view are left out. Nodes on bones, with modules that receive shadows or that are the
+ * application's, and models with a texture hook are drawn one by one. Draws lean in either way of drawing.
+ *  @param lights    may be null
+ *  @param matrices  `count` matrices, affine: what their bottom rows hold beside (0, 0, 0, 1) does not count;
+ * null draws nothing
+ *  @param colours   `count` times red, green, blue, alpha, by which the diffuse texture's colour and the
+ * opacity are multiplied, without what is drawn one by one; null for white
+ *  @param count     of instances
+ *  @param pass      as in QexModel_RenderWithCamera. Needs a current GL context. */
+QEX_API void QexModel_RenderInstances(QexModel* model, const QexLightSet* lights, const QexCamera* camera,
+                                      const QexMatrix* matrices, const float (*colours)[4], uint32_t count,
+                                      uint32_t pass);
+
 QEX_END
 
 #endif

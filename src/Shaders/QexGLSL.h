@@ -5,13 +5,17 @@
 // Where a vertex goes. Both families of modules, the static and the skinned ones, have placeVertex, which
 // puts the vertex on the screen, passes its texture coordinate on and returns its world position, and
 // worldVector, which turns a direction of the mesh into one of the world, not of length 1.
+// In the variants for instances they come from QEX_GLSL_INSTANCES, which stands in front.
+#define QEX_GLSL_VERTEX_ATTRIBUTES         \
+    "attribute highp vec3 inVertex;\n"     \
+    "attribute mediump vec2 inTexCoord;\n" \
+    "varying mediump vec2 fTexCoord;\n"
+
 #define QEX_GLSL_STATIC_VERTEX                              \
-    "attribute highp vec3 inVertex;\n"                      \
-    "attribute mediump vec2 inTexCoord;\n"                  \
+    "#ifndef QEX_INSTANCES\n" QEX_GLSL_VERTEX_ATTRIBUTES    \
+    "uniform highp mat4 mvpMatrix;\n"                       \
     "uniform highp mat4 transMatrix;\n"                     \
     "uniform highp mat3 normalMatrix;\n"                    \
-    "uniform highp mat4 mvpMatrix;\n"                       \
-    "varying mediump vec2 fTexCoord;\n"                     \
     "highp vec3 placeVertex() {\n"                          \
     "    fTexCoord = inTexCoord;\n"                         \
     "    gl_Position = mvpMatrix * vec4(inVertex, 1.0);\n"  \
@@ -19,6 +23,48 @@
     "}\n"                                                   \
     "highp vec3 worldVector(highp vec3 v) {\n"              \
     "    return normalMatrix * v;\n"                        \
+    "}\n"                                                   \
+    "#endif\n"
+
+// The same for modules without lights, which want no world.
+#define QEX_GLSL_UNLIT_VERTEX                              \
+    "#ifndef QEX_INSTANCES\n" QEX_GLSL_VERTEX_ATTRIBUTES   \
+    "uniform highp mat4 mvpMatrix;\n"                      \
+    "void placeVertex() {\n"                               \
+    "    fTexCoord = inTexCoord;\n"                        \
+    "    gl_Position = mvpMatrix * vec4(inVertex, 1.0);\n" \
+    "}\n"                                                  \
+    "#endif\n"
+
+// The mesh is there QEX_INSTANCES times, and inInstance says which one a vertex belongs to: each has the
+// first three rows of its matrix to the world, and a colour. A direction is turned by the matrix's cofactors,
+// which are its inverse's transpose times its determinant.
+#define QEX_GLSL_INSTANCES                                                                                \
+    QEX_GLSL_VERTEX_ATTRIBUTES                                                                            \
+    "attribute highp float inInstance;\n"                                                                 \
+    "uniform highp mat4 viewProjMatrix;\n"                                                                \
+    "uniform highp vec4 instanceRows[3 * QEX_INSTANCES];\n"                                               \
+    "#ifdef QEX_INSTANCE_COLOURS\n"                                                                       \
+    "uniform lowp vec4 instanceColours[QEX_INSTANCES];\n"                                                 \
+    "varying lowp vec4 fInstanceColour;\n"                                                                \
+    "#endif\n"                                                                                            \
+    "highp vec3 placeVertex() {\n"                                                                        \
+    "    int i = int(inInstance);\n"                                                                      \
+    "    highp vec4 v = vec4(inVertex, 1.0);\n"                                                           \
+    "    highp vec3 p = vec3(dot(instanceRows[3 * i], v), dot(instanceRows[3 * i + 1], v),\n"             \
+    "                        dot(instanceRows[3 * i + 2], v));\n"                                         \
+    "#ifdef QEX_INSTANCE_COLOURS\n"                                                                       \
+    "    fInstanceColour = instanceColours[i];\n"                                                         \
+    "#endif\n"                                                                                            \
+    "    fTexCoord = inTexCoord;\n"                                                                       \
+    "    gl_Position = viewProjMatrix * vec4(p, 1.0);\n"                                                  \
+    "    return p;\n"                                                                                     \
+    "}\n"                                                                                                 \
+    "highp vec3 worldVector(highp vec3 v) {\n"                                                            \
+    "    int i = 3 * int(inInstance);\n"                                                                  \
+    "    highp vec3 x = instanceRows[i].xyz, y = instanceRows[i + 1].xyz, z = instanceRows[i + 2].xyz;\n" \
+    "    highp vec3 yz = cross(y, z);\n"                                                                  \
+    "    return sign(dot(x, yz)) * vec3(dot(yz, v), dot(cross(z, x), v), dot(cross(x, y), v));\n"         \
     "}\n"
 
 // A vertex follows boneCount bones, and the bone matrices lead straight into the world.
@@ -86,30 +132,43 @@
     "    return sum;\n" \
     "}\n"
 
-// The diffuse texture's colour, white in the variants for nodes without one.
-#define QEX_GLSL_TEXEL                                 \
-    "varying mediump vec2 fTexCoord;\n"                \
-    "#ifdef QEX_NO_TEXTURE\n"                          \
-    "#define texel() vec4(1.0)\n"                      \
-    "#else\n"                                          \
-    "uniform sampler2D sTexture;\n"                    \
-    "#define texel() texture2D(sTexture, fTexCoord)\n" \
+// The diffuse texture's colour, white in the variants for nodes without one, in the instance's colour.
+#define QEX_GLSL_TEXEL                                           \
+    "varying mediump vec2 fTexCoord;\n"                          \
+    "#ifdef QEX_INSTANCE_COLOURS\n"                              \
+    "varying lowp vec4 fInstanceColour;\n"                       \
+    "#define tinted(c) (vec4(fInstanceColour.rgb, 1.0) * (c))\n" \
+    "#else\n"                                                    \
+    "#define tinted(c) (c)\n"                                    \
+    "#endif\n"                                                   \
+    "#ifdef QEX_NO_TEXTURE\n"                                    \
+    "#define texel() tinted(vec4(1.0))\n"                        \
+    "#else\n"                                                    \
+    "uniform sampler2D sTexture;\n"                              \
+    "#define texel() tinted(texture2D(sTexture, fTexCoord))\n"   \
     "#endif\n"
 
 // Opacity times `source`, 0 up to the threshold. In the variants for nodes whose alpha is the same
-// everywhere, that is what opacity holds.
-#define QEX_GLSL_ALPHA_OF(source)                         \
-    "uniform lowp float opacity;\n"                       \
-    "#ifdef QEX_CONSTANT_ALPHA\n"                         \
-    "#define surfaceAlpha() opacity\n"                    \
-    "#else\n"                                             \
-    "uniform lowp float alphaThreshold;\n"                \
-    "lowp float surfaceAlpha() {\n"                       \
-    "    lowp float alpha = opacity * " source            \
-    ";\n"                                                 \
-    "    return alpha <= alphaThreshold ? 0.0 : alpha;\n" \
-    "}\n"                                                 \
-    "#endif\n"
+// everywhere, that is what opacity holds; instances may each have an alpha of their own.
+#define QEX_GLSL_ALPHA_OF(source)                                        \
+    "uniform lowp float opacity;\n"                                      \
+    "uniform lowp float alphaThreshold;\n"                               \
+    "lowp float aboveThreshold(lowp float alpha) {\n"                    \
+    "    return alpha <= alphaThreshold ? 0.0 : alpha;\n"                \
+    "}\n"                                                                \
+    "lowp float surfaceAlpha() {\n"                                      \
+    "#if defined(QEX_CONSTANT_ALPHA) && defined(QEX_INSTANCE_COLOURS)\n" \
+    "    return aboveThreshold(opacity * fInstanceColour.a);\n"          \
+    "#elif defined(QEX_CONSTANT_ALPHA)\n"                                \
+    "    return opacity;\n"                                              \
+    "#elif defined(QEX_INSTANCE_COLOURS)\n"                              \
+    "    return aboveThreshold(opacity * fInstanceColour.a * " source    \
+    ");\n"                                                               \
+    "#else\n"                                                            \
+    "    return aboveThreshold(opacity * " source                        \
+    ");\n"                                                               \
+    "#endif\n"                                                           \
+    "}\n"
 
 // Colour and alpha of the modules with an alpha texture.
 #define QEX_GLSL_ALPHA                  \

@@ -58,6 +58,10 @@ QexProgramNames NamesOf(QexShaderModule* module) {
 
 }  // namespace
 
+const QexPODMaterial* QexShaderModule_MaterialOf(const QexModel* model, int32_t index) {
+    return index < 0 ? &kNoMaterial : &model->scene.materials[index];
+}
+
 const char* QexShaderModule_UniformName(uint8_t uniform) {
     return kUniformNames[uniform];
 }
@@ -135,8 +139,7 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
     if (nodeIndex >= model->scene.meshNodeCount || !model->vertexBuffers) return false;
     QexPODNode* node = &model->scene.nodes[nodeIndex];
     if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return false;
-    const QexPODMaterial* material =
-        node->materialIndex < 0 ? &kNoMaterial : &model->scene.materials[node->materialIndex];
+    const QexPODMaterial* material = QexShaderModule_MaterialOf(model, node->materialIndex);
     *draw = {type, module, model, nodeIndex, node, QexPODModel_MeshOf(&model->scene, nodeIndex), material};
     QexRenderState_UseProgram(module->program);
     return true;

@@ -53,6 +53,8 @@
     X(blurSize)                \
     X(horizontal_or_vertical)  \
     X(samples)                 \
+    X(instanceRows)            \
+    X(instanceColours)         \
     X(focus)                   \
     X(range)
 
@@ -107,6 +109,9 @@ struct QexShaderModuleType {
     bool isCaster = false;    // draws what throws shadows, in the pass from the light
     uint32_t traits = 0;      // kTrait...
 };
+
+// The material of that number; below 0 an opaque white one, which nodes without material are drawn with.
+const QexPODMaterial* QexShaderModule_MaterialOf(const QexModel* model, int32_t index);
 
 // The names of a uniform, of the attribute that a vertex element feeds, of a texture unit's sampler.
 const char* QexShaderModule_UniformName(uint8_t uniform);

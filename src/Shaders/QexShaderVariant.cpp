@@ -1,12 +1,14 @@
 // Building variants, and giving them what is new.
 #include "Shaders/QexShaderVariant.h"
 
+#include <cstdio>
 #include <cstring>
 
 #include "base/Memory.h"
 #include "gl/Program.h"
 #include "Qex/base.h"
 #include "Qex/renderer.h"
+#include "Shaders/QexGLSL.h"
 #include "Shaders/QexLitShader.h"
 
 #define QEX_MODULE (variant->type->path)
@@ -26,13 +28,22 @@ TypeVariants s_Types[kMaxTypes];
 uint32_t s_Generation = 1;
 QexShaderFrame s_Frame;
 
-// In the order of the flags.
-const char* const kDefines[kShaderVariants] = {
-    "",
-    "#define QEX_NO_TEXTURE\n",
-    "#define QEX_CONSTANT_ALPHA\n",
-    "#define QEX_NO_TEXTURE\n#define QEX_CONSTANT_ALPHA\n",
-};
+// In the order of the flags' bits.
+const char* const kDefines[] = {"#define QEX_NO_TEXTURE\n", "#define QEX_CONSTANT_ALPHA\n", nullptr,
+                                "#define QEX_INSTANCE_COLOURS\n"};
+
+// The lines in front of a variant's sources.
+void WriteDefines(char* out, size_t size, uint32_t flags) {
+    out[0] = 0;
+    for (uint32_t bit = 0; flags >> bit; ++bit) {
+        const size_t used = strlen(out);
+        if (!(flags >> bit & 1)) continue;
+        if (kDefines[bit])
+            snprintf(out + used, size - used, "%s", kDefines[bit]);
+        else
+            snprintf(out + used, size - used, "#define QEX_INSTANCES %u\n", QexShaderVariant_MaxInstances());
+    }
+}
 
 TypeVariants* Find(const QexShaderModuleType* type) {
     for (TypeVariants& row : s_Types)
@@ -51,21 +62,30 @@ void LookUp(QexShaderVariant* variant) {
     for (const uint8_t uniform : type->uniforms)
         if (uniform != kUniform_none)
             variant->locations[uniform] = lookup.Uniform(QexShaderModule_UniformName(uniform));
+    const uint8_t instances[] = {kUniform_viewProjMatrix, kUniform_instanceRows, kUniform_instanceColours};
+    for (const uint8_t uniform : instances)
+        if (variant->flags & kVariantInstances)
+            variant->locations[uniform] = lookup.Uniform(QexShaderModule_UniformName(uniform));
     for (const uint8_t unit : type->units) lookup.SetSampler({QexShaderModule_SamplerName(unit), unit});
 }
 
 bool Build(QexShaderVariant* variant) {
     const QexShaderModuleType* type = variant->type;
-    const char* names[QEX_ELEMENT_COUNT];
+    const char* names[kInstanceAttribute + 1];
+    char defines[160];
     for (uint8_t i = 0; i < QEX_ELEMENT_COUNT; ++i) names[i] = QexShaderModule_AttributeName(i);
+    names[kInstanceAttribute] = "inInstance";
+    WriteDefines(defines, sizeof defines, variant->flags);
     for (const uint8_t element : type->attributes) variant->elements |= 1u << element;
     // Without a texture there is nothing to look up at a coordinate.
     const uint32_t bare = kVariantNoTexture | kVariantConstantAlpha;
     if ((variant->flags & bare) == bare && !(type->traits & kTraitNormalMap))
         variant->elements &= ~(1u << QEX_ELEMENT_UV0);
-    if (!QexProgram_Build({type->path, type->vertexSource, type->fragmentSource, names, QEX_ELEMENT_COUNT,
-                           kDefines[variant->flags]},
-                          NamesOf(variant)))
+    if (variant->flags & kVariantInstances) variant->elements |= 1u << kInstanceAttribute;
+    if (!QexProgram_Build(
+            {type->path, type->vertexSource, type->fragmentSource, names, kInstanceAttribute + 1, defines,
+             variant->flags & kVariantInstances ? QEX_GLSL_INSTANCES : nullptr},
+            NamesOf(variant)))
         return false;
     LookUp(variant);
     return true;
@@ -170,6 +190,15 @@ const QexShaderModuleType* QexShaderVariant_TypeOf(const QexShaderModule* module
     return nullptr;
 }
 
+uint32_t QexShaderVariant_MaxInstances() {
+    static const uint32_t kMost = 128, kOthers = 28, kEach = 4;  // vectors: of other uniforms, of an instance
+    GLint vectors = 0;
+    glGetIntegerv(GL_MAX_VERTEX_UNIFORM_VECTORS, &vectors);
+    const uint32_t room = vectors > 0 ? static_cast<uint32_t>(vectors) : 0;
+    const uint32_t count = room > kOthers ? (room - kOthers) / kEach : 0;
+    return count < kMost ? count : kMost;
+}
+
 uint32_t QexShaderVariant_Generation() {
     return s_Generation;
 }
@@ -201,7 +230,8 @@ void QexShaderVariant_Surface(const QexShaderVariant* variant, const QexShaderMo
     out->shininess = material->shininess * 256.0f;
     out->opacity = material->opacity * g_fQexGlobalAlpha;
     out->threshold = parameters[0].value;
-    if (variant->flags & kVariantConstantAlpha && out->opacity <= out->threshold) out->opacity = 0;
+    const bool constant = variant->flags & kVariantConstantAlpha && !(variant->flags & kVariantColours);
+    if (constant && out->opacity <= out->threshold) out->opacity = 0;
     out->shadowFade = type->traits & kTraitShadowFade ? parameters[1].value : 0;
     const bool displaced = type->traits & kTraitDisplaced;
     for (int i = 0; i < 2; ++i) out->displacement[i] = displaced ? parameters[i - 2].value : 0;

@@ -12,8 +12,16 @@
 enum QexShaderVariantFlag : uint32_t {
     kVariantNoTexture = 1,      // the diffuse texture is white
     kVariantConstantAlpha = 2,  // alpha is the same for all of a node
-    kShaderVariants = 4
+    kVariantInstances = 4,      // several of a mesh in one draw, each with a matrix of its own
+    kVariantColours = 8,        // and with a colour; with kVariantInstances only
+    kShaderVariants = 16
 };
+
+// The attribute that says which instance a vertex belongs to, behind the elements of meshes.
+constexpr uint32_t kInstanceAttribute = QEX_ELEMENT_COUNT;
+
+// How many instances a draw can have: what the vertex uniforms hold.
+uint32_t QexShaderVariant_MaxInstances();
 
 // What the nodes of a call share. Stamps change with what they stand for.
 struct QexShaderFrame {

@@ -8,14 +8,9 @@
 
 #define QEX_MODULE (type->path)
 
-const char* const kQexTextureVertexSource = R"(
-attribute highp vec3 inVertex;
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 mvpMatrix;
-varying mediump vec2 fTexCoord;
+const char* const kQexTextureVertexSource = QEX_GLSL_UNLIT_VERTEX R"(
 void main() {
-    fTexCoord = inTexCoord;
-    gl_Position = mvpMatrix * vec4(inVertex, 1.0);
+    placeVertex();
 }
 )";
 

@@ -4,20 +4,17 @@
 #include "Qex/math.h"
 #include "Qex/pod.h"
 #include "Qex/shader_modules.h"
+#include "Shaders/QexGLSL.h"
 #include "Shaders/QexTextureShader.h"
 
 #define QEX_MODULE (draw.type->path)
 
 // A shift may be animated past 1 for long; low precision would not hold it.
-const char* const kQexUVDisplacementVertexSource = R"(
-attribute highp vec3 inVertex;
-attribute mediump vec2 inTexCoord;
-uniform highp mat4 mvpMatrix;
+const char* const kQexUVDisplacementVertexSource = QEX_GLSL_UNLIT_VERTEX R"(
 uniform mediump vec2 displacement;
-varying mediump vec2 fTexCoord;
 void main() {
+    placeVertex();
     fTexCoord = inTexCoord + displacement;
-    gl_Position = mvpMatrix * vec4(inVertex, 1.0);
 }
 )";
 

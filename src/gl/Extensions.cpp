@@ -4,6 +4,7 @@
 #include <cstring>
 
 #if defined(__EMSCRIPTEN__)
+#define GL_GLEXT_PROTOTYPES
 #include <GLES2/gl2ext.h>
 #else
 #include <dlfcn.h>

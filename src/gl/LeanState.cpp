@@ -10,13 +10,13 @@ namespace {
 
 constexpr uint32_t kUnits = 8;  // that every GL has; further ones are not followed
 constexpr GLuint kUnknown = UINT32_MAX;
-constexpr uint32_t kAllElements = (1u << QEX_ELEMENT_COUNT) - 1;
 
 struct {
     GLuint texture2D[kUnits], textureCube[kUnits];
     GLuint vertexArray;   // 0: the vertices are those below
     GLuint vertexBuffer;  // of the attribute pointers
     GLuint indexBuffer;
+    uint32_t pointed;    // attributes that point there
     uint32_t enabled;    // arrays
     uint32_t constants;  // attributes whose value, where there is no array, is (0, 0, 0, 1)
     const QexVertexAttribute* attributes;
@@ -54,10 +54,10 @@ void SetConstants(uint32_t elements) {
     s_State.constants |= missing;
 }
 
-uint32_t ElementsOf(const QexVertexAttribute* attributes) {
+uint32_t ElementsOf(const QexMeshBuffers& mesh) {
     uint32_t elements = 0;
-    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i)
-        if (attributes[i].componentCount) elements |= 1u << i;
+    for (uint32_t i = 0; i < mesh.attributeCount; ++i)
+        if (mesh.attributes[i].componentCount) elements |= 1u << i;
     return elements;
 }
 
@@ -80,11 +80,14 @@ void BindVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
 
 void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
     Enable(elements);
-    if (s_State.attributes != mesh.attributes || s_State.vertexBuffer != mesh.vertexBuffer) {
+    if (s_State.attributes != mesh.attributes || s_State.vertexBuffer != mesh.vertexBuffer)
+        s_State.pointed = 0;
+    if (elements & ~s_State.pointed) {
         glBindBuffer(GL_ARRAY_BUFFER, mesh.vertexBuffer);
-        SetPointers(mesh.attributes, elements);
+        SetPointers(mesh.attributes, elements & ~s_State.pointed);
         s_State.attributes = mesh.attributes;
         s_State.vertexBuffer = mesh.vertexBuffer;
+        s_State.pointed |= elements;
     }
     if (s_State.indexBuffer != mesh.indexBuffer) {
         glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, mesh.indexBuffer);
@@ -98,7 +101,7 @@ uint32_t g_QexLean = 0;
 uint32_t g_QexReadsErrors = 1;
 
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
-    const uint32_t elements = ElementsOf(mesh.attributes);
+    const uint32_t elements = ElementsOf(mesh);
     SetConstants(needed & ~elements);
     if (s_VertexArrays && QexExtensions_Get()->bindVertexArray)
         BindVertexArray(mesh, elements);

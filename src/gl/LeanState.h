@@ -17,8 +17,9 @@ inline bool QexLeanState_IsLean() {
 // A mesh's vertices in GL buffers. The elements of a mesh are the attributes of their own numbers.
 struct QexMeshBuffers {
     GLuint vertexBuffer;
-    GLuint indexBuffer;  // 0: none
-    const QexVertexAttribute* attributes;
+    GLuint indexBuffer;                    // 0: none
+    const QexVertexAttribute* attributes;  // by number
+    uint32_t attributeCount;
     GLuint* vertexArray;  // the object that holds all of it; made when first needed, 0 before
 };
 

@@ -29,13 +29,14 @@ void LogShader(const char* name, const char* what, uint32_t shader) {
     LogWords(name, what, length, shader, glGetShaderInfoLog);
 }
 
-// A stage of a program, with the prefix in front of its source.
-bool CompileStage(uint32_t* shader, const char* prefix, const char* source, GLenum stage) {
+// A stage of a program, with the prefixes in front of its source; without a first there is none.
+bool CompileStage(uint32_t* shader, const char* prefix, const char* second, const char* source,
+                  GLenum stage) {
     if (!prefix) return QexShader_Create(shader, source, stage) == 0;
-    const char* const pieces[] = {prefix, source};
+    const char* const pieces[] = {prefix, second ? second : "", source};
     GLint status = 0;
     *shader = glCreateShader(stage);
-    QEX_GL(glShaderSource(*shader, 2, pieces, nullptr));
+    QEX_GL(glShaderSource(*shader, 3, pieces, nullptr));
     QEX_GL(glCompileShader(*shader));
     QEX_GL(glGetShaderiv(*shader, GL_COMPILE_STATUS, &status));
     return status == GL_TRUE;
@@ -56,9 +57,10 @@ void QexProgram_LogFailure(const char* name, uint32_t vertexShader, uint32_t fra
 }
 
 bool QexProgram_Compile(const QexProgramSource& source, const QexProgramNames& names) {
-    const bool vertex = CompileStage(names.vertexShader, source.prefix, source.vertex, GL_VERTEX_SHADER);
+    const bool vertex =
+        CompileStage(names.vertexShader, source.prefix, source.vertexPrefix, source.vertex, GL_VERTEX_SHADER);
     const bool fragment =
-        CompileStage(names.fragmentShader, source.prefix, source.fragment, GL_FRAGMENT_SHADER);
+        CompileStage(names.fragmentShader, source.prefix, nullptr, source.fragment, GL_FRAGMENT_SHADER);
     if (QexShader_CreateProgram(names.program, *names.vertexShader, *names.fragmentShader, source.attributes,
                                 source.attributeCount, nullptr) == 0 &&
         vertex && fragment)

@@ -12,7 +12,8 @@ struct QexProgramSource {
     const char* fragment;
     const char* const* attributes;  // at locations 0, 1, ...; null: where the linker puts them
     int32_t attributeCount;
-    const char* prefix = nullptr;  // lines in front of both sources, or null
+    const char* prefix = nullptr;        // lines in front of both sources, or null
+    const char* vertexPrefix = nullptr;  // more of them in front of the vertex shader's, with a prefix only
 };
 
 // Where the GL names of a program and its shaders are kept.

@@ -20,68 +20,14 @@ namespace {
 // What a material's opacity and textures allow.
 enum Look : uint8_t { kOpaque = 1, kTextured = 2, kAlphaTextured = 4 };
 
-// A mesh node as it was when the order was made.
-struct Entry {
-    uint32_t node;
-    uint32_t mesh;
-    int32_t material;  // below 0: none
-    uint32_t run;      // nodes of the same run may change places
-    QexShaderModule* module;
-    const QexShaderModuleType* type;  // null: drawn in the described way
-    uint32_t flags;                   // kVariant...
-    QexShaderVariant* variant;        // found when first drawn
-};
-
-}  // namespace
-
-// Beside a model: its nodes in the order in which they are drawn.
-struct QexModelDrawing {
-    uint32_t nodeCount, meshCount, materialCount;
-    uint32_t generation;  // of the variants
-    bool blends;          // whether the order is for blending, where what has alpha keeps its place
-    bool moved;           // whether the order is another than the scene's
-    Entry* entries;
-    uint32_t* places;  // of the nodes among them
-    uint8_t* looks;    // Look, of no material and of each material
-    GLuint* vertexArrays;
-};
-
-namespace {
-
-constexpr QexPODMaterial MakeWhite() {
-    QexPODMaterial material = {};
-    material.opacity = 1;
-    for (int i = 0; i < 3; ++i) {
-        material.ambient[i] = 0.3f;
-        material.diffuse[i] = 1;
-    }
-    return material;
-}
-
-// A call while it is drawn.
-struct Drawing {
-    QexModel* model;
-    QexModelDrawing* kept;
-    const QexLeanCall* call;
-    const QexShaderFrame* frame;
-    Float4x4 viewProjection;
-    const Entry* given;  // whose program, material and textures are set
-    const Entry* mesh;   // whose mesh is bound
-};
-
 // ---- Order ----
 
 QexTexture* TextureOf(QexTexture** textures, int32_t material) {
     return textures && material >= 0 ? textures[material] : nullptr;
 }
 
-const QexPODMaterial* MaterialOf(const QexModel* model, int32_t index) {
-    static constexpr QexPODMaterial kNone = MakeWhite();
-    return index < 0 ? &kNone : &model->scene.materials[index];
-}
-
 uint8_t LookOf(const QexModel* model, int32_t material) {
-    const bool opaque = MaterialOf(model, material)->opacity * g_fQexGlobalAlpha >= 1;
+    const bool opaque = QexShaderModule_MaterialOf(model, material)->opacity * g_fQexGlobalAlpha >= 1;
     return static_cast<uint8_t>((opaque ? kOpaque : 0) |
                                 (TextureOf(model->textures, material) ? kTextured : 0) |
                                 (TextureOf(model->alphaTextures, material) ? kAlphaTextured : 0));
@@ -101,7 +47,7 @@ uint32_t FlagsOf(const QexShaderModuleType* type, uint8_t look) {
 }
 
 int CompareEntries(const void* a, const void* b) {
-    const Entry &x = *static_cast<const Entry*>(a), &y = *static_cast<const Entry*>(b);
+    const QexLeanEntry &x = *static_cast<const QexLeanEntry*>(a), &y = *static_cast<const QexLeanEntry*>(b);
     const uint64_t keys[][2] = {
         {x.run, y.run},
         {reinterpret_cast<uintptr_t>(x.type), reinterpret_cast<uintptr_t>(y.type)},
@@ -117,7 +63,7 @@ int CompareEntries(const void* a, const void* b) {
 }
 
 // Whether a node hides what lies behind it. Modules with lights take alpha from both textures.
-bool Hides(const Entry& entry, uint8_t look) {
+bool Hides(const QexLeanEntry& entry, uint8_t look) {
     const uint32_t bare = kVariantConstantAlpha | (entry.type->traits & kTraitLit ? kVariantNoTexture : 0u);
     return look & kOpaque && (entry.flags & bare) == bare;
 }
@@ -129,7 +75,7 @@ void MakeOrder(QexModel* model, QexModelDrawing* kept) {
         kept->looks[i] = LookOf(model, static_cast<int32_t>(i) - 1);
     for (uint32_t i = 0; i < kept->nodeCount; ++i) {
         const QexPODNode& node = model->scene.nodes[i];
-        Entry& entry = kept->entries[i];
+        QexLeanEntry& entry = kept->entries[i];
         entry = {i,
                  static_cast<uint32_t>(node.objectIndex),
                  node.materialIndex,
@@ -159,7 +105,7 @@ bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
     for (uint32_t i = 0; i <= kept.materialCount; ++i)
         if (kept.looks[i] != LookOf(model, static_cast<int32_t>(i) - 1)) return false;
     for (uint32_t i = 0; i < kept.nodeCount; ++i) {
-        const Entry& entry = kept.entries[i];
+        const QexLeanEntry& entry = kept.entries[i];
         const QexPODNode& node = model->scene.nodes[entry.node];
         if (node.shader != entry.module || node.materialIndex != entry.material ||
             static_cast<uint32_t>(node.objectIndex) != entry.mesh)
@@ -189,7 +135,7 @@ QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
         kept->nodeCount = scene.meshNodeCount;
         kept->meshCount = scene.meshCount;
         kept->materialCount = scene.materialCount;
-        kept->entries = QexMemory_AllocZeroed<Entry>(kept->nodeCount);
+        kept->entries = QexMemory_AllocZeroed<QexLeanEntry>(kept->nodeCount);
         kept->places = QexMemory_AllocZeroed<uint32_t>(kept->nodeCount);
         kept->looks = QexMemory_AllocZeroed<uint8_t>(kept->materialCount + 1);
         kept->vertexArrays = QexMemory_AllocZeroed<GLuint>(kept->meshCount);
@@ -203,9 +149,9 @@ QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
     return kept;
 }
 
-// ---- Drawing ----
+// ---- QexLeanDrawing ----
 
-void DrawAsDescribed(Drawing* drawing, uint32_t node) {
+void DrawAsDescribed(QexLeanDrawing* drawing, uint32_t node) {
     const QexLeanCall& call = *drawing->call;
     QexModel* model = drawing->model;
     QexShaderModule* module = model->scene.nodes[node].shader;
@@ -224,7 +170,7 @@ void BindTexture(QexTexture* texture, uint32_t unit) {
     QexLeanState_BindTexture(unit, QexTexture_Target(texture), texture->glName);
 }
 
-void BindTextures(const Drawing& drawing, const Entry& entry) {
+void BindTextures(const QexLeanDrawing& drawing, const QexLeanEntry& entry) {
     const QexModel* model = drawing.model;
     const uint32_t traits = entry.type->traits;
     if (traits & kTraitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
@@ -241,45 +187,29 @@ void BindTextures(const Drawing& drawing, const Entry& entry) {
 }
 
 // Makes program, material and textures the entry's; false when its variant cannot be had.
-bool Give(Drawing* drawing, Entry* entry) {
-    const Entry* given = drawing->given;
+bool Give(QexLeanDrawing* drawing, QexLeanEntry* entry) {
+    const QexLeanEntry* given = drawing->given;
     if (given && given->variant == entry->variant && given->material == entry->material &&
         given->module == entry->module)
         return true;
     if (!entry->variant) entry->variant = QexShaderVariant_Get(entry->type, entry->flags);
     if (!entry->variant) return false;
-    QexShaderSurface surface;
-    QexShaderVariant_Surface(entry->variant, entry->module, MaterialOf(drawing->model, entry->material),
-                             &surface);
-    QexShaderVariant_Use(entry->variant, drawing->frame, surface);
-    BindTextures(*drawing, *entry);
-    drawing->given = entry;
+    QexLeanDrawing_Give(drawing, *entry, entry->variant);
     return true;
 }
 
-void BindMesh(Drawing* drawing, const Entry& entry) {
-    const Entry* bound = drawing->mesh;
+void BindMesh(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
+    const QexLeanEntry* bound = drawing->mesh;
     if (bound && bound->mesh == entry.mesh && bound->variant == entry.variant) return;
     drawing->mesh = &entry;
     const QexModel* model = drawing->model;
-    QexLeanState_BindMesh(
-        {model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
-         model->scene.meshes[entry.mesh].attributes, &drawing->kept->vertexArrays[entry.mesh]},
-        entry.variant->elements);
+    QexLeanState_BindMesh({model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
+                           model->scene.meshes[entry.mesh].attributes, QEX_ELEMENT_COUNT,
+                           &drawing->kept->vertexArrays[entry.mesh]},
+                          entry.variant->elements);
 }
 
-// Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
-// once, and rather kept than left out.
-bool IsOutside(const QexBoundingBox& box, const Float4x4& mvp) {
-    const QexVec3 &c = box.centre, &h = box.halfExtent;
-    const Float4 at = mvp.x * c.x + mvp.y * c.y + mvp.z * c.z + mvp.w;
-    const Float4 reach = Magnitude(mvp.x) * h.x + Magnitude(mvp.y) * h.y + Magnitude(mvp.z) * h.z;
-    const Float4 limit = Splat<3>(at) + Splat<3>(reach) + reach;
-    const Float4 over = Magnitude(at) - limit * 1.0001f;
-    return over[0] > 0 || over[1] > 0 || over[2] > 0;
-}
-
-void DrawStatic(Drawing* drawing, Entry* entry) {
+void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     QexPODModel* scene = &drawing->model->scene;
     const QexLeanCall& call = *drawing->call;
     const QexMatrix* world = QexPODAnimation_WorldMatrix(scene, &scene->nodes[entry->node]);
@@ -289,7 +219,7 @@ void DrawStatic(Drawing* drawing, Entry* entry) {
         world = &placed;
     }
     const Float4x4 mvp = Product(drawing->viewProjection, Load4x4(world->m));
-    if (IsOutside(scene->meshes[entry->mesh].localBox, mvp)) return;
+    if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh].localBox, mvp)) return;
     if (!Give(drawing, entry)) {
         DrawAsDescribed(drawing, entry->node);
         return;
@@ -312,7 +242,7 @@ void DrawStatic(Drawing* drawing, Entry* entry) {
     QexShaderModule_DrawFaces(entry->type, drawing->model, entry->mesh);
 }
 
-void DrawSkinned(Drawing* drawing, Entry* entry) {
+void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     if (!drawing->model->scene.meshes[entry->mesh].skinned) return;
     if (!Give(drawing, entry)) {
         DrawAsDescribed(drawing, entry->node);
@@ -326,7 +256,29 @@ void DrawSkinned(Drawing* drawing, Entry* entry) {
                                  at[kUniform_boneVecMatrixArray], drawing->call->modelMatrix});
 }
 
-void DrawEntry(Drawing* drawing, Entry* entry) {
+}  // namespace
+
+// Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
+// once, and rather kept than left out.
+bool QexLeanDrawing_IsOutside(const QexBoundingBox& box, const Float4x4& mvp) {
+    const QexVec3 &c = box.centre, &h = box.halfExtent;
+    const Float4 at = mvp.x * c.x + mvp.y * c.y + mvp.z * c.z + mvp.w;
+    const Float4 reach = Magnitude(mvp.x) * h.x + Magnitude(mvp.y) * h.y + Magnitude(mvp.z) * h.z;
+    const Float4 limit = Splat<3>(at) + Splat<3>(reach) + reach;
+    const Float4 over = Magnitude(at) - limit * 1.0001f;
+    return over[0] > 0 || over[1] > 0 || over[2] > 0;
+}
+
+void QexLeanDrawing_Give(QexLeanDrawing* drawing, const QexLeanEntry& entry, QexShaderVariant* variant) {
+    QexShaderSurface surface;
+    QexShaderVariant_Surface(variant, entry.module,
+                             QexShaderModule_MaterialOf(drawing->model, entry.material), &surface);
+    QexShaderVariant_Use(variant, drawing->frame, surface);
+    BindTextures(*drawing, entry);
+    drawing->given = &entry;
+}
+
+void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     QexPODNode* node = &drawing->model->scene.nodes[entry->node];
     if (!entry->type) {
         DrawAsDescribed(drawing, entry->node);
@@ -339,7 +291,7 @@ void DrawEntry(Drawing* drawing, Entry* entry) {
     (traits & kTraitSkinned ? DrawSkinned : DrawStatic)(drawing, entry);
 }
 
-bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call, bool anyOrder) {
+bool QexLeanDrawing_Begin(QexLeanDrawing* drawing, QexModel* model, const QexLeanCall& call, bool anyOrder) {
     if (!model->vertexBuffers) return false;
     QexModelDrawing* kept = Keep(model, anyOrder || model->scene.meshNodeCount < 2);
     if (!kept) return false;
@@ -348,32 +300,31 @@ bool Begin(Drawing* drawing, QexModel* model, const QexLeanCall& call, bool anyO
     return true;
 }
 
-}  // namespace
-
 void QexModel_DrawLean(QexModel* model, const QexLeanCall& call) {
-    Drawing drawing;
-    if (!Begin(&drawing, model, call, false)) return;
+    QexLeanDrawing drawing;
+    if (!QexLeanDrawing_Begin(&drawing, model, call, false)) return;
     const QexPODMesh* meshes = model->scene.meshes;
     const QexModelDrawing& kept = *drawing.kept;
     const bool inPlace = kept.moved && !DepthDecides();
     for (uint32_t i = 0; i < kept.nodeCount; ++i) {
-        Entry* entry = &kept.entries[inPlace ? kept.places[i] : i];
+        QexLeanEntry* entry = &kept.entries[inPlace ? kept.places[i] : i];
         if (meshes[entry->mesh].passID != call.pass) continue;
         if (call.wants && !call.wants(model, entry->node, call.mode)) continue;
-        DrawEntry(&drawing, entry);
+        QexLeanDrawing_Draw(&drawing, entry);
     }
 }
 
 void QexModel_DrawNodeLean(QexModel* model, uint32_t node, const QexLeanCall& call) {
-    Drawing drawing;
-    if (Begin(&drawing, model, call, true))
-        DrawEntry(&drawing, &drawing.kept->entries[drawing.kept->places[node]]);
+    QexLeanDrawing drawing;
+    if (QexLeanDrawing_Begin(&drawing, model, call, true))
+        QexLeanDrawing_Draw(&drawing, &drawing.kept->entries[drawing.kept->places[node]]);
 }
 
 void QexModel_ReleaseLean(QexModel* model) {
     QexModelDrawing* kept = model->drawing;
     if (!kept) return;
     QexRenderState_Restore();
+    QexModel_ReleaseInstances(kept);
     if (kept->vertexArrays) QexLeanState_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
     QexMemory_FreeArray(kept->entries);
     QexMemory_FreeArray(kept->places);

@@ -71,7 +71,7 @@ pod::Scene Overlapping(bool skinned) {
     for (int i = 0; i < 4; ++i) {
         const float f = static_cast<float>(i);
         scene.materials[static_cast<size_t>(i)].diffuse = {0.2f + 0.2f * f, 0.8f, 0.5f};
-        scene.nodes.push_back(pod::BuildNode("n", {{{4 * f, 3, f}}, {}, {}, {}}, -1, i % 2, i));
+        scene.nodes.push_back(pod::BuildNode("n", {{{4 * f, 3, f}}, {}, {}, {}}, -1, i / 2, i));
     }
     scene.meshNodeCount = 4;
     return scene;
@@ -256,6 +256,58 @@ TEST_F(LeanTest, ApplicationsMayCallGL) {
         "hooks and modules");
 }
 
+// Turned, mirrored, squeezed and out of the view, against one call for each.
+TEST_F(LeanTest, InstancesAreTheModelAtEachMatrix) {
+    const glm::mat4 one(1);
+    const std::vector<QexMatrix> places = {
+        ToQex(glm::scale(one, {0.3f, 0.3f, 1})),
+        ToQex(glm::scale(glm::translate(one, {120, 20, 3}), {-0.5f, 0.4f, 1})),
+        ToQex(glm::rotate(glm::scale(glm::translate(one, {60, 50, 6}), {0.3f, 0.2f, 2}), 0.5f, {0, 1, 1})),
+        ToQex(glm::translate(one, {500, 0, 0})),
+    };
+    const QexLightSet lights = TwoLights();
+    const QexCamera camera = PixelCamera();
+    const uint8_t texels[] = {255, 80, 30, 255, 90, 250, 20, 120, 10, 90, 255, 200, 255, 255, 90, 30};
+    ScopedTexture diffuse(2, 2, texels);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
+    for (const uint32_t kind :
+         {QEX_SHADER_TEXTURE, QEX_SHADER_UV_DISPLACEMENT, QEX_SHADER_GOURAUD, QEX_SHADER_GOURAUD_NORMALMAP,
+          QEX_SHADER_GOURAUD_SPECULAR, QEX_SHADER_GOURAUD_SHADOW, QEX_SHADER_SKINNING_TEXTURE}) {
+        const Module module(kind);
+        LoadedModel model(Overlapping(kind == QEX_SHADER_SKINNING_TEXTURE));
+        QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
+        QexShaders_SetShaderUVDisplacement(module.module, kind, 0.3f, 0.1f);
+        model.model.textures[1] = &diffuse;
+        Clear();
+        for (const QexMatrix& place : places)
+            QexModel_RenderWithCamera(&model.model, &lights, &camera, &place, 0);
+        const Picture single = Read();
+        for (const int32_t vertexArrays : {1, 0}) {
+            QexRenderer_AllowVertexArrays(vertexArrays);
+            Clear();
+            QexModel_RenderInstances(&model.model, &lights, &camera, places.data(), nullptr, 4, 0);
+            EXPECT_TRUE(SamePicture(Read(), single, 1)) << "module " << kind;
+        }
+        model.model.textures[1] = nullptr;
+    }
+    QexRenderer_AllowVertexArrays(1);
+    EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
+}
+
+TEST_F(LeanTest, InstancesHaveColours) {
+    LoadedModel model(SceneOf(pod::BuildMesh(Rectangle(0, 0, 10, 10))));
+    const QexCamera camera = PixelCamera();
+    const QexMatrix places[] = {ToQex(glm::mat4(1)), ToQex(glm::translate(glm::mat4(1), {50, 20, 0}))};
+    const float colours[][4] = {{1, 0.4f, 0.2f, 1}, {0.2f, 0.6f, 0.8f, 0.8f}};
+    model.Material().opacity = 0.75f;
+    Clear();
+    QexModel_RenderInstances(&model.model, nullptr, &camera, places, colours, 2, 0);
+    EXPECT_TRUE(Near(Read().Pixel(5, 90), {255, 102, 51, 191}, 1));
+    EXPECT_TRUE(Near(Read().Pixel(55, 70), {51, 153, 204, 153}, 1));
+    EXPECT_EQ(QexRenderer_GetDrawing(), QEX_DRAWING_DESCRIBED);
+    QexModel_RenderInstances(&model.model, nullptr, &camera, nullptr, nullptr, 2, 0);
+}
+
 class LeanCallsTest : public NullRenderTest {
   protected:
     static QexCamera Camera() {
@@ -324,6 +376,23 @@ TEST_F(LeanCallsTest, OneModelByItsMatrix) {
                   }
               }),
               400u);
+}
+
+TEST_F(LeanCallsTest, AThousandInstances) {
+    const QexCamera camera = Camera();
+    const QexLightSet lights = TwoLights();
+    const Module module(QEX_SHADER_GOURAUD);
+    LoadedModel model(scenes::Grid(1));
+    QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
+    std::vector<QexMatrix> places;
+    for (uint32_t i = 0; i < kNodes; ++i)
+        places.push_back(ToQex(glm::translate(glm::mat4(1), {i % 32, i / 32, 0})));
+    const auto draw = [&] {
+        QexModel_RenderInstances(&model.model, &lights, &camera, places.data(), nullptr, kNodes, 0);
+    };
+    EXPECT_LE(CallsOf(draw), 100u);
+    EXPECT_EQ(gltapCount("glDrawElements"), 40u) << "25 by 25 on a GL of 128 vectors";
+    EXPECT_EQ(CountAllocations(draw).made, 0);
 }
 
 TEST_F(LeanCallsTest, NodesOutsideTheViewAreNotDrawn) {
