@@ -153,8 +153,8 @@ TEST_F(ModuleTest, EveryVertexLayoutDrawsTheSamePicture) {
     };
     // Positions in halves, moved and doubled by the unpack matrix.
     pod::Mesh unpacked = apart(pod::kInt8, pod::kInt16, 1);
-    unpacked.vertices = IntegerElement(pod::kInt8, 3, {-2, 3, 0, 30, 3, 0, -2, 27, 0, 30, 27, 0});
-    unpacked.unpackMatrix = {2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 0, 20, 10, 0, 1};
+    unpacked.vertices = IntegerElement(pod::kInt8, 3, {-20, 3, 0, 12, 3, 0, -20, 27, 0, 12, 27, 0});
+    unpacked.unpackMatrix = {2, 0, 0, 0, 0, 2, 0, 0, 0, 0, 2, 0, 56, 10, 0, 1};
     pod::MeshArrays corners = Rectangle(16, 16, 80, 64), repeated;
     for (const uint32_t v : corners.indices) {
         repeated.positions.push_back(corners.positions[v]);

@@ -161,10 +161,11 @@ TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
 // What an application changes between frames, in records that are its own.
 TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
     ScopedTexture red({250, 20, 20, 255});
-    const Module lit(QEX_SHADER_GOURAUD);
+    const Module lit(QEX_SHADER_GOURAUD), other(QEX_SHADER_GOURAUD);
     const QexLightSet lights = TwoLights();
     const QexMatrix projection = PixelProjection();
     LoadedModel model(Overlapping(false));
+    QexShaders_SetShaderAlphaThreshold(other.module, other.kind, 0.95f);
     QexPODModel& scene = model.model.scene;
     const std::function<void()> changes[] = {
         [&] { model.Node(1).shader = lit.module; },
@@ -175,6 +176,8 @@ TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
         [&] { QexModel_ReplaceAlphaTextureByIdx(&model.model, &red, 1); },
         [&] { QexModel_SetNodePosition(&model.model, 0, 30, -2, 0); },
         [&] { model.Node(2).materialIndex = 1; },
+        [&] { model.Material(1).opacity = 0.92f; },
+        [&] { model.Node(2).shader = other.module; },
         [&] { model.Node(3).objectIndex = 0; },
         [&] { scene.nodes[1].stateFlags &= ~QEX_NODE_RENDERING_ENABLED; },
         [&] { QexShaders_SetShaderAlphaThreshold(lit.module, lit.kind, 0.9f); },
@@ -191,6 +194,7 @@ TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
                                               0);
             return Read();
         };
+        draw();
         const Picture picture = draw();
         QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
         EXPECT_TRUE(SamePicture(picture, draw(), 1)) << "change " << number;
