@@ -122,6 +122,7 @@ TEST_F(LeanTest, EveryModuleDrawsTheSame) {
         for (const bool blends : {true, false}) {
             if (!blends && kind != QEX_SHADER_GOURAUD) continue;
             QexRenderer_SetZTestFunc(blends ? QEX_DEPTH_LESS_EQUAL : QEX_DEPTH_ALWAYS);
+            model.Material(0).opacity = blends ? 1.0f : 0.3f;
             QexRenderer_SetAlphaBlendMode(blends ? QEX_BLEND_ALPHA : QEX_BLEND_NONE);
             ExpectSamePictures(
                 [&] {
@@ -203,6 +204,18 @@ TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
         ++number;
     }
     model.model.textures[0] = model.model.alphaTextures[1] = nullptr;
+}
+
+// Modules that go take their programs along, whatever is made in their place.
+TEST_F(LeanTest, ModulesComeAndGo) {
+    LoadedModel model(Overlapping(false));
+    QexShaderModule* const own = model.Node().shader;
+    for (int round = 0; round < 3; ++round) {
+        const Module lit(QEX_SHADER_GOURAUD);
+        QexModel_SetShaderProgramForAllNode(&model.model, lit.module, lit.module);
+        ExpectSamePictures([&] { model.Draw(); }, "round " + std::to_string(round));
+        QexModel_SetShaderProgramForAllNode(&model.model, own, own);
+    }
 }
 
 // Translucent nodes are drawn where they stand in the scene; the opaque ones around them may change places.
