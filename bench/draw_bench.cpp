@@ -1,5 +1,5 @@
-// Drawing 1,000 nodes with the texture module against the same GL calls replayed from a record, both under
-// the tap's null driver: what is left is the engine's own work.
+// Drawing 1,000 nodes with the texture module against the same GL calls replayed from a record, and lean
+// against described drawing, all under the tap's null driver: what is left is the engine's own work.
 #include <cstdlib>
 
 #include "BenchEngine.h"
@@ -28,8 +28,19 @@ int main(int argc, char** argv) {
     bench.Compare(
         "draw a node with the texture module / its GL calls", 1.3, draw, [&] { gltapReplay(recording); },
         kNodes);
+    const auto drawLean = [&] {
+        QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
+        draw();
+        QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
+    };
+    bench.Compare("draw a node lean / in the described way", 0.4, drawLean, draw, kNodes);
+    drawLean();
+    gltapResetCounts();
+    drawLean();
+    const uint64_t leanCalls = gltapCountAll();
     const int status = bench.Result();
-    printf("GL calls a node: %.1f\n", static_cast<double>(calls) / kNodes);
+    printf("GL calls a node: %.1f described, %.1f lean\n", static_cast<double>(calls) / kNodes,
+           static_cast<double>(leanCalls) / kNodes);
     gltapReleaseRecording(recording);
     return status;
 }

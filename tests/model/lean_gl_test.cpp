@@ -163,13 +163,15 @@ TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
 TEST_F(LeanTest, ChangesOfTheSceneAreSeen) {
     ScopedTexture red({250, 20, 20, 255});
     const Module lit(QEX_SHADER_GOURAUD), other(QEX_SHADER_GOURAUD);
-    const QexLightSet lights = TwoLights();
+    QexLightSet lights = TwoLights();
     const QexMatrix projection = PixelProjection();
     LoadedModel model(Overlapping(false));
     QexShaders_SetShaderAlphaThreshold(other.module, other.kind, 0.95f);
     QexPODModel& scene = model.model.scene;
     const std::function<void()> changes[] = {
         [&] { model.Node(1).shader = lit.module; },
+        [&] { lights.lights[1].colour[2] = 0.1f; },
+        [&] { lights.count = 1; },
         [&] { model.Material(2).opacity = 0.75f; },
         [&] { QexRenderer_SetGlobalAlpha(0.8f); },
         [&] { QexRenderer_SetGlobalAlpha(1); },
