@@ -3,6 +3,8 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "gl/LeanState.h"
+#include "overlay/Billboard.h"
 #include "Qex/base.h"
 #include "Qex/effects.h"
 #include "Qex/geometry.h"
@@ -191,8 +193,12 @@ void QexParticleEmitter_Draw(QexParticleEmitter* emitter, const QexCamera* camer
         const int32_t frames = FrameCount(p->animation);
         if (frames > 1)
             QexBillboard_SetTexture(billboard, p->animation->frames[Limited(p->frame, frames - 1)]);
-        QexBillboard_Draw(billboard, camera);
+        if (QexLeanState_IsLean() && camera)
+            QexBillboard_Queue(*billboard, *camera);
+        else
+            QexBillboard_Draw(billboard, camera);
     }
+    if (QexLeanState_IsLean()) QexBillboardBatch_Draw();
     QexRenderer_SetZWrite(1);
 }
 

@@ -284,6 +284,7 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
         QexSkyBox_Release();
         return -1;
     }
+    QexRenderState_Restore();
     QEX_GL(glGenBuffers(1, &s_SkyBuffer));
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, s_SkyBuffer));
     QEX_GL(glBufferData(GL_ARRAY_BUFFER, kSkyBytes, s_SkyVertices, GL_STATIC_DRAW));

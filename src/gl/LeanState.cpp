@@ -16,6 +16,7 @@ struct {
     GLuint vertexArray;   // 0: the vertices are those below
     GLuint vertexBuffer;  // of the attribute pointers
     GLuint indexBuffer;
+    GLuint streamed;     // the buffer that QexLeanState_Stream has left bound, 0: none
     uint32_t pointed;    // attributes that point there
     uint32_t enabled;    // arrays
     uint32_t constants;  // attributes whose value, where there is no array, is (0, 0, 0, 1)
@@ -74,6 +75,7 @@ void BindVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
         SetPointers(mesh.attributes, elements);
         // The array buffer is no part of the object.
         glBindBuffer(GL_ARRAY_BUFFER, 0);
+        s_State.streamed = 0;
     }
     s_State.vertexArray = *mesh.vertexArray;
 }
@@ -84,6 +86,7 @@ void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
         s_State.pointed = 0;
     if (elements & ~s_State.pointed) {
         glBindBuffer(GL_ARRAY_BUFFER, mesh.vertexBuffer);
+        s_State.streamed = 0;
         SetPointers(mesh.attributes, elements & ~s_State.pointed);
         s_State.attributes = mesh.attributes;
         s_State.vertexBuffer = mesh.vertexBuffer;
@@ -109,17 +112,23 @@ void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
         BindBuffers(mesh, needed & elements);
 }
 
+void QexLeanState_Stream(GLuint buffer, const void* data, size_t bytes) {
+    if (s_State.streamed != buffer) glBindBuffer(GL_ARRAY_BUFFER, buffer);
+    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), data, GL_STREAM_DRAW);
+    s_State.streamed = buffer;
+}
+
 void QexLeanState_Leave() {
     if (s_State.vertexArray) QexExtensions_Get()->bindVertexArray(0);
     Enable(0);
-    if (s_State.vertexBuffer) glBindBuffer(GL_ARRAY_BUFFER, 0);
+    if (s_State.vertexBuffer || s_State.streamed) glBindBuffer(GL_ARRAY_BUFFER, 0);
     if (s_State.indexBuffer) glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
-    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = 0;
+    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = s_State.streamed = 0;
     s_State.attributes = nullptr;
 }
 
 void QexLeanState_Forget() {
-    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = 0;
+    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = s_State.streamed = 0;
     s_State.attributes = nullptr;
     s_State.enabled = s_State.constants = 0;
     QexLeanState_ForgetTextures();

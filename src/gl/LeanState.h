@@ -32,6 +32,9 @@ void QexLeanState_Leave();
 // Nothing is known any more; the GL's vertex arrays are as QexLeanState_Leave leaves them.
 void QexLeanState_Forget();
 
+// Gives a buffer new contents, for one draw.
+void QexLeanState_Stream(GLuint buffer, const void* data, size_t bytes);
+
 // Whether a texture is bound on the active unit; if not, it is taken to be from now on.
 bool QexLeanState_HasTexture(GLenum target, GLuint name);
 

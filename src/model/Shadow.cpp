@@ -206,6 +206,7 @@ void QexModel_RenderFromShadowCamera(const QexMatrix* modelMatrix, const QexShad
                 DrawStatic(caster.model, node, modelMatrix, &info->lightViewProj);
         }
     }
+    QexRenderState_Restore();
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
 }

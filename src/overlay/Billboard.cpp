@@ -3,9 +3,12 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "gl/Program.h"
 #include "gl/Quad.h"
 #include "math/Float4.h"
+#include "overlay/Billboard.h"
+#include "overlay/BillboardBatch.h"
 #include "Qex/base.h"
 #include "Qex/geometry.h"
 #include "Qex/math.h"
@@ -134,7 +137,18 @@ bool HasPerspective(const QexMatrix& view) {
     return view.m[3] != 0 || view.m[7] != 0 || view.m[11] != 0;
 }
 
+void BuildAnyMVP(QexMatrix* out, const QexBillboard& b, const QexCamera& camera) {
+    const bool simple = b.mode == QEX_BILLBOARD_SCREEN && !HasPerspective(camera.viewMatrix);
+    (simple ? BuildScreenMVP : BuildMVP)(out, b, camera);
+}
+
 }  // namespace
+
+void QexBillboard_Queue(const QexBillboard& billboard, const QexCamera& camera) {
+    QexMatrix mvp;
+    BuildAnyMVP(&mvp, billboard, camera);
+    QexBillboardBatch_Add(billboard, mvp);
+}
 
 extern "C" {
 
@@ -179,9 +193,13 @@ void QexBillboard_SetTexture(QexBillboard* billboard, QexTexture* texture) {
 // Without error checks: a particle system draws hundreds of these.
 void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
     if (!billboard || !camera) return;
+    if (QexLeanState_IsLean()) {
+        QexBillboard_Queue(*billboard, *camera);
+        QexBillboardBatch_Draw();
+        return;
+    }
     QexMatrix mvp;
-    const bool simple = billboard->mode == QEX_BILLBOARD_SCREEN && !HasPerspective(camera->viewMatrix);
-    (simple ? BuildScreenMVP : BuildMVP)(&mvp, *billboard, *camera);
+    BuildAnyMVP(&mvp, *billboard, *camera);
     QexRenderState_UseProgram(g_BillboardShaderProgramID);
     glUniform1f(g_BillboardOpacityLoc, billboard->opacity);
     glUniform1f(g_BillboardAlphaThresholdLoc, kAlphaThreshold);
@@ -197,7 +215,9 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
 void QexBillboard_Release(QexBillboard* billboard) {
     if (!billboard) return;
     QexMemory_Free(billboard);
-    if (--g_BillboardCount == 0) QexProgram_Delete(kProgramNames, false);
+    if (--g_BillboardCount != 0) return;
+    QexProgram_Delete(kProgramNames, false);
+    QexBillboardBatch_Release();
 }
 
 }  // extern "C"

@@ -2,33 +2,16 @@
 #include <GLES2/gl2.h>
 
 #include "Scenes.h"
+#include "support/Capture.h"
 #include "support/RenderScenes.h"
 
 namespace {
 
-constexpr uint32_t kKinds[] = {QEX_SHADER_TEXTURE,
-                               QEX_SHADER_TEXTURE_NOALPHA,
-                               QEX_SHADER_UV_DISPLACEMENT,
-                               QEX_SHADER_GOURAUD,
-                               QEX_SHADER_GOURAUD_SHADOW,
-                               QEX_SHADER_GOURAUD_NORMALMAP,
-                               QEX_SHADER_GOURAUD_SPECULAR,
-                               QEX_SHADER_GOURAUD_SHADOW_EXT,
-                               QEX_SHADER_SKINNING_TEXTURE,
-                               QEX_SHADER_SKINNING_GOURAUD,
-                               QEX_SHADER_SKINNING_GOURAUD_NORMALMAP,
-                               QEX_SHADER_SKINNING_GOURAUD_SPECULAR,
-                               QEX_SHADER_SKINNING_TEXTURE_NOALPHA};
+constexpr uint32_t kLastKind = QEX_SHADER_GOURAUD_SHADOW_EXT;
 
 struct Lean {
     Lean() { QexRenderer_SetDrawing(QEX_DRAWING_LEAN); }
     ~Lean() { QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED); }
-};
-
-// Without vertex array objects: those of the GL are hidden, or they are not to be used.
-struct WithoutVertexArrays {
-    WithoutVertexArrays() { QexRenderer_AllowVertexArrays(0); }
-    ~WithoutVertexArrays() { QexRenderer_AllowVertexArrays(1); }
 };
 
 // An instance of a module, by number.
@@ -91,9 +74,10 @@ class LeanTest : public RenderTest {
         };
         const Picture described = picture();
         const Lean lean;
-        EXPECT_TRUE(SamePicture(picture(), described, 1)) << what;
-        const WithoutVertexArrays without;
-        EXPECT_TRUE(SamePicture(picture(), described, 1)) << what << ", without vertex array objects";
+        for (const int32_t vertexArrays : {0, 1}) {
+            QexRenderer_AllowVertexArrays(vertexArrays);
+            EXPECT_TRUE(SamePicture(picture(), described, 1)) << what << ", vertex arrays " << vertexArrays;
+        }
         EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
     }
 };
@@ -108,8 +92,9 @@ TEST_F(LeanTest, EveryModuleDrawsTheSame) {
     shadow.shadowSpaceMatrix = ToQex(glm::scale(glm::mat4(1), {0.01f, 0.01f, 0.5f}));
     shadow.shadowIntensity = 0.4f;
     shadow.shadowTexture = shadowMap.glName;
-    for (const uint32_t kind : kKinds) {
+    for (uint32_t kind = 1; kind <= kLastKind; ++kind) {
         const Module module(kind);
+        if (!module.module) continue;
         LoadedModel model(
             Overlapping(kind >= QEX_SHADER_SKINNING_TEXTURE && kind != QEX_SHADER_GOURAUD_SHADOW_EXT));
         QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
@@ -138,11 +123,23 @@ TEST_F(LeanTest, EveryModuleDrawsTheSame) {
 
 // Everything else that the engine draws, between nodes, in the same frame.
 TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
+    Capture log(STDERR_FILENO);
     ScopedTexture blue({20, 40, 250, 255});
     LoadedModel model(Overlapping(false));
     QexBillboard* billboard = QexBillboard_Create(&blue);
     billboard->position = {90, 20, 5};
     billboard->scale = {20, 20, 1};
+    QexParticleEmitter* emitter = QexParticleEmitter_Create();
+    emitter->animations[0].frames[0] = &blue;
+    emitter->animations[1] = {{nullptr}, 1, 1, 0};
+    emitter->animations[1].frames[0] = Qextexture_GetDefault();
+    emitter->animationCount = 2;
+    emitter->positionSpread = {40, 40, 10};
+    emitter->position = {60, 50, 0};
+    emitter->scaleMin = emitter->scaleMax = {9, 6, 1};
+    emitter->startOpacity = 0.8f;
+    emitter->currentRate = 20;
+    QexParticleEmitter_Update(emitter, 0, nullptr);
     const QexCamera camera = PixelCamera();
     ExpectSamePictures(
         [&] {
@@ -151,12 +148,14 @@ TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
             model.DrawNode(model.Node().shader, 1);
             QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
             QexBillboard_Draw(billboard, &camera);
+            QexParticleEmitter_Draw(emitter, &camera);
             glEnable(GL_CULL_FACE);
             model.Draw();
             glDisable(GL_CULL_FACE);
         },
         "a frame of many things");
     QexBillboard_Release(billboard);
+    QexParticleEmitter_Release(emitter);
 }
 
 // What an application changes between frames, in records that are its own.
@@ -412,6 +411,19 @@ TEST_F(LeanCallsTest, AThousandInstances) {
     EXPECT_LE(CallsOf(draw), 100u);
     EXPECT_EQ(gltapCount("glDrawElements"), 40u) << "25 by 25 on a GL of 128 vectors";
     EXPECT_EQ(CountAllocations(draw).made, 0);
+}
+
+TEST_F(LeanCallsTest, BillboardsOfAnEmitter) {
+    Capture log(STDERR_FILENO);
+    const QexCamera camera = Camera();
+    QexParticleEmitter* emitter = QexParticleEmitter_Create();
+    emitter->currentRate = 299;
+    QexParticleEmitter_Update(emitter, 0, nullptr);
+    ASSERT_EQ(emitter->particleCount, 299);
+    const Lean lean;
+    EXPECT_LE(CallsOf([&] { QexParticleEmitter_Draw(emitter, &camera); }), 10u);
+    EXPECT_EQ(gltapCount("glDrawElements"), 1u);
+    QexParticleEmitter_Release(emitter);
 }
 
 TEST_F(LeanCallsTest, NodesOutsideTheViewAreNotDrawn) {

@@ -1,4 +1,5 @@
 #include <cmath>
+#include <cstring>
 #include <map>
 #include <set>
 
@@ -9,13 +10,16 @@ namespace {
 
 using Floats = std::vector<float>;
 
-void ExpectNear(const float* actual, const Floats& expected, float tolerance = 1e-5f) {
-    ASSERT_NE(actual, nullptr);
+void ExpectNear(const Floats& actual, const Floats& expected, float tolerance = 1e-5f) {
     for (size_t i = 0; i < expected.size(); ++i)
         EXPECT_NEAR(actual[i], expected[i], tolerance) << "entry " << i;
 }
-void ExpectNear(const Floats& actual, const Floats& expected, float tolerance = 1e-5f) {
-    ExpectNear(actual.data(), expected, tolerance);
+// A scene's numbers lie in its file, wherever they begin.
+void ExpectNear(const float* actual, const Floats& expected, float tolerance = 1e-5f) {
+    ASSERT_NE(actual, nullptr);
+    Floats values(expected.size());
+    memcpy(values.data(), actual, values.size() * sizeof(float));
+    ExpectNear(values, expected, tolerance);
 }
 
 // A column, 0 to 2, of a node's rotation at a frame.
