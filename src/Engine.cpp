@@ -125,6 +125,7 @@ void QexEngine_Shutdown(QexRuntimeContext* context) {
 }
 
 void QexEngine_ShutdownForOwnerDraw(QexRuntimeContext* context) {
+    QexRenderState_Restore();
     QexFont_Release();
     QexTexture_ReleaseDefault();
     QexModel_ReleaseShader(1);

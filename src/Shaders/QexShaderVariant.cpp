@@ -210,14 +210,16 @@ void QexShaderVariant_Retain(const QexShaderModuleType* type) {
     if (!row) return;
     row->type = type;
     ++row->users;
+    ++s_Generation;
 }
 
 void QexShaderVariant_Release(const QexShaderModuleType* type) {
     TypeVariants* row = type ? Find(type) : nullptr;
-    if (!row || --row->users > 0) return;
+    if (!row) return;
+    ++s_Generation;
+    if (--row->users > 0) return;
     for (QexShaderVariant*& variant : row->variants) Delete(&variant);
     *row = {};
-    ++s_Generation;
 }
 
 void QexShaderVariant_Surface(const QexShaderVariant* variant, const QexShaderModule* module,

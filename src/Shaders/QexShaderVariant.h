@@ -62,7 +62,8 @@ QexShaderVariant* QexShaderVariant_Get(const QexShaderModuleType* type, uint32_t
 // module. The instance may have any Render, so that is what tells.
 const QexShaderModuleType* QexShaderVariant_TypeOf(const QexShaderModule* module);
 
-// How often variants were deleted: who keeps one asks whether it is still there.
+// Changes whenever an instance of a module comes or goes, and variants with it: who keeps one asks whether it
+// is still there.
 uint32_t QexShaderVariant_Generation();
 
 // Instances of modules count, so that the variants go with the last.

@@ -80,6 +80,7 @@ void QexExtensions_Forget() {
 extern "C" {
 
 void QexRenderer_SetGetProcAddress(QexGetProcAddress function) {
+    QexRenderState_Restore();
     s_GetProcAddress = function;
     QexExtensions_Forget();
 }

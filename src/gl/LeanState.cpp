@@ -163,7 +163,8 @@ void QexLeanState_SetDepthFunction(uint32_t mode) {
 
 void QexLeanState_DeleteVertexArrays(uint32_t count, GLuint* names) {
     for (uint32_t i = 0; i < count; ++i)
-        if (names[i]) QexExtensions_Get()->deleteVertexArrays(1, &names[i]);
+        if (names[i] && QexExtensions_Get()->deleteVertexArrays)
+            QexExtensions_Get()->deleteVertexArrays(1, &names[i]);
 }
 
 extern "C" {

@@ -87,8 +87,8 @@ const QexInstanceMesh* Prepare(QexLeanDrawing* drawing, uint32_t index) {
     const uint32_t fits = mesh->vertexCount ? kMostVertices / mesh->vertexCount : 0;
     const uint32_t most = QexShaderVariant_MaxInstances(), count = fits < most ? fits : most;
     QexMeshUpload upload = {};
-    made->failed =
-        count < 2 || !QexModelGeometry_Prepare(&upload, mesh, index) || !Fill(made, *mesh, upload, count);
+    made->failed = count < 2 || !mesh->attributes[QEX_ELEMENT_POSITION].componentCount ||
+                   !QexModelGeometry_Prepare(&upload, mesh, index) || !Fill(made, *mesh, upload, count);
     QexModelGeometry_Release(&upload);
     drawing->given = drawing->mesh = nullptr;
     return made->failed ? nullptr : made;
@@ -113,12 +113,17 @@ struct Instances {
 // Draws a node's instances in few draws; false when it cannot be drawn so.
 bool DrawTogether(QexLeanDrawing* drawing, QexLeanEntry* entry, const Instances& instances) {
     QexPODModel* scene = &drawing->model->scene;
-    if (!entry->type || !(entry->type->traits & kTraitStatic) || entry->type->traits & kTraitShadow)
+    if (!entry->type || !drawing->model->vertexBuffers || !(entry->type->traits & kTraitStatic) ||
+        entry->type->traits & kTraitShadow)
         return false;
     const QexInstanceMesh* mesh = Prepare(drawing, entry->mesh);
     const uint32_t flags = entry->flags | kVariantInstances | (instances.colours ? kVariantColours : 0u);
     QexShaderVariant* variant = mesh ? QexShaderVariant_Get(entry->type, flags) : nullptr;
-    if (!variant) return false;
+    if (!variant) {
+        drawing->given = nullptr;
+        return false;
+    }
+    QexLeanDrawing_MarkPass(drawing, *entry);
     QexLeanDrawing_Give(drawing, *entry, variant);
     QexLeanState_BindMesh({mesh->vertexBuffer, mesh->indexBuffer, mesh->attributes, kInstanceAttribute + 1,
                            &drawing->kept->instances[entry->mesh].vertexArray},
@@ -128,8 +133,7 @@ bool DrawTogether(QexLeanDrawing* drawing, QexLeanEntry* entry, const Instances&
     const Float4x4 local = Load4x4(world->m);
     for (uint32_t i = 0; i < instances.count; ++i) {
         const Float4x4 placed = Product(Load4x4(instances.matrices[i].m), local);
-        if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh].localBox,
-                                     Product(drawing->viewProjection, placed)))
+        if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh], Product(drawing->viewProjection, placed)))
             continue;
         QexMatrix m;
         Store4x4(m.m, placed);
@@ -167,8 +171,11 @@ void QexModel_RenderInstances(QexModel* model, const QexLightSet* lights, const 
     QexLeanDrawing drawing;
     g_VecEyePos = camera->eye;
     if (QexLeanDrawing_Begin(&drawing, model, call, false)) {
-        for (uint32_t e = 0; e < drawing.kept->nodeCount; ++e) {
-            QexLeanEntry* entry = &drawing.kept->entries[e];
+        const QexModelDrawing& kept = *drawing.kept;
+        // Colours may make what hides the rest translucent.
+        const bool inPlace = kept.moved && (!QexLeanDrawing_DepthDecides() || (colours && kept.blends));
+        for (uint32_t e = 0; e < kept.nodeCount; ++e) {
+            QexLeanEntry* entry = &kept.entries[inPlace ? kept.places[e] : e];
             const uint32_t state = model->scene.nodes[entry->node].stateFlags;
             if (model->scene.meshes[entry->mesh].passID != pass || !(state & QEX_NODE_RENDERING_ENABLED))
                 continue;

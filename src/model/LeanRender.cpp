@@ -110,17 +110,9 @@ bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
         if (node.shader != entry.module || node.materialIndex != entry.material ||
             static_cast<uint32_t>(node.objectIndex) != entry.mesh)
             return false;
-        if (entry.type && model->bindTextureHook) return false;
+        if (entry.type && (model->bindTextureHook || node.shader->render != entry.type->render)) return false;
     }
     return true;
-}
-
-// Whether what is nearer is seen, whatever is drawn first.
-bool DepthDecides() {
-    GLboolean writes = GL_FALSE;
-    if (!glIsEnabled(GL_DEPTH_TEST) || !QexLeanState_NearerIsSeen()) return false;
-    glGetBooleanv(GL_DEPTH_WRITEMASK, &writes);
-    return writes;
 }
 
 // What is kept of the model, in order; null when there is no memory for it.
@@ -160,8 +152,10 @@ void DrawAsDescribed(QexLeanDrawing* drawing, uint32_t node) {
     QexRenderState_Restore();
     module->render(module, model, node, call.lights, call.modelMatrix, call.view, call.projection,
                    call.shadow);
-    // A module or a hook of the application may have changed anything.
+    // A module or a hook of the application may have changed anything, and drawn lean itself.
+    QexRenderState_Restore();
     QexRenderState_Reset(nullptr);
+    QexShaderFrame_Set(call.view, call.projection, call.lights, call.shadow);
 }
 
 void BindTexture(QexTexture* texture, uint32_t unit) {
@@ -219,7 +213,7 @@ void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
         world = &placed;
     }
     const Float4x4 mvp = Product(drawing->viewProjection, Load4x4(world->m));
-    if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh].localBox, mvp)) return;
+    if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh], mvp)) return;
     if (!Give(drawing, entry)) {
         DrawAsDescribed(drawing, entry->node);
         return;
@@ -258,9 +252,28 @@ void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
 
 }  // namespace
 
+bool QexLeanDrawing_DepthDecides() {
+    GLboolean writes = GL_FALSE;
+    if (!glIsEnabled(GL_DEPTH_TEST) || !QexLeanState_NearerIsSeen()) return false;
+    glGetBooleanv(GL_DEPTH_WRITEMASK, &writes);
+    if (!writes || !glIsEnabled(GL_BLEND)) return writes;
+    // What adds to what is there shows wherever it stands.
+    GLint destination = 0;
+    glGetIntegerv(GL_BLEND_DST_RGB, &destination);
+    return destination == GL_ONE_MINUS_SRC_ALPHA;
+}
+
+void QexLeanDrawing_MarkPass(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
+    const uint32_t traits = entry.type->traits;
+    if (traits & kTraitAlphaTexture && !(entry.flags & kVariantConstantAlpha) && !(traits & kTraitKeepsPass))
+        drawing->model->scene.nodes[entry.node].blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
+}
+
 // Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
 // once, and rather kept than left out.
-bool QexLeanDrawing_IsOutside(const QexBoundingBox& box, const Float4x4& mvp) {
+bool QexLeanDrawing_IsOutside(const QexPODMesh& mesh, const Float4x4& mvp) {
+    const QexBoundingBox& box = mesh.localBox;
+    if (mesh.attributes[QEX_ELEMENT_POSITION].componentCount < 3) return false;  // it has no box
     const QexVec3 &c = box.centre, &h = box.halfExtent;
     const Float4 at = mvp.x * c.x + mvp.y * c.y + mvp.z * c.z + mvp.w;
     const Float4 reach = Magnitude(mvp.x) * h.x + Magnitude(mvp.y) * h.y + Magnitude(mvp.z) * h.z;
@@ -284,15 +297,12 @@ void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry) {
         DrawAsDescribed(drawing, entry->node);
         return;
     }
-    if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return;
-    const uint32_t traits = entry->type->traits;
-    if (traits & kTraitAlphaTexture && !(entry->flags & kVariantConstantAlpha) && !(traits & kTraitKeepsPass))
-        node->blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
-    (traits & kTraitSkinned ? DrawSkinned : DrawStatic)(drawing, entry);
+    if (!drawing->model->vertexBuffers || !(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return;
+    QexLeanDrawing_MarkPass(drawing, *entry);
+    (entry->type->traits & kTraitSkinned ? DrawSkinned : DrawStatic)(drawing, entry);
 }
 
 bool QexLeanDrawing_Begin(QexLeanDrawing* drawing, QexModel* model, const QexLeanCall& call, bool anyOrder) {
-    if (!model->vertexBuffers) return false;
     QexModelDrawing* kept = Keep(model, anyOrder || model->scene.meshNodeCount < 2);
     if (!kept) return false;
     const QexShaderFrame* frame = QexShaderFrame_Set(call.view, call.projection, call.lights, call.shadow);
@@ -305,7 +315,7 @@ void QexModel_DrawLean(QexModel* model, const QexLeanCall& call) {
     if (!QexLeanDrawing_Begin(&drawing, model, call, false)) return;
     const QexPODMesh* meshes = model->scene.meshes;
     const QexModelDrawing& kept = *drawing.kept;
-    const bool inPlace = kept.moved && !DepthDecides();
+    const bool inPlace = kept.moved && !QexLeanDrawing_DepthDecides();
     for (uint32_t i = 0; i < kept.nodeCount; ++i) {
         QexLeanEntry* entry = &kept.entries[inPlace ? kept.places[i] : i];
         if (meshes[entry->mesh].passID != call.pass) continue;

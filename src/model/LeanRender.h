@@ -76,7 +76,13 @@ void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry);
 void QexLeanDrawing_Give(QexLeanDrawing* drawing, const QexLeanEntry& entry, QexShaderVariant* variant);
 
 // Whether a mesh's box lies outside the view, rather kept than left out.
-bool QexLeanDrawing_IsOutside(const QexBoundingBox& box, const Float4x4& mvp);
+bool QexLeanDrawing_IsOutside(const QexPODMesh& mesh, const Float4x4& mvp);
+
+// Whether what is nearer is seen, whatever is drawn first.
+bool QexLeanDrawing_DepthDecides();
+
+// A node with an alpha texture is no opaque one from its first draw on.
+void QexLeanDrawing_MarkPass(QexLeanDrawing* drawing, const QexLeanEntry& entry);
 
 // Draws the nodes of the pass that the call wants.
 void QexModel_DrawLean(QexModel* model, const QexLeanCall& call);
