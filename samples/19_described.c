@@ -1,8 +1,7 @@
 /* Sample 19: described drawing, in which every function makes the GL calls that its description names and
  * looks for errors after each. The other samples draw lean. Take this way while a program is being written,
- * to have a GL error named where it happens, where GL calls are traced or counted against the descriptions,
- * and where code draws in between that knows of unbound buffers only. F8 would switch in a program of your
- * own: here the way changes every second, and the picture does not. */
+ * to have a GL error named where it happens, or where GL calls are traced. Here the way changes every second,
+ * and the picture does not. */
 #include "window.h"
 
 int main(int argc, char** argv) {

@@ -12,7 +12,6 @@ void QexLitShader_SendLights(const int32_t* locations, const QexLightSet& lights
 
 struct QexLitShaderType {
     QexShaderModuleType module;
-    uint32_t features;               // 0...
     uint8_t slots[kShaderUniforms];  // of the uniforms that the module has
 };
 

@@ -11,8 +11,6 @@
 #include "Shaders/QexGLSL.h"
 #include "Shaders/QexLitShader.h"
 
-#define QEX_MODULE (variant->type->path)
-
 namespace {
 
 constexpr uint32_t kMaxTypes = 16;  // there are 14 modules with variants
@@ -176,7 +174,6 @@ QexShaderVariant* QexShaderVariant_Get(const QexShaderModuleType* type, uint32_t
     if (variant) {
         variant->type = type;
         variant->flags = flags;
-        variant->boneCount = -1;
         if (Build(variant)) return variant;
         Delete(&variant);
     }

@@ -52,7 +52,6 @@ struct QexShaderVariant {
     uint32_t viewStamp, lightStamp, shadowStamp;
     bool hasSurface;
     QexShaderSurface surface;
-    int32_t boneCount;
 };
 
 // The variant of a module, built if need be; null when the GL does not build it.

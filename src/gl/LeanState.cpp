@@ -140,7 +140,7 @@ void QexLeanState_ForgetTextures() {
 
 bool QexLeanState_HasTexture(GLenum target, GLuint name) {
     const uint32_t unit = g_QexCachedRenderStates.activeTexture - GL_TEXTURE0;
-    if (unit >= kUnits) return false;
+    if (unit >= kUnits || (target != GL_TEXTURE_2D && target != GL_TEXTURE_CUBE_MAP)) return false;
     GLuint* bound = target == GL_TEXTURE_2D ? &s_State.texture2D[unit] : &s_State.textureCube[unit];
     const bool has = *bound == name;
     *bound = name;

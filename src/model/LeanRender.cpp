@@ -141,7 +141,7 @@ QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
     return kept;
 }
 
-// ---- QexLeanDrawing ----
+// ---- Drawing ----
 
 void DrawAsDescribed(QexLeanDrawing* drawing, uint32_t node) {
     const QexLeanCall& call = *drawing->call;
@@ -167,7 +167,7 @@ void BindTexture(QexTexture* texture, uint32_t unit) {
 void BindTextures(const QexLeanDrawing& drawing, const QexLeanEntry& entry) {
     const QexModel* model = drawing.model;
     const uint32_t traits = entry.type->traits;
-    if (traits & kTraitNormalMap) QexTexture_SetBlankNormalMap(kNormalMapUnit);
+    if (traits & kTraitNormalMap) BindTexture(QexTexture_GetBlankNormalMap(), kNormalMapUnit);
     if (traits & kTraitShadow) {
         const QexShadowInfo* shadow = drawing.call->shadow;
         QexLeanState_BindTexture(
@@ -203,6 +203,16 @@ void BindMesh(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
                           entry.variant->elements);
 }
 
+// Sets what the entry is drawn with; where its variant cannot be had, draws it in the described way: false.
+bool BeginNode(QexLeanDrawing* drawing, QexLeanEntry* entry) {
+    if (!Give(drawing, entry)) {
+        DrawAsDescribed(drawing, entry->node);
+        return false;
+    }
+    BindMesh(drawing, *entry);
+    return true;
+}
+
 void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     QexPODModel* scene = &drawing->model->scene;
     const QexLeanCall& call = *drawing->call;
@@ -214,11 +224,7 @@ void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     }
     const Float4x4 mvp = Product(drawing->viewProjection, Load4x4(world->m));
     if (QexLeanDrawing_IsOutside(scene->meshes[entry->mesh], mvp)) return;
-    if (!Give(drawing, entry)) {
-        DrawAsDescribed(drawing, entry->node);
-        return;
-    }
-    BindMesh(drawing, *entry);
+    if (!BeginNode(drawing, entry)) return;
     const int32_t* at = entry->variant->locations;
     QexMatrix matrix;
     Store4x4(matrix.m, mvp);
@@ -238,11 +244,7 @@ void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
 
 void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     if (!drawing->model->scene.meshes[entry->mesh].skinned) return;
-    if (!Give(drawing, entry)) {
-        DrawAsDescribed(drawing, entry->node);
-        return;
-    }
-    BindMesh(drawing, *entry);
+    if (!BeginNode(drawing, entry)) return;
     const int32_t* at = entry->variant->locations;
     const bool lit = entry->type->traits & kTraitLit;
     QexShaderModule_DrawBatches(entry->type, drawing->model, entry->node,

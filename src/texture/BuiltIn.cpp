@@ -81,6 +81,10 @@ void FillFace(uint8_t* texels, uint32_t face, int32_t size) {
 
 }  // namespace
 
+QexTexture* QexTexture_GetBlankNormalMap() {
+    return &s_BlankNormalMap;
+}
+
 extern "C" {
 
 QexTexture* Qextexture_GetDefault(void) {

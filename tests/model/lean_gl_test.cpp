@@ -230,7 +230,6 @@ TEST_F(LeanTest, TranslucentNodesKeepTheirPlaces) {
     glEnable(GL_BLEND);
     glBlendFunc(GL_SRC_ALPHA, GL_ONE_MINUS_SRC_ALPHA);
     QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
-    for (uint32_t i = 0; i < 8; ++i) model.Node(i).stateFlags |= QEX_NODE_RENDERING_ENABLED;
     ExpectSamePictures([&] { model.Draw(); }, "translucent nodes between opaque ones");
     glDisable(GL_BLEND);
     QexModel_SetAlphaTestCmpValue(0.5f);
