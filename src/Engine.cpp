@@ -5,6 +5,7 @@
 
 #include "base/Diagnostics.h"
 #include "gl/Extensions.h"
+#include "gl/LeanState.h"
 #include "overlay/Font.h"
 #include "Qex/base.h"
 #include "Qex/effects.h"
@@ -125,7 +126,7 @@ void QexEngine_Shutdown(QexRuntimeContext* context) {
 }
 
 void QexEngine_ShutdownForOwnerDraw(QexRuntimeContext* context) {
-    QexRenderState_Restore();
+    QexLeanState_Release();
     QexFont_Release();
     QexTexture_ReleaseDefault();
     QexModel_ReleaseShader(1);

@@ -272,8 +272,10 @@ QEX_API void QexModel_SetAlphaTestCmpValue(float threshold);
 /** Does nothing; kept for callers. */
 QEX_API void QexModel_SetAnimatedUVUniform(QexModel* model, float u, float v);
 
-/** Recomputes a mesh node's box (nodeBoxes): its mesh's box carried by the node, for a skinned mesh by the
- * first bone of its first batch. No GL context needed.
+/** Recomputes a mesh node's box (nodeBoxes): its mesh's box carried by the node. The box of a skinned mesh
+ * goes along with the first bone of its first batch; while lean drawing is on (QexRenderer_SetDrawing) it is
+ * the axis-aligned box around all that its bones carry, so that shadow maps, screen boxes and picking miss no
+ *  bent part. No GL context needed.
  *  @param modelMatrix  applied in front for meshes that are not skinned, or null */
 QEX_API void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
                                                 const QexMatrix* modelMatrix);

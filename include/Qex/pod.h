@@ -160,6 +160,7 @@ typedef struct QexPODMesh {
     /* Filled by QexModel_DownloadGeometry: */
     QexBoundingBox localBox;                          /* box of the positions */
     QexVertexAttribute attributes[QEX_ELEMENT_COUNT]; /* layout of the GL vertex buffer */
+    struct QexAABB* boneBoxes; /* boxes of what follows each entry of the bone table, or null; the engine's */
 } QexPODMesh;
 
 /** Animation flags of a node: which of its keys change from frame to frame. */

@@ -1,6 +1,9 @@
 // Particle sets: points that the vertex shader moves, drawn in one call.
+#include <cstddef>
+
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "gl/Program.h"
 #include "Qex/base.h"
 #include "Qex/effects.h"
@@ -106,6 +109,28 @@ void PointAttribute(GLint location, GLint size, const void* data) {
                                  sizeof(QexParticleSetEntry), data));
 }
 
+void DrawDescribed(const QexParticleSet& set) {
+    PointAttribute(s_Program.lifetime, 1, &set.buffer->lifetime);
+    PointAttribute(s_Program.endPosition, 3, &set.buffer->velocity);
+    PointAttribute(s_Program.startPosition, 3, &set.buffer->startPosition);
+    for (const auto& attribute : kAttributes)
+        QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(*attribute.location)));
+    QEX_GL(glDrawArrays(GL_POINTS, 0, static_cast<GLsizei>(set.count)));
+    for (const auto& attribute : kAttributes)
+        QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(*attribute.location)));
+}
+
+void DrawLean(const QexParticleSet& set) {
+    const GLuint buffer = QexLeanState_StreamBuffer();
+    const QexFloatAttribute attributes[] = {
+        {s_Program.lifetime, 1, offsetof(QexParticleSetEntry, lifetime)},
+        {s_Program.endPosition, 3, offsetof(QexParticleSetEntry, velocity)},
+        {s_Program.startPosition, 3, offsetof(QexParticleSetEntry, startPosition)}};
+    QexLeanState_Fill(buffer, set.buffer, size_t{set.count} * sizeof *set.buffer, GL_STREAM_DRAW);
+    QexLeanState_BindFloats({buffer, 0, sizeof *set.buffer, attributes, 3});
+    glDrawArrays(GL_POINTS, 0, static_cast<GLsizei>(set.count));
+}
+
 }  // namespace
 
 extern "C" {
@@ -168,15 +193,7 @@ void QexParticleSet_Draw(QexParticleSet* set) {
     QexTexture_Set(set->texture, kDiffuseUnit);
     QexTexture_Set(set->alphaTexture, kAlphaUnit);
     QexRenderer_SetZWrite(0);
-    QexRenderState_Restore();
-    PointAttribute(s_Program.lifetime, 1, &set->buffer->lifetime);
-    PointAttribute(s_Program.endPosition, 3, &set->buffer->velocity);
-    PointAttribute(s_Program.startPosition, 3, &set->buffer->startPosition);
-    for (const auto& attribute : kAttributes)
-        QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(*attribute.location)));
-    QEX_GL(glDrawArrays(GL_POINTS, 0, static_cast<GLsizei>(set->count)));
-    for (const auto& attribute : kAttributes)
-        QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(*attribute.location)));
+    (QexLeanState_IsLean() ? DrawLean : DrawDescribed)(*set);
     QexRenderer_SetZWrite(1);
     QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
 }

@@ -7,6 +7,7 @@
 #include "base/Memory.h"
 #include "effects/SkyPrograms.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "Qex/base.h"
 #include "Qex/effects.h"
 #include "Qex/geometry.h"
@@ -23,6 +24,7 @@ constexpr int32_t kNormalisationSize = 8;
 constexpr float kWaveDistortion = 30;
 constexpr float kClipOffset = 2.5f;  // how far below the surface the mirrored scene is cut
 constexpr int kMaxWaterVertices = 5;
+constexpr int32_t kVertexBytes = 3 * sizeof(float);
 
 // Of the two layers of waves.
 constexpr QexVec2 kBumpVelocities[] = {{0.16f, -0.14f}, {0.25f, -0.3f}};
@@ -125,6 +127,24 @@ void DrawScene(QexSkyBox* box) {
     DrawSky(*box);
 }
 
+void DrawFan(int32_t count) {
+    QEX_GL(glEnableVertexAttribArray(0));
+    if (count) {
+        QEX_GL(glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, kVertexBytes, s_WaterVertices));
+        QEX_GL(glDrawArrays(GL_TRIANGLE_FAN, 0, count));
+    }
+    QEX_GL(glDisableVertexAttribArray(0));
+}
+
+void DrawFanLean(int32_t count) {
+    const GLuint buffer = QexLeanState_StreamBuffer();
+    const QexFloatAttribute position = {0, 3, 0};
+    if (!count) return;
+    QexLeanState_Fill(buffer, s_WaterVertices, static_cast<size_t>(count) * kVertexBytes, GL_STREAM_DRAW);
+    QexLeanState_BindFloats({buffer, 0, kVertexBytes, &position, 1});
+    glDrawArrays(GL_TRIANGLE_FAN, 0, count);
+}
+
 // Draws what the camera sees of the water's plane with the program in use.
 void DrawWaterPlane(const QexCamera& camera) {
     // QexMatrix_Perspective is the usual projection divided by the far distance. The polygon is that of the
@@ -132,16 +152,10 @@ void DrawWaterPlane(const QexCamera& camera) {
     QexMatrix inverse = ViewProjection();
     for (float& element : inverse.m) element *= camera.farPlane;
     QexMatrix_InverseEx(&inverse, &inverse);
-    const int32_t count = QexMath_CalculateInfinitePlane(s_WaterVertices, 3 * sizeof(float), &s_Plane,
-                                                         &inverse, &camera.eye, camera.farPlane);
+    const int32_t count = QexMath_CalculateInfinitePlane(s_WaterVertices, kVertexBytes, &s_Plane, &inverse,
+                                                         &camera.eye, camera.farPlane);
     QEX_GL(glDisable(GL_CULL_FACE));
-    QexRenderState_Restore();
-    QEX_GL(glEnableVertexAttribArray(0));
-    if (count) {
-        QEX_GL(glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, 3 * sizeof(float), s_WaterVertices));
-        QEX_GL(glDrawArrays(GL_TRIANGLE_FAN, 0, count));
-    }
-    QEX_GL(glDisableVertexAttribArray(0));
+    (QexLeanState_IsLean() ? DrawFanLean : DrawFan)(count);
     QEX_GL(glEnable(GL_CULL_FACE));
 }
 

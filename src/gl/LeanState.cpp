@@ -1,6 +1,8 @@
 // The GL's state in lean drawing: textures by unit, vertices, buffers.
 #include "gl/LeanState.h"
 
+#include <cstring>
+
 #include "gl/Extensions.h"
 #include "Qex/renderer.h"
 
@@ -13,18 +15,32 @@ constexpr GLuint kUnknown = UINT32_MAX;
 
 struct {
     GLuint texture2D[kUnits], textureCube[kUnits];
+    GLuint arrayBuffer;
     GLuint vertexArray;   // 0: the vertices are those below
     GLuint vertexBuffer;  // of the attribute pointers
     GLuint indexBuffer;
-    GLuint streamed;     // the buffer that QexLeanState_Stream has left bound, 0: none
     uint32_t pointed;    // attributes that point there
     uint32_t enabled;    // arrays
     uint32_t constants;  // attributes whose value, where there is no array, is (0, 0, 0, 1)
     const QexVertexAttribute* attributes;
 } s_State;
 
+constexpr int32_t kLocations = 16;  // of float attributes
+QexVertexAttribute s_Floats[kLocations];
+GLuint s_StreamBuffer, s_QuadIndices;
+
 bool s_VertexArrays = true;  // allowed
 uint32_t s_DepthFunction = QEX_DEPTH_LESS;
+
+void BindArrayBuffer(GLuint buffer) {
+    if (s_State.arrayBuffer != buffer) glBindBuffer(GL_ARRAY_BUFFER, buffer);
+    s_State.arrayBuffer = buffer;
+}
+
+void BindVertexArray(GLuint name) {
+    if (s_State.vertexArray != name) QexExtensions_Get()->bindVertexArray(name);
+    s_State.vertexArray = name;
+}
 
 void Enable(uint32_t wanted) {
     const uint32_t changed = s_State.enabled ^ wanted;
@@ -62,22 +78,15 @@ uint32_t ElementsOf(const QexMeshBuffers& mesh) {
     return elements;
 }
 
-void BindVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
-    if (*mesh.vertexArray) {
-        if (s_State.vertexArray != *mesh.vertexArray) QexExtensions_Get()->bindVertexArray(*mesh.vertexArray);
-    } else {
-        QexExtensions_Get()->genVertexArrays(1, mesh.vertexArray);
-        QexExtensions_Get()->bindVertexArray(*mesh.vertexArray);
-        glBindBuffer(GL_ARRAY_BUFFER, mesh.vertexBuffer);
-        glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, mesh.indexBuffer);
-        for (GLuint i = 0; elements >> i; ++i)
-            if (elements >> i & 1) glEnableVertexAttribArray(i);
-        SetPointers(mesh.attributes, elements);
-        // The array buffer is no part of the object.
-        glBindBuffer(GL_ARRAY_BUFFER, 0);
-        s_State.streamed = 0;
-    }
-    s_State.vertexArray = *mesh.vertexArray;
+// Makes the mesh's vertex array object and leaves it bound.
+void MakeVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
+    QexExtensions_Get()->genVertexArrays(1, mesh.vertexArray);
+    BindVertexArray(*mesh.vertexArray);
+    BindArrayBuffer(mesh.vertexBuffer);
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, mesh.indexBuffer);
+    for (GLuint i = 0; elements >> i; ++i)
+        if (elements >> i & 1) glEnableVertexAttribArray(i);
+    SetPointers(mesh.attributes, elements);
 }
 
 void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
@@ -85,8 +94,7 @@ void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
     if (s_State.attributes != mesh.attributes || s_State.vertexBuffer != mesh.vertexBuffer)
         s_State.pointed = 0;
     if (elements & ~s_State.pointed) {
-        glBindBuffer(GL_ARRAY_BUFFER, mesh.vertexBuffer);
-        s_State.streamed = 0;
+        BindArrayBuffer(mesh.vertexBuffer);
         SetPointers(mesh.attributes, elements & ~s_State.pointed);
         s_State.attributes = mesh.attributes;
         s_State.vertexBuffer = mesh.vertexBuffer;
@@ -106,29 +114,71 @@ uint32_t g_QexReadsErrors = 1;
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
     const uint32_t elements = ElementsOf(mesh);
     SetConstants(needed & ~elements);
-    if (s_VertexArrays && QexExtensions_Get()->bindVertexArray)
-        BindVertexArray(mesh, elements);
-    else
+    if (!s_VertexArrays || !QexExtensions_Get()->bindVertexArray)
         BindBuffers(mesh, needed & elements);
+    else if (*mesh.vertexArray)
+        BindVertexArray(*mesh.vertexArray);
+    else
+        MakeVertexArray(mesh, elements);
 }
 
-void QexLeanState_Stream(GLuint buffer, const void* data, size_t bytes) {
-    if (s_State.streamed != buffer) glBindBuffer(GL_ARRAY_BUFFER, buffer);
-    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), data, GL_STREAM_DRAW);
-    s_State.streamed = buffer;
+void QexLeanState_BindFloats(const QexFloatVertices& vertices) {
+    QexVertexAttribute layout[kLocations] = {};
+    uint32_t elements = 0;
+    for (int32_t i = 0; i < vertices.count; ++i) {
+        const QexFloatAttribute& a = vertices.attributes[i];
+        if (a.location < 0 || a.location >= kLocations) continue;
+        layout[a.location] = {a.components, GL_FLOAT, 0, vertices.stride, a.offset};
+        elements |= 1u << a.location;
+    }
+    if (memcmp(layout, s_Floats, sizeof layout) != 0) {
+        memcpy(s_Floats, layout, sizeof layout);
+        if (s_State.attributes == s_Floats) s_State.attributes = nullptr;
+    }
+    BindVertexArray(0);
+    BindBuffers({vertices.buffer, vertices.indexBuffer, s_Floats, kLocations, nullptr}, elements);
+}
+
+GLuint QexLeanState_StreamBuffer() {
+    if (!s_StreamBuffer) glGenBuffers(1, &s_StreamBuffer);
+    return s_StreamBuffer;
+}
+
+GLuint QexLeanState_QuadIndices() {
+    if (s_QuadIndices) return s_QuadIndices;
+    uint16_t indices[kQuadsOfADraw][6];
+    for (uint32_t i = 0; i < kQuadsOfADraw; ++i) {
+        static const uint16_t corners[] = {0, 1, 2, 2, 1, 3};
+        for (int c = 0; c < 6; ++c) indices[i][c] = static_cast<uint16_t>(4 * i + corners[c]);
+    }
+    glGenBuffers(1, &s_QuadIndices);
+    BindVertexArray(0);
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, s_QuadIndices);
+    glBufferData(GL_ELEMENT_ARRAY_BUFFER, sizeof indices, indices, GL_STATIC_DRAW);
+    return s_State.indexBuffer = s_QuadIndices;
+}
+
+void QexLeanState_Fill(GLuint buffer, const void* data, size_t bytes, GLenum usage) {
+    BindArrayBuffer(buffer);
+    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(bytes), data, usage);
+}
+
+void QexLeanState_FillPart(GLuint buffer, size_t offset, const void* data, size_t bytes) {
+    BindArrayBuffer(buffer);
+    glBufferSubData(GL_ARRAY_BUFFER, static_cast<GLintptr>(offset), static_cast<GLsizeiptr>(bytes), data);
 }
 
 void QexLeanState_Leave() {
-    if (s_State.vertexArray) QexExtensions_Get()->bindVertexArray(0);
+    if (s_State.vertexArray) BindVertexArray(0);
     Enable(0);
-    if (s_State.vertexBuffer || s_State.streamed) glBindBuffer(GL_ARRAY_BUFFER, 0);
+    BindArrayBuffer(0);
     if (s_State.indexBuffer) glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
-    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = s_State.streamed = 0;
+    s_State.vertexBuffer = s_State.indexBuffer = 0;
     s_State.attributes = nullptr;
 }
 
 void QexLeanState_Forget() {
-    s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = s_State.streamed = 0;
+    s_State.arrayBuffer = s_State.vertexArray = s_State.vertexBuffer = s_State.indexBuffer = 0;
     s_State.attributes = nullptr;
     s_State.enabled = s_State.constants = 0;
     QexLeanState_ForgetTextures();
@@ -161,6 +211,13 @@ void QexLeanState_SetDepthFunction(uint32_t mode) {
     s_DepthFunction = mode;
 }
 
+void QexLeanState_Release() {
+    QexLeanState_Leave();
+    if (s_StreamBuffer) glDeleteBuffers(1, &s_StreamBuffer);
+    if (s_QuadIndices) glDeleteBuffers(1, &s_QuadIndices);
+    s_StreamBuffer = s_QuadIndices = 0;
+}
+
 void QexLeanState_DeleteVertexArrays(uint32_t count, GLuint* names) {
     for (uint32_t i = 0; i < count; ++i)
         if (names[i] && QexExtensions_Get()->deleteVertexArrays)
@@ -173,7 +230,7 @@ int32_t QexRenderer_SetDrawing(int32_t drawing) {
     const int32_t previous = g_QexLean ? QEX_DRAWING_LEAN : QEX_DRAWING_DESCRIBED;
     if (drawing == previous || (drawing != QEX_DRAWING_LEAN && drawing != QEX_DRAWING_DESCRIBED))
         return previous;
-    QexRenderState_Restore();
+    QexLeanState_Release();
     QexRenderState_Reset(nullptr);
     g_QexLean = drawing == QEX_DRAWING_LEAN;
     g_QexReadsErrors = !g_QexLean;

@@ -26,14 +26,40 @@ struct QexMeshBuffers {
 // Feeds the elements in `needed`, bits by number, from a mesh; those that it lacks are (0, 0, 0, 1).
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed);
 
+// Vertices of floats in a buffer, without a vertex array object.
+struct QexFloatAttribute {
+    int32_t location;
+    int32_t components;
+    uint32_t offset;  // bytes
+};
+struct QexFloatVertices {
+    GLuint buffer;
+    GLuint indexBuffer;  // 0: none
+    uint32_t stride;     // bytes
+    const QexFloatAttribute* attributes;
+    int32_t count;
+};
+void QexLeanState_BindFloats(const QexFloatVertices& vertices);
+
+// The buffer for vertices that are good for one draw.
+GLuint QexLeanState_StreamBuffer();
+
+// Indices of as many quads as one draw shows, two triangles each: 0 1 2, 2 1 3.
+constexpr uint32_t kQuadsOfADraw = 300;
+GLuint QexLeanState_QuadIndices();
+
 // Puts vertex array object, attribute arrays and buffers where described drawing has them.
 void QexLeanState_Leave();
+
+// Leaves and deletes what lean drawing shares, the buffers above.
+void QexLeanState_Release();
 
 // Nothing is known any more; the GL's vertex arrays are as QexLeanState_Leave leaves them.
 void QexLeanState_Forget();
 
-// Gives a buffer new contents, for one draw.
-void QexLeanState_Stream(GLuint buffer, const void* data, size_t bytes);
+// Gives a buffer new contents; GL_STREAM_DRAW: for one draw.
+void QexLeanState_Fill(GLuint buffer, const void* data, size_t bytes, GLenum usage);
+void QexLeanState_FillPart(GLuint buffer, size_t offset, const void* data, size_t bytes);
 
 // Whether a texture is bound on the active unit; if not, it is taken to be from now on.
 bool QexLeanState_HasTexture(GLenum target, GLuint name);

@@ -5,6 +5,7 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "model/Geometry.h"
+#include "pod/BoneBoxes.h"
 #include "pod/Rebatch.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"
@@ -269,6 +270,7 @@ bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t 
     QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload->vertices,
                                       whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
                                       position.stride);
+    if (whole) QexPODMesh_MeasureBones(mesh, upload->vertices + position.offset, position.stride);
     return true;
 }
 

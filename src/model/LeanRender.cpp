@@ -8,7 +8,9 @@
 #include "gl/LeanState.h"
 #include "math/Float4.h"
 #include "pod/Animation.h"
+#include "pod/BoneBoxes.h"
 #include "Qex/base.h"
+#include "Qex/geometry.h"
 #include "Qex/pod.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
@@ -242,8 +244,29 @@ void DrawStatic(QexLeanDrawing* drawing, QexLeanEntry* entry) {
     QexShaderModule_DrawFaces(entry->type, drawing->model, entry->mesh);
 }
 
+// Whether a box lies outside the view. It is tested in clip space, against each pair of planes at once, and
+// rather kept than left out.
+bool IsOutside(const QexVec3& centre, const QexVec3& half, const Float4x4& mvp) {
+    const Float4 at = mvp.x * centre.x + mvp.y * centre.y + mvp.z * centre.z + mvp.w;
+    const Float4 reach = Magnitude(mvp.x) * half.x + Magnitude(mvp.y) * half.y + Magnitude(mvp.z) * half.z;
+    const Float4 limit = Splat<3>(at) + Splat<3>(reach) + reach;
+    const Float4 over = Magnitude(at) - limit * 1.0001f;
+    return over[0] > 0 || over[1] > 0 || over[2] > 0;
+}
+
+bool IsOutsideOnBones(const QexLeanDrawing& drawing, const QexLeanEntry& entry) {
+    const QexMatrix* modelMatrix = drawing.call->modelMatrix;
+    QexAABB around;
+    if (!QexPODAnimation_SkinnedBox(&drawing.model->scene, entry.node, &around)) return false;
+    QexBoundingBox box;
+    QexBoundingBox_ComputeInterleaved(&box, &around, 2, 0, sizeof around.min);
+    const Float4x4 mvp =
+        modelMatrix ? Product(drawing.viewProjection, Load4x4(modelMatrix->m)) : drawing.viewProjection;
+    return IsOutside(box.centre, box.halfExtent, mvp);
+}
+
 void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
-    if (!drawing->model->scene.meshes[entry->mesh].skinned) return;
+    if (!drawing->model->scene.meshes[entry->mesh].skinned || IsOutsideOnBones(*drawing, *entry)) return;
     if (!BeginNode(drawing, entry)) return;
     const int32_t* at = entry->variant->locations;
     const bool lit = entry->type->traits & kTraitLit;
@@ -271,17 +294,10 @@ void QexLeanDrawing_MarkPass(QexLeanDrawing* drawing, const QexLeanEntry& entry)
         drawing->model->scene.nodes[entry.node].blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
 }
 
-// Whether a mesh's box lies outside the view. It is tested in clip space, against each pair of planes at
-// once, and rather kept than left out.
 bool QexLeanDrawing_IsOutside(const QexPODMesh& mesh, const Float4x4& mvp) {
-    const QexBoundingBox& box = mesh.localBox;
-    if (mesh.attributes[QEX_ELEMENT_POSITION].componentCount < 3) return false;  // it has no box
-    const QexVec3 &c = box.centre, &h = box.halfExtent;
-    const Float4 at = mvp.x * c.x + mvp.y * c.y + mvp.z * c.z + mvp.w;
-    const Float4 reach = Magnitude(mvp.x) * h.x + Magnitude(mvp.y) * h.y + Magnitude(mvp.z) * h.z;
-    const Float4 limit = Splat<3>(at) + Splat<3>(reach) + reach;
-    const Float4 over = Magnitude(at) - limit * 1.0001f;
-    return over[0] > 0 || over[1] > 0 || over[2] > 0;
+    // A mesh of flat positions has no box.
+    return mesh.attributes[QEX_ELEMENT_POSITION].componentCount >= 3 &&
+           IsOutside(mesh.localBox.centre, mesh.localBox.halfExtent, mvp);
 }
 
 void QexLeanDrawing_Give(QexLeanDrawing* drawing, const QexLeanEntry& entry, QexShaderVariant* variant) {

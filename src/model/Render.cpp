@@ -8,6 +8,7 @@
 #include "model/LeanRender.h"
 #include "model/SharedShaders.h"
 #include "pod/Animation.h"
+#include "pod/BoneBoxes.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"
 #include "Qex/geometry.h"
@@ -296,6 +297,11 @@ void QexModel_UpdateMeshNodeBoundingBox(QexModel* model, uint32_t meshNodeIndex,
     QexPODNode* node = &scene->nodes[meshNodeIndex];
     const QexPODMesh* mesh = QexPODModel_MeshOf(&model->scene, meshNodeIndex);
     QexMatrix world;
+    QexAABB around;
+    if (QexLeanState_IsLean() && QexPODAnimation_SkinnedBox(scene, meshNodeIndex, &around)) {
+        QexBoundingBox_ComputeInterleaved(&model->nodeBoxes[meshNodeIndex], &around, 2, 0, sizeof around.min);
+        return;
+    }
     if (mesh->skinned && mesh->boneBatches.batchCount > 0 && mesh->boneBatches.bonesPerBatch[0] > 0) {
         QexPODNode* bone = QexPODAnimation_BoneNode(scene, node, mesh->boneBatches.boneTable[0]);
         QexPODModel_GetBoneWorldMatrix(scene, &world, node, bone);

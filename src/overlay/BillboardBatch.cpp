@@ -11,8 +11,6 @@
 
 namespace {
 
-constexpr uint32_t kMost = 300;  // billboards of a draw, as many as an emitter has
-
 const char* const kVertexSource = R"(
 attribute highp vec4 inVertex;
 attribute mediump vec3 inTexCoord;
@@ -42,48 +40,34 @@ struct Corner {
     float u, v, opacity;
 };
 
-const QexVertexAttribute kLayout[] = {{4, GL_FLOAT, 0, sizeof(Corner), 0},
-                                      {3, GL_FLOAT, 0, sizeof(Corner), offsetof(Corner, u)}};
-constexpr uint32_t kBothAttributes = 3;
+const QexFloatAttribute kLayout[] = {{0, 4, offsetof(Corner, position)}, {1, 3, offsetof(Corner, u)}};
 
 struct {
     GLuint program, vertexShader, fragmentShader;
-    GLuint vertexBuffer, indexBuffer, vertexArray;
     bool failed;
 } s_GL;
 
-Corner s_Corners[kMost][4];
+Corner s_Corners[kQuadsOfADraw][4];
 uint32_t s_Count;
 QexTexture* s_Texture;
 
 bool Create() {
-    static uint16_t indices[kMost][6];
     if (s_GL.program || s_GL.failed) return !s_GL.failed;
     s_GL.failed = !QexProgram_Build({"QexBillboard_Draw", kVertexSource, kFragmentSource, kAttributes, 2},
                                     {&s_GL.program, &s_GL.vertexShader, &s_GL.fragmentShader});
     if (s_GL.failed) return false;
     QexProgramLookup{"src/QexBillboard", s_GL.program, false}.SetSampler({"sTexture", kDiffuseUnit});
-    for (uint32_t i = 0; i < kMost; ++i) {
-        static const uint16_t corners[] = {0, 2, 1, 1, 2, 3};
-        for (int c = 0; c < 6; ++c) indices[i][c] = static_cast<uint16_t>(4 * i + corners[c]);
-    }
-    QexRenderState_Restore();
-    glGenBuffers(1, &s_GL.vertexBuffer);
-    glGenBuffers(1, &s_GL.indexBuffer);
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, s_GL.indexBuffer);
-    glBufferData(GL_ELEMENT_ARRAY_BUFFER, sizeof indices, indices, GL_STATIC_DRAW);
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
     return true;
 }
 
 }  // namespace
 
 void QexBillboardBatch_Add(const QexBillboard& billboard, const QexMatrix& mvp) {
-    if (s_Count == kMost || (s_Count && billboard.texture != s_Texture)) QexBillboardBatch_Draw();
+    if (s_Count == kQuadsOfADraw || (s_Count && billboard.texture != s_Texture)) QexBillboardBatch_Draw();
     s_Texture = billboard.texture;
     const Float4x4 m = Load4x4(mvp.m);
     for (int i = 0; i < 4; ++i) {
-        const float *p = g_BB_Vertices + 3 * i, *uv = g_BB_UVs + 2 * i;
+        const float *p = g_BB_Vertices + 3 * g_BB_indices[i], *uv = g_BB_UVs + 2 * g_BB_indices[i];
         Corner& corner = s_Corners[s_Count][i];
         Store4(corner.position, m.x * p[0] + m.y * p[1] + m.w);
         corner.u = uv[0];
@@ -103,9 +87,9 @@ void QexBillboardBatch_Draw() {
     texture->stage = kDiffuseUnit;
     QexRenderState_UseProgram(s_GL.program);
     QexLeanState_BindTexture(kDiffuseUnit, GL_TEXTURE_2D, texture->glName);
-    QexLeanState_BindMesh({s_GL.vertexBuffer, s_GL.indexBuffer, kLayout, 2, &s_GL.vertexArray},
-                          kBothAttributes);
-    QexLeanState_Stream(s_GL.vertexBuffer, s_Corners, sizeof s_Corners[0] * s_Count);
+    const GLuint buffer = QexLeanState_StreamBuffer();
+    QexLeanState_Fill(buffer, s_Corners, sizeof s_Corners[0] * s_Count, GL_STREAM_DRAW);
+    QexLeanState_BindFloats({buffer, QexLeanState_QuadIndices(), sizeof(Corner), kLayout, 2});
     glDisable(GL_CULL_FACE);
     glDrawElements(GL_TRIANGLES, 6 * count, GL_UNSIGNED_SHORT, nullptr);
     glEnable(GL_CULL_FACE);
@@ -118,10 +102,5 @@ void QexBillboardBatch_Release() {
         s_GL.failed = false;
         return;
     }
-    QexRenderState_Restore();
-    QexLeanState_DeleteVertexArrays(1, &s_GL.vertexArray);
-    glDeleteBuffers(1, &s_GL.vertexBuffer);
-    glDeleteBuffers(1, &s_GL.indexBuffer);
     QexProgram_Delete({&s_GL.program, &s_GL.vertexShader, &s_GL.fragmentShader}, false);
-    s_GL.vertexBuffer = s_GL.indexBuffer = s_GL.vertexArray = 0;
 }

@@ -1,4 +1,4 @@
-// Text: strings are laid out as quads of glyphs, kept or drawn at once.
+// Text, kept or drawn at once: the font's program and sheets, and what goes to GL.
 #include "overlay/Font.h"
 
 #include <cstdio>
@@ -7,8 +7,11 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "gl/Program.h"
+#include "gl/Quad.h"
 #include "overlay/FontLatin.h"
+#include "overlay/Glyphs.h"
 #include "Qex/base.h"
 #include "Qex/images.h"
 #include "Qex/math.h"
@@ -20,18 +23,8 @@
 
 namespace {
 
-constexpr int32_t kGlyphWidth = 8;
-constexpr int32_t kGlyphHeight = 16;
-constexpr int32_t kSheetWidth = 256;
-constexpr int32_t kSheetHeight = 48;
-constexpr uint32_t kSheetColumns = 32;
-constexpr uint32_t kFirstCharacter = 32;
-constexpr uint32_t kLastCharacter = 127;
-constexpr uint32_t kFirstLatin = 160;
-constexpr uint32_t kLastLatin = 255;
 constexpr uint32_t kInitialCapacity = 80;
 constexpr uint32_t kTemporaryCapacity = 16;
-constexpr uint32_t kStripGlyphs = 64;  // that byte indices reach
 constexpr float kMaxScale = 1000;
 
 const char* const kVertexSource = R"(#version 100
@@ -61,164 +54,25 @@ void main() {
 }
 )";
 
-struct Colour {
-    float r, g, b, a;
-};
-
-// Vertices of a text: four a glyph. The strip joins as many as one draw can show; further ones are drawn by
-// further strips of the same indices.
-struct Glyphs {
-    float (*positions)[4][3];
-    float (*texCoords)[4][2];
-    Colour (*colours)[4];
-    uint8_t* sheets;  // which sheet each is on
-    uint8_t* indices;
-    uint32_t capacity;
-    uint32_t count;
-};
-
-// The sheets: the font's own and, made when the first text asks for it, that of Latin-1.
-enum Sheet : uint8_t { kPlainSheet, kLatinSheet, kSheets };
-
 bool s_Created;
 bool s_ToldNoProgram;
 float s_Scale = 1;
-Glyphs s_Text;
-Glyphs s_Temporary;
+QexGlyphs s_Text;
+QexGlyphs s_Temporary;
 QexTexture s_Sheets[kSheets];
 QexFontProgram s_Program;
 QexMatrix s_Projection;
 
-uint32_t IndexCount(uint32_t glyphs) {
-    return glyphs * 6 - 2;
-}
-
-uint32_t FirstStrip(uint32_t glyphs) {
-    return glyphs < kStripGlyphs ? glyphs : kStripGlyphs;
-}
-
-// Makes room for that many glyphs, and some more: texts are often added piece by piece. False when memory
-// runs out.
-bool Reserve(Glyphs* glyphs, uint32_t count) {
-    if (count <= glyphs->capacity) return true;
-    const uint32_t grown = glyphs->capacity + glyphs->capacity / 2;
-    if (count < grown) count = grown;
-    if (!QexMemory_Resize(glyphs->positions, uint64_t{count} * sizeof *glyphs->positions) ||
-        !QexMemory_Resize(glyphs->texCoords, uint64_t{count} * sizeof *glyphs->texCoords) ||
-        !QexMemory_Resize(glyphs->colours, uint64_t{count} * sizeof *glyphs->colours) ||
-        !QexMemory_Resize(glyphs->sheets, count) ||
-        !QexMemory_Resize(glyphs->indices, IndexCount(FirstStrip(count))))
-        return false;
-    glyphs->capacity = count;
-    return true;
-}
-
-void FreeGlyphs(Glyphs* glyphs) {
-    QexMemory_Free(glyphs->positions);
-    QexMemory_Free(glyphs->texCoords);
-    QexMemory_Free(glyphs->colours);
-    QexMemory_Free(glyphs->sheets);
-    QexMemory_Free(glyphs->indices);
-    *glyphs = {};
-}
-
-// The strip: each further glyph repeats the last vertex and its own first, which joins the quads by triangles
-// without area.
-void BuildIndices(Glyphs* glyphs) {
-    uint8_t* out = glyphs->indices;
-    for (uint32_t glyph = 0; glyph < FirstStrip(glyphs->count); ++glyph) {
-        const uint8_t first = static_cast<uint8_t>(4 * glyph);
-        if (glyph) {
-            *out++ = static_cast<uint8_t>(first - 1);
-            *out++ = first;
-        }
-        for (uint8_t i = 0; i < 4; ++i) *out++ = static_cast<uint8_t>(first + i);
-    }
-}
-
-// Takes the next character of UTF-8 text. A byte that starts none stands for itself, as a character that no
-// sheet has.
-uint32_t NextCharacter(const char** text) {
-    const uint8_t* bytes = reinterpret_cast<const uint8_t*>(*text);
-    const uint32_t follow = bytes[0] >= 0xF0 ? 3 : bytes[0] >= 0xE0 ? 2 : bytes[0] >= 0xC0 ? 1 : 0;
-    uint32_t character = follow ? bytes[0] & (0x3Fu >> follow) : bytes[0];
-    for (uint32_t i = 1; i <= follow; ++i) {
-        if ((bytes[i] & 0xC0) != 0x80) {
-            *text += 1;
-            return UINT32_MAX;
-        }
-        character = character << 6 | (bytes[i] & 0x3Fu);
-    }
-    *text += follow + 1;
-    return character >= 0x80 && !follow ? UINT32_MAX : character;
-}
-
-uint32_t CountGlyphs(const char* string) {
-    uint32_t count = 0;
-    while (*string)
-        if (NextCharacter(&string) != '\n') ++count;
-    return count;
-}
-
-// Where a character's glyph lies, in cells of its sheet.
-struct Cell {
-    Sheet sheet;
-    int32_t column, row;
-};
-Cell FindCell(uint32_t character) {
-    const bool latin = character >= kFirstLatin && character <= kLastLatin;
-    const bool plain = character >= kFirstCharacter && character <= kLastCharacter;
-    const uint32_t cell =
-        latin ? character - kFirstLatin : (plain ? character : kLastCharacter) - kFirstCharacter;
-    return {latin ? kLatinSheet : kPlainSheet, static_cast<int32_t>(cell % kSheetColumns),
-            static_cast<int32_t>(cell / kSheetColumns)};
-}
-
-// Vertex i of a quad lies right for odd i and up for i > 1.
-void WriteGlyph(Glyphs* glyphs, uint32_t slot, float left, float bottom, const Cell& cell,
-                const Colour& colour) {
-    // Enlarged, the filter would reach into the next cells.
-    const float inset = s_Scale > 1 ? 0.5f - 0.5f / s_Scale : 0;
-    const float s[2] = {static_cast<float>(cell.column * kGlyphWidth) + inset,
-                        static_cast<float>((cell.column + 1) * kGlyphWidth) - inset};
-    const float t[2] = {static_cast<float>((cell.row + 1) * kGlyphHeight) - inset,
-                        static_cast<float>(cell.row * kGlyphHeight) + inset};
-    glyphs->sheets[slot] = cell.sheet;
-    for (int i = 0; i < 4; ++i) {
-        const int32_t right = i & 1, up = i >> 1;
-        float* position = glyphs->positions[slot][i];
-        position[0] = left + static_cast<float>(right * kGlyphWidth) * s_Scale;
-        position[1] = bottom + static_cast<float>(up * kGlyphHeight) * s_Scale;
-        position[2] = 0;
-        glyphs->texCoords[slot][i][0] = s[right] / kSheetWidth;
-        glyphs->texCoords[slot][i][1] = t[up] / kSheetHeight;
-        glyphs->colours[slot][i] = colour;
-    }
+QexGlyphColour FromBytes(int32_t r, int32_t g, int32_t b, int32_t a) {
+    return {static_cast<float>(r) / 255.0f, static_cast<float>(g) / 255.0f, static_cast<float>(b) / 255.0f,
+            static_cast<float>(a) / 255.0f};
 }
 
 // A text's upper edge is two lines above its y, whatever its scale.
-void WriteString(Glyphs* glyphs, uint32_t slot, const QexRuntimeContext* context, int32_t x, int32_t y,
-                 const char* string, const Colour& colour) {
-    const float lineHeight = kGlyphHeight * s_Scale, advance = kGlyphWidth * s_Scale;
-    float bottom =
-        static_cast<float>(context->height) + 2 * kGlyphHeight - static_cast<float>(y) - lineHeight;
-    float column = 0;
-    while (*string) {
-        const uint32_t character = NextCharacter(&string);
-        if (character == '\n') {
-            bottom -= lineHeight;
-            column = 0;
-            continue;
-        }
-        WriteGlyph(glyphs, slot++, static_cast<float>(x) + column * advance, bottom, FindCell(character),
-                   colour);
-        ++column;
-    }
-}
-
-Colour FromBytes(int32_t r, int32_t g, int32_t b, int32_t a) {
-    return {static_cast<float>(r) / 255.0f, static_cast<float>(g) / 255.0f, static_cast<float>(b) / 255.0f,
-            static_cast<float>(a) / 255.0f};
+void Write(QexGlyphs* glyphs, uint32_t slot, const QexRuntimeContext& context, int32_t x, int32_t y,
+           const char* string, const QexGlyphColour& colour) {
+    const float upper = static_cast<float>(context.height) + 2 * kGlyphHeight - static_cast<float>(y);
+    QexGlyphs_Write(glyphs, slot, {string, static_cast<float>(x), upper, s_Scale, colour});
 }
 
 void PointAt(int32_t location, GLint size, const void* data) {
@@ -230,12 +84,12 @@ void SetState() {
     QexRenderState_UseProgram(s_Program.program);
 }
 
-void BindSheet(Sheet sheet) {
+void BindSheet(QexSheet sheet) {
     QexTexture_Set(&s_Sheets[sheet], kDiffuseUnit);
-    QexTexture_SetFilter(&s_Sheets[sheet], QEX_FILTER_LINEAR);
+    if (!QexLeanState_IsLean()) QexTexture_SetFilter(&s_Sheets[sheet], QEX_FILTER_LINEAR);
 }
 
-void CreateSheet(Sheet sheet, const uint8_t* pixels) {
+void CreateSheet(QexSheet sheet, const uint8_t* pixels) {
     QexTexture* texture = &s_Sheets[sheet];
     // The pixels are only read; the record has no pointer to constant ones.
     QexTexture_CreateFromPixels(texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
@@ -257,36 +111,61 @@ void ReleaseSheets() {
         if (sheet.glName) QexTexture_Release(&sheet);
 }
 
-// Glyphs from `first` on that one draw can show: on one sheet, and no more than the strip joins.
-uint32_t RunLength(const Glyphs& glyphs, uint32_t first) {
+// Glyphs from `first` on that one draw can show: on one sheet, and no more than so many.
+uint32_t RunLength(const QexGlyphs& glyphs, uint32_t first, uint32_t most = kStripGlyphs) {
     uint32_t run = 1;
-    while (run < kStripGlyphs && first + run < glyphs.count &&
-           glyphs.sheets[first + run] == glyphs.sheets[first])
+    while (run < most && first + run < glyphs.count && glyphs.sheets[first + run] == glyphs.sheets[first])
         ++run;
     return run;
 }
 
 // The sheet of the first glyph; the others are made now, if they are needed and not there.
-void BindTextures(const Glyphs& glyphs) {
+void BindTextures(const QexGlyphs& glyphs) {
     if (memchr(glyphs.sheets, kLatinSheet, glyphs.count) && !s_Sheets[kLatinSheet].glName) CreateLatinSheet();
-    BindSheet(static_cast<Sheet>(glyphs.sheets[0]));
+    BindSheet(static_cast<QexSheet>(glyphs.sheets[0]));
     QexTexture_Set(nullptr, kAlphaUnit);
 }
 
+// Draws through buffers; what is kept is sent once.
+void DrawLean(QexGlyphs* glyphs) {
+    const bool keeps = glyphs == &s_Text;
+    const uint32_t most = keeps ? kQuadsOfADraw : kStreamedQuads;
+    const QexQuads quads = {{{s_Program.position, 3, glyphs->positions[0][0]},
+                             {s_Program.colour, 4, &glyphs->colours[0][0].r},
+                             {s_Program.texCoord, 2, glyphs->texCoords[0][0]}},
+                            glyphs->count};
+    if (keeps && !glyphs->buffer) glGenBuffers(1, &glyphs->buffer);
+    if (keeps && !glyphs->sent) QexQuads_Send(quads, glyphs->buffer);
+    glyphs->sent = keeps;
+    for (uint32_t first = 0, run; first < glyphs->count; first += run) {
+        run = RunLength(*glyphs, first, most);
+        if (first && glyphs->sheets[first] != glyphs->sheets[first - 1])
+            BindSheet(static_cast<QexSheet>(glyphs->sheets[first]));
+        if (keeps)
+            QexQuads_DrawSent(quads, glyphs->buffer, first, run);
+        else
+            QexQuads_Stream(quads, first, run);
+    }
+}
+
 // Draws what BindTextures was called for.
-void DrawGlyphs(const Glyphs& glyphs) {
+void DrawGlyphs(QexGlyphs* text) {
+    if (QexLeanState_IsLean()) {
+        DrawLean(text);
+        return;
+    }
+    const QexGlyphs& glyphs = *text;
     const int32_t arrays[] = {s_Program.position, s_Program.colour, s_Program.texCoord};
     uint8_t bound = glyphs.sheets[0];
-    QexRenderState_Restore();
     for (const int32_t array : arrays) QEX_GL(glEnableVertexAttribArray(static_cast<GLuint>(array)));
     for (uint32_t first = 0, run; first < glyphs.count; first += run) {
         run = RunLength(glyphs, first);
-        if (bound != glyphs.sheets[first]) BindSheet(static_cast<Sheet>(bound = glyphs.sheets[first]));
+        if (bound != glyphs.sheets[first]) BindSheet(static_cast<QexSheet>(bound = glyphs.sheets[first]));
         PointAt(s_Program.position, 3, glyphs.positions + first);
         PointAt(s_Program.colour, 4, glyphs.colours + first);
         PointAt(s_Program.texCoord, 2, glyphs.texCoords + first);
-        QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, static_cast<GLsizei>(IndexCount(run)), GL_UNSIGNED_BYTE,
-                              glyphs.indices));
+        QEX_GL(glDrawElements(GL_TRIANGLE_STRIP, static_cast<GLsizei>(QexGlyphs_IndexCount(run)),
+                              GL_UNSIGNED_BYTE, glyphs.indices));
     }
     for (const int32_t array : arrays) QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(array)));
 }
@@ -328,6 +207,7 @@ void QexFont_Resize(int32_t width, int32_t height, int32_t heightBefore) {
     const float up = static_cast<float>(height - heightBefore);
     for (uint32_t glyph = 0; glyph < s_Text.count; ++glyph)
         for (float(&position)[3] : s_Text.positions[glyph]) position[1] += up;
+    s_Text.sent = false;
 }
 
 extern "C" {
@@ -339,10 +219,11 @@ int32_t QexFont_Create(int32_t width, int32_t height) {
     }
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(width), 0, static_cast<float>(height), 0, 1);
     if (QexFont_CreateShader() != 0) return -1;
-    if (!Reserve(&s_Text, kInitialCapacity) || !Reserve(&s_Temporary, kTemporaryCapacity)) {
+    if (!QexGlyphs_Reserve(&s_Text, kInitialCapacity) ||
+        !QexGlyphs_Reserve(&s_Temporary, kTemporaryCapacity)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        FreeGlyphs(&s_Text);
-        FreeGlyphs(&s_Temporary);
+        QexGlyphs_Free(&s_Text);
+        QexGlyphs_Free(&s_Temporary);
         ReleaseSheets();
         QexFont_ReleaseShader(1);
         return -1;
@@ -380,7 +261,7 @@ int32_t QexFont_Release(void) {
     const bool created = s_Created;
     // A program that was made without a font goes as well.
     if (created) QexFont_ClearString();
-    FreeGlyphs(&s_Temporary);
+    QexGlyphs_Free(&s_Temporary);
     ReleaseSheets();
     if (created || s_Program.program) QexFont_ReleaseShader(1);
     s_Created = false;
@@ -392,14 +273,13 @@ int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y
                           int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_AddString")) return 0;
     const uint32_t slot = s_Text.count;
-    const uint32_t count = slot + CountGlyphs(string);
-    if (!Reserve(&s_Text, count)) {
+    const uint32_t count = slot + QexGlyphs_Count(string);
+    if (!QexGlyphs_Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         exit(1);
     }
     s_Text.count = count;
-    BuildIndices(&s_Text);
-    WriteString(&s_Text, slot, context, x, y, string, FromBytes(r, g, b, a));
+    Write(&s_Text, slot, *context, x, y, string, FromBytes(r, g, b, a));
     return static_cast<int32_t>(strlen(string));
 }
 
@@ -407,15 +287,14 @@ int32_t QexFont_ReplaceString(const QexRuntimeContext* context, int32_t x, int32
                               int32_t r, int32_t g, int32_t b, int32_t a) {
     if (!CheckCreated("QexFont_ReplaceString")) return 0;
     const int32_t length = static_cast<int32_t>(strlen(string));
-    const uint32_t count = CountGlyphs(string);
+    const uint32_t count = QexGlyphs_Count(string);
     s_Text.count = 0;
-    if (!Reserve(&s_Text, count)) {
+    if (!QexGlyphs_Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return length;
     }
     s_Text.count = count;
-    BuildIndices(&s_Text);
-    WriteString(&s_Text, 0, context, x, y, string, FromBytes(r, g, b, a));
+    Write(&s_Text, 0, *context, x, y, string, FromBytes(r, g, b, a));
     return length;
 }
 
@@ -428,7 +307,7 @@ int32_t QexFont_SetScale(float scale) {
 void QexFont_MeasureString(const char* string, float* width, float* height) {
     uint32_t columns = 0, widest = 0, lines = 1;
     while (*string) {
-        const bool ends = NextCharacter(&string) == '\n';
+        const bool ends = QexGlyphs_NextCharacter(&string) == '\n';
         columns = ends ? 0 : columns + 1;
         lines += ends;
         widest = columns > widest ? columns : widest;
@@ -439,7 +318,7 @@ void QexFont_MeasureString(const char* string, float* width, float* height) {
 
 void QexFont_ClearString(void) {
     s_Text.count = 0;
-    if (CheckCreated("QexFont_ClearString")) FreeGlyphs(&s_Text);
+    if (CheckCreated("QexFont_ClearString")) QexGlyphs_Free(&s_Text);
 }
 
 void QexFont_Draw(void) {
@@ -447,27 +326,27 @@ void QexFont_Draw(void) {
     SetState();
     BindTextures(s_Text);
     glDepthFunc(GL_ALWAYS);
-    DrawGlyphs(s_Text);
+    DrawGlyphs(&s_Text);
     glDepthFunc(GL_LEQUAL);
 }
 
 void QexFont_DrawTempString(const QexRuntimeContext* context, int32_t x, int32_t y, const char* string,
                             uint32_t colour) {
     if (!CheckCreated("QexFont_DrawTempString")) return;
-    s_Temporary.count = CountGlyphs(string);
+    s_Temporary.count = QexGlyphs_Count(string);
     if (!s_Temporary.count || !QexFont_CanDraw("QexFont_DrawTempString")) return;
-    if (!Reserve(&s_Temporary, s_Temporary.count)) {
+    if (!QexGlyphs_Reserve(&s_Temporary, s_Temporary.count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
         return;
     }
-    BuildIndices(&s_Temporary);
-    WriteString(&s_Temporary, 0, context, x, y, string,
-                FromBytes(colour >> 16 & 0xFF, colour >> 8 & 0xFF, colour & 0xFF, colour >> 24 & 0xFF));
+    Write(&s_Temporary, 0, *context, x, y, string,
+          FromBytes(colour >> 16 & 0xFF, colour >> 8 & 0xFF, colour & 0xFF, colour >> 24 & 0xFF));
     glDepthFunc(GL_ALWAYS);
     SetState();
-    QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
+    if (!QexLeanState_IsLean())
+        QEX_GL(glUniformMatrix4fv(s_Program.projectionLocation, 1, GL_FALSE, s_Projection.m));
     BindTextures(s_Temporary);
-    DrawGlyphs(s_Temporary);
+    DrawGlyphs(&s_Temporary);
     glDepthFunc(GL_LEQUAL);
 }
 

@@ -131,8 +131,9 @@ bool CheckSkin(const Check& at, const QexPODMesh& mesh, const uint32_t* extents)
     if (!QexPODMesh_IsIndexedList(mesh)) return true;
     for (int32_t batch = 0; batch < b.batchCount; ++batch)
         if (!CheckBatch(at, mesh, batch)) return false;
-    return QexPODMesh_VisitBatches(
-        mesh, [&](uint32_t vertex, int32_t bones) { return CheckBones(at, mesh, vertex, bones); });
+    return QexPODMesh_VisitBatches(mesh, [&](uint32_t vertex, uint32_t batch) {
+        return CheckBones(at, mesh, vertex, b.bonesPerBatch[batch]);
+    });
 }
 
 // ---- The rest ----

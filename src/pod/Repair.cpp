@@ -105,8 +105,8 @@ void RepairBatches(Repair* repair, QexPODMesh* mesh) {
     for (int64_t batch = 0; batch < b.batchCount; ++batch)
         for (int32_t i = 0; i < b.bonesPerBatch[batch]; ++i)
             Settle(repair, kBoneOfBatch, &b.boneTable[batch * b.maxBones + i], repair->scene->nodeCount);
-    QexPODMesh_VisitBatches(*mesh, [mesh](uint32_t vertex, int32_t bones) {
-        SettleBones(mesh, vertex, bones);
+    QexPODMesh_VisitBatches(*mesh, [mesh](uint32_t vertex, uint32_t batch) {
+        SettleBones(mesh, vertex, mesh->boneBatches.bonesPerBatch[batch]);
         return true;
     });
     mesh->skinned = 1;

@@ -19,6 +19,7 @@ void ReleaseMesh(QexPODMesh* mesh) {
     QexMemory_FreeArray(mesh->stripLengths);
     QexMemory_FreeArray(mesh->interleaved);
     QexBoneBatches_Release(&mesh->boneBatches);
+    QexMemory_FreeArray(mesh->boneBoxes);
 }
 
 void ReleaseNode(QexPODNode* node) {

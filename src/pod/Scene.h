@@ -56,7 +56,7 @@ inline QexPODFaceRun QexPODMesh_FacesOfBatch(const QexPODMesh& mesh, uint32_t ba
             last ? mesh.faceCount : static_cast<uint32_t>(b.offsets[batch + 1])};
 }
 
-// Calls visit(vertex, bones of its batch) for the vertices of all batches of an indexed list, each once a
+// Calls visit(vertex, its batch) for the vertices of all batches of an indexed list, each once a
 // batch where memory allows. Ends with false as soon as a visit does.
 template <class Visit>
 bool QexPODMesh_VisitBatches(const QexPODMesh& mesh, Visit visit) {
@@ -71,7 +71,7 @@ bool QexPODMesh_VisitBatches(const QexPODMesh& mesh, Visit visit) {
             QexPODVertex_ReadInt(&vertex, mesh.faces.data + i * size, mesh.faces.type);
             if (seenIn && seenIn[vertex] == batch + 1) continue;
             if (seenIn) seenIn[vertex] = batch + 1;
-            if (!visit(vertex, mesh.boneBatches.bonesPerBatch[batch])) return false;
+            if (!visit(vertex, batch)) return false;
         }
     }
     return true;

@@ -121,9 +121,13 @@ TEST_F(LeanTest, EveryModuleDrawsTheSame) {
     }
 }
 
-// Everything else that the engine draws, between nodes, in the same frame.
-TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
-    Capture log(STDERR_FILENO);
+// Everything else that the engine draws, between nodes, in the same frame. In lean drawing GL reads no memory
+// of the application's during a draw.
+TEST_F(LeanTest, EverythingElseAmongNodes) {
+    Capture log(STDERR_FILENO), waves(STDOUT_FILENO);
+    static LoadedModel* focused;
+    QexTexture cube = {};
+    QexTexture_GenerateNormalisationCubeMap(&cube, 8);
     ScopedTexture blue({20, 40, 250, 255});
     LoadedModel model(Overlapping(false));
     QexBillboard* billboard = QexBillboard_Create(&blue);
@@ -140,20 +144,67 @@ TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
     emitter->startOpacity = 0.8f;
     emitter->currentRate = 20;
     QexParticleEmitter_Update(emitter, 0, nullptr);
-    const QexCamera camera = PixelCamera();
-    ExpectSamePictures(
-        [&] {
-            model.Draw();
-            QexFont_DrawTempString(&runtime_, 5, 60, "lean", 0xFF20FF20u);
-            model.DrawNode(model.Node().shader, 1);
-            QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
-            QexBillboard_Draw(billboard, &camera);
-            QexParticleEmitter_Draw(emitter, &camera);
-            glEnable(GL_CULL_FACE);
-            model.Draw();
-            glDisable(GL_CULL_FACE);
-        },
-        "a frame of many things");
+    QexCamera camera = PixelCamera(), eye = {};
+    QexSkyBox sky = {};
+    sky.skyTexture = &cube;
+    sky.size = 200;
+    sky.waterEnabled = 1;
+    sky.camera = &eye;
+    const QexVec3 from = {30, 22, 60}, to = {0, 5, 0};
+    QexCamera_LookAt(&eye, &from, &to, nullptr);
+    QexCamera_Project(&eye, 0.9f, float{kWidth} / kHeight, 1, 200);
+    ASSERT_EQ(QexSkyBox_Create(&sky), 0);
+    ASSERT_EQ(QexPostProcessing_Initialize(&runtime_), 0);
+    QexParticleSet set;
+    QexParticleSetEntry* entries;
+    ASSERT_EQ(QexParticleSet_Create(&set, &blue, nullptr, 2, 12, 4), 0);
+    QexParticleSet_GetBuffer(&set, &entries, nullptr);
+    entries[0] = {3, {0, 0, 0}, {20, 80, 0}};
+    entries[1] = {2, {5, 0, 0}, {50, 80, 0}};
+    QexParticleSet_Trigger(&set);
+    QexParticleSet_Update(&set, 1, &camera, nullptr);
+    focused = &model;
+    const auto focus = [](QexRuntimeContext*, void*, void*, void*, QexShaderModule* depth, QexShaderModule*,
+                          const float*) -> int32_t {
+        for (uint32_t i = 0; i < 2; ++i)
+            focused->DrawNode(depth ? depth : focused->model.scene.nodes[i].shader, i);
+        return 0;
+    };
+    // More glyphs than a draw shows, and one of another sheet among them.
+    QexFont_AddString(&runtime_, 2, 50, (std::string(310, '.') + "\n\xC3\xA9t\xC3\xA9").c_str(), 255, 255, 0,
+                      255);
+    const std::string longText(70, 'a');
+    const auto frame = [&] {
+        QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, focus, 0.3f, 4, 1, 1, 2, 5, 1, 1,
+                                  100);
+        QexSkyBox_Update(&runtime_, &sky, 0);
+        model.Draw();
+        QexParticleSet_Draw(&set);
+        QexFont_Draw();
+        QexFont_DrawTempString(&runtime_, 5, 60, "lean", 0xFF20FF20u);
+        QexFont_DrawTempString(&runtime_, 0, 90, longText.c_str(), 0xFF20FF20u);
+        model.DrawNode(model.Node().shader, 1);
+        QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
+        QexBillboard_Draw(billboard, &camera);
+        QexParticleEmitter_Draw(emitter, &camera);
+        glEnable(GL_CULL_FACE);
+        model.Draw();
+        glDisable(GL_CULL_FACE);
+    };
+    ExpectSamePictures(frame, "a frame of many things");
+    {
+        const Lean lean;
+        const GLCalls calls(frame);
+        for (const gltapCall* call : calls.Of({"glVertexAttribPointer"}))
+            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[5].p), 65536u) << "an offset";
+        for (const gltapCall* call : calls.Of({"glDrawElements"}))
+            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[3].p), 65536u) << "an offset";
+    }
+    QexFont_ClearString();
+    QexPostProcessing_Finalize();
+    QexSkyBox_Release();
+    QexTexture_Release(&cube);
+    QexParticleSet_Release(&set);
     QexBillboard_Release(billboard);
     QexParticleEmitter_Release(emitter);
 }
@@ -423,6 +474,20 @@ TEST_F(LeanCallsTest, BillboardsOfAnEmitter) {
     EXPECT_LE(CallsOf([&] { QexParticleEmitter_Draw(emitter, &camera); }), 10u);
     EXPECT_EQ(gltapCount("glDrawElements"), 1u);
     QexParticleEmitter_Release(emitter);
+}
+
+TEST_F(LeanCallsTest, TextIsSentWhenItChanged) {
+    const auto sent = [] { return gltapCount("glBufferData") + gltapCount("glBufferSubData"); };
+    const Lean lean;
+    QexFont_AddString(&runtime_, 0, 20, "kept", 255, 255, 255, 255);
+    CallsOf([] { QexFont_Draw(); });
+    EXPECT_EQ(sent(), 0u);
+    QexFont_AddString(&runtime_, 0, 40, "more", 255, 255, 255, 255);
+    QexFont_Draw();
+    EXPECT_EQ(sent(), 2u) << "room, and the text";
+    EXPECT_LE(CallsOf([this] { QexFont_DrawTempString(&runtime_, 0, 60, "12 fps", ~0u); }), 8u);
+    EXPECT_LE(CallsOf([this] { QexTexture_Draw(&runtime_, nullptr, 0, 0, nullptr, 9, 9, ~0u); }), 6u);
+    QexFont_ClearString();
 }
 
 TEST_F(LeanCallsTest, NodesOutsideTheViewAreNotDrawn) {

@@ -11,7 +11,6 @@
 namespace {
 
 constexpr float kShadowIntensity = 0.4f, kShadowBias = 0.01f;
-constexpr float kCasterMargin = 1.3f;
 constexpr float kMirrorOpacity = 0.6f;  // of the plane over its image
 
 // The names of the scene's nodes, as many as a line may hold.
@@ -23,11 +22,6 @@ std::string NodeNames(const QexPODModel& scene) {
         names += (names.empty() ? "" : ", ") + std::string(scene.nodes[i].name);
     }
     return names.empty() ? "none with a name" : names;
-}
-
-// A skinned node's box goes along with one of its bones; the others may reach beyond it.
-void Widen(QexBoundingBox* box) {
-    for (QexVec3& corner : box->corners) QexVec3_Lerp(&corner, &box->centre, &corner, kCasterMargin);
 }
 
 // What draws the passes of a frame: the depth pass gets no arguments of its caller.
@@ -83,8 +77,10 @@ void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model,
     const QexVec3 direction = ShadowDirection(lights, camera);
     GLfloat clear[4];
     glGetFloatv(GL_COLOR_CLEAR_VALUE, clear);
+    // Lean drawing's boxes hold all bones.
+    const int32_t drawing = QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
     QexModel_UpdateModelBoundingBox(model, nullptr);
-    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) Widen(&model->nodeBoxes[i]);
+    QexRenderer_SetDrawing(drawing);
     QexShadowInfo* info =
         QexModel_InitShadowInfo(&camera, &direction, &all, 1, kShadowIntensity, kShadowBias);
     QexModel_RenderShadow(engine, nullptr, info);
