@@ -25,7 +25,7 @@ void main() {
 }
 )";
 
-enum { kNear, kFar, kMvpMatrix };
+enum { kNear, kFar, kMvpMatrix, kThreshold, kNearValue, kFarValue };  // there is no threshold
 
 // Normals and texture coordinates are fed although the shaders read only positions.
 const QexShaderModuleType kType = {
@@ -37,7 +37,10 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kUniform_near, kUniform_far, kUniform_mvpMatrix),
     {},
     false,
+    kThreshold,
     0,
+    false,
+    kTraitStatic | kTraitAlphaTexture | kTraitDepth | kTraitVariants,
 };
 
 }  // namespace
@@ -50,6 +53,8 @@ QEX_SHADER_MODULE_DRAW_MESH(QexDepthShader, &kType)
 void QexDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar) {
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kNear), zNear));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
+    module->slots[kNearValue].value = zNear;
+    module->slots[kFarValue].value = zFar;
 }
 
 void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uint32_t nodeIndex, const QexLightSet*,

@@ -92,6 +92,7 @@ enum QexShaderTrait : uint32_t {
     kTraitAlphaTexture = 128,  // alpha is the alpha texture's; else the diffuse texture's
     kTraitKeepsPass = 256,     // an alpha texture does not make its nodes transparent ones
     kTraitDisplaced = 512,     // its texture coordinates are shifted by the two slots before the threshold
+    kTraitDepth = 2048,        // it has a depth range, whose ends are in the slots behind the threshold
     kTraitVariants = 1024      // its sources know the variants, see QexShaderVariant.h
 };
 

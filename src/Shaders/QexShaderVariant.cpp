@@ -13,7 +13,7 @@
 
 namespace {
 
-constexpr uint32_t kMaxTypes = 16;  // there are 14 modules with variants
+constexpr uint32_t kMaxTypes = 20;  // there are 16 modules with variants, and two programs of the shadow pass
 
 struct TypeVariants {
     const QexShaderModuleType* type;
@@ -116,6 +116,8 @@ void SendSurface(QexShaderVariant* variant, const QexShaderSurface& surface) {
     SendFloat(at[kUniform_opacity], surface.opacity, given.opacity, all);
     SendFloat(at[kUniform_alphaThreshold], surface.threshold, given.threshold, all);
     SendFloat(at[kUniform_shadowFade], surface.shadowFade, given.shadowFade, all);
+    SendFloat(at[kUniform_near], surface.depthRange[0], given.depthRange[0], all);
+    SendFloat(at[kUniform_far], surface.depthRange[1], given.depthRange[1], all);
     if (at[kUniform_displacement] >= 0) glUniform2fv(at[kUniform_displacement], 1, surface.displacement);
     variant->surface = surface;
     variant->hasSurface = true;
@@ -233,7 +235,10 @@ void QexShaderVariant_Surface(const QexShaderVariant* variant, const QexShaderMo
     if (constant && out->opacity <= out->threshold) out->opacity = 0;
     out->shadowFade = type->traits & kTraitShadowFade ? parameters[1].value : 0;
     const bool displaced = type->traits & kTraitDisplaced;
-    for (int i = 0; i < 2; ++i) out->displacement[i] = displaced ? parameters[i - 2].value : 0;
+    for (int i = 0; i < 2; ++i) {
+        out->displacement[i] = displaced ? parameters[i - 2].value : 0;
+        out->depthRange[i] = type->traits & kTraitDepth ? parameters[i + 1].value : 0;
+    }
 }
 
 void QexShaderVariant_Use(QexShaderVariant* variant, const QexShaderFrame* frame,

@@ -41,6 +41,7 @@ struct QexShaderSurface {
     float ambient[3], diffuse[3], specular[3];
     float shininess, opacity, threshold, shadowFade;
     float displacement[2];
+    float depthRange[2];  // near and far
 };
 
 struct QexShaderVariant {

@@ -19,12 +19,26 @@ void main() {
 const char* const kFragmentSource = QEX_GLSL_FRAGMENT_PRECISION QEX_GLSL_ALPHA R"(
 varying float fDepth;
 void main() {
-    lowp float alpha = opacity * texture2D(alphaTexture, fTexCoord).r;
+    lowp float alpha = opacity;
+#ifndef QEX_CONSTANT_ALPHA
+    alpha *= texture2D(alphaTexture, fTexCoord).r;
+#endif
     gl_FragColor = vec4(fDepth, fDepth, fDepth, alpha <= alphaThreshold ? 0.0 : 1.0);
 }
 )";
 
-enum { kNear, kFar, kBoneCount, kBoneMatrixArray, kViewProjMatrix, kOpacity, kAlphaThreshold, kThreshold };
+enum {
+    kNear,
+    kFar,
+    kBoneCount,
+    kBoneMatrixArray,
+    kViewProjMatrix,
+    kOpacity,
+    kAlphaThreshold,
+    kThreshold,
+    kNearValue,
+    kFarValue
+};
 
 const QexShaderModuleType kType = {
     "src/Shaders/QexSkinningDepthShader",
@@ -37,6 +51,9 @@ const QexShaderModuleType kType = {
     QexShaderList_Of(kDiffuseUnit, kAlphaUnit),
     true,
     kThreshold,
+    0,
+    false,
+    kTraitSkinned | kTraitAlphaTexture | kTraitKeepsPass | kTraitDepth | kTraitVariants,
 };
 
 }  // namespace
@@ -49,6 +66,8 @@ QEX_SHADER_MODULE_THRESHOLD(QexSkinningDepthShader, kThreshold)
 void QexSkinningDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar) {
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kNear), zNear));
     QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
+    module->slots[kNearValue].value = zNear;
+    module->slots[kFarValue].value = zFar;
 }
 
 int32_t QexSkinningDepthShader_DrawMesh(QexShaderModule* module, QexModel* model, uint32_t nodeIndex,

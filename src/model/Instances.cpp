@@ -114,7 +114,7 @@ struct Instances {
 bool DrawTogether(QexLeanDrawing* drawing, QexLeanEntry* entry, const Instances& instances) {
     QexPODModel* scene = &drawing->model->scene;
     if (!entry->type || !drawing->model->vertexBuffers || !(entry->type->traits & kTraitStatic) ||
-        entry->type->traits & kTraitShadow)
+        entry->type->traits & (kTraitShadow | kTraitDepth))
         return false;
     const QexInstanceMesh* mesh = Prepare(drawing, entry->mesh);
     const uint32_t flags = entry->flags | kVariantInstances | (instances.colours ? kVariantColours : 0u);

@@ -44,6 +44,7 @@ const QexShaderModuleType* LeanType(const QexModel* model, const QexPODNode& nod
 }
 
 uint32_t FlagsOf(const QexShaderModuleType* type, uint8_t look) {
+    if (!type->units.count) return kVariantNoTexture | kVariantConstantAlpha;
     const uint8_t alphaSource = type->traits & kTraitAlphaTexture ? kAlphaTextured : kTextured;
     return (look & kTextured ? 0u : kVariantNoTexture) | (look & alphaSource ? 0u : kVariantConstantAlpha);
 }
@@ -198,11 +199,7 @@ void BindMesh(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
     const QexLeanEntry* bound = drawing->mesh;
     if (bound && bound->mesh == entry.mesh && bound->variant == entry.variant) return;
     drawing->mesh = &entry;
-    const QexModel* model = drawing->model;
-    QexLeanState_BindMesh({model->vertexBuffers[entry.mesh], model->indexBuffers[entry.mesh],
-                           model->scene.meshes[entry.mesh].attributes, QEX_ELEMENT_COUNT,
-                           &drawing->kept->vertexArrays[entry.mesh]},
-                          entry.variant->elements);
+    QexLeanDrawing_BindMesh(*drawing, entry.mesh, entry.variant->elements);
 }
 
 // Sets what the entry is drawn with; where its variant cannot be had, draws it in the described way: false.
@@ -277,6 +274,14 @@ void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
 
 }  // namespace
 
+void QexLeanDrawing_BindMesh(const QexLeanDrawing& drawing, uint32_t mesh, uint32_t elements) {
+    const QexModel* model = drawing.model;
+    QexLeanState_BindMesh(
+        {model->vertexBuffers[mesh], model->indexBuffers[mesh], model->scene.meshes[mesh].attributes,
+         QEX_ELEMENT_COUNT, &drawing.kept->vertexArrays[mesh]},
+        elements);
+}
+
 bool QexLeanDrawing_DepthDecides() {
     GLboolean writes = GL_FALSE;
     if (!glIsEnabled(GL_DEPTH_TEST) || !QexLeanState_NearerIsSeen()) return false;
@@ -290,7 +295,8 @@ bool QexLeanDrawing_DepthDecides() {
 
 void QexLeanDrawing_MarkPass(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
     const uint32_t traits = entry.type->traits;
-    if (traits & kTraitAlphaTexture && !(entry.flags & kVariantConstantAlpha) && !(traits & kTraitKeepsPass))
+    if (traits & kTraitAlphaTexture && !(traits & kTraitKeepsPass) &&
+        TextureOf(drawing->model->alphaTextures, entry.material))
         drawing->model->scene.nodes[entry.node].blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
 }
 

@@ -75,6 +75,9 @@ void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry);
 // Makes a variant current with the entry's material and textures.
 void QexLeanDrawing_Give(QexLeanDrawing* drawing, const QexLeanEntry& entry, QexShaderVariant* variant);
 
+// Binds a mesh for what reads these elements, bits by number.
+void QexLeanDrawing_BindMesh(const QexLeanDrawing& drawing, uint32_t mesh, uint32_t elements);
+
 // Whether a mesh's box lies outside the view, rather kept than left out.
 bool QexLeanDrawing_IsOutside(const QexPODMesh& mesh, const Float4x4& mvp);
 

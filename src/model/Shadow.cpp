@@ -1,7 +1,9 @@
 // The shadow pass: what casts a shadow into the camera's view, and its depth as the light sees it.
 #include "base/Memory.h"
 #include "gl/GL.h"
+#include "gl/LeanState.h"
 #include "model/Casters.h"
+#include "model/LeanRender.h"
 #include "model/SharedShaders.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
@@ -19,19 +21,6 @@
 #define QEX_MODULE "src/QexModel"
 
 namespace {
-
-// The vertex elements that the depth programs read; both draw through what the shader modules share.
-constexpr QexShaderModuleType MakeCaster(const QexShaderList& attributes) {
-    QexShaderModuleType type = {};
-    type.path = QEX_MODULE;
-    type.attributes = attributes;
-    type.isCaster = true;
-    return type;
-}
-constexpr QexShaderModuleType kStaticCaster =
-    MakeCaster(QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0));
-constexpr QexShaderModuleType kSkinnedCaster = MakeCaster(
-    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0, QEX_ELEMENT_BONE_WEIGHT, QEX_ELEMENT_BONE_INDEX));
 
 // The axis-aligned box of a box seen through a matrix.
 QexAABB TransformedBox(const QexMatrix* matrix, const QexBoundingBox* box) {
@@ -109,8 +98,8 @@ void BindAlpha(QexModel* model, uint32_t node) {
     if (model->bindTextureHook) model->bindTextureHook(model, node);
 }
 
-void DrawStatic(QexModel* model, uint32_t node, const QexMatrix* modelMatrix,
-                const QexMatrix* lightViewProj) {
+QexMatrix LightSpaceMatrix(QexModel* model, uint32_t node, const QexMatrix* modelMatrix,
+                           const QexMatrix* lightViewProj) {
     const QexMatrix* world = QexPODAnimation_WorldMatrix(&model->scene, &model->scene.nodes[node]);
     QexMatrix placed, mvp;
     if (modelMatrix) {
@@ -118,6 +107,12 @@ void DrawStatic(QexModel* model, uint32_t node, const QexMatrix* modelMatrix,
         world = &placed;
     }
     QexMatrix_Multiply(&mvp, lightViewProj, world);
+    return mvp;
+}
+
+void DrawStatic(QexModel* model, uint32_t node, const QexMatrix* modelMatrix,
+                const QexMatrix* lightViewProj) {
+    const QexMatrix mvp = LightSpaceMatrix(model, node, modelMatrix, lightViewProj);
     QexRenderState_UseProgram(m_uModelShadowShaderProgram.program);
     QEX_GL(glUniformMatrix4fv(m_uModelShadowShaderProgram.mvpMatrixLoc, 1, GL_FALSE, mvp.m));
     BindAlpha(model, node);
@@ -133,6 +128,55 @@ void DrawSkinned(QexModel* model, uint32_t node, const QexMatrix* lightViewProj)
 
 bool CanDraw(const QexModel* model, uint32_t node) {
     return model->vertexBuffers && node < model->scene.meshNodeCount;
+}
+
+bool IsDrawn(const QexModel* model, uint32_t node) {
+    return CanDraw(model, node) && model->scene.nodes[node].stateFlags & QEX_NODE_RENDERING_ENABLED;
+}
+
+void DrawDescribed(const QexShadowCaster& caster, const QexMatrix* modelMatrix,
+                   const QexMatrix* lightViewProj) {
+    QexModel* model = caster.model;
+    for (uint32_t i = 0; i < caster.nodeCount; ++i) {
+        const uint32_t node = static_cast<uint32_t>(caster.nodeIndices[i]);
+        if (!IsDrawn(model, node)) continue;
+        if (QexPODModel_MeshOf(&model->scene, node)->skinned)
+            DrawSkinned(model, node, lightViewProj);
+        else
+            DrawStatic(model, node, modelMatrix, lightViewProj);
+    }
+}
+
+// Without alpha textures, which only a hook could bind. False where the variants cannot be had.
+bool DrawLean(const QexShadowCaster& caster, const QexMatrix* modelMatrix, const QexMatrix* lightViewProj) {
+    QexModel* model = caster.model;
+    const uint32_t bare = kVariantNoTexture | kVariantConstantAlpha;
+    const QexLeanCall call = {nullptr, nullptr, &g_sMatIdentity, lightViewProj, nullptr};
+    const QexShaderModuleType* types[] = {QexModel_CasterType(false), QexModel_CasterType(true)};
+    QexShaderVariant* variants[] = {QexShaderVariant_Get(types[0], bare),
+                                    QexShaderVariant_Get(types[1], bare)};
+    QexLeanDrawing drawing;
+    if (model->bindTextureHook || !variants[0] || !variants[1]) return false;
+    if (!QexLeanDrawing_Begin(&drawing, model, call, true)) return false;
+    for (uint32_t i = 0; i < caster.nodeCount; ++i) {
+        const uint32_t node = static_cast<uint32_t>(caster.nodeIndices[i]);
+        if (!IsDrawn(model, node)) continue;
+        const uint32_t mesh = static_cast<uint32_t>(model->scene.nodes[node].objectIndex);
+        const uint32_t skinned = model->scene.meshes[mesh].skinned ? 1 : 0;
+        const int32_t* at = variants[skinned]->locations;
+        QexShaderVariant_Use(variants[skinned], drawing.frame, {});
+        QexLeanDrawing_BindMesh(drawing, mesh, variants[skinned]->elements);
+        if (skinned) {
+            QexShaderModule_DrawBatches(
+                types[1], model, node,
+                {at[kUniform_boneCount], at[kUniform_boneMatrixArray], false, 0, nullptr});
+        } else {
+            const QexMatrix mvp = LightSpaceMatrix(model, node, modelMatrix, lightViewProj);
+            glUniformMatrix4fv(at[kUniform_mvpMatrix], 1, GL_FALSE, mvp.m);
+            QexShaderModule_DrawFaces(types[0], model, mesh);
+        }
+    }
+    return true;
 }
 
 }  // namespace
@@ -196,29 +240,23 @@ void QexModel_RenderShadow(const QexRuntimeContext* context, const QexMatrix* mo
 void QexModel_RenderFromShadowCamera(const QexMatrix* modelMatrix, const QexShadowInfo* info) {
     for (uint32_t c = 0; info && c < info->casterCount; ++c) {
         const QexShadowCaster& caster = info->casters[c];
-        for (uint32_t i = 0; i < caster.nodeCount; ++i) {
-            const uint32_t node = static_cast<uint32_t>(caster.nodeIndices[i]);
-            if (!CanDraw(caster.model, node)) continue;
-            if (!(caster.model->scene.nodes[node].stateFlags & QEX_NODE_RENDERING_ENABLED)) continue;
-            if (QexPODModel_MeshOf(&caster.model->scene, node)->skinned)
-                DrawSkinned(caster.model, node, &info->lightViewProj);
-            else
-                DrawStatic(caster.model, node, modelMatrix, &info->lightViewProj);
-        }
+        if (!QexLeanState_IsLean() || !DrawLean(caster, modelMatrix, &info->lightViewProj))
+            DrawDescribed(caster, modelMatrix, &info->lightViewProj);
     }
-    QexRenderState_Restore();
+    if (QexLeanState_IsLean()) return;
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
 }
 
 void QexModel_DrawShadowMesh(QexModel* model, uint32_t nodeIndex) {
-    if (CanDraw(model, nodeIndex)) QexShaderModule_DrawMesh(&kStaticCaster, model, nodeIndex);
+    if (CanDraw(model, nodeIndex)) QexShaderModule_DrawMesh(QexModel_CasterType(false), model, nodeIndex);
 }
 
 void QexModel_DrawSkinShadowMesh(QexModel* model, uint32_t nodeIndex) {
     const QexShaderBones bones = {m_SkinShadowShaderProgram.boneCountLoc,
                                   m_SkinShadowShaderProgram.boneMatrixArrayLoc, false, 0, nullptr};
-    if (CanDraw(model, nodeIndex)) QexShaderModule_DrawSkinnedMesh(&kSkinnedCaster, model, nodeIndex, bones);
+    if (CanDraw(model, nodeIndex))
+        QexShaderModule_DrawSkinnedMesh(QexModel_CasterType(true), model, nodeIndex, bones);
 }
 
 }  // extern "C"

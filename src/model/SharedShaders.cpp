@@ -10,6 +10,8 @@
 #include "Qex/renderer.h"
 #include "Qex/shader_modules.h"
 #include "Qex/shadows.h"
+#include "Shaders/QexShaderModule.h"
+#include "Shaders/QexShaderVariant.h"
 #include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexModel"
@@ -20,7 +22,7 @@ constexpr int32_t kDefaultShadowSize = 512;
 constexpr char kName[] = "QexModel_CreateDefaultShader";
 
 // What lies before the near plane is drawn at it: it stands between the light and the view, and casts.
-const char* const kSkinShadowVertexSource = R"(
+constexpr const char* kSkinShadowVertexSource = R"(
 attribute highp vec3 inVertex;
 attribute mediump vec2 inTexCoord;
 attribute mediump vec4 inBoneWeight;
@@ -41,7 +43,7 @@ void main() {
 }
 )";
 
-const char* const kShadowVertexSource = R"(
+constexpr const char* kShadowVertexSource = R"(
 attribute highp vec3 inVertex;
 attribute mediump vec2 inTexCoord;
 uniform highp mat4 mvpMatrix;
@@ -55,7 +57,7 @@ void main() {
 )";
 
 // The light's projection is orthographic: w is 1.
-const char* const kShadowFragmentSource = R"(
+constexpr const char* kShadowFragmentSource = R"(
 #ifdef GL_FRAGMENT_PRECISION_HIGH
 precision highp float;
 #else
@@ -65,11 +67,35 @@ uniform sampler2D alphaTexture;
 varying vec4 fPosition;
 varying mediump vec2 fTexCoord;
 void main() {
+#ifndef QEX_CONSTANT_ALPHA
     if (texture2D(alphaTexture, fTexCoord).r <= 0.01) discard;
+#endif
     float depth = (fPosition.z + 1.0) / 2.0;
     gl_FragColor = vec4(depth, depth, depth, 1.0);
 }
 )";
+
+// The vertex elements that the programs read. Described drawing takes these alone from here, lean drawing
+// makes variants.
+constexpr QexShaderModuleType MakeCaster(const char* vertexSource, uint32_t trait,
+                                         const QexShaderList& attributes, const QexShaderList& uniforms) {
+    QexShaderModuleType type = {};
+    type.path = QEX_MODULE;
+    type.vertexSource = vertexSource;
+    type.fragmentSource = kShadowFragmentSource;
+    type.attributes = attributes;
+    type.uniforms = uniforms;
+    type.isCaster = true;
+    type.traits = trait | kTraitVariants;
+    return type;
+}
+constexpr QexShaderModuleType kStaticCaster =
+    MakeCaster(kShadowVertexSource, kTraitStatic, QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0),
+               QexShaderList_Of(kUniform_mvpMatrix));
+constexpr QexShaderModuleType kSkinnedCaster = MakeCaster(
+    kSkinShadowVertexSource, kTraitSkinned,
+    QexShaderList_Of(QEX_ELEMENT_POSITION, QEX_ELEMENT_UV0, QEX_ELEMENT_BONE_WEIGHT, QEX_ELEMENT_BONE_INDEX),
+    QexShaderList_Of(kUniform_viewProjMatrix, kUniform_boneCount, kUniform_boneMatrixArray));
 
 const char* const kSkinShadowAttributes[] = {"inVertex", "inTexCoord", "inBoneWeight", "inBoneIndex"};
 const char* const kShadowAttributes[] = {"inVertex", "inTexCoord"};
@@ -153,6 +179,10 @@ const QexModelSharedShaders* QexModel_GetSharedShaders() {
     return &s_Shared;
 }
 
+const QexShaderModuleType* QexModel_CasterType(bool skinned) {
+    return skinned ? &kSkinnedCaster : &kStaticCaster;
+}
+
 uint32_t QexModel_GetSharedGeneration() {
     return s_Generation;
 }
@@ -173,6 +203,8 @@ int32_t QexModel_CreateDefaultShader(void) {
     s_Shared.skinning = QexSkinningTextureShader_CreateProgram();
     s_Shared.simple = QexSimpleShader_CreateProgram();
     CreateShadowPrograms();
+    QexShaderVariant_Retain(&kStaticCaster);
+    QexShaderVariant_Retain(&kSkinnedCaster);
     CreateShadowTarget();
     return 0;
 }
@@ -184,6 +216,8 @@ void QexModel_ReleaseShader(int32_t force) {
         {&m_SkinShadowShaderProgram.program, &s_SkinShadowShaders.vertex, &s_SkinShadowShaders.fragment});
     QexProgram_Delete(
         {&m_uModelShadowShaderProgram.program, &s_ModelShadowShaders.vertex, &s_ModelShadowShaders.fragment});
+    QexShaderVariant_Release(&kStaticCaster);
+    QexShaderVariant_Release(&kSkinnedCaster);
     QexTextureShader_Release(&s_Shared.texture);
     QexSkinningTextureShader_Release(&s_Shared.skinning);
     QexSimpleShader_Release(&s_Shared.simple);

@@ -8,6 +8,8 @@
 #include "Qex/pod.h"
 #include "Qex/shader_modules.h"
 
+struct QexShaderModuleType;
+
 struct QexModelSharedShaders {
     QexShaderModule* texture;  // null while there are none
     QexShaderModule* skinning;
@@ -27,6 +29,9 @@ uint32_t QexModel_GetSharedGeneration();
 inline bool QexModel_IsOutdated(const QexModel* model) {
     return model->sharedGeneration && model->sharedGeneration != QexModel_GetSharedGeneration();
 }
+
+// What draws casters into the shadow map, through what the shader modules share.
+const QexShaderModuleType* QexModel_CasterType(bool skinned);
 
 // The lit module that models made of arrays share: made when first asked for, gone with the others.
 QexShaderModule* QexModel_GetSharedLitShader();

@@ -63,6 +63,7 @@ class ShadowTest : public RenderTest {
         const QexShadowCaster request = {&model.model, 0, casters.data(),
                                          static_cast<uint32_t>(casters.size())};
         QexLightSet lights = {1, {{1, {direction.x, direction.y, direction.z}, {2, 2, 2, 1}}}};
+        QexRenderer_SetDrawing(drawing_);
         QexModel_UpdateModelBoundingBox(&model.model, nullptr);
         QexShadowInfo* info = QexModel_InitShadowInfo(&camera_, &direction, &request, 1, 0.25f, 0.01f);
         drawn_ = info->casters[0].nodeCount;
@@ -75,6 +76,7 @@ class ShadowTest : public RenderTest {
         QexModel_RenderNodeFromViewPerspectiveWithShadow(
             &model.model, 0, &lights, nullptr, &camera_.viewMatrix, &camera_.projectionMatrix, info);
         QexModel_ReleaseShadowInfo(info);
+        QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
         return Read();
     }
     Rgba At(const Picture& picture, glm::vec3 point) const {
@@ -87,6 +89,7 @@ class ShadowTest : public RenderTest {
     QexShaderModule* module_;
     QexCamera camera_;
     uint32_t drawn_ = 0;
+    int32_t drawing_ = QEX_DRAWING_DESCRIBED;
 };
 
 const Rgba kLit = {255, 255, 255, 255};
@@ -94,26 +97,29 @@ const Rgba kLit = {255, 255, 255, 255};
 // Light straight down, and light that moves a shadow of height 10 by 5 to the east.
 TEST_F(ShadowTest, FallsWhereTheGeometrySays) {
     const glm::vec3 moves[] = {{6, 0, 3}, {-8, 0, 1}, {5, 0, -9}, {99, 0, 99}};  // of the bones
+    const glm::vec3 bent =
+        glm::vec3(1, 0, 2) + (100.0f * moves[0] + 60.0f * moves[1] + 80.0f * moves[2]) / 240.0f;
     const struct {
         QexVec3 direction;
         Square square;
         glm::vec3 centre;
+        int32_t drawing = QEX_DRAWING_DESCRIBED;
     } cases[] = {
-        {{0, -1, 0}, {{0, 10, 0}}, {0, 0, 0}},
+        {{0, -1, 0}, {{0, 10, 0}}, {0, 0, 0}, QEX_DRAWING_LEAN},
         {{1, -2, 0}, {{0, 10, 0}}, {5, 0, 0}},
         {{0, -2, 1}, {{-6, 10, -4}}, {-6, 0, 1}},
         // Above the camera, between the light and the view.
         {{0, -1, 0}, {{5, 70, 3}}, {5, 0, 3}},
         // Only the first three bones of a vertex count.
-        {{0, -1, 0},
-         {{1, 10, 2}, false, true},
-         glm::vec3(1, 0, 2) + (100.0f * moves[0] + 60.0f * moves[1] + 80.0f * moves[2]) / 240.0f},
+        {{0, -1, 0}, {{1, 10, 2}, false, true}, bent},
+        {{0, -1, 0}, {{1, 10, 2}, false, true}, bent, QEX_DRAWING_LEAN},
     };
     for (const auto& c : cases) {
         LoadedModel model(FloorAndSquare(c.square));
         ASSERT_EQ(model.log, "");
         for (uint32_t i = 0; i < 4; ++i)
             QexModel_SetNodePosition(&model.model, 2 + i, moves[i].x, moves[i].y, moves[i].z);
+        drawing_ = c.drawing;
         const Picture picture = Floor(model, c.direction, {0, 1});
         EXPECT_EQ(drawn_, 2u);
         const int grey =
@@ -149,10 +155,13 @@ TEST_F(ShadowTest, TheHookLeavesHoles) {
     static QexTexture* s_half;
     s_half = &half;
     LoadedModel model(FloorAndSquare({{0, 10, 0}}));
-    model.model.bindTextureHook = [](QexModel*, uint32_t) { return QexTexture_Set(s_half, 3), 0; };
-    const Picture picture = Floor(model, {0, -1, 0}, {1});
-    EXPECT_EQ(At(picture, {2, 0, 0}), kLit);
-    EXPECT_TRUE(Near(At(picture, {-2, 0, 0}), {128, 128, 128, 255}, 1));
+    for (const int32_t drawing : {QEX_DRAWING_DESCRIBED, QEX_DRAWING_LEAN}) {
+        drawing_ = drawing;
+        model.model.bindTextureHook = [](QexModel*, uint32_t) { return QexTexture_Set(s_half, 3), 0; };
+        const Picture picture = Floor(model, {0, -1, 0}, {1});
+        EXPECT_EQ(At(picture, {2, 0, 0}), kLit);
+        EXPECT_TRUE(Near(At(picture, {-2, 0, 0}), {128, 128, 128, 255}, 1));
+    }
 }
 
 TEST_F(ShadowTest, StateAfterThePass) {
@@ -168,6 +177,13 @@ TEST_F(ShadowTest, StateAfterThePass) {
     glDisable(GL_SCISSOR_TEST);
     const GLCalls calls([&] { QexModel_RenderShadow(&runtime_, nullptr, info); });
     EXPECT_EQ(calls.Of({"glDrawElements"}).size(), 2u);
+    QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
+    QexModel_RenderShadow(&runtime_, nullptr, info);
+    const GLCalls lean([&] { QexModel_RenderShadow(&runtime_, nullptr, info); });
+    EXPECT_LE(lean.Size() + 12, calls.Size()) << "a matrix and a draw for each of the two";
+    EXPECT_EQ(lean.Of({"glUniformMatrix4fv", "glDrawElements"}).size(), 4u);
+    EXPECT_EQ(lean.Of({"glVertexAttribPointer", "glGetError"}).size(), 0u);
+    QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
     EXPECT_EQ(GLCalls([&] { QexModel_RenderShadow(&runtime_, nullptr, nullptr); }).Size(), 0u);
     gltapState state;
     gltapGetState(&state);
