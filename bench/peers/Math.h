@@ -1,5 +1,5 @@
-// The math that is compared: four operations on 256 inputs, Qex's through the shared library as an application calls
-// it, a peer's behind a function call of this program.
+// The math that is compared: four operations on 256 inputs, Qex's through the shared library as an
+// application calls it, a peer's behind a function call of this program.
 #pragma once
 
 #include <cmath>
@@ -11,8 +11,8 @@
 #include "Qex.h"
 #include "Ratio.h"
 
-// A peer has types Matrix (16 floats, column-major) and Quaternion (x, y, z, w), which its inputs are copied to, and
-// Multiply, Inverse, ToMatrix and Slerp, which take pointers to them, the result's first.
+// A peer has types Matrix (16 floats, column-major) and Quaternion (x, y, z, w), which its inputs are copied
+// to, and Multiply, Inverse, ToMatrix and Slerp, which take pointers to them, the result's first.
 template <class Peer>
 class MathComparison {
   public:
@@ -86,7 +86,8 @@ class MathComparison {
         const float sign = own[16] * peer[16] < 0 ? -1.0f : 1.0f;
         for (int i = 0; i < 20; ++i) {
             if (std::fabs(own[i] - (i < 16 ? 1 : sign) * peer[i]) <= 1e-3f) continue;
-            fprintf(stderr, "the two sides differ in number %d: %g and %g\n", i, double(own[i]), double(peer[i]));
+            fprintf(stderr, "the two sides differ in number %d: %g and %g\n", i, double(own[i]),
+                    double(peer[i]));
             exit(1);
         }
     }

@@ -1,9 +1,9 @@
-// One model from its file to memory: assimp's importer reads it as binary glTF, without any step after it, the engine
-// as POD; once more with the engine's buffers filled, under the tap's null driver.
+// One model from its file to memory: assimp's importer reads it as binary glTF, without any step after it,
+// the engine as POD; once more with the engine's buffers filled, under the tap's null driver.
 #include <cstdlib>
 
-#include <assimp/Importer.hpp>
 #include <assimp/scene.h>
+#include <assimp/Importer.hpp>
 
 #include "BenchEngine.h"
 #include "gltap.h"

@@ -1,5 +1,5 @@
-// Math against cglm, whose functions are inlined into one call each. It has no inverse for affine matrices with
-// scale, so the general one stands against Qex's.
+// Math against cglm, whose functions are inlined into one call each. It has no inverse for affine matrices
+// with scale, so the general one stands against Qex's.
 #include <cglm/cglm.h>
 
 #include "Math.h"
@@ -26,7 +26,8 @@ struct Cglm {
     __attribute__((noinline)) static void ToMatrix(Matrix* out, const Quaternion* q) {
         glm_quat_mat4(In(q), out->m);
     }
-    __attribute__((noinline)) static void Slerp(Quaternion* out, const Quaternion* a, const Quaternion* b, float t) {
+    __attribute__((noinline)) static void Slerp(Quaternion* out, const Quaternion* a, const Quaternion* b,
+                                                float t) {
         glm_quat_slerp(In(a), In(b), t, out->q);
     }
 };

@@ -14,9 +14,14 @@ struct Glm {
     __attribute__((noinline)) static void Multiply(Matrix* out, const Matrix* a, const Matrix* b) {
         *out = *a * *b;
     }
-    __attribute__((noinline)) static void Inverse(Matrix* out, const Matrix* m) { *out = glm::affineInverse(*m); }
-    __attribute__((noinline)) static void ToMatrix(Matrix* out, const Quaternion* q) { *out = glm::mat4_cast(*q); }
-    __attribute__((noinline)) static void Slerp(Quaternion* out, const Quaternion* a, const Quaternion* b, float t) {
+    __attribute__((noinline)) static void Inverse(Matrix* out, const Matrix* m) {
+        *out = glm::affineInverse(*m);
+    }
+    __attribute__((noinline)) static void ToMatrix(Matrix* out, const Quaternion* q) {
+        *out = glm::mat4_cast(*q);
+    }
+    __attribute__((noinline)) static void Slerp(Quaternion* out, const Quaternion* a, const Quaternion* b,
+                                                float t) {
         *out = glm::slerp(*a, *b, t);
     }
 };

@@ -1,5 +1,5 @@
-// 1,000 lit cubes, a node each: Irrlicht's scene manager on its null device, which makes no GL call at all, against
-// lean drawing under the tap's null driver, which counts and follows every call.
+// 1,000 lit cubes, a node each: Irrlicht's scene manager on its null device, which makes no GL call at all,
+// against lean drawing under the tap's null driver, which counts and follows every call.
 #include <irrlicht.h>
 
 #include <cstdlib>

@@ -1,9 +1,9 @@
-// Writes the model that the loaders read as a binary glTF: two spheres of 90,000 triangles each, with normals and
-// texture coordinates, beside each other. `qex convert` makes the POD of it.
+// Writes the model that the loaders read as a binary glTF: two spheres of 90,000 triangles each, with normals
+// and texture coordinates, beside each other. `qex convert` makes the POD of it.
 #include <cstdio>
 
-#include <assimp/Exporter.hpp>
 #include <assimp/scene.h>
+#include <assimp/Exporter.hpp>
 
 #include "Scenes.h"
 
@@ -42,7 +42,7 @@ int main(int argc, char** argv) {
     if (argc != 2) return fprintf(stderr, "usage: %s OUT.glb\n", argv[0]), 2;
     aiScene scene;
     scene.mNumMaterials = 1;
-    scene.mMaterials = new aiMaterial*[1]{new aiMaterial};
+    scene.mMaterials = new aiMaterial* [1] { new aiMaterial };
     scene.mNumMeshes = kMeshes;
     scene.mMeshes = new aiMesh*[kMeshes];
     scene.mRootNode = new aiNode("root");
