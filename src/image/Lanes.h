@@ -19,6 +19,31 @@ static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__, "pixels are put togethe
 
 typedef uint16_t Lanes __attribute__((vector_size(16)));
 
+// Red and blue, or green and alpha, of one colour, for four pixels; the second one in the upper half.
+QEX_INLINE Lanes QexLanes_Splat(uint32_t pair) {
+    typedef uint32_t Pairs __attribute__((vector_size(16)));
+    return reinterpret_cast<Lanes>(Pairs{pair, pair, pair, pair});
+}
+
+// Any eight lanes of a and b: 0 to 7 are a's, 8 to 15 are b's.
+template <int... from>
+QEX_INLINE Lanes QexLanes_Pick(Lanes a, Lanes b) {
+#if defined(__clang__)
+    return __builtin_shufflevector(a, b, from...);
+#else
+    return __builtin_shuffle(a, b, Lanes{from...});
+#endif
+}
+
+// In each half of 8 bytes: those of `left` from byte `first` on, then the first ones of `right`.
+template <int first>
+QEX_INLINE Lanes QexLanes_Join(Lanes left, Lanes right) {
+    typedef uint64_t Halves __attribute__((vector_size(16)));
+    const Halves head = reinterpret_cast<Halves>(left) >> 8 * first;
+    const Halves tail = reinterpret_cast<Halves>(right) << (64 - 8 * first);
+    return reinterpret_cast<Lanes>(head | tail);
+}
+
 #else
 
 struct Lanes {
@@ -51,13 +76,31 @@ QEX_INLINE Lanes operator~(Lanes a) {
     return a ^ 0xFFFF;
 }
 
+QEX_INLINE Lanes QexLanes_Splat(uint32_t pair) {
+    const auto first = static_cast<uint16_t>(pair), second = static_cast<uint16_t>(pair >> 16);
+    return {first, second, first, second, first, second, first, second};
+}
+
+template <int... from>
+QEX_INLINE Lanes QexLanes_Pick(Lanes a, Lanes b) {
+    return {(from < 8 ? a.lane[from & 7] : b.lane[from & 7])...};
+}
+
+template <int first>
+QEX_INLINE Lanes QexLanes_Join(Lanes left, Lanes right) {
+    uint64_t halves[2], next[2];
+    memcpy(halves, &left, sizeof halves);
+    memcpy(next, &right, sizeof next);
+    for (uint32_t i = 0; i < 2; ++i) halves[i] = halves[i] >> 8 * first | next[i] << (64 - 8 * first);
+    memcpy(&left, halves, sizeof left);
+    return left;
+}
+
 #endif
 
-// Red and blue, or green and alpha, of one colour, for four pixels; the second one in the upper half.
-QEX_INLINE Lanes QexLanes_Splat(uint32_t pair) {
-    const uint32_t pairs[4] = {pair, pair, pair, pair};
+QEX_INLINE Lanes QexLanes_Load(const uint16_t from[8]) {
     Lanes lanes;
-    memcpy(&lanes, pairs, sizeof lanes);
+    memcpy(&lanes, from, sizeof lanes);
     return lanes;
 }
 

@@ -7,7 +7,9 @@
 #include "Qex/base.h"
 
 typedef float Float4 __attribute__((vector_size(16)));
-typedef double Double4 __attribute__((vector_size(32)));
+typedef double Double2 __attribute__((vector_size(16)));
+typedef int32_t Int4 __attribute__((vector_size(16)));
+typedef int64_t Long2 __attribute__((vector_size(16)));
 
 inline Float4 Load4(const float* from) {
     Float4 value;
@@ -25,13 +27,17 @@ inline Float4 Shuffle(Float4 a, Float4 b) {
 #if defined(__clang__)
     return __builtin_shufflevector(a, b, i, j, k, l);
 #else
-    typedef int Int4 __attribute__((vector_size(16)));
     return __builtin_shuffle(a, b, Int4{i, j, k, l});
 #endif
 }
+// As integers, since SSE2 shuffles those into another register.
 template <int i, int j, int k, int l>
 inline Float4 Shuffle(Float4 a) {
-    return Shuffle<i, j, k, l>(a, a);
+#if defined(__clang__)
+    return __builtin_shufflevector(a, a, i, j, k, l);
+#else
+    return reinterpret_cast<Float4>(__builtin_shuffle(reinterpret_cast<Int4>(a), Int4{i, j, k, l}));
+#endif
 }
 
 // One lane in all four.
@@ -42,12 +48,22 @@ inline Float4 Splat(Float4 a) {
 
 // The lanes without their signs.
 inline Float4 Magnitude(Float4 a) {
-    typedef int Int4 __attribute__((vector_size(16)));
-    Int4 bits;
-    memcpy(&bits, &a, sizeof bits);
-    bits &= 0x7FFFFFFF;
-    memcpy(&a, &bits, sizeof bits);
-    return a;
+    return reinterpret_cast<Float4>(reinterpret_cast<Int4>(a) & INT32_MAX);
+}
+inline Double2 Magnitude(Double2 a) {
+    return reinterpret_cast<Double2>(reinterpret_cast<Long2>(a) & INT64_MAX);
+}
+
+// The first three lanes, and 0.
+inline Float4 FirstThree(Float4 a) {
+    return reinterpret_cast<Float4>(reinterpret_cast<Int4>(a) & Int4{-1, -1, -1, 0});
+}
+
+// The first two lanes.
+inline Double2 Widen(Float4 a) {
+    typedef double Double4 __attribute__((vector_size(32)));
+    const Double4 wide = __builtin_convertvector(a, Double4);
+    return Double2{wide[0], wide[1]};
 }
 
 // c0 * v.x + c1 * v.y + c2 * v.z

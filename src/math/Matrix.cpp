@@ -205,33 +205,31 @@ void QexMatrix_Transpose(QexMatrix* m) {
 }
 
 QexMatrix* QexMatrix_Inverse(QexMatrix* out, const QexMatrix* m) {
-    // The axes, and their components turned by one and by two places. Nothing depends on the fourth lanes.
+    // Nothing depends on the fourth lanes.
     const Float4 a = Load4(m->m), b = Load4(m->m + 4), c = Load4(m->m + 8), t = Load4(m->m + 12);
-    const Float4 a1 = Shuffle<1, 2, 0, 3>(a), a2 = Shuffle<2, 0, 1, 3>(a);
-    const Float4 b1 = Shuffle<1, 2, 0, 3>(b), b2 = Shuffle<2, 0, 1, 3>(b);
-    const Float4 c1 = Shuffle<1, 2, 0, 3>(c), c2 = Shuffle<2, 0, 1, 3>(c);
 
-    // The six products of the determinant, three of either sign. In double those of a singular matrix cancel
-    // to within their last bits; the sum of their magnitudes is the scale that the determinant is judged by.
-    const Double4 wideA = __builtin_convertvector(a, Double4);
-    const Double4 plus = wideA * __builtin_convertvector(b1, Double4) * __builtin_convertvector(c2, Double4);
-    const Double4 minus = wideA * __builtin_convertvector(b2, Double4) * __builtin_convertvector(c1, Double4);
-    const double determinant = (plus[0] - minus[0]) + (plus[1] - minus[1]) + (plus[2] - minus[2]);
-    const double magnitude =
-        fabs(plus[0]) + fabs(plus[1]) + fabs(plus[2]) + fabs(minus[0]) + fabs(minus[1]) + fabs(minus[2]);
-    if (determinant == 0 || fabs(determinant) < 1e-15 * magnitude) return nullptr;
+    // The six products of the determinant, two each of x, y and z of all axes; the second one's sign is
+    // opposite in z alone. In double those of a singular matrix cancel to within their last bits; the sum of
+    // their magnitudes is the scale that the determinant is judged by.
+    const Double2 aXY = Widen(a), bXY = Widen(b), cXY = Widen(c);
+    const Double2 bYX = {bXY[1], bXY[0]}, cYX = {cXY[1], cXY[0]};
+    const Double2 ofC = aXY * bYX * Widen(Splat<2>(c)), ofB = aXY * cYX * Widen(Splat<2>(b));
+    const Double2 ofA = bXY * cYX * Widen(Splat<2>(a));
+    const Double2 difference = ofC - ofB, scales = Magnitude(ofC) + Magnitude(ofB) + Magnitude(ofA);
+    const double determinant = (difference[0] - difference[1]) + (ofA[0] - ofA[1]);
+    if (fabs(determinant) <= 1e-15 * (scales[0] + scales[1])) return nullptr;
 
-    // The rows of the inverse are the cross products of the axes.
-    const float inverse = static_cast<float>(1 / determinant);
-    const Float4 row0 = (b1 * c2 - b2 * c1) * inverse;
-    const Float4 row1 = (c1 * a2 - c2 * a1) * inverse;
-    const Float4 row2 = (a1 * b2 - a2 * b1) * inverse;
-    const Float4 zero = {0, 0, 0, 0}, origin = {0, 0, 0, 1};
-    const Float4 low01 = Shuffle<0, 4, 1, 5>(row0, row1), high01 = Shuffle<2, 6, 3, 7>(row0, row1);
-    const Float4 low2 = Shuffle<0, 4, 1, 5>(row2, zero), high2 = Shuffle<2, 6, 3, 7>(row2, zero);
-    const Float4 o0 = Shuffle<0, 1, 4, 5>(low01, low2), o1 = Shuffle<2, 3, 6, 7>(low01, low2);
-    const Float4 o2 = Shuffle<0, 1, 4, 5>(high01, high2);
-    Store4x4(out->m, {o0, o1, o2, origin - Combine3(o0, o1, o2, t)});
+    // The rows of the inverse are the cross products of the axes, here as z, x, y. They are scaled last, as
+    // the division takes longest.
+    const Float4 aYZX = Shuffle<1, 2, 0, 3>(a), bYZX = Shuffle<1, 2, 0, 3>(b), cYZX = Shuffle<1, 2, 0, 3>(c);
+    const Float4 row0 = b * cYZX - bYZX * c, row1 = c * aYZX - cYZX * a,
+                 row2 = FirstThree(a * bYZX - aYZX * b);
+    const Float4 low = Shuffle<0, 4, 1, 5>(row0, row1), high = Shuffle<2, 6, 3, 7>(row0, row1);
+    const float scale = static_cast<float>(1 / determinant);
+    const Float4 inverse = FirstThree(Float4{scale, scale, scale, scale}), origin = {0, 0, 0, 1};
+    const Float4 x = Shuffle<2, 3, 5, 7>(low, row2) * inverse, y = Shuffle<0, 1, 6, 7>(high, row2) * inverse;
+    const Float4 z = Shuffle<0, 1, 4, 7>(low, row2) * inverse;
+    Store4x4(out->m, {x, y, z, origin - Combine3(x, y, z, t)});
     return out;
 }
 
