@@ -7,15 +7,9 @@ namespace {
 
 constexpr const char* kVertexSource =
     QEX_GLSL_SKINNED_VERTEX QEX_GLSL_SKINNED_VECTOR QEX_GLSL_NORMAL("mediump")
-        QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") R"(
-varying mediump vec3 fDiffuse;
-void main() {
-    highp vec3 point = placeVertex();
-    fDiffuse = diffuseLight(point, normalize(worldVector(inNormal)));
-}
-)";
+        QEX_GLSL_LIGHT_VECTOR QEX_GLSL_DIFFUSE("3", "highp") QEX_GLSL_GOURAUD_VERTEX;
 
-constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_SURFACE QEX_GLSL_GOURAUD_FRAGMENT;
+constexpr const char* kFragmentSource = QEX_GLSL_ALPHA QEX_GLSL_GOURAUD_FRAGMENT;
 
 constexpr QexLitShaderType kType =
     QexLitShader_Describe("src/Shaders/QexSkinningGouraudShader", kVertexSource, kFragmentSource,
