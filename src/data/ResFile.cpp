@@ -15,13 +15,18 @@ namespace {
 // Room for the closing 0 byte within the largest block that QexMemory_Alloc gives.
 constexpr long kMaxFileSize = INT32_MAX - 1;
 
+// The size of an open file, -1 where it has none. A directory opens for reading, too; its size is absurd, or
+// reading it fails. A pipe cannot be sought.
+long FindSize(FILE* file) {
+    if (fseek(file, 0, SEEK_END) != 0) return -1;
+    const long size = ftell(file);
+    return size <= kMaxFileSize && fseek(file, 0, SEEK_SET) == 0 ? size : -1;
+}
+
 // Reads all of an open file into the record, which stays closed when that fails.
 void ReadAll(QexResFile* record, FILE* file) {
-    // A directory opens for reading, too; its size is absurd, or reading it fails. A pipe cannot be sought.
-    if (fseek(file, 0, SEEK_END) != 0) return;
-    const long size = ftell(file);
-    if (size < 0 || size > kMaxFileSize || fseek(file, 0, SEEK_SET) != 0) return;
-
+    const long size = FindSize(file);
+    if (size < 0) return;
     const size_t count = static_cast<size_t>(size);
     QexScratch<uint8_t> data(uint64_t{count} + 1);
     if (!data) return;
@@ -39,6 +44,21 @@ void ClearData(QexResFile* record) {
     record->data = nullptr;
 }
 
+// Opens a file for a closed record that keeps its path; null, logged, when there is none.
+FILE* Open(QexResFile* record, const char* path) {
+    // Opened first, since the path may be the record's own.
+    FILE* const file = QexResFile_OpenForReading(path);
+    QexResFile_SetReadPath(record, path);
+    ClearData(record);
+    if (!file) QexError(QEX_TAG, "<QexResFile_Create> opening file '%s' failed", path ? path : "");
+    return file;
+}
+
+// Null for a record without a file of its own that is still open.
+QexUnreadFile* AsUnread(QexResFile* record) {
+    return record->open && record->size && !record->data ? static_cast<QexUnreadFile*>(record) : nullptr;
+}
+
 }  // namespace
 
 FILE* QexResFile_OpenForReading(const char* path) {
@@ -48,17 +68,45 @@ FILE* QexResFile_OpenForReading(const char* path) {
 }
 
 int32_t QexResFile_Create(QexResFile* record, const char* path) {
-    // Opened first, since the path may be the record's own.
-    FILE* const file = QexResFile_OpenForReading(path);
-    QexResFile_SetReadPath(record, path);
-    ClearData(record);
-    if (!file) {
-        QexError(QEX_TAG, "<QexResFile_Create> opening file '%s' failed", path ? path : "");
-        return -1;
-    }
+    FILE* const file = Open(record, path);
+    if (!file) return -1;
     ReadAll(record, file);
     fclose(file);
     return 0;
+}
+
+int32_t QexResFile_CreateUnread(QexUnreadFile* file, const char* path) {
+    FILE* const handle = Open(file, path);
+    if (!handle) return -1;
+    setvbuf(handle, file->buffer, _IOFBF, sizeof file->buffer);
+    const long size = FindSize(handle);
+    // The first byte shows whether it can be read at all.
+    const bool readable = size == 0 || (size > 0 && ungetc(getc(handle), handle) != EOF);
+    if (readable) {
+        file->open = 1;
+        file->size = static_cast<uint32_t>(size);
+        file->handle = handle;
+        file->position = 0;
+    }
+    if (!AsUnread(file)) fclose(handle);
+    return 0;
+}
+
+bool QexResFile_Copy(QexResFile* record, uint32_t position, void* destination, uint32_t count) {
+    if (record->data) {
+        memcpy(destination, record->data + position, count);
+        return true;
+    }
+    QexUnreadFile* const file = AsUnread(record);
+    if (!file) return false;
+    const bool there =
+        file->position == position || fseek(file->handle, static_cast<long>(position), SEEK_SET) == 0;
+    file->position = position + count;
+    if (there && fread(destination, 1, count, file->handle) == count) return true;
+    QexError(QEX_TAG, "<QexResFile_Copy> reading file '%s' failed", file->path);
+    fclose(file->handle);
+    file->open = 0;
+    return false;
 }
 
 int32_t QexResFile_CreateFromMemory(QexResFile* record, const void* data, uint32_t size) {
@@ -104,6 +152,7 @@ void QexResFile_SetReadPath(QexResFile* record, const char* path) {
 
 void QexResFile_Close(QexResFile* record) {
     if (!record->open) return;
+    if (QexUnreadFile* const file = AsUnread(record)) fclose(file->handle);
     if (!record->memoryFile) QexMemory_Free(record->data);
     ClearData(record);
 }

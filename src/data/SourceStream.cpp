@@ -2,6 +2,8 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "data/ResFile.h"
+#include "data/SourceStream.h"
 #include "Qex/base.h"
 #include "Qex/resources.h"
 
@@ -16,11 +18,21 @@ uint32_t Remaining(const QexSourceStream* stream) {
 }
 
 // Gives the stream an empty, closed file record. False, logged, when there is no memory.
-bool NewFile(QexSourceStream* stream, const char* function) {
+template <class File>
+File* NewFile(QexSourceStream* stream, const char* function) {
+    File* const file = static_cast<File*>(QexMemory_Alloc(sizeof(File)));
     stream->position = 0;
-    stream->file = static_cast<QexResFile*>(QexMemory_Alloc(sizeof(QexResFile)));
-    if (!stream->file) QexError(QEX_TAG, "<%s> out of memory", function);
-    return stream->file != nullptr;
+    stream->file = file;
+    if (!file) QexError(QEX_TAG, "<%s> out of memory", function);
+    return file;
+}
+
+// Whether the file is open; the stream is released, logged, where not.
+int32_t CheckOpen(QexSourceStream* stream, const char* path) {
+    if (QexResFile_IsOpen(stream->file)) return 1;
+    QexSourceStream_Release(stream);
+    QexError(QEX_TAG, "<QexSourceStream_Create> open file %s failed", path ? path : "");
+    return 0;
 }
 
 // Reads all `count` words at once. False, where there are fewer, leaves the stream as it is.
@@ -34,16 +46,21 @@ bool ReadBlock(QexSourceStream* stream, Word* destination, uint32_t count) {
 }  // namespace
 
 int32_t QexSourceStream_Create(QexSourceStream* stream, const char* path) {
-    if (!NewFile(stream, "QexSourceStream_Create")) return 0;
-    QexResFile_Create(stream->file, path);
-    if (QexResFile_IsOpen(stream->file)) return 1;
-    QexSourceStream_Release(stream);
-    QexError(QEX_TAG, "<QexSourceStream_Create> open file %s failed", path ? path : "");
-    return 0;
+    QexResFile* const file = NewFile<QexResFile>(stream, "QexSourceStream_Create");
+    if (!file) return 0;
+    QexResFile_Create(file, path);
+    return CheckOpen(stream, path);
+}
+
+int32_t QexSourceStream_CreateUnread(QexSourceStream* stream, const char* path) {
+    QexUnreadFile* const file = NewFile<QexUnreadFile>(stream, "QexSourceStream_Create");
+    if (!file) return 0;
+    QexResFile_CreateUnread(file, path);
+    return CheckOpen(stream, path);
 }
 
 int32_t QexSourceStream_CreateFromMemory(QexSourceStream* stream, const void* data, uint32_t size) {
-    if (!NewFile(stream, "QexSourceStream_CreateFromMemory")) return 0;
+    if (!NewFile<QexResFile>(stream, "QexSourceStream_CreateFromMemory")) return 0;
     QexResFile_CreateFromMemory(stream->file, data, size);
     if (QexResFile_IsOpen(stream->file)) return 1;
     QexSourceStream_Release(stream);
@@ -60,7 +77,7 @@ void QexSourceStream_Release(QexSourceStream* stream) {
 
 int32_t QexSourceStream_Read(QexSourceStream* stream, uint8_t* destination, uint32_t count) {
     if (!stream->file || count > Remaining(stream)) return 0;
-    if (count) memcpy(destination, QexResFile_DataPtr(stream->file) + stream->position, count);
+    if (count && !QexResFile_Copy(stream->file, stream->position, destination, count)) return 0;
     stream->position += count;
     return 1;
 }

@@ -6,6 +6,7 @@
 #include <cstring>
 
 #include "base/Diagnostics.h"
+#include "data/SourceStream.h"
 #include "pod/Check.h"
 #include "pod/Elements.h"
 #include "pod/Repair.h"
@@ -279,10 +280,11 @@ int32_t QexPODModel_ReadFromFile(QexPODModel* scene, const char* path, uint32_t 
                                  uint32_t optionB, uint32_t option4) {
     QexSourceStream stream;
     if (scene) memset(scene, 0, sizeof *scene);
-    if (!QexSourceStream_Create(&stream, path)) return -1;
+    if (!QexSourceStream_CreateUnread(&stream, path)) return -1;
     QexPODModel_ReadFromSourceStream(scene, &stream, optionA, option2, optionB, option4);
+    const bool read = QexResFile_IsOpen(stream.file) != 0;
     QexSourceStream_Release(&stream);
-    return 0;
+    return read ? 0 : -1;
 }
 
 int32_t QexPODModel_ReadFromMemory(QexPODModel* scene, const void* data, uint32_t size, uint32_t optionA,
