@@ -185,39 +185,29 @@
     "    return texel() * vec4(light + sceneAmbient, surfaceAlpha());\n" \
     "}\n"
 
-// Diffuse light per vertex. In variants the vertices have the material's colours, too, and its alpha where
-// that is constant. Needs a vertex, QEX_GLSL_NORMAL and QEX_GLSL_DIFFUSE.
-#define QEX_GLSL_GOURAUD_VERTEX                                                        \
-    "varying mediump vec4 fSurface;\n"                                                 \
-    "#ifdef QEX_VARIANT\n"                                                             \
-    "uniform highp vec3 sceneAmbient;\n"                                               \
-    "uniform highp vec3 sceneDiffuse;\n"                                               \
-    "uniform lowp float opacity;\n"                                                    \
-    "#define surface(light) vec4(sceneDiffuse * (light) + sceneAmbient, opacity)\n"    \
-    "#else\n"                                                                          \
-    "#define surface(light) vec4(light, 1.0)\n"                                        \
-    "#endif\n"                                                                         \
-    "void main() {\n"                                                                  \
-    "    highp vec3 point = placeVertex();\n"                                          \
-    "    fSurface = surface(diffuseLight(point, normalize(worldVector(inNormal))));\n" \
+// Light per vertex: the material's colours in diffuse and ambient light, and its opacity. Needs a vertex,
+// QEX_GLSL_NORMAL and QEX_GLSL_DIFFUSE.
+#define QEX_GLSL_GOURAUD_VERTEX                                                       \
+    "uniform lowp vec3 sceneAmbient;\n"                                               \
+    "uniform lowp vec3 sceneDiffuse;\n"                                               \
+    "uniform lowp float opacity;\n"                                                   \
+    "varying mediump vec4 fSurface;\n"                                                \
+    "void main() {\n"                                                                 \
+    "    highp vec3 point = placeVertex();\n"                                         \
+    "    highp vec3 light = diffuseLight(point, normalize(worldVector(inNormal)));\n" \
+    "    fSurface = vec4(sceneDiffuse * light + sceneAmbient, opacity);\n"            \
     "}\n"
 
 // Needs QEX_GLSL_ALPHA.
 #define QEX_GLSL_GOURAUD_FRAGMENT                                         \
     "varying mediump vec4 fSurface;\n"                                    \
+    "void main() {\n"                                                     \
     "#if defined(QEX_CONSTANT_ALPHA) && !defined(QEX_INSTANCE_COLOURS)\n" \
-    "void main() {\n"                                                     \
     "    gl_FragColor = texel() * fSurface;\n"                            \
-    "}\n"                                                                 \
-    "#elif defined(QEX_VARIANT)\n"                                        \
-    "void main() {\n"                                                     \
+    "#else\n"                                                             \
     "    gl_FragColor = texel() * vec4(fSurface.rgb, surfaceAlpha());\n"  \
-    "}\n"                                                                 \
-    "#else\n" QEX_GLSL_SURFACE                                            \
-    "void main() {\n"                                                     \
-    "    gl_FragColor = surfaceColour(sceneDiffuse * fSurface.rgb);\n"    \
-    "}\n"                                                                 \
-    "#endif\n"
+    "#endif\n"                                                            \
+    "}\n"
 
 // The vertex stage of specular highlights by the first `limit` lights. Needs a vertex, inNormal,
 // QEX_GLSL_LIGHT_VECTOR and QEX_GLSL_DIFFUSE.

@@ -32,7 +32,7 @@ const char* const kDefines[] = {"#define QEX_NO_TEXTURE\n", "#define QEX_CONSTAN
 
 // The lines in front of a variant's sources.
 void WriteDefines(char* out, size_t size, uint32_t flags) {
-    snprintf(out, size, "#define QEX_VARIANT\n");
+    out[0] = 0;
     for (uint32_t bit = 0; flags >> bit; ++bit) {
         const size_t used = strlen(out);
         if (!(flags >> bit & 1)) continue;
