@@ -80,6 +80,10 @@ QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
  * QexRenderer_SetZTestFunc made another than QEX_DEPTH_LESS and QEX_DEPTH_LESS_EQUAL, nodes keep the scene's
  * order.
  *
+ * During a lean draw GL reads nothing of the application's memory: text, pictures, billboards, particle sets
+ * and the water's plane go through buffers, and standing text that did not change is not sent again. The
+ * passes of shadow and depth draw lean as well.
+ *
  * After a lean draw, program, textures, vertex array object, attribute arrays and buffers stay as the draw
  * left them. An application that makes GL calls of its own says QexRenderState_Restore before them, which
  * leaves no vertex array object, no enabled array and no buffer bound, and QexRenderState_Reset after them.
@@ -91,7 +95,8 @@ QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
 #define QEX_DRAWING_DESCRIBED 0 /* at first */
 #define QEX_DRAWING_LEAN 1
 
-/** Chooses the way of drawing from now on. Another number changes nothing. @return the way before. */
+/** Chooses the way of drawing from now on. Another number changes nothing. Needs a current GL context: going
+ *  back to described drawing deletes buffers that lean drawing shared. @return the way before. */
 QEX_API int32_t QexRenderer_SetDrawing(int32_t drawing);
 /** @return the way of drawing, QEX_DRAWING_... */
 QEX_API int32_t QexRenderer_GetDrawing(void);
