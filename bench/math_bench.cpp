@@ -1,17 +1,12 @@
-// Math against GLM and cglm, all compiled with the same flags and behind a function call: Qex's through the
-// shared library as an application calls it, the others' in this program.
+// Math against GLM, both compiled with the same flags and both behind a function call: Qex's through the
+// shared library as an application calls it, GLM's in this program.
 #include <cmath>
 #include <cstdlib>
-#include <cstring>
 #include <glm/glm.hpp>
 #include <glm/gtc/matrix_inverse.hpp>
 #include <glm/gtc/quaternion.hpp>
 #include <glm/gtc/type_ptr.hpp>
 #include <vector>
-
-#if QEX_CGLM
-#include <cglm/cglm.h>
-#endif
 
 #include "Qex.h"
 #include "Ratio.h"
@@ -56,14 +51,6 @@ __attribute__((noinline)) void GlmAffineInverse(glm::mat4* out, const glm::mat4*
 __attribute__((noinline)) void GlmInverse(glm::mat4* out, const glm::mat4* m) {
     *out = glm::inverse(*m);
 }
-#if QEX_CGLM
-struct CglmMatrix {
-    mat4 m;
-};
-__attribute__((noinline)) void CglmInverse(mat4 m, mat4 out) {
-    glm_mat4_inv(m, out);
-}
-#endif
 __attribute__((noinline)) void GlmToMatrix(glm::mat4* out, const glm::quat* q) {
     *out = glm::mat4_cast(*q);
 }
@@ -108,17 +95,6 @@ int main(int argc, char** argv) {
     // GLM's affine inverse makes no test for singular matrices and has its determinant in single precision.
     compare("QexMatrix_Inverse / affineInverse", 1.5, qexInverse, glmAffine);
     compare("QexMatrix_Inverse / inverse", 1.0, qexInverse, glmInverse);
-#if QEX_CGLM
-    // Not const, as its functions take them.
-    std::vector<CglmMatrix> cglmMatrices(in.qexMatrices.size());
-    memcpy(cglmMatrices.data(), in.qexMatrices.data(), cglmMatrices.size() * sizeof(CglmMatrix));
-    CglmMatrix cglmMatrix;
-    const auto cglmInverse = [&](size_t i) {
-        CglmInverse(cglmMatrices[i].m, cglmMatrix.m);
-        KeepValue(cglmMatrix);
-    };
-    compare("QexMatrix_Inverse / cglm's glm_mat4_inv", 1.1, qexInverse, cglmInverse);
-#endif
 
     const auto qexToMatrix = [&](size_t i) {
         QexQuaternion_ToRotationMatrix(&out.qexMatrix, &in.qexQuaternions[i]);

@@ -1,4 +1,5 @@
-// The least that a page wants: a scene from a file, lit, drawn lean. bench/peers/web-size says how large it is.
+// The least that a page wants: a scene from a file, lit, drawn lean. bench/peers/web-size says how large it
+// is.
 #include <EGL/egl.h>
 #include <emscripten.h>
 

@@ -161,6 +161,7 @@ typedef struct QexPODMesh {
     QexBoundingBox localBox;                          /* box of the positions */
     QexVertexAttribute attributes[QEX_ELEMENT_COUNT]; /* layout of the GL vertex buffer */
     struct QexAABB* boneBoxes; /* boxes of what follows each entry of the bone table, or null; the engine's */
+    uint32_t boneBoxCount;
 } QexPODMesh;
 
 /** Animation flags of a node: which of its keys change from frame to frame. */

@@ -385,7 +385,8 @@ QEX_API void QexSkinningGouraudNormalMapShader_Render(QexShaderModule* module, Q
 /** QexDepthShader (no kind): depth as a grey level: 0 nearer than near, 1 beyond far, z / (far - near)
  *  between, z being the clip-space z. No threshold; textures are bound and a node's pass changes as by
  *  QexTextureShader. near and far are not set at first; SetParameters sets them, far above near, for the
- *  module's program, which must be current. Slots: near, far, mvpMatrix locations. */
+ *  module's program, which must be current; lean drawing takes them from there alone. Slots: near, far,
+ * mvpMatrix locations; unused; near and far as values. */
 QEX_API QexShaderModule* QexDepthShader_CreateProgram(void);
 QEX_API int32_t QexDepthShader_SetupProgram(QexShaderModule* module);
 QEX_API void QexDepthShader_Release(QexShaderModule** module);
@@ -399,7 +400,7 @@ QEX_API void QexDepthShader_Render(QexShaderModule* module, QexModel* model, uin
 /** QexSkinningDepthShader (no kind): as QexDepthShader for meshes that follow bones, alpha 0 where it is for
  *  QexSkinningTextureShader, else 1; it leaves the node's pass alone. near and far as in QexDepthShader.
  *  Slots: near, far, boneCount, boneMatrixArray, viewProjMatrix, opacity, alphaThreshold locations; the
- *  threshold. */
+ *  threshold; near and far as values. */
 QEX_API QexShaderModule* QexSkinningDepthShader_CreateProgram(void);
 QEX_API int32_t QexSkinningDepthShader_SetupProgram(QexShaderModule* module);
 QEX_API void QexSkinningDepthShader_Release(QexShaderModule** module);

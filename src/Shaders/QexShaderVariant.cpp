@@ -185,7 +185,7 @@ QexShaderVariant* QexShaderVariant_Get(const QexShaderModuleType* type, uint32_t
 
 const QexShaderModuleType* QexShaderVariant_TypeOf(const QexShaderModule* module) {
     for (const TypeVariants& row : s_Types)
-        if (module && row.type && row.type->render == module->render) return row.type;
+        if (module && module->render && row.type && row.type->render == module->render) return row.type;
     return nullptr;
 }
 

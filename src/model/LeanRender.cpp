@@ -120,25 +120,10 @@ bool IsInOrder(const QexModel* model, const QexModelDrawing& kept) {
 
 // What is kept of the model, in order; null when there is no memory for it.
 QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
-    const QexPODModel& scene = model->scene;
-    QexModelDrawing* kept = model->drawing;
-    const bool blends = anyOrder ? kept && kept->blends : glIsEnabled(GL_BLEND);
-    if (kept && kept->blends == blends && IsInOrder(model, *kept)) return kept;
-    if (!kept) {
-        kept = model->drawing = QexMemory_AllocZeroed<QexModelDrawing>(1);
-        if (!kept) return nullptr;
-        kept->nodeCount = scene.meshNodeCount;
-        kept->meshCount = scene.meshCount;
-        kept->materialCount = scene.materialCount;
-        kept->entries = QexMemory_AllocZeroed<QexLeanEntry>(kept->nodeCount);
-        kept->places = QexMemory_AllocZeroed<uint32_t>(kept->nodeCount);
-        kept->looks = QexMemory_AllocZeroed<uint8_t>(kept->materialCount + 1);
-        kept->vertexArrays = QexMemory_AllocZeroed<GLuint>(kept->meshCount);
-        if (!kept->entries || !kept->places || !kept->looks || !kept->vertexArrays) {
-            QexModel_ReleaseLean(model);
-            return nullptr;
-        }
-    }
+    QexModelDrawing* kept = QexModel_KeepDrawing(model);
+    if (!kept) return nullptr;
+    const bool blends = anyOrder ? kept->blends : glIsEnabled(GL_BLEND);
+    if (kept->blends == blends && IsInOrder(model, *kept)) return kept;
     kept->blends = blends;
     MakeOrder(model, kept);
     return kept;
@@ -199,7 +184,7 @@ void BindMesh(QexLeanDrawing* drawing, const QexLeanEntry& entry) {
     const QexLeanEntry* bound = drawing->mesh;
     if (bound && bound->mesh == entry.mesh && bound->variant == entry.variant) return;
     drawing->mesh = &entry;
-    QexLeanDrawing_BindMesh(*drawing, entry.mesh, entry.variant->elements);
+    QexModel_BindMeshLean(drawing->model, entry.mesh, entry.variant->elements);
 }
 
 // Sets what the entry is drawn with; where its variant cannot be had, draws it in the described way: false.
@@ -274,11 +259,26 @@ void DrawSkinned(QexLeanDrawing* drawing, QexLeanEntry* entry) {
 
 }  // namespace
 
-void QexLeanDrawing_BindMesh(const QexLeanDrawing& drawing, uint32_t mesh, uint32_t elements) {
-    const QexModel* model = drawing.model;
+QexModelDrawing* QexModel_KeepDrawing(QexModel* model) {
+    if (model->drawing) return model->drawing;
+    const QexPODModel& scene = model->scene;
+    QexModelDrawing* kept = model->drawing = QexMemory_AllocZeroed<QexModelDrawing>(1);
+    if (!kept) return nullptr;
+    kept->nodeCount = scene.meshNodeCount;
+    kept->meshCount = scene.meshCount;
+    kept->materialCount = scene.materialCount;
+    kept->entries = QexMemory_AllocZeroed<QexLeanEntry>(kept->nodeCount);
+    kept->places = QexMemory_AllocZeroed<uint32_t>(kept->nodeCount);
+    kept->looks = QexMemory_AllocZeroed<uint8_t>(kept->materialCount + 1);
+    kept->vertexArrays = QexMemory_AllocZeroed<GLuint>(kept->meshCount);
+    if (!kept->entries || !kept->places || !kept->looks || !kept->vertexArrays) QexModel_ReleaseLean(model);
+    return model->drawing;
+}
+
+void QexModel_BindMeshLean(const QexModel* model, uint32_t mesh, uint32_t elements) {
     QexLeanState_BindMesh(
         {model->vertexBuffers[mesh], model->indexBuffers[mesh], model->scene.meshes[mesh].attributes,
-         QEX_ELEMENT_COUNT, &drawing.kept->vertexArrays[mesh]},
+         QEX_ELEMENT_COUNT, &model->drawing->vertexArrays[mesh]},
         elements);
 }
 

@@ -75,9 +75,6 @@ void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry);
 // Makes a variant current with the entry's material and textures.
 void QexLeanDrawing_Give(QexLeanDrawing* drawing, const QexLeanEntry& entry, QexShaderVariant* variant);
 
-// Binds a mesh for what reads these elements, bits by number.
-void QexLeanDrawing_BindMesh(const QexLeanDrawing& drawing, uint32_t mesh, uint32_t elements);
-
 // Whether a mesh's box lies outside the view, rather kept than left out.
 bool QexLeanDrawing_IsOutside(const QexPODMesh& mesh, const Float4x4& mvp);
 
@@ -86,6 +83,12 @@ bool QexLeanDrawing_DepthDecides();
 
 // A node with an alpha texture is no opaque one from its first draw on.
 void QexLeanDrawing_MarkPass(QexLeanDrawing* drawing, const QexLeanEntry& entry);
+
+// What is kept of a model, made if need be, in no order yet; null when memory runs out.
+QexModelDrawing* QexModel_KeepDrawing(QexModel* model);
+
+// Binds a mesh of a model that something is kept of, for what reads these elements, bits by number.
+void QexModel_BindMeshLean(const QexModel* model, uint32_t mesh, uint32_t elements);
 
 // Draws the nodes of the pass that the call wants.
 void QexModel_DrawLean(QexModel* model, const QexLeanCall& call);

@@ -166,16 +166,18 @@ int32_t QexModel_DownloadGeometry(QexModel* model) {
     model->indexBuffers = AllocZeroed<uint32_t>(count);
     if (!model->vertexBuffers || !model->indexBuffers) return -1;
     QEX_GL(glGenBuffers(static_cast<GLsizei>(count), model->vertexBuffers));
-    for (uint32_t i = 0; i < count; ++i)
-        if (model->scene.meshes[i].vertexCount && !DownloadMesh(model, i)) return -1;
+    bool complete = true;
+    for (uint32_t i = 0; complete && i < count; ++i)
+        complete = !model->scene.meshes[i].vertexCount || DownloadMesh(model, i);
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
     QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
-    return 0;
+    return complete ? 0 : -1;
 }
 
 void QexModel_UnloadGeometry(QexModel* model) {
     QexModel_ReleaseLean(model);
     if (model->vertexBuffers || model->indexBuffers) {
+        QexRenderState_Restore();
         QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
         QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
     }

@@ -150,22 +150,21 @@ void DrawDescribed(const QexShadowCaster& caster, const QexMatrix* modelMatrix,
 // Without alpha textures, which only a hook could bind. False where the variants cannot be had.
 bool DrawLean(const QexShadowCaster& caster, const QexMatrix* modelMatrix, const QexMatrix* lightViewProj) {
     QexModel* model = caster.model;
+    if (model->bindTextureHook) return false;
     const uint32_t bare = kVariantNoTexture | kVariantConstantAlpha;
-    const QexLeanCall call = {nullptr, nullptr, &g_sMatIdentity, lightViewProj, nullptr};
     const QexShaderModuleType* types[] = {QexModel_CasterType(false), QexModel_CasterType(true)};
     QexShaderVariant* variants[] = {QexShaderVariant_Get(types[0], bare),
                                     QexShaderVariant_Get(types[1], bare)};
-    QexLeanDrawing drawing;
-    if (model->bindTextureHook || !variants[0] || !variants[1]) return false;
-    if (!QexLeanDrawing_Begin(&drawing, model, call, true)) return false;
+    if (!variants[0] || !variants[1] || !QexModel_KeepDrawing(model)) return false;
+    const QexShaderFrame* frame = QexShaderFrame_Set(&g_sMatIdentity, lightViewProj, nullptr, nullptr);
     for (uint32_t i = 0; i < caster.nodeCount; ++i) {
         const uint32_t node = static_cast<uint32_t>(caster.nodeIndices[i]);
         if (!IsDrawn(model, node)) continue;
         const uint32_t mesh = static_cast<uint32_t>(model->scene.nodes[node].objectIndex);
         const uint32_t skinned = model->scene.meshes[mesh].skinned ? 1 : 0;
         const int32_t* at = variants[skinned]->locations;
-        QexShaderVariant_Use(variants[skinned], drawing.frame, {});
-        QexLeanDrawing_BindMesh(drawing, mesh, variants[skinned]->elements);
+        QexShaderVariant_Use(variants[skinned], frame, {});
+        QexModel_BindMeshLean(model, mesh, variants[skinned]->elements);
         if (skinned) {
             QexShaderModule_DrawBatches(
                 types[1], model, node,

@@ -41,25 +41,32 @@ void QexPODMesh_MeasureBones(QexPODMesh* mesh, const uint8_t* positions, uint32_
     const uint32_t count = static_cast<uint32_t>(batches.batchCount) * perBatch;
     const uint32_t influences = QexPODData_Components(mesh->boneIndices);
     mesh->boneBoxes = QexMemory_AllocArray<QexAABB>(count);
+    mesh->boneBoxCount = mesh->boneBoxes ? count : 0;
     if (!mesh->boneBoxes) return;
     for (uint32_t i = 0; i < count; ++i) QexBoundingBox_InitAABB(&mesh->boneBoxes[i]);
-    QexPODMesh_VisitBatches(*mesh, [=](uint32_t vertex, uint32_t batch) {
+    const bool measured = QexPODMesh_VisitBatches(*mesh, [=](uint32_t vertex, uint32_t batch) {
         float bones[4], weights[4];
         QexVec3 position;
+        if (vertex >= mesh->vertexCount) return false;
         memcpy(&position, positions + uint64_t{vertex} * stride, sizeof position);
         QexPODMesh_ReadInfluences(mesh, vertex, bones, weights);
-        for (uint32_t i = 0; i < influences; ++i)
-            if (weights[i] != 0 && bones[i] >= 0 && bones[i] < static_cast<float>(perBatch))
+        for (uint32_t i = 0; i < influences; ++i) {
+            if (!(weights[i] >= 0)) return false;
+            if (weights[i] > 0 && bones[i] >= 0 && bones[i] < static_cast<float>(perBatch))
                 Widen(&mesh->boneBoxes[batch * perBatch + static_cast<uint32_t>(bones[i])], position);
+        }
         return true;
     });
+    if (!measured) QexMemory_FreeArray(mesh->boneBoxes);
 }
 
 bool QexPODAnimation_SkinnedBox(QexPODModel* scene, uint32_t meshNode, QexAABB* out) {
     QexPODNode* node = &scene->nodes[meshNode];
     const QexPODMesh& mesh = *QexPODModel_MeshOf(scene, meshNode);
     const QexBoneBatches& batches = mesh.boneBatches;
-    if (!mesh.skinned || !mesh.boneBoxes) return false;
+    // Batches that were made anew since then have no boxes.
+    const int64_t entries = int64_t{batches.batchCount} * batches.maxBones;
+    if (!mesh.skinned || !mesh.boneBoxes || entries != mesh.boneBoxCount) return false;
     QexBoundingBox_InitAABB(out);
     for (int32_t batch = 0; batch < batches.batchCount; ++batch) {
         const int64_t first = int64_t{batch} * batches.maxBones;

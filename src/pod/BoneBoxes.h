@@ -10,6 +10,6 @@ struct QexAABB;
 void QexPODMesh_MeasureBones(QexPODMesh* mesh, const uint8_t* positions, uint32_t stride);
 
 // The axis-aligned box around a skinned mesh node in the world, as its bones stand now. A vertex lies between
-// the places that its bones alone would carry it to, so that the box holds it for any weights of 0 or more.
-// False for a mesh that was not measured.
+// the places that its bones alone would carry it to, so that the box holds it. False for a mesh that was not
+// measured, as with a weight below 0.
 bool QexPODAnimation_SkinnedBox(QexPODModel* scene, uint32_t meshNode, QexAABB* out);

@@ -1,36 +1,14 @@
-// Lean drawing: the calls that are left, the same pictures, and what it takes from applications.
+// Lean drawing: the same pictures, and what it takes from applications.
 #include <GLES2/gl2.h>
 
 #include "Scenes.h"
 #include "support/Capture.h"
+#include "support/LeanDrawing.h"
 #include "support/RenderScenes.h"
 
 namespace {
 
 constexpr uint32_t kLastKind = QEX_SHADER_GOURAUD_SHADOW_EXT;
-
-struct Lean {
-    Lean() { QexRenderer_SetDrawing(QEX_DRAWING_LEAN); }
-    ~Lean() { QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED); }
-};
-
-// An instance of a module, by number.
-struct Module {
-    explicit Module(uint32_t number) : kind(number), module(QexShaders_CreateShaderProgram(number)) {}
-    ~Module() { QexShaders_ReleaseShaderProgram(module, kind); }
-    Module(const Module&) = delete;
-    Module& operator=(const Module&) = delete;
-    uint32_t kind;
-    QexShaderModule* module;
-};
-
-QexLightSet TwoLights() {
-    QexLightSet lights = {};
-    lights.count = 2;
-    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-0.4f, 0.3f, -1}, {0.7f, 0.5f, 0.3f, 1}};
-    lights.lights[1] = {QEX_LIGHT_POINT, {20, 80, 60}, {0.2f, 0.3f, 0.6f, 1}};
-    return lights;
-}
 
 // A mesh whose vertices have everything, over a rectangle, on one bone where it is to be skinned.
 pod::Mesh RichMesh(float left, float bottom, bool skinned) {
@@ -79,6 +57,12 @@ class LeanTest : public RenderTest {
             EXPECT_TRUE(SamePicture(picture(), described, 1)) << what << ", vertex arrays " << vertexArrays;
         }
         EXPECT_EQ(glGetError(), GLenum(GL_NO_ERROR));
+        // GL reads no memory of the application's during a draw.
+        const GLCalls calls(draw);
+        for (const gltapCall* call : calls.Of({"glVertexAttribPointer"}))
+            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[5].p), 65536u) << "an offset";
+        for (const gltapCall* call : calls.Of({"glDrawElements"}))
+            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[3].p), 65536u) << "an offset";
     }
 };
 
@@ -121,13 +105,9 @@ TEST_F(LeanTest, EveryModuleDrawsTheSame) {
     }
 }
 
-// Everything else that the engine draws, between nodes, in the same frame. In lean drawing GL reads no memory
-// of the application's during a draw.
-TEST_F(LeanTest, EverythingElseAmongNodes) {
-    Capture log(STDERR_FILENO), waves(STDOUT_FILENO);
-    static LoadedModel* focused;
-    QexTexture cube = {};
-    QexTexture_GenerateNormalisationCubeMap(&cube, 8);
+// Everything else that the engine draws, between nodes, in the same frame.
+TEST_F(LeanTest, TextQuadsAndBillboardsAmongNodes) {
+    Capture log(STDERR_FILENO);
     ScopedTexture blue({20, 40, 250, 255});
     LoadedModel model(Overlapping(false));
     QexBillboard* billboard = QexBillboard_Create(&blue);
@@ -144,69 +124,74 @@ TEST_F(LeanTest, EverythingElseAmongNodes) {
     emitter->startOpacity = 0.8f;
     emitter->currentRate = 20;
     QexParticleEmitter_Update(emitter, 0, nullptr);
+    const QexCamera camera = PixelCamera();
+    // More glyphs than a draw shows, and those of another sheet behind them.
+    const std::string kept = std::string(310, '.') + "\n\xC3\xA9t\xC3\xA9", brief(70, 'a');
+    QexFont_AddString(&runtime_, 2, 50, kept.c_str(), 255, 255, 0, 255);
+    ExpectSamePictures(
+        [&] {
+            model.Draw();
+            QexFont_Draw();
+            QexFont_DrawTempString(&runtime_, 5, 60, "lean", 0xFF20FF20u);
+            QexFont_DrawTempString(&runtime_, 0, 90, brief.c_str(), 0xFF20FF20u);
+            model.DrawNode(model.Node().shader, 1);
+            QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
+            QexBillboard_Draw(billboard, &camera);
+            QexParticleEmitter_Draw(emitter, &camera);
+            glEnable(GL_CULL_FACE);
+            model.Draw();
+            glDisable(GL_CULL_FACE);
+        },
+        "a frame of many things");
+    QexFont_ClearString();
+    QexBillboard_Release(billboard);
+    QexParticleEmitter_Release(emitter);
+}
+
+TEST_F(LeanTest, EffectsAmongNodes) {
+    Capture log(STDERR_FILENO), waves(STDOUT_FILENO);
+    ScopedTexture blue({20, 40, 250, 255});
+    LoadedModel model(Overlapping(false));
+    QexTexture cube = {};
+    QexTexture_GenerateNormalisationCubeMap(&cube, 8);
+    const QexVec3 from = {30, 22, 60}, to = {0, 5, 0};
     QexCamera camera = PixelCamera(), eye = {};
+    QexCamera_LookAt(&eye, &from, &to, nullptr);
+    QexCamera_Project(&eye, 0.9f, float{kWidth} / kHeight, 1, 200);
     QexSkyBox sky = {};
     sky.skyTexture = &cube;
     sky.size = 200;
     sky.waterEnabled = 1;
     sky.camera = &eye;
-    const QexVec3 from = {30, 22, 60}, to = {0, 5, 0};
-    QexCamera_LookAt(&eye, &from, &to, nullptr);
-    QexCamera_Project(&eye, 0.9f, float{kWidth} / kHeight, 1, 200);
     ASSERT_EQ(QexSkyBox_Create(&sky), 0);
-    ASSERT_EQ(QexPostProcessing_Initialize(&runtime_), 0);
     QexParticleSet set;
-    QexParticleSetEntry* entries;
     ASSERT_EQ(QexParticleSet_Create(&set, &blue, nullptr, 2, 12, 4), 0);
-    QexParticleSet_GetBuffer(&set, &entries, nullptr);
-    entries[0] = {3, {0, 0, 0}, {20, 80, 0}};
-    entries[1] = {2, {5, 0, 0}, {50, 80, 0}};
+    set.buffer[0] = {3, {0, 0, 0}, {20, 80, 0}};
+    set.buffer[1] = {2, {5, 0, 0}, {50, 80, 0}};
     QexParticleSet_Trigger(&set);
     QexParticleSet_Update(&set, 1, &camera, nullptr);
-    focused = &model;
-    const auto focus = [](QexRuntimeContext*, void*, void*, void*, QexShaderModule* depth, QexShaderModule*,
-                          const float*) -> int32_t {
-        for (uint32_t i = 0; i < 2; ++i)
-            focused->DrawNode(depth ? depth : focused->model.scene.nodes[i].shader, i);
+    ASSERT_EQ(QexPostProcessing_Initialize(&runtime_), 0);
+    static LoadedModel* s_model;
+    s_model = &model;
+    const auto drawNodes = [](QexRuntimeContext*, void*, void*, void*, QexShaderModule* depth,
+                              QexShaderModule*, const float*) -> int32_t {
+        QexShaderModule* lit = s_model->Node().shader;
+        for (uint32_t i = 0; i < 2; ++i) s_model->DrawNode(depth ? depth : lit, i);
         return 0;
     };
-    // More glyphs than a draw shows, and one of another sheet among them.
-    QexFont_AddString(&runtime_, 2, 50, (std::string(310, '.') + "\n\xC3\xA9t\xC3\xA9").c_str(), 255, 255, 0,
-                      255);
-    const std::string longText(70, 'a');
-    const auto frame = [&] {
-        QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, focus, 0.3f, 4, 1, 1, 2, 5, 1, 1,
-                                  100);
-        QexSkyBox_Update(&runtime_, &sky, 0);
-        model.Draw();
-        QexParticleSet_Draw(&set);
-        QexFont_Draw();
-        QexFont_DrawTempString(&runtime_, 5, 60, "lean", 0xFF20FF20u);
-        QexFont_DrawTempString(&runtime_, 0, 90, longText.c_str(), 0xFF20FF20u);
-        model.DrawNode(model.Node().shader, 1);
-        QexTexture_Draw(&runtime_, &blue, 100, 90, nullptr, 20, 20, ~0u);
-        QexBillboard_Draw(billboard, &camera);
-        QexParticleEmitter_Draw(emitter, &camera);
-        glEnable(GL_CULL_FACE);
-        model.Draw();
-        glDisable(GL_CULL_FACE);
-    };
-    ExpectSamePictures(frame, "a frame of many things");
-    {
-        const Lean lean;
-        const GLCalls calls(frame);
-        for (const gltapCall* call : calls.Of({"glVertexAttribPointer"}))
-            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[5].p), 65536u) << "an offset";
-        for (const gltapCall* call : calls.Of({"glDrawElements"}))
-            EXPECT_LT(reinterpret_cast<uintptr_t>(call->argument[3].p), 65536u) << "an offset";
-    }
-    QexFont_ClearString();
+    ExpectSamePictures(
+        [&] {
+            QexPostProcessing_DrawDOF(&runtime_, nullptr, nullptr, nullptr, drawNodes, 0.3f, 4, 1, 1, 2, 5, 1,
+                                      1, 100);
+            QexSkyBox_Update(&runtime_, &sky, 0);
+            model.Draw();
+            QexParticleSet_Draw(&set);
+        },
+        "a frame of effects");
     QexPostProcessing_Finalize();
     QexSkyBox_Release();
     QexTexture_Release(&cube);
     QexParticleSet_Release(&set);
-    QexBillboard_Release(billboard);
-    QexParticleEmitter_Release(emitter);
 }
 
 // What an application changes between frames, in records that are its own.
@@ -268,6 +253,23 @@ TEST_F(LeanTest, ModulesComeAndGo) {
         ExpectSamePictures([&] { model.Draw(); }, "round " + std::to_string(round));
         QexModel_SetShaderProgramForAllNode(&model.model, own, own);
     }
+}
+
+// Another model goes, or is made anew, while a mesh and text of this one are bound.
+TEST_F(LeanTest, ModelsComeAndGo) {
+    LoadedModel model(Overlapping(false));
+    ExpectSamePictures(
+        [&] {
+            LoadedModel other(Overlapping(true));
+            model.Draw();
+            QexModel_DownloadGeometry(&other.model);
+            model.Draw();
+            QexFont_DrawTempString(&runtime_, 5, 60, "before", 0xFF20FF20u);
+            QexModel_Unload(&other.model);
+            QexFont_DrawTempString(&runtime_, 5, 90, "behind", 0xFF20FF20u);
+            model.Draw();
+        },
+        "beside another");
 }
 
 // Translucent nodes are drawn where they stand in the scene; the opaque ones around them may change places.
@@ -374,163 +376,6 @@ TEST_F(LeanTest, InstancesHaveColours) {
     EXPECT_TRUE(Near(Read().Pixel(55, 70), {51, 153, 204, 153}, 1));
     EXPECT_EQ(QexRenderer_GetDrawing(), QEX_DRAWING_DESCRIBED);
     QexModel_RenderInstances(&model.model, nullptr, &camera, nullptr, nullptr, 2, 0);
-}
-
-class LeanCallsTest : public NullRenderTest {
-  protected:
-    static QexCamera Camera() {
-        QexCamera camera;
-        const QexVec3 eye = {16, 16, 60}, target = {16, 16, 0};
-        QexCamera_Create(&camera, 0);
-        QexCamera_LookAt(&camera, &eye, &target, nullptr);
-        QexCamera_Project(&camera, 0.785f, 4.0f / 3, 1, 100);
-        return camera;
-    }
-
-    // GL calls of a steady frame.
-    static uint64_t CallsOf(const std::function<void()>& draw) {
-        draw();
-        gltapResetCounts();
-        draw();
-        return gltapCountAll();
-    }
-};
-
-constexpr uint32_t kNodes = 1000;
-
-TEST_F(LeanCallsTest, OfAThousandNodes) {
-    const QexCamera camera = Camera();
-    const QexLightSet lights = TwoLights();
-    const struct {
-        uint32_t kind;
-        bool ownMeshes, vertexArrays;
-        uint64_t aNode;
-    } cases[] = {
-        {QEX_SHADER_TEXTURE, false, true, 2},  {QEX_SHADER_TEXTURE, true, true, 3},
-        {QEX_SHADER_TEXTURE, false, false, 2}, {QEX_SHADER_TEXTURE, true, false, 5},
-        {QEX_SHADER_GOURAUD, false, true, 4},  {QEX_SHADER_GOURAUD, true, true, 5},
-    };
-    for (const auto& c : cases) {
-        pod::Scene scene = scenes::Grid(kNodes);
-        if (c.ownMeshes) {
-            scene.meshes.resize(kNodes, scene.meshes[0]);
-            for (uint32_t i = 0; i < kNodes; ++i) scene.nodes[i].object = static_cast<int32_t>(i);
-        }
-        const Module module(c.kind);
-        LoadedModel model(scene);
-        QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
-        const Lean lean;
-        QexRenderer_AllowVertexArrays(c.vertexArrays);
-        const auto draw = [&] { QexModel_RenderWithCamera(&model.model, &lights, &camera, nullptr, 0); };
-        EXPECT_LE(CallsOf(draw), c.aNode * kNodes + 10) << c.kind << (c.ownMeshes ? ", own meshes" : "");
-        EXPECT_EQ(gltapCount("glDrawElements"), kNodes);
-        EXPECT_EQ(gltapCount("glGetError"), 0u);
-        EXPECT_EQ(CountAllocations(draw).made, 0);
-        QexRenderer_AllowVertexArrays(1);
-    }
-}
-
-TEST_F(LeanCallsTest, OneModelByItsMatrix) {
-    const QexCamera camera = Camera();
-    const QexLightSet lights = TwoLights();
-    const Module module(QEX_SHADER_GOURAUD);
-    LoadedModel model(scenes::Grid(1));
-    QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
-    const Lean lean;
-    EXPECT_EQ(CallsOf([&] {
-                  for (int i = 0; i < 100; ++i) {
-                      const QexMatrix place = ToQex(glm::translate(glm::mat4(1), {i % 10, i / 10, 0}));
-                      QexModel_RenderWithCamera(&model.model, &lights, &camera, &place, 0);
-                  }
-              }),
-              400u);
-}
-
-TEST_F(LeanCallsTest, AThousandInstances) {
-    const QexCamera camera = Camera();
-    const QexLightSet lights = TwoLights();
-    const Module module(QEX_SHADER_GOURAUD);
-    LoadedModel model(scenes::Grid(1));
-    QexModel_SetShaderProgramForAllNode(&model.model, module.module, module.module);
-    std::vector<QexMatrix> places;
-    for (uint32_t i = 0; i < kNodes; ++i)
-        places.push_back(ToQex(glm::translate(glm::mat4(1), {i % 32, i / 32, 0})));
-    const auto draw = [&] {
-        QexModel_RenderInstances(&model.model, &lights, &camera, places.data(), nullptr, kNodes, 0);
-    };
-    EXPECT_LE(CallsOf(draw), 100u);
-    EXPECT_EQ(gltapCount("glDrawElements"), 40u) << "25 by 25 on a GL of 128 vectors";
-    EXPECT_EQ(CountAllocations(draw).made, 0);
-}
-
-TEST_F(LeanCallsTest, BillboardsOfAnEmitter) {
-    Capture log(STDERR_FILENO);
-    const QexCamera camera = Camera();
-    QexParticleEmitter* emitter = QexParticleEmitter_Create();
-    emitter->currentRate = 299;
-    QexParticleEmitter_Update(emitter, 0, nullptr);
-    ASSERT_EQ(emitter->particleCount, 299);
-    const Lean lean;
-    EXPECT_LE(CallsOf([&] { QexParticleEmitter_Draw(emitter, &camera); }), 10u);
-    EXPECT_EQ(gltapCount("glDrawElements"), 1u);
-    QexParticleEmitter_Release(emitter);
-}
-
-TEST_F(LeanCallsTest, TextIsSentWhenItChanged) {
-    const auto sent = [] { return gltapCount("glBufferData") + gltapCount("glBufferSubData"); };
-    const Lean lean;
-    QexFont_AddString(&runtime_, 0, 20, "kept", 255, 255, 255, 255);
-    CallsOf([] { QexFont_Draw(); });
-    EXPECT_EQ(sent(), 0u);
-    QexFont_AddString(&runtime_, 0, 40, "more", 255, 255, 255, 255);
-    QexFont_Draw();
-    EXPECT_EQ(sent(), 2u) << "room, and the text";
-    EXPECT_LE(CallsOf([this] { QexFont_DrawTempString(&runtime_, 0, 60, "12 fps", ~0u); }), 8u);
-    EXPECT_LE(CallsOf([this] { QexTexture_Draw(&runtime_, nullptr, 0, 0, nullptr, 9, 9, ~0u); }), 6u);
-    QexFont_ClearString();
-}
-
-TEST_F(LeanCallsTest, NodesOutsideTheViewAreNotDrawn) {
-    const Lean lean;
-    const QexMatrix projection = PixelProjection();
-    pod::Scene scene = SceneOf(pod::BuildMesh(Rectangle(0, 0, 10, 10)));
-    const QexVec3 places[] = {{50, 50, 0}, {-9, 50, 0}, {-12, 50, 0}, {127, 0, 0},  {129, 0, 0},
-                              {0, -11, 0}, {0, 97, 0},  {0, 0, 101},  {0, 0, -101}, {0, 0, 99}};
-    scene.nodes.clear();
-    for (const QexVec3& at : places)
-        scene.nodes.push_back(pod::BuildNode("n", {{{at.x, at.y, at.z}}, {}, {}, {}}, -1, 0, 0));
-    scene.meshNodeCount = static_cast<uint32_t>(scene.nodes.size());
-    LoadedModel model(scene);
-    CallsOf([&] {
-        QexModel_RenderWithViewProjection(&model.model, nullptr, nullptr, &g_sMatIdentity, &projection, 0);
-    });
-    EXPECT_EQ(gltapCount("glDrawElements"), 4u) << "of the ten";
-}
-
-TEST_F(LeanCallsTest, WhatIsLeftAndHowItIsRestored) {
-    LoadedModel model(Overlapping(false));
-    const QexMatrix projection = PixelProjection();
-    const auto draw = [&] {
-        QexModel_RenderWithViewProjection(&model.model, nullptr, nullptr, &g_sMatIdentity, &projection, 0);
-    };
-    for (const int32_t vertexArrays : {1, 0}) {
-        const Lean lean;
-        QexRenderer_AllowVertexArrays(vertexArrays);
-        gltapState state;
-        draw();
-        gltapGetState(&state);
-        EXPECT_EQ(state.vertexArray != 0, vertexArrays != 0);
-        EXPECT_NE(state.elementBuffer, 0u);
-        QexRenderState_Restore();
-        gltapGetState(&state);
-        EXPECT_EQ(state.vertexArray, 0u);
-        EXPECT_EQ(state.attributeArrays, 0u);
-        EXPECT_EQ(state.arrayBuffer, 0u);
-        EXPECT_EQ(state.elementBuffer, 0u);
-        QexRenderer_AllowVertexArrays(1);
-    }
-    EXPECT_EQ(QexRenderer_SetDrawing(7), QEX_DRAWING_DESCRIBED) << "there is no such way";
-    EXPECT_EQ(QexRenderer_GetDrawing(), QEX_DRAWING_DESCRIBED);
 }
 
 }  // namespace
