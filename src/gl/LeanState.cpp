@@ -169,7 +169,7 @@ void QexLeanState_FillPart(GLuint buffer, size_t offset, const void* data, size_
 }
 
 void QexLeanState_Leave() {
-    if (s_State.vertexArray) BindVertexArray(0);
+    BindVertexArray(0);
     Enable(0);
     BindArrayBuffer(0);
     if (s_State.indexBuffer) glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);

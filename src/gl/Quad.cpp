@@ -22,8 +22,9 @@ uint32_t BytesOfAVertex(const QexQuads& quads) {
 
 // Copies vertices, one array's part of each behind the other's. Returns the end.
 uint8_t* Pack(uint8_t* out, const QexQuads& quads, uint32_t first, uint32_t count) {
-    for (uint32_t vertex = 4 * first; vertex < 4 * (first + count); ++vertex)
+    for (uint32_t i = 4 * first; i < 4 * (first + count); ++i)
         for (const QexQuadArray& array : quads.arrays) {
+            const uint32_t vertex = (i & ~3u) + quads.strip[i & 3];
             const uint32_t components = static_cast<uint32_t>(array.components);
             if (components) memcpy(out, array.data + components * vertex, components * sizeof(float));
             out += components * sizeof(float);
@@ -35,15 +36,8 @@ uint8_t* Pack(uint8_t* out, const QexQuads& quads, uint32_t first, uint32_t coun
 
 void QexQuad_Draw(const char* module, const QexQuadArray* arrays, int32_t count) {
     if (QexLeanState_IsLean()) {
-        float strip[kMostFloats * 4], *to = strip;
-        QexQuads quads = {{}, 1};
-        for (int32_t i = 0; i < count; ++i) {
-            quads.arrays[i] = arrays[i];
-            quads.arrays[i].data = to;
-            for (const uint8_t vertex : kStrip)
-                for (int32_t c = 0; c < arrays[i].components; ++c)
-                    *to++ = arrays[i].data[arrays[i].components * vertex + c];
-        }
+        QexQuads quads = {{}, 1, kStrip};
+        for (int32_t i = 0; i < count; ++i) quads.arrays[i] = arrays[i];
         QexQuads_Stream(quads, 0, 1);
         return;
     }

@@ -21,12 +21,13 @@ void QexQuad_Draw(const char* module, const QexQuadArray (&arrays)[count]) {
 }
 
 // ---- Lean drawing ----
-// Quads whose vertices stand in the order of a strip: of each quad two triangles, 0 1 2 and 2 1 3.
+// Of each quad two triangles, the first three vertices of the strip and the last three.
 
 constexpr uint32_t kStreamedQuads = 64;
 struct QexQuads {
     QexQuadArray arrays[kQuadArrays];
     uint32_t count;
+    const uint8_t* strip;  // the four vertices of a quad in the order of a strip
 };
 
 // Draws quads from number `first`, at most kStreamedQuads, sent for this draw alone.

@@ -128,12 +128,14 @@ void BindTextures(const QexGlyphs& glyphs) {
 
 // Draws through buffers; what is kept is sent once.
 void DrawLean(QexGlyphs* glyphs) {
+    static const uint8_t kStrip[4] = {0, 1, 2, 3};
     const bool keeps = glyphs == &s_Text;
     const uint32_t most = keeps ? kQuadsOfADraw : kStreamedQuads;
     const QexQuads quads = {{{s_Program.position, 3, glyphs->positions[0][0]},
                              {s_Program.colour, 4, &glyphs->colours[0][0].r},
                              {s_Program.texCoord, 2, glyphs->texCoords[0][0]}},
-                            glyphs->count};
+                            glyphs->count,
+                            kStrip};
     if (keeps && !glyphs->buffer) glGenBuffers(1, &glyphs->buffer);
     if (keeps && !glyphs->sent) QexQuads_Send(quads, glyphs->buffer);
     glyphs->sent = keeps;
