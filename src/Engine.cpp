@@ -97,7 +97,7 @@ int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSi
     context->startTime = QexTime_Init();
     QexExtensions_Forget();
     QexRenderState_Reset(context);
-    QexTexture_CreateDefault();
+    if (QexTexture_CreateDefault() != 0) return -1;
     QexFont_Create(context->width, context->height);
     s_OwnerDrawInitialized = 1;
     QexLog(QEX_TAG, "<QexEngine_InitForOwnerDraw> Owner draw initialized ok");

@@ -46,8 +46,8 @@ QEX_API void QexFont_ReleaseShader(int32_t ignored);
 /** Releases the font. @return the log call's result. */
 QEX_API int32_t QexFont_Release(void);
 
-/** Appends a string to the persistent text. Running out of memory ends the process with exit status 1. No GL
- * context needed.
+/** Appends a string to the persistent text. Running out of memory ends the process with exit status 1; with
+ * an error handler the string is left out and the result is 0. No GL context needed.
  *  @param context     the engine's context; its height is read
  *  @param x, y        pixels
  *  @param r, g, b, a  0 to 255

@@ -7,7 +7,8 @@
  * module's threshold; a node without a material is opaque. A mesh without one of the attributes that a module
  * reads supplies (0, 0, 0, 1) for it. DrawMesh does not check its node: it has to be a mesh node of a model
  * whose geometry is loaded. When the GL does not take a module's shaders, its reason is logged and the GL
- * error ends the process. Needs a current GL context, except to set or get thresholds, shifts and fades.
+ * error ends the process, or, with an error handler, CreateProgram gives null and SetupProgram -1. Needs a
+ * current GL context, except to set or get thresholds, shifts and fades.
  */
 #ifndef QEX_SHADER_MODULES_H
 #define QEX_SHADER_MODULES_H

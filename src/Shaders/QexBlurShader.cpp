@@ -80,14 +80,14 @@ QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context) {
     QexMatrix projection;
     QexMatrix_Orthographic(&projection, 0, width * 0.5f, height * 0.5f, height, 0, 1);
     QexBlurShader_SetProjection(module, &projection);
-    QexBlurShader_SetupProgram(context, module, kDefaultSigma, kDefaultSamples);
-    return module;
+    return QexScreenShader_Finish(
+        module, QexBlurShader_SetupProgram(context, module, kDefaultSigma, kDefaultSamples));
 }
 
 int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module, float sigma,
                                    float samples) {
     const QexMatrix projection = ProjectionOf(module);
-    QexScreenShader_Setup(&kType, module, &projection, 1);
+    if (QexScreenShader_Setup(&kType, module, &projection, 1) != 0) return -1;
     QexBlurShader_SetParameters(module, nullptr, 0, sigma, samples,
                                 1.0f / static_cast<float>(context->width));
     return 0;

@@ -52,13 +52,11 @@ QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context) {
     if (!module) return nullptr;
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(context->width), 0,
                            static_cast<float>(context->height), 0, 1);
-    QexDOFShader_SetupProgram(context, module);
-    return module;
+    return QexScreenShader_Finish(module, QexDOFShader_SetupProgram(context, module));
 }
 
 int32_t QexDOFShader_SetupProgram(const QexRuntimeContext*, QexShaderModule* module) {
-    QexScreenShader_Setup(&kType, module, &s_Projection, 3);
-    return 0;
+    return QexScreenShader_Setup(&kType, module, &s_Projection, 3);
 }
 
 void QexDOFShader_Release(QexShaderModule** module) {

@@ -11,6 +11,9 @@
 enum { kScreenPosition, kScreenProjection, kScreenTexCoord, kScreenSlots };
 
 // Compiles, links, fills the slots and sets the projection; the program stays current. The module's samplers
-// come first behind the first slots, for the units 0, 1, ...
-void QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
-                           const QexMatrix* projection, int32_t samplers);
+// come first behind the first slots, for the units 0, 1, ... 0, or -1 and no program after an error that was
+// handled.
+int32_t QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* module,
+                              const QexMatrix* projection, int32_t samplers);
+// The module, or null and the record freed where its set-up gave no 0.
+QexShaderModule* QexScreenShader_Finish(QexShaderModule* module, int32_t result);

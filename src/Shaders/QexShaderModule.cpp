@@ -96,7 +96,10 @@ QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type) {
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
     QexShaderModule* module = QexShaderModule_Alloc(type);
     if (!module) return nullptr;
-    QexShaderModule_Setup(type, module);
+    if (QexShaderModule_Setup(type, module) != 0) {
+        QexMemory_Free(module);
+        return nullptr;
+    }
     if (type->hasThreshold) {
         module->slots[type->thresholdSlot].value = kDefaultThreshold;
         module->slots[type->thresholdSlot + 1].value = type->secondDefault;
@@ -107,12 +110,14 @@ QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
 }
 
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module) {
+    const QexMaking making;
     if (module->program) QexProgram_Delete(NamesOf(module));
     const char* names[sizeof type->attributes.items];
     for (uint8_t i = 0; i < type->attributes.count; ++i)
         names[i] = QexShaderModule_AttributeName(type->attributes.items[i]);
     QexProgram_Compile({type->path, type->vertexSource, type->fragmentSource, names, type->attributes.count},
                        NamesOf(module));
+    if (making.Failed()) return -1;  // nothing is left
     const QexProgramLookup lookup = {type->path, module->program, false};
     QexShaderSlot* slot = module->slots;
     for (const uint8_t uniform : type->uniforms) {
@@ -120,7 +125,9 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
         ++slot;
     }
     for (const uint8_t unit : type->units) lookup.SetSampler({kSamplerNames[unit], unit});
-    return 0;
+    if (!making.Failed()) return 0;
+    QexProgram_Delete(NamesOf(module), false);
+    return -1;
 }
 
 void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {
@@ -138,7 +145,7 @@ bool QexShaderModule_Begin(QexShaderDraw* draw, const QexShaderModuleType* type,
                            QexModel* model, uint32_t nodeIndex) {
     if (nodeIndex >= model->scene.meshNodeCount || !model->vertexBuffers) return false;
     QexPODNode* node = &model->scene.nodes[nodeIndex];
-    if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED)) return false;
+    if (!(node->stateFlags & QEX_NODE_RENDERING_ENABLED) || !module->program) return false;
     const QexPODMaterial* material = QexShaderModule_MaterialOf(model, node->materialIndex);
     *draw = {type, module, model, nodeIndex, node, QexPODModel_MeshOf(&model->scene, nodeIndex), material};
     QexRenderState_UseProgram(module->program);

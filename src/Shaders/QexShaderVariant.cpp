@@ -68,6 +68,7 @@ void LookUp(QexShaderVariant* variant) {
 }
 
 bool Build(QexShaderVariant* variant) {
+    const QexMaking making;
     const QexShaderModuleType* type = variant->type;
     const char* names[kInstanceAttribute + 1];
     char defines[160];
@@ -86,7 +87,7 @@ bool Build(QexShaderVariant* variant) {
             NamesOf(variant)))
         return false;
     LookUp(variant);
-    return true;
+    return !making.Failed();
 }
 
 void Delete(QexShaderVariant** variant) {

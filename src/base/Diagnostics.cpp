@@ -10,6 +10,7 @@
 #include "base/AndroidLog.h"
 #include "base/Formatted.h"
 #include "Qex/base.h"
+#include "Qex/engine.h"
 
 namespace {
 
@@ -99,16 +100,62 @@ static void DeliverError(const char* tag, const char* format, ...) {
     va_end(arguments);
 }
 
-void QexDiagnostics_FatalGLError(uint32_t error, const char* module, const char* file, int line) {
-    // The folder of the engine and the file in it.
+namespace {
+
+QexErrorHandler s_Handler;
+void* s_HandlerUser;
+bool s_InHandler;
+
+// The folder of the engine and the file in it.
+const char* ShortName(const char* file) {
     const char* name = file + strlen(file);
     for (int slashes = 0; name > file && (slashes += name[-1] == '/') < 2;) --name;
+    return name;
+}
+
+// The application's turn. What its handler does wrong itself is counted, and not handed to it again.
+void Handle(uint32_t code, const char* module, const char* file, int line, const char* message) {
+    ++g_QexFaults;
+    if (!s_Handler || s_InHandler) return;
+    s_InHandler = true;
+    s_Handler(s_HandlerUser, code, module, ShortName(file), line, message);
+    s_InHandler = false;
+}
+
+}  // namespace
+
+uint32_t g_QexFaults;
+
+bool QexDiagnostics_HasHandler() {
+    return s_Handler;
+}
+
+void QexDiagnostics_GLError(uint32_t error, const char* module, const char* file, int line) {
+    char message[32];
+    snprintf(message, sizeof message, "GL error 0x%.4x", error);
     DeliverError("QexEngine", "glGetError() = %i (0x%.8x) at %s:%i\n", static_cast<int>(error), error, module,
                  line);
-    DeliverError("QexEngine", "in %s, line %i", name, line);
-    exit(-1);
+    DeliverError("QexEngine", "in %s, line %i", ShortName(file), line);
+    if (!s_Handler) exit(-1);
+    Handle(error, module, file, line, message);
+}
+
+void QexDiagnostics_Refused(uint32_t code, const char* module, const char* file, int line,
+                            const char* message) {
+    if (s_Handler) Handle(code, module, file, line, message);
+}
+
+void QexDiagnostics_NoMemory(uint32_t bytes, const char* module, const char* file, int line) {
+    char message[48];
+    snprintf(message, sizeof message, "%u bytes are not to be had", bytes);
+    Handle(QEX_ERROR_MEMORY, module, file, line, message);
 }
 
 void QexDiagnostics_OutOfMemory(const char* module, int line) {
     QexSystem_Printf("Error: Out of memory at %s:%i\n", module, line);
+}
+
+void QexEngine_SetErrorHandler(QexErrorHandler handler, void* user) {
+    s_Handler = handler;
+    s_HandlerUser = user;
 }

@@ -1,10 +1,13 @@
 // The process heap, and the pool whose statistics alone are kept.
 #include "base/Memory.h"
 
+#include "base/Diagnostics.h"
 #include "Qex/base.h"
 
 #include <cstdlib>
 #include <cstring>
+
+#define QEX_MODULE "src/QexMemory"
 
 namespace {
 
@@ -121,13 +124,17 @@ uint32_t QexMemory_GetMaxSize(const void* start) {
 }
 
 void* QexMemory_Alloc(uint32_t size) {
-    return size > kMaxBlock ? nullptr : malloc(size ? size : 1);
+    void* const block = size > kMaxBlock ? nullptr : malloc(size ? size : 1);
+    if (!block) QexDiagnostics_NoMemory(size, QEX_MODULE, __FILE__, __LINE__);
+    return block;
 }
 
 void* QexMemory_ReAlloc(void* block, uint32_t size) {
-    if (!block || size > kMaxBlock) return nullptr;
+    if (!block) return nullptr;
     // A size of 0 would release the block.
-    return realloc(block, size ? size : 1);
+    void* const resized = size > kMaxBlock ? nullptr : realloc(block, size ? size : 1);
+    if (!resized) QexDiagnostics_NoMemory(size, QEX_MODULE, __FILE__, __LINE__);
+    return resized;
 }
 
 void QexMemory_Free(void* block) {

@@ -125,6 +125,7 @@ int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context) {
     if (!context) return kNullArgument;
     const int32_t width = context->width, height = context->height;
     if (!QexRenderTarget_CheckSize("QexPostProcessing_Initialize", width, height)) return kFailed;
+    const QexMaking making;
     QexPostProcessing_Finalize();
     QexPP_CreateQuad(context);
     for (int i = 0; i < QEX_POST_PROCESSING_TARGETS; ++i) {
@@ -139,7 +140,7 @@ int32_t QexPostProcessing_Initialize(const QexRuntimeContext* context) {
     blurShaderProgram = QexBlurShader_CreateProgram(context);
     DOFShaderProgram = QexDOFShader_CreateProgram(context);
     if (result == 0 && depthShaderProgram && skinningDepthShaderProgram && blurShaderProgram &&
-        DOFShaderProgram)
+        DOFShaderProgram && !making.Failed())
         return 0;
     QexPostProcessing_Finalize();
     return kFailed;
@@ -169,6 +170,7 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     if (!context) return kNullArgument;
     QexMatrix projection;
     QexMatrix_Orthographic(&projection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
+    const QexMaking making;
     QexPP_ReleaseShader();
     if (!QexProgram_Build({"QexPP_CreateShader", pVertexShaderPP, pFragmentShaderPP, nullptr, 0},
                           kProgramNames))
@@ -179,7 +181,9 @@ int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     lookup.SetSampler({"u_s2dTexture", kDiffuseUnit});
     // For sources that an application puts in; the engine's own have no such sampler.
     lookup.SetSampler({"u_s2dAlpha", kAlphaUnit});
-    return 0;
+    if (!making.Failed()) return 0;
+    QexPP_ReleaseShader();
+    return kFailed;
 }
 
 void QexPP_ReleaseShader(void) {

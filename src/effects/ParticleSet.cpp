@@ -138,6 +138,7 @@ extern "C" {
 int32_t QexParticleSet_Create(QexParticleSet* set, QexTexture* texture, QexTexture* alphaTexture,
                               uint32_t count, float pointSize, float duration) {
     if (!set) return -1;
+    const QexMaking making;
     *set = {};
     if (!s_Program.users && !CreateProgram()) return -1;
     ++s_Program.users;
@@ -155,7 +156,9 @@ int32_t QexParticleSet_Create(QexParticleSet* set, QexTexture* texture, QexTextu
     set->startColor = set->endColor = {1, 1, 1, 1};
     QexRenderState_UseProgram(s_Program.program);
     QEX_GL(glUniform1f(s_Program.pointSize, pointSize));
-    return 0;
+    if (!making.Failed()) return 0;
+    QexParticleSet_Release(set);
+    return -1;
 }
 
 int32_t QexParticleSet_GetBuffer(QexParticleSet* set, QexParticleSetEntry** buffer, uint32_t* count) {

@@ -58,7 +58,7 @@ void SetMatrix(GLint location, const QexMatrix& matrix) {
 // False, with a line, when the GL cannot draw into it.
 bool CreateTarget(QexRenderTarget* target) {
     GLenum status;
-    QexRenderTarget_Create(target, kTargetSize, kTargetSize, 0);
+    if (QexRenderTarget_Create(target, kTargetSize, kTargetSize, 0) != 0) return false;
     QexTexture_SetFilter(&target->colorTexture, QEX_FILTER_LINEAR);
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer));
     QEX_GL(glClear(GL_COLOR_BUFFER_BIT));
@@ -290,6 +290,7 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
                                 : "a sky texture");
         return -1;
     }
+    const QexMaking making;
     QexSkyBox_Release();
     s_Plane = {0, 1, 0, box->waterHeight};
     QexSky_NewVertices(box->size * 0.5f, 1, box->skyTexture->width, &s_SkyVertices, &s_SkyTexCoords);
@@ -306,13 +307,18 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
     const bool linked = QexSkyBox_CreatePrograms();
     SetCamera(*box->camera);
     QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
-    if (!CreateTarget(&s_Reflection) || !CreateTarget(&s_Surface)) return -1;
+    if (!CreateTarget(&s_Reflection) || !CreateTarget(&s_Surface)) {
+        if (making.Failed()) QexSkyBox_Release();
+        return -1;
+    }
     QexRenderer_SetZWrite(1);
     QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
     QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
     s_Drawable = linked;
-    return 0;
+    if (!making.Failed()) return 0;
+    QexSkyBox_Release();
+    return -1;
 }
 
 void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, int32_t) {

@@ -204,7 +204,7 @@ bool QexSkyBox_CreatePrograms() {
             QexSystem_Printf(row.error, log);
             QexProgram_LogFailure("QexSkyBox_Create", s_Shaders[row.pair].vertex,
                                   s_Shaders[row.pair].fragment, 0);
-            QEX_GL(glDeleteProgram(*row.program));
+            if (*row.program) QEX_GL(glDeleteProgram(*row.program));
             *row.program = 0;
             return false;
         }

@@ -1,7 +1,8 @@
 // The GL interface as the engine's GL modules see it, and the check that follows nearly every call.
 //
-// QEX_GL(call) issues the call and reads glGetError once; an error ends the process. The file that uses it
-// defines QEX_MODULE first. Lean drawing reads no errors; a build with QEX_GL_CHECKS=0 never does.
+// QEX_GL(call) issues the call and reads glGetError once; an error ends the process, or is the application's
+// handler's. The file that uses it defines QEX_MODULE first. Lean drawing reads errors where objects are made
+// and nowhere else; a build with QEX_GL_CHECKS=0 never does.
 #pragma once
 
 #include <GLES2/gl2.h>
@@ -10,12 +11,13 @@
 
 extern uint32_t g_QexReadsErrors;
 
+// Reads the GL's error, and reports one with its place.
+void QexGL_Check(const char* module, const char* file, int line);
+
 #if QEX_GL_CHECKS
-#define QEX_GL_CHECK()                                                             \
-    do {                                                                           \
-        const GLenum qexError = g_QexReadsErrors ? glGetError() : GL_NO_ERROR;     \
-        if (__builtin_expect(qexError != GL_NO_ERROR, 0))                          \
-            QexDiagnostics_FatalGLError(qexError, QEX_MODULE, __FILE__, __LINE__); \
+#define QEX_GL_CHECK()                                                     \
+    do {                                                                   \
+        if (g_QexReadsErrors) QexGL_Check(QEX_MODULE, __FILE__, __LINE__); \
     } while (0)
 #else
 #define QEX_GL_CHECK() ((void)QEX_MODULE)
@@ -41,3 +43,17 @@ inline GLsizei QexGL_Size(int32_t pixels) {
 
 // Texture units, the same in every module.
 enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };
+
+// A span in which GL objects are made: errors are read in either way of drawing. When one was found, and the
+// application's handler came back, nothing half-made is to be kept.
+class QexMaking {
+  public:
+    QexMaking() : faults_(g_QexFaults), read_(g_QexReadsErrors) { g_QexReadsErrors = 1; }
+    ~QexMaking() { g_QexReadsErrors = read_; }
+    QexMaking(const QexMaking&) = delete;
+    QexMaking& operator=(const QexMaking&) = delete;
+    bool Failed() const { return g_QexFaults != faults_; }
+
+  private:
+    uint32_t faults_, read_;
+};

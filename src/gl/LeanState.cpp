@@ -111,6 +111,11 @@ void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
 uint32_t g_QexLean = 0;
 uint32_t g_QexReadsErrors = 1;
 
+void QexGL_Check(const char* module, const char* file, int line) {
+    const GLenum error = glGetError();
+    if (error != GL_NO_ERROR) QexDiagnostics_GLError(error, module, file, line);
+}
+
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
     const uint32_t elements = ElementsOf(mesh);
     SetConstants(needed & ~elements);
@@ -251,8 +256,7 @@ void QexRenderState_Restore(void) {
 }
 
 void QexRenderer_CheckErrors(void) {
-    const GLenum error = glGetError();
-    if (error != GL_NO_ERROR) QexDiagnostics_FatalGLError(error, QEX_MODULE, __FILE__, __LINE__);
+    QexGL_Check(QEX_MODULE, __FILE__, __LINE__);
 }
 
 }  // extern "C"

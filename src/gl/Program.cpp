@@ -4,20 +4,24 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "Qex/base.h"
+#include "Qex/engine.h"
 #include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexShader"
 
 namespace {
 
-// A line with the GL's own words. No checks: the failure itself is what is told.
-void LogWords(const char* name, const char* what, GLint length, uint32_t object,
+// A line with the GL's own words, and the same for the error handler. No checks: the failure itself is what
+// is told.
+void LogWords(const char* name, const char* what, uint32_t code, GLint length, uint32_t object,
               void (*read)(GLuint, GLsizei, GLsizei*, GLchar*)) {
     QexScratch<char> text(static_cast<uint64_t>(length > 0 ? length : 0) + 1);
-    if (!text) return;
-    text[0] = 0;
-    if (length > 0) read(object, length, nullptr, text.Get());
-    QexError(QEX_TAG, "<%s> %s: %s", name, what, text.Get());
+    if (text) {
+        text[0] = 0;
+        if (length > 0) read(object, length, nullptr, text.Get());
+        QexError(QEX_TAG, "<%s> %s: %s", name, what, text.Get());
+    }
+    QexDiagnostics_Refused(code, QEX_MODULE, __FILE__, __LINE__, text ? text.Get() : what);
 }
 
 void LogShader(const char* name, const char* what, uint32_t shader) {
@@ -26,7 +30,7 @@ void LogShader(const char* name, const char* what, uint32_t shader) {
     glGetShaderiv(shader, GL_COMPILE_STATUS, &compiled);
     if (compiled) return;
     glGetShaderiv(shader, GL_INFO_LOG_LENGTH, &length);
-    LogWords(name, what, length, shader, glGetShaderInfoLog);
+    LogWords(name, what, QEX_ERROR_SHADER, length, shader, glGetShaderInfoLog);
 }
 
 // A stage of a program, with the prefixes in front of its source; without a first there is none.
@@ -53,19 +57,21 @@ void QexProgram_LogFailure(const char* name, uint32_t vertexShader, uint32_t fra
     glGetProgramiv(program, GL_LINK_STATUS, &linked);
     if (linked) return;
     glGetProgramiv(program, GL_INFO_LOG_LENGTH, &length);
-    LogWords(name, "the program does not link", length, program, glGetProgramInfoLog);
+    LogWords(name, "the program does not link", QEX_ERROR_PROGRAM, length, program, glGetProgramInfoLog);
 }
 
 bool QexProgram_Compile(const QexProgramSource& source, const QexProgramNames& names) {
+    const QexMaking making;
     const bool vertex =
         CompileStage(names.vertexShader, source.prefix, source.vertexPrefix, source.vertex, GL_VERTEX_SHADER);
     const bool fragment =
         CompileStage(names.fragmentShader, source.prefix, nullptr, source.fragment, GL_FRAGMENT_SHADER);
-    if (QexShader_CreateProgram(names.program, *names.vertexShader, *names.fragmentShader, source.attributes,
-                                source.attributeCount, nullptr) == 0 &&
-        vertex && fragment)
-        return true;
+    const bool linked =
+        !making.Failed() && QexShader_CreateProgram(names.program, *names.vertexShader, *names.fragmentShader,
+                                                    source.attributes, source.attributeCount, nullptr) == 0;
+    if (linked && vertex && fragment && !making.Failed()) return true;
     QexProgram_LogFailure(source.name, *names.vertexShader, *names.fragmentShader, *names.program);
+    if (making.Failed()) QexProgram_Delete(names, false);
     return false;
 }
 

@@ -24,7 +24,7 @@ struct QexProgramNames {
 };
 
 // Compiles, links and makes the program current. When a step fails it says so, and the objects that there are
-// stay.
+// stay, unless the application handles errors: then nothing is left.
 bool QexProgram_Compile(const QexProgramSource& source, const QexProgramNames& names);
 
 // The same, but nothing is left when a step fails.

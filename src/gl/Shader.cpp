@@ -47,16 +47,25 @@ void ReadLinkLog(uint32_t program, char* log) {
     log[QEX_SHADER_LOG_SIZE - 1] = 0;
 }
 
+// What the handler of an error leaves of a shader or a program.
+int32_t Drop(uint32_t* name, void (*deleteObject)(GLuint)) {
+    if (*name) deleteObject(*name);
+    *name = 0;
+    return -1;
+}
+
 }  // namespace
 
 extern "C" {
 
 int32_t QexShader_Create(uint32_t* shader, const char* source, uint32_t type) {
     GLint status = 0, length = 0;
+    const QexMaking making;
     *shader = glCreateShader(type);
     QEX_GL(glShaderSource(*shader, 1, &source, nullptr));
     QEX_GL(glCompileShader(*shader));
     QEX_GL(glGetShaderiv(*shader, GL_COMPILE_STATUS, &status));
+    if (making.Failed()) return Drop(shader, glDeleteShader);
     if (status == 1) return 0;
     // The log is fetched, so that it can be seen in a debugger or a GL trace, but not printed.
     QEX_GL(glGetShaderiv(*shader, GL_INFO_LOG_LENGTH, &length));
@@ -91,22 +100,26 @@ int32_t QexShader_CreateFromFileEx(uint32_t* shader, const char* path, uint32_t 
 
 int32_t QexShader_CreateWithBinary(uint32_t* shader, const void* binary, int32_t length, uint32_t format,
                                    uint32_t type) {
+    const QexMaking making;
     *shader = glCreateShader(type);
     QEX_GL(glShaderBinary(1, shader, format, binary, length));
-    return 0;
+    return making.Failed() ? Drop(shader, glDeleteShader) : 0;
 }
 
 int32_t QexShader_CreateProgram(uint32_t* program, uint32_t vertexShader, uint32_t fragmentShader,
                                 const char* const* attributes, int32_t attributeCount, char* log) {
     GLint status = 0;
+    const QexMaking making;
     *program = glCreateProgram();
     if (log) log[0] = 0;
     QEX_GL(glAttachShader(*program, fragmentShader));
     QEX_GL(glAttachShader(*program, vertexShader));
+    if (making.Failed()) return Drop(program, glDeleteProgram);
     for (int32_t i = 0; i < attributeCount; ++i)
         QEX_GL(glBindAttribLocation(*program, static_cast<GLuint>(i), attributes[i]));
     QEX_GL(glLinkProgram(*program));
     QEX_GL(glGetProgramiv(*program, GL_LINK_STATUS, &status));
+    if (making.Failed()) return Drop(program, glDeleteProgram);
     if (status == GL_TRUE) {
         QexRenderState_UseProgram(*program);
         return 0;

@@ -84,8 +84,11 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
     record->type = type;
     const bool lit = type == QEX_PROGRAM_TEXTURE_LIGHT;
     if (!lit && type != QEX_PROGRAM_TEXTURE_COLOUR) return -1;
+    const QexMaking making;
     DeleteShaders();
+    record->program = 0;
     QexProgram_Compile(kSources[lit], {&record->program, &s_VertexShader, &s_FragmentShader});
+    if (making.Failed()) return -1;
     const QexProgramLookup lookup = {QEX_MODULE, record->program};
     record->mvpMatrixLoc = lookup.Uniform("MVPMatrix");
     if (lit)
@@ -93,7 +96,10 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
                          {&record->lightColorLoc, "LightColor"},
                          {&record->globalAlphaLoc, "GlobalAlpha"}});
     lookup.SetSampler({"sTexture", kDiffuseUnit});
-    return 0;
+    if (!making.Failed()) return 0;
+    QexShaderProgram_Release(record);
+    record->program = 0;
+    return -1;
 }
 
 void QexShaderProgram_Apply(const QexShaderProgram* record) {

@@ -71,9 +71,12 @@ bool FillMesh(QexPODMesh* out, const QexMesh& mesh, bool tangents) {
     QexPODMesh_SetDefaults(out);
     out->vertexCount = count;
     out->faceCount = QexMesh_CornerCount(mesh) / 3;
-    out->uvwChannelCount = mesh.uvs ? 1 : 0;
-    if (mesh.uvs) out->uvws = QexMemory_AllocZeroed<CPODData>(1);
-    if (mesh.uvs && (!out->uvws || !CopyElement(out->uvws, mesh.uvs, count))) return false;
+    if (mesh.uvs) {
+        out->uvws = QexMemory_AllocZeroed<CPODData>(1);
+        if (!out->uvws) return false;
+        out->uvwChannelCount = 1;
+        if (!CopyElement(out->uvws, mesh.uvs, count)) return false;
+    }
     if (mesh.indexCount) {
         out->faces = {QEX_POD_UNSIGNED_SHORT, 1, sizeof(uint16_t),
                       reinterpret_cast<uint8_t*>(CopyArray(mesh.indices, mesh.indexCount))};
@@ -120,9 +123,12 @@ bool FillScene(QexPODModel* scene, const QexMesh& mesh, bool tangents) {
 QexTexture* CreateTexture(const QexMeshColours& colours) {
     QexTexture* texture = QexMemory_AllocZeroed<QexTexture>(1);
     if (!texture) return nullptr;
-    QexTexture_CreateFromPixels(texture, static_cast<int32_t>(colours.width),
-                                static_cast<int32_t>(colours.height), QEX_TEXFMT_RGBA8888, 0, 0,
-                                QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, colours.pixels);
+    if (QexTexture_CreateFromPixels(texture, static_cast<int32_t>(colours.width),
+                                    static_cast<int32_t>(colours.height), QEX_TEXFMT_RGBA8888, 0, 0,
+                                    QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, colours.pixels) != 0) {
+        QexMemory_Free(texture);
+        return nullptr;
+    }
     texture->pixels = nullptr;  // they go with the baking
     return texture;
 }
@@ -142,7 +148,7 @@ bool Complete(QexModel* model, QexTexture* texture, const QexMeshColours& colour
     QexShaderModule* module = lit ? QexModel_GetSharedLitShader() : QexModel_GetSharedShaders()->texture;
     QexModel_SetShaderProgramForAllNode(model, module, nullptr);
     model->sharedGeneration = QexModel_GetSharedGeneration();
-    return model->nodeBoxes && model->screenBoxes;
+    return module && model->nodeBoxes && model->screenBoxes;
 }
 
 }  // namespace
@@ -164,8 +170,10 @@ extern "C" int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh,
     const bool filled = FillScene(&model->scene, drawn, tangents);
     bool done = false;
     if (filled) {
-        QexModel_CreateDefaultShader();
-        done = Complete(model, texture, colours, mesh->normals != nullptr);
+        if (QexModel_CreateDefaultShader() != 0)
+            model->flags |= QEX_MODEL_NO_SHADERS;
+        else
+            done = Complete(model, texture, colours, mesh->normals != nullptr);
         if (!done) QexModel_Unload(model);
     } else {
         QexPODModel_Release(&model->scene);

@@ -58,7 +58,8 @@ bool Fill(QexInstanceMesh* out, const QexPODMesh& mesh, const QexMeshUpload& upl
     out->attributes[kInstanceAttribute] = {1, GL_FLOAT, 0, 0, stride};
     for (QexVertexAttribute& attribute : out->attributes) attribute.stride = stride + kNumberBytes;
     QexRenderState_Restore();
-    GLuint buffers[2];
+    const QexMaking making;
+    GLuint buffers[2] = {};
     glGenBuffers(2, buffers);
     out->vertexBuffer = buffers[0];
     out->indexBuffer = buffers[1];

@@ -149,7 +149,8 @@ int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_
         Abandon(model, 0, false, "<QexModel_LoadContentFromCache> QexModel_LoadFromMemory failed!");
         return 0;
     }
-    QexModel_CreateDefaultShader();
+    if (QexModel_CreateDefaultShader() != 0)
+        return Abandon(model, -1, false, "<QexModel_LoadContentFromCache> create default shader error!");
     if (QexModel_DownloadGeometry(model) != 0)
         return Abandon(model, -1, true, "<QexModel_LoadContentFromCache> download geometry failed!");
     if (QexModel_LoadTextureFromCache(model, cache) != 0 || !Complete(model))
@@ -160,6 +161,7 @@ int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_
 
 int32_t QexModel_DownloadGeometry(QexModel* model) {
     const uint32_t count = model->scene.meshCount;
+    const QexMaking making;
     QexModel_UnloadGeometry(model);
     QexRenderState_Restore();
     model->vertexBuffers = AllocZeroed<uint32_t>(count);
@@ -167,11 +169,13 @@ int32_t QexModel_DownloadGeometry(QexModel* model) {
     if (!model->vertexBuffers || !model->indexBuffers) return -1;
     QEX_GL(glGenBuffers(static_cast<GLsizei>(count), model->vertexBuffers));
     bool complete = true;
-    for (uint32_t i = 0; complete && i < count; ++i)
+    for (uint32_t i = 0; complete && i < count && !making.Failed(); ++i)
         complete = !model->scene.meshes[i].vertexCount || DownloadMesh(model, i);
     QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
     QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
-    return complete ? 0 : -1;
+    if (complete && !making.Failed()) return 0;
+    QexModel_UnloadGeometry(model);
+    return -1;
 }
 
 void QexModel_UnloadGeometry(QexModel* model) {

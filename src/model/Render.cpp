@@ -145,7 +145,8 @@ void QexModel_RenderFromViewPerspectiveWithShadow(QexModel* model, const QexLigh
         if (!IsGone(model)) QexModel_DrawLean(model, {lights, modelMatrix, view, projection, info, pass});
         return;
     }
-    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i)
+    const uint32_t faults = g_QexFaults;
+    for (uint32_t i = 0; i < model->scene.meshNodeCount && g_QexFaults == faults; ++i)
         if (InPass(model, i, pass)) DrawNode(model, i, lights, modelMatrix, view, projection, info);
 }
 
@@ -169,10 +170,12 @@ void QexModel_RenderWithViewProjectionEx(QexModel* model, const QexLightSet* lig
                                          const QexMatrix* modelMatrix, const QexVec3* eye,
                                          const QexMatrix* view, const QexMatrix* projection, uint32_t pass,
                                          uint32_t mode, TransparentSPODNodeInfo* list, uint32_t* count) {
+    const uint32_t faults = g_QexFaults;
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
         if (!InPass(model, i, pass)) continue;
         if (IsDrawnNow(model, i, mode)) {
-            if (!QexLeanState_IsLean()) DrawNode(model, i, lights, modelMatrix, view, projection);
+            if (!QexLeanState_IsLean() && g_QexFaults == faults)
+                DrawNode(model, i, lights, modelMatrix, view, projection);
             continue;
         }
         if (!list || !count) continue;
@@ -204,7 +207,8 @@ void QexModel_RenderAlphaBlendingNodes(TransparentSPODNodeInfo* list, uint32_t c
         if (distance == distance) list[i].distance = distance;
     }
     qsort(list, count, sizeof *list, TransparentSPODNodeInfo_Compare);
-    for (uint32_t i = count; i-- > 0;) {
+    const uint32_t faults = g_QexFaults;
+    for (uint32_t i = count; i-- > 0 && g_QexFaults == faults;) {
         const TransparentSPODNodeInfo& entry = list[i];
         if (entry.model && entry.passID == static_cast<int32_t>(pass))
             QexModel_RenderNodeWithViewProjection(entry.model, entry.nodeIndex, &entry.lights,

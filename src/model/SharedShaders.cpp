@@ -116,11 +116,13 @@ QexShaderModule* s_Lit;
 
 // The shadow programs, each with its alpha texture on its unit.
 void CreateShadowPrograms() {
+    const QexMaking making;
     QexSkinShadowProgram& skin = m_SkinShadowShaderProgram;
     QexModelShadowProgram& model = m_uModelShadowShaderProgram;
     const QexProgramSampler alpha = {"alphaTexture", kAlphaUnit};
     QexProgram_Compile({kName, kSkinShadowVertexSource, kShadowFragmentSource, kSkinShadowAttributes, 4},
                        {&skin.program, &s_SkinShadowShaders.vertex, &s_SkinShadowShaders.fragment});
+    if (making.Failed()) return;
     const QexProgramLookup skinLookup = {QEX_MODULE, skin.program};
     skinLookup.SetSampler(alpha);
     skinLookup.Uniforms({{&skin.viewProjMatrixLoc, "viewProjMatrix"},
@@ -128,6 +130,7 @@ void CreateShadowPrograms() {
                          {&skin.boneMatrixArrayLoc, "boneMatrixArray"}});
     QexProgram_Compile({kName, kShadowVertexSource, kShadowFragmentSource, kShadowAttributes, 2},
                        {&model.program, &s_ModelShadowShaders.vertex, &s_ModelShadowShaders.fragment});
+    if (making.Failed()) return;
     const QexProgramLookup modelLookup = {QEX_MODULE, model.program};
     modelLookup.SetSampler(alpha);
     model.mvpMatrixLoc = modelLookup.Uniform("mvpMatrix");
@@ -135,6 +138,7 @@ void CreateShadowPrograms() {
 
 void CreateShadowTarget() {
     GLint framebuffer = 0;
+    const QexMaking making;
     const int32_t most = QexRenderTarget_MaxSize();
     s_Shared.shadowWidth = s_ShadowWidth < most ? s_ShadowWidth : most;
     s_Shared.shadowHeight = s_ShadowHeight < most ? s_ShadowHeight : most;
@@ -162,6 +166,7 @@ void CreateShadowTarget() {
                                   0));
     QEX_GL(glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_DEPTH_ATTACHMENT, GL_RENDERBUFFER,
                                      s_Shared.shadowDepth));
+    QexRenderTarget_CheckComplete();
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
 }
 
@@ -199,6 +204,7 @@ QexModelShadowProgram m_uModelShadowShaderProgram = {0, -1};
 
 int32_t QexModel_CreateDefaultShader(void) {
     if (s_ReferenceCount++ > 0) return 0;
+    const QexMaking making;
     s_Shared.texture = QexTextureShader_CreateProgram();
     s_Shared.skinning = QexSkinningTextureShader_CreateProgram();
     s_Shared.simple = QexSimpleShader_CreateProgram();
@@ -206,7 +212,9 @@ int32_t QexModel_CreateDefaultShader(void) {
     QexShaderVariant_Retain(&kStaticCaster);
     QexShaderVariant_Retain(&kSkinnedCaster);
     CreateShadowTarget();
-    return 0;
+    if (s_Shared.texture && s_Shared.skinning && s_Shared.simple && !making.Failed()) return 0;
+    QexModel_ReleaseShader(1);
+    return -1;
 }
 
 void QexModel_ReleaseShader(int32_t force) {

@@ -53,6 +53,7 @@ QexTexture* s_Texture;
 
 bool Create() {
     if (s_GL.program || s_GL.failed) return !s_GL.failed;
+    const QexMaking making;
     s_GL.failed = !QexProgram_Build({"QexBillboard_Draw", kVertexSource, kFragmentSource, kAttributes, 2},
                                     {&s_GL.program, &s_GL.vertexShader, &s_GL.fragmentShader});
     if (s_GL.failed) return false;

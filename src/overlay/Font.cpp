@@ -89,14 +89,17 @@ void BindSheet(QexSheet sheet) {
     if (!QexLeanState_IsLean()) QexTexture_SetFilter(&s_Sheets[sheet], QEX_FILTER_LINEAR);
 }
 
-void CreateSheet(QexSheet sheet, const uint8_t* pixels) {
+bool CreateSheet(QexSheet sheet, const uint8_t* pixels) {
     QexTexture* texture = &s_Sheets[sheet];
     // The pixels are only read; the record has no pointer to constant ones.
-    QexTexture_CreateFromPixels(texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
-                                QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, const_cast<uint8_t*>(pixels));
+    const int32_t result =
+        QexTexture_CreateFromPixels(texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
+                                    QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, const_cast<uint8_t*>(pixels));
     texture->pixels = nullptr;
+    if (result != 0) return false;
     QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE));
     QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE));
+    return true;
 }
 
 void CreateLatinSheet() {
@@ -238,6 +241,7 @@ int32_t QexFont_Create(int32_t width, int32_t height) {
 
 int32_t QexFont_CreateShader(void) {
     QexFontProgram& p = s_Program;
+    const QexMaking making;
     if (p.program) QexFont_ReleaseShader(1);
     ReleaseSheets();
     if (!QexProgram_Build({"QexFont_CreateShader", kVertexSource, kFragmentSource, nullptr, 0},
@@ -251,8 +255,10 @@ int32_t QexFont_CreateShader(void) {
     QEX_GL(glUniformMatrix4fv(p.projectionLocation, 1, GL_FALSE, s_Projection.m));
     lookup.SetSampler({"u_s2dTexture", kDiffuseUnit});
     lookup.SetSampler({"u_s2dAlpha", kAlphaUnit});
-    CreateSheet(kPlainSheet, fontdata);
-    return 0;
+    if (CreateSheet(kPlainSheet, fontdata) && !making.Failed()) return 0;
+    ReleaseSheets();
+    QexFont_ReleaseShader(1);
+    return -1;
 }
 
 void QexFont_ReleaseShader(int32_t) {
@@ -278,6 +284,7 @@ int32_t QexFont_AddString(const QexRuntimeContext* context, int32_t x, int32_t y
     const uint32_t count = slot + QexGlyphs_Count(string);
     if (!QexGlyphs_Reserve(&s_Text, count)) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        if (QexDiagnostics_HasHandler()) return 0;
         exit(1);
     }
     s_Text.count = count;

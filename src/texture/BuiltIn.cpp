@@ -38,7 +38,7 @@ QexTexture s_BlankNormalMap;
 bool s_Created;
 
 // Loads a PVR image of one colour: every block of every level is the same. `image` is room for it.
-void LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mipmaps, const uint8_t* block,
+bool LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mipmaps, const uint8_t* block,
                  uint32_t blocks) {
     const uint32_t words[13] = {
         kQexPvrHeaderSize, size, size, mipmaps, kPVRFlags, blocks * kETCBlockSize, 4, 0, 0, 0, 0,
@@ -47,7 +47,7 @@ void LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mi
     for (uint32_t i = 0; i < blocks; ++i)
         memcpy(image + kQexPvrHeaderSize + i * kETCBlockSize, block, kETCBlockSize);
     memset(texture, 0, sizeof *texture);
-    QexTexture_LoadPVRFromMem(texture, image, nullptr, 1, 0, nullptr);
+    return QexTexture_LoadPVRFromMem(texture, image, nullptr, 1, 0, nullptr) == 0;
 }
 
 // Direction through a texel of each cube face, from the texel's offsets s and t and half the edge.
@@ -101,8 +101,13 @@ int32_t QexTexture_CreateDefault(void) {
         return 0;
     }
     uint8_t image[kQexPvrHeaderSize + kDefaultBlocks * kETCBlockSize];
-    LoadUniform(&s_Default, image, kDefaultSize, kDefaultMipmaps, kWhiteBlock, kDefaultBlocks);
-    LoadUniform(&s_BlankNormalMap, image, kNormalSize, kNormalMipmaps, kFlatNormalBlock, kNormalBlocks);
+    if (!LoadUniform(&s_Default, image, kDefaultSize, kDefaultMipmaps, kWhiteBlock, kDefaultBlocks))
+        return -1;
+    if (!LoadUniform(&s_BlankNormalMap, image, kNormalSize, kNormalMipmaps, kFlatNormalBlock,
+                     kNormalBlocks)) {
+        QexTexture_Release(&s_Default);
+        return -1;
+    }
     s_Created = true;
     QexLog(QEX_TAG, "<QexTexture_CreateDefault> Created.");
     return 0;
@@ -122,6 +127,7 @@ int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t siz
         QexSystem_Printf("ERROR:<GenerateNormalisationCubeMap> a cube map of %d pixels a side\n", size);
         return -1;
     }
+    const QexMaking making;
     glGenTextures(1, &texture->glName);
     QexRenderState_Bind(GL_TEXTURE_CUBE_MAP, texture->glName);
     texture->width = size;
@@ -143,7 +149,10 @@ int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t siz
     glTexParameteri(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
     glTexParameteri(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE);
     glTexParameteri(GL_TEXTURE_CUBE_MAP, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE);
-    return 0;
+    if (QexDiagnostics_HasHandler()) QEX_GL_CHECK();
+    if (!making.Failed()) return 0;
+    QexTexture_Release(texture);
+    return -1;
 }
 
 }  // extern "C"

@@ -154,6 +154,7 @@ int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file) {
     QexKtx ktx;
     const QexImage& image = ktx.image;
     bool decodes = false;
+    const QexMaking making;
     if (!QexKtx_Is(file)) return -3;
     if (!QexKtx_ReadHeader(&ktx, file))
         return QexTextureLoad_Refuse(kFunction, "the file is cut short in its header.");
@@ -166,7 +167,7 @@ int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file) {
     texture->width = static_cast<int32_t>(image.width);
     texture->height = image.height;
     QexTextureLoad_Begin(texture, &texture->glName, image.faces == 6);
-    if (!UploadLevels(&ktx, decodes, file)) {
+    if (!UploadLevels(&ktx, decodes, file) || making.Failed()) {
         QEX_GL(glDeleteTextures(1, &texture->glName));
         QexLeanState_ForgetTextures();
         texture->glName = 0;

@@ -171,6 +171,7 @@ int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* heade
     if (QexKtx_Is(file)) return QexTextureLoad_KTX(texture, file);
     PVR pvr;
     const QexPVRHeader& read = pvr.file.header;
+    const QexMaking making;
     texture->glName = 0;
     if (!ReadHeader(&pvr.file, file)) return -1;
     const bool known = !pixelData && file.size != kQexUnknownSize;
@@ -190,11 +191,11 @@ int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* heade
     QexTextureLoad_Begin(texture, &name, pvr.file.IsCube());
     const GLenum target = QexTexture_Target(texture);
     const Upload result = UploadAll(pvr, target);
-    if (result == Upload::kGLError) return QexTextureLoad_Refuse(kFunction, "glTexImage2D() failed.");
-    if (result == Upload::kOutOfMemory) {
+    if (result != Upload::kDone || making.Failed()) {
         QEX_GL(glDeleteTextures(1, &name));
         QexLeanState_ForgetTextures();
-        return QexTextureLoad_Refuse(kFunction, "out of memory.");
+        return QexTextureLoad_Refuse(
+            kFunction, result == Upload::kOutOfMemory ? "out of memory." : "glTexImage2D() failed.");
     }
     texture->glName = name;
     if (header) *header = read;

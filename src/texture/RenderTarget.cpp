@@ -1,9 +1,11 @@
 // Framebuffers that a scene is drawn into, with a colour texture and a depth buffer.
+#include <cstdio>
 #include <cstring>
 
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "Qex/base.h"
+#include "Qex/engine.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
 #include "texture/RenderTarget.h"
@@ -51,11 +53,22 @@ bool QexRenderTarget_CheckSize(const char* function, int32_t width, int32_t heig
     return false;
 }
 
+void QexRenderTarget_CheckComplete() {
+    if (!QexDiagnostics_HasHandler()) return;
+    const GLenum status = glCheckFramebufferStatus(GL_FRAMEBUFFER);
+    char message[64];
+    if (status == GL_FRAMEBUFFER_COMPLETE) return;
+    snprintf(message, sizeof message, "an incomplete framebuffer, status 0x%.4x", status);
+    QexError(QEX_TAG, "%s", message);
+    QexDiagnostics_Refused(QEX_ERROR_FRAMEBUFFER, QEX_MODULE, __FILE__, __LINE__, message);
+}
+
 extern "C" {
 
 int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t height, int32_t) {
     memset(target, 0, sizeof *target);
     if (!QexRenderTarget_CheckSize("QexRenderTarget_Create", width, height)) return -1;
+    const QexMaking making;
     target->created = 1;
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &target->savedFramebuffer));
     QEX_GL(glGenFramebuffers(1, &target->framebuffer));
@@ -68,10 +81,13 @@ int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t h
                                      target->depthRenderbuffer));
     QEX_GL(glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D,
                                   target->colorTexture.glName, 0));
+    QexRenderTarget_CheckComplete();
     target->viewport[2] = width;
     target->viewport[3] = height;
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(target->savedFramebuffer)));
-    return 0;
+    if (!making.Failed()) return 0;
+    QexRenderTarget_Release(target);
+    return -1;
 }
 
 int32_t QexRenderTarget_CreateFromTexture(QexRenderTarget*, QexTexture*) {

@@ -9,3 +9,6 @@ int32_t QexRenderTarget_MaxSize();
 
 // Whether the GL can draw into that many pixels; an error line in the function's name when it cannot.
 bool QexRenderTarget_CheckSize(const char* function, int32_t width, int32_t height);
+
+// Tells the application's error handler, where there is one, of a bound framebuffer that is incomplete.
+void QexRenderTarget_CheckComplete();

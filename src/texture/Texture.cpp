@@ -66,6 +66,14 @@ int32_t Set(QexTexture* texture, const Setting& setting, uint32_t code, uint8_t*
     return kUnknownCode;
 }
 
+// Gives back the GL texture of a record that an error was found in.
+int32_t Drop(QexTexture* texture) {
+    if (texture->glName) glDeleteTextures(1, &texture->glName);
+    QexLeanState_ForgetTextures();
+    texture->glName = 0;
+    return -1;
+}
+
 // BGR(A) to RGB(A).
 void SwapRedAndBlue(uint8_t* pixels, uint64_t bytes, uint32_t bytesPerPixel) {
     for (uint64_t i = 0; i < bytes; i += bytesPerPixel) {
@@ -101,6 +109,7 @@ extern "C" {
 
 int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t height, uint32_t format,
                                     int32_t, uint32_t stage, uint32_t filter, uint32_t wrap, void* pixels) {
+    const QexMaking making;
     memset(texture, 0, sizeof *texture);
     texture->pixels = pixels;
     texture->width = width;
@@ -112,6 +121,7 @@ int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t 
     QexTexture_SetFilter(texture, filter);
     QexTexture_SetWrapping(texture, wrap);
     QexTexture_Download(texture, nullptr);
+    if (making.Failed()) return Drop(texture);
     return QexTexture_SetName(texture, "Noname");
 }
 
@@ -120,6 +130,7 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
     const uint8_t* file = static_cast<const uint8_t*>(tga);
     const QexTga header = QexTga_ReadHeader(file);
     const uint32_t bytesPerPixel = header.BytesPerPixel();
+    const QexMaking making;
     memset(texture, 0, sizeof *texture);
     texture->width = static_cast<int32_t>(header.width);
     texture->height = header.height;
@@ -149,6 +160,7 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
     QexTexture_SetFilter(texture, filter);
     QexTexture_SetWrapping(texture, wrap);
     QexTexture_Download(texture, copy.Get());
+    if (making.Failed()) return Drop(texture);
     if (texture->flags & QEX_TEXFLAG_OWNS_PIXELS) texture->pixels = copy.Take();
     return 0;
 }
@@ -168,6 +180,7 @@ int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint3
     if (!file) return -1;
     QexScratch<uint8_t> data;
     uint64_t size = 0;
+    const QexMaking making;
     if (ReadFile(file, &data, &size) && size <= UINT32_MAX) {
         QexTexture_CreateTGAFromMemSized(texture, ignored, stage, filter, wrap, data.Get(),
                                          static_cast<uint32_t>(size));
@@ -178,7 +191,7 @@ int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint3
     fclose(file);
     const char* name = GetNameFromFullPath(path);
     QexTexture_SetName(texture, name ? name : "");
-    return 0;
+    return making.Failed() ? -1 : 0;
 }
 
 int32_t QexTexture_Download(QexTexture* texture, const void* pixels) {
@@ -187,11 +200,12 @@ int32_t QexTexture_Download(QexTexture* texture, const void* pixels) {
     QexRenderState_Bind(QexTexture_Target(texture), texture->glName);
     if (!IsFormat(texture->format) || texture->flags & QEX_TEXFLAG_CUBEMAP) return -1;
     const auto& format = kFormats[texture->format - 1];
+    const QexMaking making;
     // Rows are tightly packed, whatever the application set.
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
     QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, static_cast<GLint>(format.format), texture->width,
                         static_cast<GLsizei>(texture->height), 0, format.format, format.type, pixels));
-    return 0;
+    return making.Failed() ? -1 : 0;
 }
 
 int32_t QexTexture_SetFormat(QexTexture* texture, uint32_t format) {

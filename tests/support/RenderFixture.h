@@ -62,6 +62,9 @@ struct Allocations {
 };
 extern const bool kAllocationsAreCounted;
 Allocations CountAllocations(const std::function<void()>& code);
+// Runs the code, in which the engine's nth allocation fails (1: the first, 0: none), and, if wanted, all that
+// follow. How many it asked for.
+long EngineAllocations(const std::function<void()>& code, long nth, bool following);
 
 // The lines of a log that report errors.
 std::string ErrorLines(const std::string& log);
