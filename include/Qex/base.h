@@ -64,6 +64,36 @@ typedef void (*QexLogSink)(void* user, int32_t weight, const char* tag, const ch
  *  @param user  passed on to it, the application's; may be null */
 QEX_API void QexLog_SetSink(QexLogSink sink, void* user);
 
+/** What an error handler is told of, besides the GL's own errors, which have the GL's numbers (0x0500 and
+ *  more). */
+#define QEX_ERROR_SHADER 1u      /* a shader does not compile; the message is the GL's log */
+#define QEX_ERROR_PROGRAM 2u     /* a program does not link; likewise */
+#define QEX_ERROR_FRAMEBUFFER 3u /* a framebuffer is incomplete */
+#define QEX_ERROR_MEMORY 4u      /* memory was not to be had */
+
+/** @param user     as given with the handler
+ *  @param code     a GL error or QEX_ERROR_...
+ *  @param module   of the engine, as in the log: "src/QexModel"
+ *  @param file     of its source: "model/Model.cpp"
+ *  @param line     there
+ *  @param message  one line or the GL's log; like the other texts, valid during the call alone */
+typedef void (*QexErrorHandler)(void* user, uint32_t code, const char* module, const char* file, int32_t line,
+                                const char* message);
+
+/** Says who is called when the GL reports an error, refuses a shader, a program or a framebuffer, or memory
+ *  runs out. Without a handler, which is how the engine starts, a GL error ends the process with exit status
+ *  255. With one, the lines are logged all the same, and when it returns the call that found the error fails
+ *  as it says it may: what it was making is given back whole. A call that draws leaves out what it has not
+ *  drawn yet; the next frame is drawn as ever.
+ *
+ *  A handler may call any function of the engine that releases or asks, not one that draws or loads; errors
+ *  found meanwhile are logged and not handed to it. What is being drawn or made at the moment must stay:
+ *  release that afterwards. It has to return: a jump out of it (longjmp, an exception) leaves the engine in
+ *  no defined state. Builds without checks of GL errors report all but those.
+ *  @param handler  null: none
+ *  @param user     handed to it */
+QEX_API void QexEngine_SetErrorHandler(QexErrorHandler handler, void* user);
+
 /** Writes one message to the log at priority 4 (information).
  *  @param tag     log tag, "Qex" for the engine's own messages; null counts as ""
  *  @param format  printf format, not null; no trailing newline is needed, and no length limit set but that of

@@ -10,7 +10,6 @@
 #include "base/AndroidLog.h"
 #include "base/Formatted.h"
 #include "Qex/base.h"
-#include "Qex/engine.h"
 
 namespace {
 

@@ -4,7 +4,6 @@
 #include "base/Memory.h"
 #include "gl/GL.h"
 #include "Qex/base.h"
-#include "Qex/engine.h"
 #include "Qex/renderer.h"
 
 #define QEX_MODULE "src/QexShader"

@@ -5,7 +5,6 @@
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "Qex/base.h"
-#include "Qex/engine.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
 #include "texture/RenderTarget.h"
