@@ -68,6 +68,48 @@ QEX_API void QexRenderState_ActiveTexture(uint32_t unit);
  *  @param name    GL name, 0 for none */
 QEX_API void QexRenderState_Bind(uint32_t target, uint32_t name);
 
+/* ---- Lost contexts ----
+ *
+ * A GL context may be lost: Android takes it from an application in the background, a browser from a page, a
+ * driver after a fault. All GL objects are gone then. QexEngine_ContextLost tells the engine so, and
+ * QexEngine_ContextRestored, called first of all in another context that shares nothing with others, makes
+ * everything again: records, handles and pointers stay as they are, and the next frame is the one that would
+ * have been drawn. Buffers come from the scenes in memory; textures from the files that they came from, from
+ * copies (QexEngine_KeepTextures), or from the application (QexEngine_SetTextureSource). Contents of render
+ * targets are gone. GL objects, parameters and state that the application made itself are its own affair, as
+ * are programs from QexShader_CreateProgram.
+ *
+ * A loss that the GL tells of by an error (GL_CONTEXT_LOST) is not taken for a fault: it is logged, and
+ * errors are not looked at until the context is restored.
+ */
+
+/** Forgets every GL object, without a GL call. Records may be released meanwhile; nothing can be made. */
+QEX_API void QexEngine_ContextLost(void);
+
+/** Makes everything again in the current context, in which no other GL object was made yet. Leaves no
+ * program, buffer or vertex array object bound, and unit 0 active.
+ *  @return 0, also when nothing was lost; -1, with lines in the log, when something could not be made: that
+ *  is not drawn; or when the context was lost again: call this again in the next one. */
+QEX_API int32_t QexEngine_ContextRestored(void);
+
+/** @return 1 from a loss, told or found, until the context is restored, else 0. */
+QEX_API uint32_t QexEngine_IsContextLost(void);
+
+/** Whether textures made from memory from now on (pixels, and images whose length is given) keep a copy of
+ * it, from which they can be made again. 0 at first.
+ *  @return the setting before */
+QEX_API int32_t QexEngine_KeepTextures(int32_t keeps);
+
+/** Makes a texture again that came from memory of which no copy was kept.
+ *  @param user     as given with the function
+ *  @param name     the texture's GL name, as in its record
+ *  @param texture  an empty record: load the texture into it, with any function
+ *  @return 0, or anything else when that failed */
+typedef int32_t (*QexTextureSource)(void* user, uint32_t name, struct QexTexture* texture);
+
+/** Sets who is asked for such textures. @param source  null: nobody, they have no image then */
+QEX_API void QexEngine_SetTextureSource(QexTextureSource source, void* user);
+
 /* ---- Ways of drawing ----
  *
  * Described drawing makes the GL calls that each function's description names: it reads the GL's error after

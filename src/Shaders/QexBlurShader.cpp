@@ -65,6 +65,11 @@ QexMatrix ProjectionOf(const QexShaderModule* module) {
     return projection;
 }
 
+int32_t SetUp(QexShaderModule* module) {
+    const QexMatrix projection = ProjectionOf(module);
+    return QexScreenShader_Setup(&kType, module, &projection, 1);
+}
+
 }  // namespace
 
 void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* projection) {
@@ -74,7 +79,7 @@ void QexBlurShader_SetProjection(QexShaderModule* module, const QexMatrix* proje
 extern "C" {
 
 QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context) {
-    QexShaderModule* module = QexShaderModule_Alloc(&kType);
+    QexShaderModule* module = QexShaderModule_Alloc(&kType, SetUp);
     if (!module) return nullptr;
     const float width = static_cast<float>(context->width), height = static_cast<float>(context->height);
     QexMatrix projection;
@@ -86,8 +91,7 @@ QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context) {
 
 int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module, float sigma,
                                    float samples) {
-    const QexMatrix projection = ProjectionOf(module);
-    if (QexScreenShader_Setup(&kType, module, &projection, 1) != 0) return -1;
+    if (SetUp(module) != 0) return -1;
     QexBlurShader_SetParameters(module, nullptr, 0, sigma, samples,
                                 1.0f / static_cast<float>(context->width));
     return 0;

@@ -43,12 +43,16 @@ const QexShaderModuleType kType = {
 // Of the module created last.
 QexMatrix s_Projection;
 
+int32_t SetUp(QexShaderModule* module) {
+    return QexScreenShader_Setup(&kType, module, &s_Projection, 3);
+}
+
 }  // namespace
 
 extern "C" {
 
 QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context) {
-    QexShaderModule* module = QexShaderModule_Alloc(&kType);
+    QexShaderModule* module = QexShaderModule_Alloc(&kType, SetUp);
     if (!module) return nullptr;
     QexMatrix_Orthographic(&s_Projection, 0, static_cast<float>(context->width), 0,
                            static_cast<float>(context->height), 0, 1);
@@ -56,7 +60,7 @@ QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context) {
 }
 
 int32_t QexDOFShader_SetupProgram(const QexRuntimeContext*, QexShaderModule* module) {
-    return QexScreenShader_Setup(&kType, module, &s_Projection, 3);
+    return SetUp(module);
 }
 
 void QexDOFShader_Release(QexShaderModule** module) {

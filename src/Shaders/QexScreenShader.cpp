@@ -25,6 +25,6 @@ int32_t QexScreenShader_Setup(const QexShaderModuleType* type, QexShaderModule* 
 
 QexShaderModule* QexScreenShader_Finish(QexShaderModule* module, int32_t result) {
     if (result == 0) return module;
-    QexMemory_Free(module);
+    QexShaderModule_Free(module);
     return nullptr;
 }

@@ -1,8 +1,8 @@
 // Modules from their descriptions: programs, materials, meshes.
 #include "Shaders/QexShaderModule.h"
 
-#include <cstring>
-
+#include "base/Memory.h"
+#include "gl/Context.h"
 #include "pod/Animation.h"
 #include "pod/Scene.h"
 #include "Qex/base.h"
@@ -52,6 +52,45 @@ bool HookBinds(const QexShaderDraw& draw) {
     return model->bindTextureHook && model->bindTextureHook(model, draw.nodeIndex);
 }
 
+// A module beside what makes it again.
+struct Made {
+    Made* next;
+    const QexShaderModuleType* type;
+    int32_t (*setup)(QexShaderModule*);  // or null
+    bool built;                          // whether it had a program when the context was lost
+    QexShaderModule module;
+};
+Made* s_Made;
+
+// Where the list leads to a module; to its end for one that was not made here.
+Made** Find(const QexShaderModule* module) {
+    Made** at = &s_Made;
+    while (*at && &(*at)->module != module) at = &(*at)->next;
+    return at;
+}
+
+void Forget() {
+    for (Made* made = s_Made; made; made = made->next) {
+        QexShaderModule& m = made->module;
+        made->built |= m.program != 0;
+        m.program = m.vertexShader = m.fragmentShader = 0;
+    }
+}
+
+bool Restore() {
+    bool whole = true;
+    for (Made* made = s_Made; made; made = made->next) {
+        if (!made->built) continue;
+        const bool set = (made->setup ? made->setup(&made->module)
+                                      : QexShaderModule_Setup(made->type, &made->module)) == 0;
+        made->built = !set;
+        whole &= set;
+    }
+    return whole;
+}
+
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+
 QexProgramNames NamesOf(QexShaderModule* module) {
     return {&module->program, &module->vertexShader, &module->fragmentShader};
 }
@@ -84,20 +123,32 @@ const char* QexShaderModule_SamplerName(uint8_t unit) {
 
 // ---- Lifetime ----
 
-QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type) {
-    QexShaderModule* module = static_cast<QexShaderModule*>(QexMemory_Alloc(sizeof(QexShaderModule)));
-    if (module)
-        memset(static_cast<void*>(module), 0, sizeof *module);
-    else
+QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type, int32_t (*setup)(QexShaderModule*)) {
+    Made* made = QexMemory_AllocZeroed<Made>(1);
+    if (!made) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-    return module;
+        return nullptr;
+    }
+    made->type = type;
+    made->setup = setup;
+    made->next = s_Made;
+    s_Made = made;
+    QexContext_Register(&s_Part);
+    return &made->module;
+}
+
+void QexShaderModule_Free(QexShaderModule* module) {
+    Made** at = Find(module);
+    Made* made = *at;
+    if (made) *at = made->next;
+    QexMemory_Free(made ? static_cast<void*>(made) : module);
 }
 
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type) {
     QexShaderModule* module = QexShaderModule_Alloc(type);
     if (!module) return nullptr;
     if (QexShaderModule_Setup(type, module) != 0) {
-        QexMemory_Free(module);
+        QexShaderModule_Free(module);
         return nullptr;
     }
     if (type->hasThreshold) {
@@ -135,7 +186,7 @@ void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** 
     if (!m) return;
     QexShaderVariant_Release(type);
     QexProgram_Delete(NamesOf(m));
-    QexMemory_Free(m);
+    QexShaderModule_Free(m);
     *module = nullptr;
 }
 

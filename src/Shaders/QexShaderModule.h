@@ -120,7 +120,10 @@ const char* QexShaderModule_AttributeName(uint8_t element);
 const char* QexShaderModule_SamplerName(uint8_t unit);
 
 // Lifetime. Alloc gives a cleared record, or null with a line in the log; Create sets it up, too.
-QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type);
+// `setup` makes its program again in another context where QexShaderModule_Setup is not all that it takes.
+QexShaderModule* QexShaderModule_Alloc(const QexShaderModuleType* type,
+                                       int32_t (*setup)(QexShaderModule*) = nullptr);
+void QexShaderModule_Free(QexShaderModule* module);
 QexShaderModule* QexShaderModule_Create(const QexShaderModuleType* type);
 int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* module);
 void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module);

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/Program.h"
 #include "Qex/base.h"
 #include "Qex/renderer.h"
@@ -97,6 +98,17 @@ void Delete(QexShaderVariant** variant) {
     *variant = nullptr;
 }
 
+void Forget() {
+    for (TypeVariants& row : s_Types)
+        for (uint32_t i = 0; i < kShaderVariants; ++i) {
+            QexMemory_FreeArray(row.variants[i]);
+            row.failed[i] = false;
+        }
+    ++s_Generation;
+}
+
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, nullptr, nullptr, false};
+
 void SendVector(int32_t location, const float* value, const float* given, bool all) {
     if (location >= 0 && (all || memcmp(value, given, 3 * sizeof(float)) != 0))
         glUniform3fv(location, 1, value);
@@ -173,6 +185,8 @@ QexShaderVariant* QexShaderVariant_Get(const QexShaderModuleType* type, uint32_t
     if (!row || row->failed[flags]) return nullptr;
     QexShaderVariant*& variant = row->variants[flags];
     if (variant) return variant;
+    if (g_QexContextLost) return nullptr;
+    QexContext_Register(&s_Part);
     variant = QexMemory_AllocZeroed<QexShaderVariant>(1);
     if (variant) {
         variant->type = type;

@@ -1,6 +1,7 @@
 // Depth of field: the scene drawn sharp into one target, a blurred copy of it in another, its depth in a
 // third, and a mix of the three on the screen. The modules are Shaders/QexBlurShader, QexDOFShader and the
 // two depth modules; the copy program, which shows a target as it is, is made here.
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/Program.h"
 #include "gl/Quad.h"
@@ -36,6 +37,21 @@ Quad s_ScreenQuad;
 GLuint s_VertexShader, s_FragmentShader;
 GLint s_Position, s_TexCoord;
 const QexProgramNames kProgramNames = {&m_iProgNamePP, &s_VertexShader, &s_FragmentShader};
+
+QexMatrix s_CopyProjection;
+bool s_HadCopy;  // when the context was lost
+
+int32_t CreateCopyProgram();
+
+void Forget() {
+    s_HadCopy |= m_iProgNamePP != 0;
+    m_iProgNamePP = s_VertexShader = s_FragmentShader = 0;
+}
+bool Restore() {
+    if (s_HadCopy) s_HadCopy = CreateCopyProgram() != 0;
+    return !s_HadCopy;
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
 
 // What a scene may have left switched on that would cut into a quad.
 const GLenum kSwitches[] = {GL_DEPTH_TEST, GL_BLEND, GL_CULL_FACE};
@@ -168,25 +184,38 @@ int32_t QexPP_CreateQuad(const QexRuntimeContext* context) {
 
 int32_t QexPP_CreateShader(const QexRuntimeContext* context) {
     if (!context) return kNullArgument;
-    QexMatrix projection;
-    QexMatrix_Orthographic(&projection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
-    const QexMaking making;
+    QexMatrix_Orthographic(&s_CopyProjection, 0, WidthOf(context), 0, HeightOf(context), 0, 1);
     QexPP_ReleaseShader();
+    return CreateCopyProgram();
+}
+
+}  // extern "C"
+
+namespace {
+
+int32_t CreateCopyProgram() {
+    const QexMaking making;
     if (!QexProgram_Build({"QexPP_CreateShader", pVertexShaderPP, pFragmentShaderPP, nullptr, 0},
                           kProgramNames))
         return kFailed;
     const QexProgramLookup lookup = {QEX_MODULE, m_iProgNamePP};
     lookup.Attributes({{&s_Position, "a_v4Position"}, {&s_TexCoord, "a_v2TexCoord"}});
-    QEX_GL(glUniformMatrix4fv(lookup.Uniform("u_m4Projection"), 1, GL_FALSE, projection.m));
+    QEX_GL(glUniformMatrix4fv(lookup.Uniform("u_m4Projection"), 1, GL_FALSE, s_CopyProjection.m));
     lookup.SetSampler({"u_s2dTexture", kDiffuseUnit});
     // For sources that an application puts in; the engine's own have no such sampler.
     lookup.SetSampler({"u_s2dAlpha", kAlphaUnit});
+    QexContext_Register(&s_Part);
     if (!making.Failed()) return 0;
     QexPP_ReleaseShader();
     return kFailed;
 }
 
+}  // namespace
+
+extern "C" {
+
 void QexPP_ReleaseShader(void) {
+    s_HadCopy = false;
     QexProgram_Delete(kProgramNames);
 }
 

@@ -2,6 +2,7 @@
 #include <cstddef>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "gl/Program.h"
@@ -86,6 +87,20 @@ bool CreateProgram() {
     return true;
 }
 
+float s_PointSize;  // that the program was given last
+
+void Forget() {
+    s_Program.program = s_Program.vertexShader = s_Program.fragmentShader = 0;
+}
+bool Restore() {
+    if (!s_Program.users) return true;
+    if (!CreateProgram()) return false;
+    QexRenderState_UseProgram(s_Program.program);
+    QEX_GL(glUniform1f(s_Program.pointSize, s_PointSize));
+    return true;
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+
 void ReleaseProgram() {
     if (--s_Program.users == 0) QexProgram_Delete(kProgramNames);
 }
@@ -156,6 +171,8 @@ int32_t QexParticleSet_Create(QexParticleSet* set, QexTexture* texture, QexTextu
     set->startColor = set->endColor = {1, 1, 1, 1};
     QexRenderState_UseProgram(s_Program.program);
     QEX_GL(glUniform1f(s_Program.pointSize, pointSize));
+    s_PointSize = pointSize;
+    QexContext_Register(&s_Part);
     if (!making.Failed()) return 0;
     QexParticleSet_Release(set);
     return -1;

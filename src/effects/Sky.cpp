@@ -6,6 +6,7 @@
 
 #include "base/Memory.h"
 #include "effects/SkyPrograms.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "Qex/base.h"
@@ -38,7 +39,8 @@ constexpr int8_t kCube[kFaces * 4][3] = {
     {-1, 1, 1},  {1, 1, 1},  {-1, 1, -1},  {1, 1, -1},  {-1, -1, -1}, {1, -1, -1}, {-1, -1, 1}, {1, -1, 1}};
 constexpr uint32_t kSkyBytes = sizeof kCube / sizeof kCube[0] * 3 * sizeof(float);
 
-bool s_Drawable;  // all of it is there
+bool s_Drawable;     // all of it is there
+bool s_WasDrawable;  // when the context was lost
 float *s_SkyVertices, *s_SkyTexCoords;
 GLuint s_SkyBuffer;
 QexRenderTarget s_Reflection, s_Surface;
@@ -68,6 +70,29 @@ bool CreateTarget(QexRenderTarget* target) {
     QexSystem_Printf("ERROR: Frame buffer did not set up correctly\n");
     return false;
 }
+
+void FillBuffer() {
+    QEX_GL(glGenBuffers(1, &s_SkyBuffer));
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, s_SkyBuffer));
+    QEX_GL(glBufferData(GL_ARRAY_BUFFER, kSkyBytes, s_SkyVertices, GL_STATIC_DRAW));
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
+}
+
+void Forget() {
+    s_SkyBuffer = 0;
+    s_WasDrawable |= s_Drawable;
+    s_Drawable = false;
+    QexSkyBox_ForgetPrograms();
+}
+// Textures and targets are there again.
+bool Restore() {
+    const QexMaking making;
+    if (!s_SkyVertices) return true;
+    FillBuffer();
+    s_Drawable = QexSkyBox_CreatePrograms() && !making.Failed();
+    return s_Drawable || !s_WasDrawable;
+}
+QexContextPart s_Part = {kRankOthers, Forget, nullptr, Restore, nullptr, false};
 
 void SetCamera(const QexCamera& camera) {
     QexMatrix_LookAtRH(&s_View, &camera.eye, &camera.target, &camera.up);
@@ -300,10 +325,8 @@ int32_t QexSkyBox_Create(QexSkyBox* box) {
         return -1;
     }
     QexRenderState_Restore();
-    QEX_GL(glGenBuffers(1, &s_SkyBuffer));
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, s_SkyBuffer));
-    QEX_GL(glBufferData(GL_ARRAY_BUFFER, kSkyBytes, s_SkyVertices, GL_STATIC_DRAW));
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
+    FillBuffer();
+    QexContext_Register(&s_Part);
     const bool linked = QexSkyBox_CreatePrograms();
     SetCamera(*box->camera);
     QEX_GL(glClearColor(box->waterColour[0], box->waterColour[1], box->waterColour[2], 1));
@@ -336,7 +359,7 @@ void QexSkyBox_Update(const QexRuntimeContext* context, QexSkyBox* box, int32_t)
 
 void QexSkyBox_Release(void) {
     if (!s_SkyVertices) return;
-    s_Drawable = false;
+    s_Drawable = s_WasDrawable = false;
     QexMemory_Free(s_SkyVertices);
     QexMemory_Free(s_SkyTexCoords);
     s_SkyVertices = s_SkyTexCoords = nullptr;

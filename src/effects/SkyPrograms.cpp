@@ -219,3 +219,8 @@ void QexSkyBox_ReleasePrograms() {
         QexProgram_Delete({row.program, &s_Shaders[row.pair].vertex, &s_Shaders[row.pair].fragment});
     QexProgram_Delete({&none, &s_Shaders[kPlainWater].vertex, &s_Shaders[kPlainWater].fragment});
 }
+
+void QexSkyBox_ForgetPrograms() {
+    for (const auto& row : kPrograms) *row.program = 0;
+    for (auto& shaders : s_Shaders) shaders = {};
+}

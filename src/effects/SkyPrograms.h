@@ -18,6 +18,7 @@ struct QexWaterProgram {
 // Compiles and links all of them, up to the first that fails.
 bool QexSkyBox_CreatePrograms();
 void QexSkyBox_ReleasePrograms();
+void QexSkyBox_ForgetPrograms();  // without GL
 
 extern QexSkyProgram g_QexSkyProgram;
 extern QexWaterProgram g_QexWaterProgram;

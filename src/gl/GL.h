@@ -44,6 +44,9 @@ inline GLsizei QexGL_Size(int32_t pixels) {
 // Texture units, the same in every module.
 enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 };
 
+// Between the loss of the context and its restoring: there is nothing to delete, and nothing can be made.
+extern bool g_QexContextLost;
+
 // A span in which GL objects are made: errors are read in either way of drawing. When one was found, and the
 // application's handler came back, nothing half-made is to be kept.
 class QexMaking {
@@ -52,7 +55,7 @@ class QexMaking {
     ~QexMaking() { g_QexReadsErrors = read_; }
     QexMaking(const QexMaking&) = delete;
     QexMaking& operator=(const QexMaking&) = delete;
-    bool Failed() const { return g_QexFaults != faults_; }
+    bool Failed() const { return g_QexFaults != faults_ || g_QexContextLost; }
 
   private:
     uint32_t faults_, read_;

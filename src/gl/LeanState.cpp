@@ -3,6 +3,7 @@
 
 #include <cstring>
 
+#include "gl/Context.h"
 #include "gl/Extensions.h"
 #include "Qex/renderer.h"
 
@@ -106,6 +107,12 @@ void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
     }
 }
 
+// Both buffers are made when they are needed next.
+void LoseBuffers() {
+    s_StreamBuffer = s_QuadIndices = 0;
+}
+QexContextPart s_Part = {kRankOthers, LoseBuffers, nullptr, nullptr, nullptr, false};
+
 }  // namespace
 
 uint32_t g_QexLean = 0;
@@ -113,7 +120,11 @@ uint32_t g_QexReadsErrors = 1;
 
 void QexGL_Check(const char* module, const char* file, int line) {
     const GLenum error = glGetError();
-    if (error != GL_NO_ERROR) QexDiagnostics_GLError(error, module, file, line);
+    if (error == GL_NO_ERROR) return;
+    if (QexContext_IsLoss(error))
+        ++g_QexFaults;
+    else
+        QexDiagnostics_GLError(error, module, file, line);
 }
 
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
@@ -145,11 +156,13 @@ void QexLeanState_BindFloats(const QexFloatVertices& vertices) {
 }
 
 GLuint QexLeanState_StreamBuffer() {
+    QexContext_Register(&s_Part);
     if (!s_StreamBuffer) glGenBuffers(1, &s_StreamBuffer);
     return s_StreamBuffer;
 }
 
 GLuint QexLeanState_QuadIndices() {
+    QexContext_Register(&s_Part);
     if (s_QuadIndices) return s_QuadIndices;
     uint16_t indices[kQuadsOfADraw][6];
     for (uint32_t i = 0; i < kQuadsOfADraw; ++i) {

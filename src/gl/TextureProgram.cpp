@@ -1,4 +1,6 @@
 // The two programs that applications draw their own meshes with: textured with vertex colours, or lit.
+#include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/Program.h"
 #include "Qex/renderer.h"
@@ -65,6 +67,16 @@ const QexProgramSource kSources[] = {
     {"QexShaderProgram_Create", kColourVertexSource, kColourFragmentSource, kColourAttributes, 4},
     {"QexShaderProgram_Create", kLightVertexSource, kLightFragmentSource, kLightAttributes, 3}};
 
+// The application's records, which stay where they are until they are released.
+struct Made {
+    Made* next;
+    QexShaderProgram* record;
+};
+Made* s_Made;
+
+bool Note(QexShaderProgram* record);
+void Drop(const QexShaderProgram* record);
+
 // The shaders of the program created last.
 GLuint s_VertexShader;
 GLuint s_FragmentShader;
@@ -96,7 +108,7 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
                          {&record->lightColorLoc, "LightColor"},
                          {&record->globalAlphaLoc, "GlobalAlpha"}});
     lookup.SetSampler({"sTexture", kDiffuseUnit});
-    if (!making.Failed()) return 0;
+    if (Note(record) && !making.Failed()) return 0;
     QexShaderProgram_Release(record);
     record->program = 0;
     return -1;
@@ -109,7 +121,43 @@ void QexShaderProgram_Apply(const QexShaderProgram* record) {
 void QexShaderProgram_Release(QexShaderProgram* record) {
     QexRenderState_UseProgram(0);
     if (record->program) glDeleteProgram(record->program);
+    Drop(record);
     DeleteShaders();
 }
 
 }  // extern "C"
+
+namespace {
+
+void Forget() {
+    for (Made* made = s_Made; made; made = made->next) made->record->program = 0;
+    s_VertexShader = s_FragmentShader = 0;
+}
+bool Restore() {
+    bool whole = true;
+    for (Made* made = s_Made; made; made = made->next)
+        whole &= QexShaderProgram_Create(made->record, made->record->type) == 0;
+    return whole;
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+
+bool Note(QexShaderProgram* record) {
+    for (const Made* made = s_Made; made; made = made->next)
+        if (made->record == record) return true;
+    Made* made = QexMemory_AllocZeroed<Made>(1);
+    if (!made) return false;
+    QexContext_Register(&s_Part);
+    *made = {s_Made, record};
+    s_Made = made;
+    return true;
+}
+
+void Drop(const QexShaderProgram* record) {
+    Made** at = &s_Made;
+    while (*at && (*at)->record != record) at = &(*at)->next;
+    Made* made = *at;
+    if (made) *at = made->next;
+    QexMemory_Free(made);
+}
+
+}  // namespace

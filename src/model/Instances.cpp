@@ -3,6 +3,7 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/LeanState.h"
 #include "model/Geometry.h"
 #include "model/LeanRender.h"
@@ -152,7 +153,7 @@ bool DrawTogether(QexLeanDrawing* drawing, QexLeanEntry* entry, const Instances&
 }  // namespace
 
 void QexModel_ReleaseInstances(QexModelDrawing* kept) {
-    for (uint32_t i = 0; kept->instances && i < kept->meshCount; ++i) {
+    for (uint32_t i = 0; !g_QexContextLost && kept->instances && i < kept->meshCount; ++i) {
         QexInstanceMesh& mesh = kept->instances[i];
         QexLeanState_DeleteVertexArrays(1, &mesh.vertexArray);
         if (mesh.vertexBuffer) glDeleteBuffers(1, &mesh.vertexBuffer);

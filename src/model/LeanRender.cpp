@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/LeanState.h"
 #include "math/Float4.h"
 #include "pod/Animation.h"
@@ -128,6 +129,19 @@ QexModelDrawing* Keep(QexModel* model, bool anyOrder) {
     MakeOrder(model, kept);
     return kept;
 }
+
+// ---- Lost contexts: all that lean drawing made is made again when it is needed ----
+
+QexModelDrawing* s_Drawings;
+
+void Forget() {
+    for (QexModelDrawing* kept = s_Drawings; kept; kept = kept->next) {
+        for (uint32_t i = 0; kept->vertexArrays && i < kept->meshCount; ++i) kept->vertexArrays[i] = 0;
+        QexMemory_FreeArray(kept->instances);
+    }
+}
+
+QexContextPart s_Part = {kRankGeometry, Forget, nullptr, nullptr, nullptr, false};
 
 // ---- Drawing ----
 
@@ -264,6 +278,10 @@ QexModelDrawing* QexModel_KeepDrawing(QexModel* model) {
     const QexPODModel& scene = model->scene;
     QexModelDrawing* kept = model->drawing = QexMemory_AllocZeroed<QexModelDrawing>(1);
     if (!kept) return nullptr;
+    QexContext_Register(&s_Part);
+    kept->next = s_Drawings;
+    if (s_Drawings) s_Drawings->previous = kept;
+    s_Drawings = kept;
     kept->nodeCount = scene.meshNodeCount;
     kept->meshCount = scene.meshCount;
     kept->materialCount = scene.materialCount;
@@ -359,11 +377,14 @@ void QexModel_ReleaseLean(QexModel* model) {
     if (!kept) return;
     QexRenderState_Restore();
     QexModel_ReleaseInstances(kept);
-    if (kept->vertexArrays) QexLeanState_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
+    if (kept->vertexArrays && !g_QexContextLost)
+        QexLeanState_DeleteVertexArrays(kept->meshCount, kept->vertexArrays);
     QexMemory_FreeArray(kept->entries);
     QexMemory_FreeArray(kept->places);
     QexMemory_FreeArray(kept->looks);
     QexMemory_FreeArray(kept->vertexArrays);
+    (kept->previous ? kept->previous->next : s_Drawings) = kept->next;
+    if (kept->next) kept->next->previous = kept->previous;
     QexMemory_Free(kept);
     model->drawing = nullptr;
 }

@@ -43,6 +43,7 @@ struct QexInstanceMesh {
 
 // Beside a model: its nodes in the order in which they are drawn.
 struct QexModelDrawing {
+    QexModelDrawing *next, *previous;  // of other models
     uint32_t nodeCount, meshCount, materialCount;
     uint32_t generation;  // of the variants
     bool blends;          // whether the order is for blending, where what has alpha keeps its place

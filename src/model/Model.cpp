@@ -7,6 +7,7 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "Qex/base.h"
 #include "Qex/geometry.h"
@@ -78,24 +79,80 @@ bool Complete(QexModel* model) {
     return true;
 }
 
-bool DownloadMesh(QexModel* model, uint32_t index) {
+// The buffers of a model, beside it: its arrays of names and its meshes lie where they are, wherever the
+// record goes.
+struct Buffers {
+    Buffers* next;
+    uint32_t *vertex, *index;
+    QexPODMesh* meshes;
+    uint32_t count;
+};
+Buffers* s_Buffers;
+
+bool DownloadMesh(const Buffers& buffers, uint32_t index) {
     QexMeshUpload upload;
-    QexPODMesh* mesh = &model->scene.meshes[index];
-    if (!QexModelGeometry_Prepare(&upload, mesh, index)) {
+    if (!QexModelGeometry_Prepare(&upload, &buffers.meshes[index], index)) {
         QexModelGeometry_Release(&upload);
         return false;
     }
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, model->vertexBuffers[index]));
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, buffers.vertex[index]));
     QEX_GL(glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(upload.vertexBytes), upload.vertices,
                         GL_STATIC_DRAW));
     if (upload.indices) {
-        QEX_GL(glGenBuffers(1, &model->indexBuffers[index]));
-        QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, model->indexBuffers[index]));
+        if (!buffers.index[index]) QEX_GL(glGenBuffers(1, &buffers.index[index]));
+        QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, buffers.index[index]));
         QEX_GL(glBufferData(GL_ELEMENT_ARRAY_BUFFER, static_cast<GLsizeiptr>(uint64_t{upload.indexCount} * 2),
                             upload.indices, GL_STATIC_DRAW));
     }
     QexModelGeometry_Release(&upload);
     return true;
+}
+
+bool DownloadAll(const Buffers& buffers) {
+    const QexMaking making;
+    bool complete = true;
+    for (uint32_t i = 0; complete && i < buffers.count && !making.Failed(); ++i)
+        complete = !buffers.meshes[i].vertexCount || DownloadMesh(buffers, i);
+    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
+    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
+    return complete && !making.Failed();
+}
+
+void Forget() {}
+
+void Reserve() {
+    for (const Buffers* b = s_Buffers; b; b = b->next)
+        for (uint32_t i = 0; i < b->count; ++i) {
+            if (b->vertex[i]) QexContext_ReserveBuffer(b->vertex[i]);
+            if (b->index[i]) QexContext_ReserveBuffer(b->index[i]);
+        }
+}
+
+bool Restore() {
+    bool whole = true;
+    for (const Buffers* b = s_Buffers; b; b = b->next) whole &= DownloadAll(*b);
+    return whole;
+}
+
+QexContextPart s_Part = {kRankGeometry, Forget, Reserve, Restore, nullptr, false};
+
+bool NoteBuffers(const QexModel& model) {
+    Buffers* buffers = AllocZeroed<Buffers>(1);
+    if (!buffers) return false;
+    QexContext_Register(&s_Part);
+    *buffers = {s_Buffers, model.vertexBuffers, model.indexBuffers, model.scene.meshes,
+                model.scene.meshCount};
+    s_Buffers = buffers;
+    return true;
+}
+
+void DropBuffers(const uint32_t* vertex) {
+    Buffers** at = &s_Buffers;
+    while (*at && (*at)->vertex != vertex) at = &(*at)->next;
+    Buffers* buffers = *at;
+    if (!buffers) return;
+    *at = buffers->next;
+    QexMemory_Free(buffers);
 }
 
 QexTexture* Exchange(QexTexture** textures, uint32_t count, QexTexture* texture, uint32_t index) {
@@ -166,26 +223,23 @@ int32_t QexModel_DownloadGeometry(QexModel* model) {
     QexRenderState_Restore();
     model->vertexBuffers = AllocZeroed<uint32_t>(count);
     model->indexBuffers = AllocZeroed<uint32_t>(count);
-    if (!model->vertexBuffers || !model->indexBuffers) return -1;
+    if (!model->vertexBuffers || !model->indexBuffers || !NoteBuffers(*model)) return -1;
     QEX_GL(glGenBuffers(static_cast<GLsizei>(count), model->vertexBuffers));
-    bool complete = true;
-    for (uint32_t i = 0; complete && i < count && !making.Failed(); ++i)
-        complete = !model->scene.meshes[i].vertexCount || DownloadMesh(model, i);
-    QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
-    QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
-    if (complete && !making.Failed()) return 0;
+    if (DownloadAll(*s_Buffers) && !making.Failed()) return 0;
     QexModel_UnloadGeometry(model);
     return -1;
 }
 
 void QexModel_UnloadGeometry(QexModel* model) {
     QexModel_ReleaseLean(model);
-    if (model->vertexBuffers || model->indexBuffers) {
+    if (model->vertexBuffers) DropBuffers(model->vertexBuffers);
+    const bool there = !g_QexContextLost;
+    if (there && (model->vertexBuffers || model->indexBuffers)) {
         QexRenderState_Restore();
         QEX_GL(glBindBuffer(GL_ARRAY_BUFFER, 0));
         QEX_GL(glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0));
     }
-    for (uint32_t i = 0; i < model->scene.meshCount; ++i) {
+    for (uint32_t i = 0; there && i < model->scene.meshCount; ++i) {
         if (model->indexBuffers && model->indexBuffers[i])
             QEX_GL(glDeleteBuffers(1, &model->indexBuffers[i]));
         if (model->vertexBuffers) QEX_GL(glDeleteBuffers(1, &model->vertexBuffers[i]));

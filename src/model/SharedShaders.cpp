@@ -1,6 +1,7 @@
 // The shader modules and the shadow pass that all models share: made with the first, gone with the last.
 #include <cstring>
 
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "gl/Program.h"
@@ -168,15 +169,30 @@ void CreateShadowTarget() {
                                      s_Shared.shadowDepth));
     QexRenderTarget_CheckComplete();
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
+    QexRenderTarget_Note({s_Shared.shadowFramebuffer, s_Shared.shadowTexture, s_Shared.shadowDepth,
+                          s_Shared.shadowWidth, s_Shared.shadowHeight});
 }
 
 void DeleteShadowTarget() {
-    if (s_Shared.shadowDepth) QEX_GL(glDeleteRenderbuffers(1, &s_Shared.shadowDepth));
-    if (s_Shared.shadowFramebuffer) QEX_GL(glDeleteFramebuffers(1, &s_Shared.shadowFramebuffer));
-    if (s_Shared.shadowTexture) QEX_GL(glDeleteTextures(1, &s_Shared.shadowTexture));
+    const bool there = !g_QexContextLost;
+    QexRenderTarget_DropNote(s_Shared.shadowFramebuffer);
+    if (there && s_Shared.shadowDepth) QEX_GL(glDeleteRenderbuffers(1, &s_Shared.shadowDepth));
+    if (there && s_Shared.shadowFramebuffer) QEX_GL(glDeleteFramebuffers(1, &s_Shared.shadowFramebuffer));
+    if (there && s_Shared.shadowTexture) QEX_GL(glDeleteTextures(1, &s_Shared.shadowTexture));
     QexLeanState_ForgetTextures();
     s_Shared.shadowDepth = s_Shared.shadowFramebuffer = s_Shared.shadowTexture = 0;
 }
+
+void Forget() {
+    m_SkinShadowShaderProgram.program = m_uModelShadowShaderProgram.program = 0;
+    s_SkinShadowShaders = s_ModelShadowShaders = {};
+}
+bool Restore() {
+    const QexMaking making;
+    if (s_ReferenceCount > 0) CreateShadowPrograms();
+    return !making.Failed();
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
 
 }  // namespace
 
@@ -209,6 +225,7 @@ int32_t QexModel_CreateDefaultShader(void) {
     s_Shared.skinning = QexSkinningTextureShader_CreateProgram();
     s_Shared.simple = QexSimpleShader_CreateProgram();
     CreateShadowPrograms();
+    QexContext_Register(&s_Part);
     QexShaderVariant_Retain(&kStaticCaster);
     QexShaderVariant_Retain(&kSkinnedCaster);
     CreateShadowTarget();

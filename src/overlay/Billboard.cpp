@@ -2,6 +2,7 @@
 #include <cmath>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "gl/Program.h"
@@ -52,12 +53,19 @@ const char* const kAttributes[] = {"inVertex", "inTexCoord"};
 
 const QexProgramNames kProgramNames = {&g_BillboardShaderProgramID, &g_BillboardVShader, &g_BillboardFShader};
 
+void Forget() {
+    g_BillboardShaderProgramID = g_BillboardVShader = g_BillboardFShader = 0;
+}
+bool Restore();
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+
 bool CreateProgram() {
     if (!QexProgram_Build({"QexBillboard_Create", kVertexSource, kFragmentSource, kAttributes, 2},
                           kProgramNames)) {
         QexError(QEX_TAG, "<QexBillboard_Create> the billboards' program cannot be built");
         return false;
     }
+    QexContext_Register(&s_Part);
     const QexProgramLookup lookup = {QEX_MODULE, g_BillboardShaderProgramID, false};
     lookup.Attributes({{&g_BillboardInPosLoc, "inVertex"}, {&g_BillboardUVLoc, "inTexCoord"}});
     lookup.Uniforms({{&g_BillboardMvpMatrixLoc, "mvpMatrix"},
@@ -67,6 +75,10 @@ bool CreateProgram() {
     QexVec3_Set(&g_VecUp, 0, 1, 0);
     QexVec3_Set(&g_VecNormal, 0, 0, 1);
     return true;
+}
+
+bool Restore() {
+    return !g_BillboardCount || CreateProgram();
 }
 
 // The angle of that cosine in degrees, with 3.14 for pi as ever: a quarter turn comes to 90.05 degrees. 0

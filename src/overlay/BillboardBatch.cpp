@@ -1,6 +1,7 @@
 // Corners of billboards, placed on the screen here and streamed through one buffer.
 #include "overlay/BillboardBatch.h"
 
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "gl/Program.h"
@@ -51,7 +52,14 @@ Corner s_Corners[kQuadsOfADraw][4];
 uint32_t s_Count;
 QexTexture* s_Texture;
 
+void Forget() {
+    s_GL = {};
+    s_Count = 0;
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, nullptr, nullptr, false};
+
 bool Create() {
+    QexContext_Register(&s_Part);
     if (s_GL.program || s_GL.failed) return !s_GL.failed;
     const QexMaking making;
     s_GL.failed = !QexProgram_Build({"QexBillboard_Draw", kVertexSource, kFragmentSource, kAttributes, 2},

@@ -6,6 +6,7 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "gl/Program.h"
@@ -18,6 +19,7 @@
 #include "Qex/overlay.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 
 #define QEX_MODULE "src/QexFont"
 
@@ -96,6 +98,7 @@ bool CreateSheet(QexSheet sheet, const uint8_t* pixels) {
         QexTexture_CreateFromPixels(texture, kSheetWidth, kSheetHeight, QEX_TEXFMT_RGBA8888, 0, 0,
                                     QEX_FILTER_LINEAR, QEX_WRAP_CLAMP, const_cast<uint8_t*>(pixels));
     texture->pixels = nullptr;
+    QexKeptTexture_Drop(texture->glName);  // made again from here
     if (result != 0) return false;
     QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_S, GL_CLAMP_TO_EDGE));
     QEX_GL(glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_WRAP_T, GL_CLAMP_TO_EDGE));
@@ -175,6 +178,22 @@ void DrawGlyphs(QexGlyphs* text) {
     for (const int32_t array : arrays) QEX_GL(glDisableVertexAttribArray(static_cast<GLuint>(array)));
 }
 
+bool s_HadProgram;  // when the context was lost
+
+void Forget() {
+    s_HadProgram |= s_Program.program != 0;
+    s_Program.program = s_Program.vertexShader = s_Program.fragmentShader = 0;
+    for (QexTexture& sheet : s_Sheets) sheet.glName = 0;
+    s_Text.buffer = 0;
+    s_Text.sent = false;
+}
+bool Restore() {
+    if (!s_HadProgram) return true;
+    s_HadProgram = QexFont_CreateShader() != 0;
+    return !s_HadProgram;
+}
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+
 // Logs that the font is missing; true when it is there.
 bool CheckCreated(const char* function) {
     if (!s_Created) QexLog(QEX_TAG, "<%s> Font not initialized yet!", function);
@@ -248,6 +267,7 @@ int32_t QexFont_CreateShader(void) {
                           {&p.program, &p.vertexShader, &p.fragmentShader}))
         return -1;
     s_ToldNoProgram = false;
+    QexContext_Register(&s_Part);
     const QexProgramLookup lookup = {QEX_MODULE, p.program};
     lookup.Attributes(
         {{&p.position, "a_v4Position"}, {&p.colour, "a_v4FontColor"}, {&p.texCoord, "a_v2TexCoord"}});
@@ -262,6 +282,7 @@ int32_t QexFont_CreateShader(void) {
 }
 
 void QexFont_ReleaseShader(int32_t) {
+    s_HadProgram = false;
     QexProgram_Delete({&s_Program.program, &s_Program.vertexShader, &s_Program.fragmentShader});
 }
 

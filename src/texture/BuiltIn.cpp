@@ -3,12 +3,14 @@
 #include <cstring>
 
 #include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "image/Pvr.h"
 #include "Qex/base.h"
 #include "Qex/math.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 #include "texture/Texture.h"
 
 #define QEX_MODULE "src/QexTexture"
@@ -47,8 +49,28 @@ bool LoadUniform(QexTexture* texture, uint8_t* image, uint32_t size, uint32_t mi
     for (uint32_t i = 0; i < blocks; ++i)
         memcpy(image + kQexPvrHeaderSize + i * kETCBlockSize, block, kETCBlockSize);
     memset(texture, 0, sizeof *texture);
-    return QexTexture_LoadPVRFromMem(texture, image, nullptr, 1, 0, nullptr) == 0;
+    const bool loaded = QexTexture_LoadPVRFromMem(texture, image, nullptr, 1, 0, nullptr) == 0;
+    QexKeptTexture_Drop(texture->glName);  // made again from here
+    return loaded;
 }
+
+bool LoadBoth() {
+    uint8_t image[kQexPvrHeaderSize + kDefaultBlocks * kETCBlockSize];
+    if (!LoadUniform(&s_Default, image, kDefaultSize, kDefaultMipmaps, kWhiteBlock, kDefaultBlocks))
+        return false;
+    if (LoadUniform(&s_BlankNormalMap, image, kNormalSize, kNormalMipmaps, kFlatNormalBlock, kNormalBlocks))
+        return true;
+    QexTexture_Release(&s_Default);
+    return false;
+}
+
+void Forget() {
+    s_Default.glName = s_BlankNormalMap.glName = 0;
+}
+bool Restore() {
+    return !s_Created || LoadBoth();
+}
+QexContextPart s_Part = {kRankTextures, Forget, nullptr, Restore, nullptr, false};
 
 // Direction through a texel of each cube face, from the texel's offsets s and t and half the edge.
 QexVec3 FaceDirection(uint32_t face, float s, float t, float h) {
@@ -100,15 +122,9 @@ int32_t QexTexture_CreateDefault(void) {
         QexLog(QEX_TAG, "<QexTexture_CreateDefault> Already created.");
         return 0;
     }
-    uint8_t image[kQexPvrHeaderSize + kDefaultBlocks * kETCBlockSize];
-    if (!LoadUniform(&s_Default, image, kDefaultSize, kDefaultMipmaps, kWhiteBlock, kDefaultBlocks))
-        return -1;
-    if (!LoadUniform(&s_BlankNormalMap, image, kNormalSize, kNormalMipmaps, kFlatNormalBlock,
-                     kNormalBlocks)) {
-        QexTexture_Release(&s_Default);
-        return -1;
-    }
+    if (!LoadBoth()) return -1;
     s_Created = true;
+    QexContext_Register(&s_Part);
     QexLog(QEX_TAG, "<QexTexture_CreateDefault> Created.");
     return 0;
 }
@@ -128,7 +144,9 @@ int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t siz
         return -1;
     }
     const QexMaking making;
-    glGenTextures(1, &texture->glName);
+    texture->glName = QexKeptTexture_NewName();
+    QexKeptTexture_Note(texture->glName, GL_TEXTURE_CUBE_MAP,
+                        {kKeptNormals, nullptr, 0, size, size, 0, 0, 0});
     QexRenderState_Bind(GL_TEXTURE_CUBE_MAP, texture->glName);
     texture->width = size;
     texture->height = static_cast<uint32_t>(size);

@@ -9,6 +9,7 @@
 #include "Qex/images.h"
 #include "Qex/resources.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 #include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
@@ -174,7 +175,12 @@ int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file) {
         return -1;
     }
     QexTextureLoad_SetWrap(QexTexture_Target(texture), image.width, image.height);
-    return 0;
+    const bool known = file.size != kQexUnknownSize;
+    if (QexKeptTexture_Note(texture->glName, QexTexture_Target(texture),
+                            {kKeptImage, known ? file.bytes : nullptr, file.size, 0, 0, 0, 1, 0}))
+        return 0;
+    QexTexture_Release(texture);
+    return -1;
 }
 
 extern "C" {
@@ -192,6 +198,7 @@ int32_t QexTexture_LoadKTXFromMemSized(QexTexture* texture, const void* file, ui
 int32_t QexTexture_LoadKTXFromFile(QexTexture* texture, const char* path, QexPVRHeader*, int32_t, uint32_t) {
     QexResFile file;
     int32_t result = -1;
+    const QexKeptPath kept(path);
     QexResFile_Create(&file, path);
     if (QexResFile_IsOpen(&file))
         result = QexTextureLoad_KTX(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)});

@@ -7,6 +7,7 @@
 #include "Qex/images.h"
 #include "Qex/resources.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 #include "texture/LoadKtx.h"
 #include "texture/Upload.h"
 
@@ -198,6 +199,12 @@ int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* heade
             kFunction, result == Upload::kOutOfMemory ? "out of memory." : "glTexImage2D() failed.");
     }
     texture->glName = name;
+    if (!QexKeptTexture_Note(
+            name, target,
+            {kKeptImage, known ? file.bytes : nullptr, file.size, 0, 0, 0, decode, firstLevel})) {
+        QexTexture_Release(texture);
+        return -1;
+    }
     if (header) *header = read;
     glTexParameteri(target, GL_TEXTURE_MIN_FILTER, pvr.mipmaps ? GL_LINEAR_MIPMAP_NEAREST : GL_LINEAR);
     glTexParameteri(target, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
@@ -227,6 +234,7 @@ int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path, QexPVR
     QexResFile file;
     int32_t result = -1;
     if (!QexResFile_Exists(path)) return -1;
+    const QexKeptPath kept(path);
     QexResFile_Create(&file, path);
     if (QexResFile_IsOpen(&file))
         result = Load(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)}, header, decode,

@@ -2,20 +2,79 @@
 #include <cstdio>
 #include <cstring>
 
+#include "base/Memory.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "Qex/base.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 #include "texture/RenderTarget.h"
 
 #define QEX_MODULE "src/QexRenderTarget"
 
 namespace {
 
-void CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {
+struct KeptTarget {
+    KeptTarget* next;
+    QexTargetNames names;
+};
+KeptTarget* s_Targets;
+
+void Reserve() {
+    for (const KeptTarget* target = s_Targets; target; target = target->next) {
+        QexContext_ReserveRenderbuffer(target->names.depth);
+        QexContext_ReserveFramebuffer(target->names.framebuffer);
+    }
+}
+
+void Attach(const QexTargetNames& names) {
+    QEX_GL(glBindRenderbuffer(GL_RENDERBUFFER, names.depth));
+    QEX_GL(glRenderbufferStorage(GL_RENDERBUFFER, GL_DEPTH_COMPONENT16, names.width, names.height));
+    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, names.framebuffer));
+    QEX_GL(glFramebufferRenderbuffer(GL_FRAMEBUFFER, GL_DEPTH_ATTACHMENT, GL_RENDERBUFFER, names.depth));
+    QEX_GL(glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, names.texture, 0));
+}
+
+// Their colour textures are there again. Contents are gone.
+bool Restore() {
+    GLint framebuffer = 0;
+    QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer));
+    for (const KeptTarget* target = s_Targets; target; target = target->next) Attach(target->names);
+    QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer)));
+    return true;
+}
+
+void Forget() {}
+
+QexContextPart s_Part = {kRankTargets, Forget, Reserve, Restore, nullptr, false};
+
+}  // namespace
+
+bool QexRenderTarget_Note(const QexTargetNames& names) {
+    KeptTarget* kept = QexMemory_AllocZeroed<KeptTarget>(1);
+    if (!kept) return false;
+    QexContext_Register(&s_Part);
+    *kept = {s_Targets, names};
+    s_Targets = kept;
+    return QexKeptTexture_Note(names.texture, GL_TEXTURE_2D,
+                               {kKeptTarget, nullptr, 0, names.width, names.height, 0, 0, 0});
+}
+
+void QexRenderTarget_DropNote(uint32_t framebuffer) {
+    KeptTarget** at = &s_Targets;
+    while (*at && (*at)->names.framebuffer != framebuffer) at = &(*at)->next;
+    KeptTarget* kept = *at;
+    if (!kept) return;
+    QexKeptTexture_Drop(kept->names.texture);
+    *at = kept->next;
+    QexMemory_Free(kept);
+}
+
+void QexRenderTarget_CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {
     QexRenderState_ActiveTexture(GL_TEXTURE0);
-    QEX_GL(glGenTextures(1, &texture->glName));
+    texture->glName = QexKeptTexture_NewName();
     QexRenderState_Bind(GL_TEXTURE_2D, texture->glName);
     QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, width, height, 0, GL_RGBA, GL_UNSIGNED_BYTE, nullptr));
     glTexParameterf(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_NEAREST);
@@ -30,6 +89,8 @@ void CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {
     texture->width = width;
     texture->height = static_cast<uint32_t>(height);
 }
+
+namespace {
 
 void SetViewport(const int32_t* viewport) {
     glViewport(viewport[0], viewport[1], viewport[2], viewport[3]);
@@ -72,7 +133,7 @@ int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t h
     QEX_GL(glGetIntegerv(GL_FRAMEBUFFER_BINDING, &target->savedFramebuffer));
     QEX_GL(glGenFramebuffers(1, &target->framebuffer));
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, target->framebuffer));
-    CreateColourTexture(&target->colorTexture, width, height);
+    QexRenderTarget_CreateColourTexture(&target->colorTexture, width, height);
     QEX_GL(glGenRenderbuffers(1, &target->depthRenderbuffer));
     QEX_GL(glBindRenderbuffer(GL_RENDERBUFFER, target->depthRenderbuffer));
     QEX_GL(glRenderbufferStorage(GL_RENDERBUFFER, GL_DEPTH_COMPONENT16, width, height));
@@ -84,6 +145,8 @@ int32_t QexRenderTarget_Create(QexRenderTarget* target, int32_t width, int32_t h
     target->viewport[2] = width;
     target->viewport[3] = height;
     QEX_GL(glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(target->savedFramebuffer)));
+    QexRenderTarget_Note(
+        {target->framebuffer, target->colorTexture.glName, target->depthRenderbuffer, width, height});
     if (!making.Failed()) return 0;
     QexRenderTarget_Release(target);
     return -1;
@@ -116,10 +179,12 @@ int32_t QexRenderTarget_SetRenderTarget(const QexRuntimeContext* context, QexRen
 
 void QexRenderTarget_Release(QexRenderTarget* target) {
     if (!target) return;
-    if (target->colorTexture.glName) glDeleteTextures(1, &target->colorTexture.glName);
+    QexRenderTarget_DropNote(target->framebuffer);
+    const bool there = !g_QexContextLost;
+    if (there && target->colorTexture.glName) glDeleteTextures(1, &target->colorTexture.glName);
     QexLeanState_ForgetTextures();
-    if (target->depthRenderbuffer) glDeleteRenderbuffers(1, &target->depthRenderbuffer);
-    if (target->framebuffer) glDeleteFramebuffers(1, &target->framebuffer);
+    if (there && target->depthRenderbuffer) glDeleteRenderbuffers(1, &target->depthRenderbuffer);
+    if (there && target->framebuffer) glDeleteFramebuffers(1, &target->framebuffer);
     target->colorTexture.glName = target->depthRenderbuffer = target->framebuffer = 0;
 }
 

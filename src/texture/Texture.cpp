@@ -6,6 +6,7 @@
 
 #include "base/Memory.h"
 #include "data/ResFile.h"
+#include "gl/Context.h"
 #include "gl/GL.h"
 #include "gl/LeanState.h"
 #include "image/Tga.h"
@@ -13,6 +14,7 @@
 #include "Qex/images.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 
 #define QEX_MODULE "src/QexTexture"
 
@@ -61,14 +63,22 @@ int32_t Set(QexTexture* texture, const Setting& setting, uint32_t code, uint8_t*
         QEX_GL(glTexParameteri(target, setting.first, value.value));
         QEX_GL(glTexParameteri(target, setting.second, value.value));
         *field = value.code;
+        const bool filters = field == &texture->filter;
+        QexKeptTexture_SetCodes(texture->glName, filters ? value.code : uint8_t{0},
+                                filters ? uint8_t{0} : value.code);
         return 0;
     }
     return kUnknownCode;
 }
 
+uint64_t PixelBytes(const QexTexture& texture) {
+    return uint64_t{static_cast<uint32_t>(texture.width)} * texture.height * texture.bytesPerPixel;
+}
+
 // Gives back the GL texture of a record that an error was found in.
 int32_t Drop(QexTexture* texture) {
     if (texture->glName) glDeleteTextures(1, &texture->glName);
+    QexKeptTexture_Drop(texture->glName);
     QexLeanState_ForgetTextures();
     texture->glName = 0;
     return -1;
@@ -116,7 +126,9 @@ int32_t QexTexture_CreateFromPixels(QexTexture* texture, int32_t width, int32_t 
     texture->height = static_cast<uint32_t>(height);
     QexTexture_SetStage(texture, stage);
     QexTexture_SetFormat(texture, format);
-    QEX_GL(glGenTextures(1, &texture->glName));
+    texture->glName = QexKeptTexture_NewName();
+    QexKeptTexture_Note(texture->glName, GL_TEXTURE_2D,
+                        {kKeptPixels, nullptr, 0, width, height, format, 0, 0});
     QexRenderState_Bind(GL_TEXTURE_2D, texture->glName);
     QexTexture_SetFilter(texture, filter);
     QexTexture_SetWrapping(texture, wrap);
@@ -155,7 +167,9 @@ int32_t QexTexture_CreateTGAFromMem(QexTexture* texture, int32_t, uint32_t stage
     memcpy(copy.Get(), file + kQexTgaHeaderSize, header.PixelBytes());
     SwapRedAndBlue(copy.Get(), header.PixelBytes(), bytesPerPixel);
     QexRenderState_ActiveTexture(GL_TEXTURE0);
-    QEX_GL(glGenTextures(1, &texture->glName));
+    texture->glName = QexKeptTexture_NewName();
+    QexKeptTexture_Note(texture->glName, GL_TEXTURE_2D,
+                        {kKeptTga, tga, kQexTgaHeaderSize + header.PixelBytes(), 0, 0, 0, 0, 0});
     QexRenderState_Bind(GL_TEXTURE_2D, texture->glName);
     QexTexture_SetFilter(texture, filter);
     QexTexture_SetWrapping(texture, wrap);
@@ -178,6 +192,7 @@ int32_t QexTexture_CreateTGAFromFile(QexTexture* texture, int32_t ignored, uint3
                                      uint32_t wrap, const char* path) {
     FILE* file = QexResFile_OpenForReading(path);
     if (!file) return -1;
+    const QexKeptPath kept(path);
     QexScratch<uint8_t> data;
     uint64_t size = 0;
     const QexMaking making;
@@ -205,6 +220,7 @@ int32_t QexTexture_Download(QexTexture* texture, const void* pixels) {
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
     QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, static_cast<GLint>(format.format), texture->width,
                         static_cast<GLsizei>(texture->height), 0, format.format, format.type, pixels));
+    QexKeptTexture_Replace(*texture, pixels, PixelBytes(*texture));
     return making.Failed() ? -1 : 0;
 }
 
@@ -239,7 +255,8 @@ void QexTexture_Set(QexTexture* texture, uint32_t stage) {
 }
 
 void QexTexture_Release(QexTexture* texture) {
-    QEX_GL(glDeleteTextures(1, &texture->glName));
+    QexKeptTexture_Drop(texture->glName);
+    if (!g_QexContextLost) QEX_GL(glDeleteTextures(1, &texture->glName));
     QexLeanState_ForgetTextures();
     texture->glName = 0;
     if (!(texture->flags & QEX_TEXFLAG_OWNS_PIXELS)) return;

@@ -11,6 +11,7 @@
 #include "Qex/images.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 
@@ -34,7 +35,7 @@ void QexTextureLoad_Begin(QexTexture* texture, uint32_t* name, bool cube) {
     texture->pixels = nullptr;
     texture->rowBytes = texture->bytesPerPixel * static_cast<uint32_t>(texture->width);
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
-    QEX_GL(glGenTextures(1, name));
+    *name = QexKeptTexture_NewName();
     texture->flags = cube ? QEX_TEXFLAG_CUBEMAP : 0;
     QexRenderState_Bind(QexTexture_Target(texture), *name);
 }

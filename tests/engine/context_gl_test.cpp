@@ -1,0 +1,189 @@
+// Contexts that are lost, and all that comes back in the next one.
+#include <GLES2/gl2.h>
+#include <unistd.h>
+
+#include <map>
+
+#include "support/Capture.h"
+#include "support/Everything.h"
+
+namespace {
+
+constexpr uint32_t kContextLost = 0x0507;
+
+class LostContext : public ContextTest {
+  protected:
+    explicit LostContext(gltapMode mode = GLTAP_FORWARD) : ContextTest(mode), all_(OutputPath("")) {}
+    void SetUp() override {
+        ContextTest::SetUp();
+        QexEngine_KeepTextures(1);
+    }
+    void TearDown() override {
+        QexEngine_KeepTextures(0);
+        ContextTest::TearDown();
+    }
+    // Another context in place of the one that is there.
+    void Replace() {
+        std::string error;
+        if (mode_ == GLTAP_FORWARD) {
+            context_.reset();
+            context_ = qex::HeadlessContext::Create(kWidth, kHeight, &error);
+            ASSERT_TRUE(context_) << error;
+        }
+        gltapReset();
+    }
+    // Without its lines.
+    int32_t Restore() {
+        Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+        return QexEngine_ContextRestored();
+    }
+    int32_t LoseAndRestore() {
+        const uint64_t before = gltapCountAll();
+        QexEngine_ContextLost();
+        EXPECT_EQ(gltapCountAll(), before);
+        Replace();
+        return Restore();
+    }
+    Picture Frame() {
+        Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+        all_.Draw();
+        return context_ ? Read() : Picture();
+    }
+    bool Load() {
+        Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+        return all_.Load();
+    }
+    void Release() {
+        Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+        all_.Release();
+    }
+    Everything all_;
+};
+
+class LostNullContext : public LostContext {
+  protected:
+    LostNullContext() : LostContext(GLTAP_NULL) {}
+};
+
+// In both ways of drawing, and from one to the other.
+TEST_F(LostContext, TheNextFrameIsTheSame) {
+    ASSERT_TRUE(Load());
+    const Picture described = Frame();
+    QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
+    const Picture lean = Frame();
+    for (int round = 0; round < 3; ++round) {
+        EXPECT_EQ(LoseAndRestore(), 0);
+        EXPECT_TRUE(SamePicture(Frame(), lean)) << round;
+    }
+    QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
+    for (int round = 0; round < 2; ++round) {
+        EXPECT_TRUE(SamePicture(Frame(), described)) << round;
+        EXPECT_EQ(LoseAndRestore(), 0);
+    }
+    EXPECT_EQ(QexEngine_IsContextLost(), 0u);
+    Release();
+}
+
+// What is released while there is no context takes nothing from the next one.
+TEST_F(LostContext, RecordsMayGoMeanwhile) {
+    ASSERT_TRUE(Load());
+    const Picture expected = Frame();
+    QexEngine_ContextLost();
+    Replace();
+    const uint64_t before = gltapCount("glDeleteTextures") + gltapCount("glDeleteBuffers") +
+                            gltapCount("glDeleteFramebuffers") + gltapCount("glDeleteProgram");
+    Release();
+    EXPECT_EQ(gltapCount("glDeleteTextures") + gltapCount("glDeleteBuffers") +
+                  gltapCount("glDeleteFramebuffers") + gltapCount("glDeleteProgram"),
+              before);
+    EXPECT_EQ(LiveObjects(), "");
+    ASSERT_TRUE(Load());  // starts the engine, which ends the loss
+    EXPECT_EQ(QexEngine_IsContextLost(), 0u);
+    EXPECT_TRUE(SamePicture(Frame(), expected));
+    Release();
+}
+
+// Memory that was not kept: the application is asked by name, or the texture has no image and a line says so.
+TEST_F(LostContext, TheApplicationIsAskedForItsMemory) {
+    QexEngine_KeepTextures(0);
+    QexRuntimeContext runtime;
+    QexEngineConfig config = SurfaceConfig();
+    Capture quiet(STDERR_FILENO);
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    QexTexture texture = SolidTexture({10, 200, 30, 255});
+    QexTexture_SetFilter(&texture, QEX_FILTER_LINEAR);
+    static uint32_t asked;
+    asked = 0;
+    const auto draw = [&] {
+        Clear();
+        const QexRect whole = {0, 0, 1, 1};
+        QexTexture_Draw(&runtime, &texture, 10, 20, &whole, 8, 8, 0xFFFFFFFF);
+        return Read().Pixel(14, 30);
+    };
+    EXPECT_EQ(draw(), (Rgba{10, 200, 30, 255}));
+    EXPECT_EQ(LoseAndRestore(), -1);
+    EXPECT_NE(draw(), (Rgba{10, 200, 30, 255}));
+    QexEngine_SetTextureSource(
+        [](void* user, uint32_t name, QexTexture* record) -> int32_t {
+            asked = name;
+            *record = SolidTexture({10, 200, 30, 255});
+            return user ? 0 : -1;
+        },
+        &texture);
+    EXPECT_EQ(LoseAndRestore(), 0);
+    EXPECT_EQ(asked, texture.glName);
+    EXPECT_EQ(draw(), (Rgba{10, 200, 30, 255}));
+    GLint filter = 0;
+    glBindTexture(GL_TEXTURE_2D, texture.glName);
+    glGetTexParameteriv(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, &filter);
+    EXPECT_EQ(filter, GL_LINEAR);
+    QexEngine_SetTextureSource(nullptr, nullptr);
+    QexTexture_Release(&texture);
+    QexEngine_Shutdown(&runtime);
+}
+
+// Lost at every call of loading and drawing, as the GL says by an error: no end of the process, nothing left.
+TEST_F(LostNullContext, AtEveryCall) {
+    EXPECT_TRUE(Load());
+    Frame();
+    Release();
+    gltapResetCounts();
+    EXPECT_TRUE(Load());
+    Frame();
+    std::map<std::string, uint64_t> counts;
+    for (int f = 0; f < gltapFunctionCount(); ++f)
+        counts[gltapFunctionName(f)] = gltapCount(gltapFunctionName(f));
+    Release();
+    counts.erase("glGetError");
+    uint32_t recognised = 0, again = 0;
+    for (const auto& [function, count] : counts)
+        for (uint32_t nth = 1; nth <= count; nth += nth < 20 ? 1 : 9) {
+            gltapInjectError(function.c_str(), nth, kContextLost);
+            bool loaded = Load();
+            if (!QexEngine_IsContextLost()) Frame();
+            recognised += QexEngine_IsContextLost();
+            const int32_t restored = LoseAndRestore();
+            ASSERT_EQ(restored, 0) << function << nth;
+            if (!loaded) {
+                Release();
+                loaded = Load();
+                ++again;
+            }
+            ASSERT_TRUE(loaded) << function << nth;
+            Frame();
+            // Lost while it is restored.
+            QexEngine_ContextLost();
+            Replace();
+            if (function.rfind("glDelete", 0) != 0)
+                gltapInjectError(function.c_str(), (nth + 1) / 2, kContextLost);
+            const bool failed = Restore() != 0;
+            ASSERT_EQ(failed, QexEngine_IsContextLost() != 0) << function << nth;
+            ASSERT_EQ(LoseAndRestore(), 0) << function << nth;
+            Release();
+            ASSERT_EQ(LiveObjects(), "") << function << nth;
+        }
+    EXPECT_GT(recognised, 500u);
+    EXPECT_GT(again, 200u);
+}
+
+}  // namespace
