@@ -10,6 +10,8 @@
 namespace {
 
 constexpr uint32_t kContextLost = 0x0507;
+// Calls that are left out of long rows of the same.
+constexpr uint32_t kStep = QEX_SANITIZED ? 37 : 9;
 
 class LostContext : public ContextTest {
   protected:
@@ -157,7 +159,7 @@ TEST_F(LostNullContext, AtEveryCall) {
     counts.erase("glGetError");
     uint32_t recognised = 0, again = 0;
     for (const auto& [function, count] : counts)
-        for (uint32_t nth = 1; nth <= count; nth += nth < 20 ? 1 : 9) {
+        for (uint32_t nth = 1; nth <= count; nth += nth < 10 ? 1 : kStep) {
             gltapInjectError(function.c_str(), nth, kContextLost);
             bool loaded = Load();
             if (!QexEngine_IsContextLost()) Frame();
@@ -182,8 +184,8 @@ TEST_F(LostNullContext, AtEveryCall) {
             Release();
             ASSERT_EQ(LiveObjects(), "") << function << nth;
         }
-    EXPECT_GT(recognised, 500u);
-    EXPECT_GT(again, 200u);
+    EXPECT_GT(recognised, 200u);
+    EXPECT_GT(again, 100u);
 }
 
 }  // namespace
