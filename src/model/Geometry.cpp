@@ -42,22 +42,16 @@ GLType ToGLType(uint32_t podType) {
     return {types[type.storage], type.plain != podType};
 }
 
-struct Element {
-    const CPODData* data;
-    const uint8_t* source;  // of the first vertex
-    bool asFloats;          // converted at upload
-    uint32_t size;          // bytes a vertex in the upload
-};
+using Element = QexMeshUploadElement;
+
+// Where a mesh lacks an element.
+const CPODData kNoData = {};
+// Binormals that were made.
+const CPODData kMadeData = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
 
 // The elements that are uploaded, in the order of QexVertexElement.
-struct Elements {
-    Element list[QEX_ELEMENT_COUNT];
-};
-
-Elements ListElements(const QexPODMesh& mesh) {
-    static const CPODData none = {};
-    Elements elements;
-    for (Element& element : elements.list) element = {&none, nullptr, false, 0};
+void ListElements(Element* elements, const QexPODMesh& mesh) {
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) elements[i] = {&kNoData, nullptr, false, 0};
     const uint32_t count = QexPODMesh_ElementCount(&mesh);
     for (uint32_t i = kPODVertices; i < count && i <= kPODUVWs; ++i) {
         const CPODData& data = *QexPODMesh_Element(&mesh, i);
@@ -66,10 +60,8 @@ Elements ListElements(const QexPODMesh& mesh) {
         // Positions are always floats: the mesh's box comes from them, and its unpack matrix goes into them.
         const bool asFloats = i == kPODVertices ? data.type != QEX_POD_FLOAT : !ToGLType(data.type).type;
         const uint32_t bytes = asFloats ? QexPODData_Components(data) * 4 : QexPODData_ElementSize(data);
-        elements.list[attribute] = {&data, QexPODMesh_ElementData(&mesh, data), asFloats,
-                                    (bytes + 3) / 4 * 4};
+        elements[attribute] = {&data, QexPODMesh_ElementData(&mesh, data), asFloats, (bytes + 3) / 4 * 4};
     }
-    return elements;
 }
 
 bool IsIdentity(const QexMatrix& matrix) {
@@ -77,11 +69,12 @@ bool IsIdentity(const QexMatrix& matrix) {
 }
 
 // Whether the interleaved block can go to GL as it is: one stride, everything within it and aligned.
-bool UploadsAsIs(const QexPODMesh& mesh, const Elements& elements) {
+bool UploadsAsIs(const QexPODMesh& mesh, const Element* elements) {
     const uint32_t stride = mesh.vertices.stride;
     if (!mesh.interleaved || !mesh.vertices.componentCount || !IsIdentity(mesh.unpackMatrix)) return false;
     if (uint64_t{stride} * mesh.vertexCount > mesh.interleavedBytes || stride > INT32_MAX) return false;
-    for (const Element& element : elements.list) {
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const Element& element = elements[i];
         const CPODData& data = *element.data;
         if (!data.componentCount) continue;
         const uint32_t unit = QexPODType_Of(data.type).componentSize;
@@ -143,19 +136,20 @@ QexVec4 ReadElement(const Element& element, uint32_t vertex) {
 
 // Normal x tangent, turned round where the texture is mirrored: where its coordinates run clockwise around a
 // triangle.
-bool MakeBinormals(QexScratch<QexVec3>* out, const QexPODMesh& mesh, const Elements& elements) {
+QexVec3* MakeBinormals(const QexPODMesh& mesh, const Element* elements) {
     const uint64_t corners = uint64_t{QexPODMesh_CountTriangles(mesh)} * 3;
     QexScratch<uint32_t> vertices;
-    if (!out->Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return false;
+    QexScratch<QexVec3> out;
+    if (!out.Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return nullptr;
     for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
-        const QexVec4 n = ReadElement(elements.list[QEX_ELEMENT_NORMAL], v);
-        const QexVec4 t = ReadElement(elements.list[QEX_ELEMENT_TANGENT], v);
-        (*out)[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+        const QexVec4 n = ReadElement(elements[QEX_ELEMENT_NORMAL], v);
+        const QexVec4 t = ReadElement(elements[QEX_ELEMENT_TANGENT], v);
+        out[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
     }
-    const Element& uv = elements.list[QEX_ELEMENT_UV0];
-    if (!uv.size) return true;
+    const Element& uv = elements[QEX_ELEMENT_UV0];
+    if (!uv.size) return out.Take();
     QexScratch<uint8_t> turned;
-    if (!turned.Alloc(mesh.vertexCount)) return false;
+    if (!turned.Alloc(mesh.vertexCount)) return nullptr;
     memset(turned.Get(), 0, mesh.vertexCount);
     QexPODMesh_ListCorners(mesh, vertices.Get());
     for (uint64_t i = 0; i + 3 <= corners; i += 3) {
@@ -165,36 +159,38 @@ bool MakeBinormals(QexScratch<QexVec3>* out, const QexPODMesh& mesh, const Eleme
         for (int corner = 0; mirrored && corner < 3; ++corner) turned[vertices[i + corner]] = 1;
     }
     for (uint32_t v = 0; v < mesh.vertexCount; ++v)
-        if (turned[v]) QexVec3_Scale(&(*out)[v], &(*out)[v], -1);
-    return true;
+        if (turned[v]) QexVec3_Scale(&out[v], &out[v], -1);
+    return out.Take();
 }
 
-// Lays the vertices out anew, interleaved and aligned.
-bool Pack(QexMeshUpload* upload, QexPODMesh* mesh, const Elements& elements) {
-    uint32_t stride = 0;
-    for (const Element& element : elements.list) stride += element.size;
-    const uint64_t bytes = uint64_t{stride} * mesh->vertexCount;
-    upload->packedVertices =
-        bytes > INT32_MAX ? nullptr
-                          : static_cast<uint8_t*>(QexMemory_Alloc(static_cast<uint32_t>(bytes ? bytes : 1)));
-    if (!upload->packedVertices) {
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return false;
-    }
-    memset(upload->packedVertices, 0, static_cast<size_t>(bytes));
+// Describes vertices that are to be laid out anew, interleaved and aligned, and finds room for them.
+bool BeginPack(QexMeshUpload* upload, QexPODMesh* mesh) {
     uint32_t offset = 0;
+    for (const Element& element : upload->elements) upload->stride += element.size;
     for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
-        const Element& element = elements.list[i];
-        mesh->attributes[i] =
-            Describe(static_cast<QexVertexElement>(i), *element.data, element.asFloats, stride, offset);
-        for (uint32_t v = 0; element.size && v < mesh->vertexCount; ++v)
-            PackElement(upload->packedVertices + uint64_t{v} * stride + offset, *mesh, element,
-                        i == QEX_ELEMENT_POSITION, v);
+        const Element& element = upload->elements[i];
+        mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), *element.data, element.asFloats,
+                                       upload->stride, offset);
         offset += element.size;
     }
+    const uint64_t bytes = uint64_t{upload->stride} * mesh->vertexCount;
+    if (bytes <= INT32_MAX) upload->packedVertices = QexMemory_AllocArray<uint8_t>(bytes);
     upload->vertices = upload->packedVertices;
     upload->vertexBytes = static_cast<uint32_t>(bytes);
-    return true;
+    return upload->packedVertices != nullptr;
+}
+
+// Lays out vertices from `first` to `end`.
+void Pack(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t first, uint32_t end) {
+    const uint32_t stride = upload->stride;
+    uint8_t* out = upload->packedVertices + uint64_t{first} * stride;
+    memset(out, 0, static_cast<size_t>(uint64_t{end - first} * stride));
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const Element& element = upload->elements[i];
+        for (uint32_t v = first; element.size && v < end; ++v)
+            PackElement(out + uint64_t{v - first} * stride, mesh, element, i == QEX_ELEMENT_POSITION, v);
+        out += element.size;
+    }
 }
 
 bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t meshIndex) {
@@ -240,30 +236,40 @@ bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
 
 }  // namespace
 
-bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
+bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
     memset(upload, 0, sizeof *upload);
     if (!FitBatches(mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
-    Elements elements = ListElements(*mesh);
-    QexScratch<QexVec3> made;
-    const CPODData binormals = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
-    if (LacksBinormals(*mesh)) {
-        if (!MakeBinormals(&made, *mesh, elements)) {
-            QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-            return false;
-        }
-        elements.list[QEX_ELEMENT_BINORMAL] = {&binormals, reinterpret_cast<const uint8_t*>(made.Get()),
-                                               false, sizeof(QexVec3)};
+    Element* elements = upload->elements;
+    ListElements(elements, *mesh);
+    const bool lacking = LacksBinormals(*mesh);
+    if (lacking) {
+        upload->madeBinormals = MakeBinormals(*mesh, elements);
+        elements[QEX_ELEMENT_BINORMAL] = {&kMadeData, reinterpret_cast<const uint8_t*>(upload->madeBinormals),
+                                          false, sizeof(QexVec3)};
     }
-    if (!made && UploadsAsIs(*mesh, elements)) {
+    if (!lacking && UploadsAsIs(*mesh, elements)) {
         for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
-            const CPODData& data = *elements.list[i].data;
+            const CPODData& data = *elements[i].data;
             mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), data, false, data.stride,
                                            static_cast<uint32_t>(reinterpret_cast<uintptr_t>(data.data)));
         }
         upload->vertices = mesh->interleaved;
         upload->vertexBytes = mesh->vertices.stride * mesh->vertexCount;
-    } else if (!Pack(upload, mesh, elements)) {
-        return false;
+        return true;
+    }
+    if ((!lacking || upload->madeBinormals) && BeginPack(upload, mesh)) return true;
+    QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+    return false;
+}
+
+QexStep QexModelGeometry_LayOut(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t piece) {
+    if (upload->packedVertices && upload->laidOut < mesh->vertexCount) {
+        const uint32_t left = mesh->vertexCount - upload->laidOut;
+        const uint32_t most = upload->stride ? piece / upload->stride + 1 : left;
+        const uint32_t first = upload->laidOut;
+        upload->laidOut += left < most ? left : most;
+        Pack(upload, *mesh, first, upload->laidOut);
+        if (upload->laidOut < mesh->vertexCount) return QexStep::kMore;
     }
     const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
     const bool whole = position.componentCount >= 3;
@@ -271,11 +277,17 @@ bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t 
                                       whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
                                       position.stride);
     if (whole) QexPODMesh_MeasureBones(mesh, upload->vertices + position.offset, position.stride);
-    return true;
+    return QexStep::kDone;
+}
+
+bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
+    if (!QexModelGeometry_Begin(upload, mesh, meshIndex)) return false;
+    return QexModelGeometry_LayOut(upload, mesh, kQexWhole) == QexStep::kDone;
 }
 
 void QexModelGeometry_Release(QexMeshUpload* upload) {
     QexMemory_Free(upload->packedVertices);
     QexMemory_Free(upload->packedIndices);
+    QexMemory_Free(upload->madeBinormals);
     memset(upload, 0, sizeof *upload);
 }

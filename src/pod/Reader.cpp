@@ -294,11 +294,13 @@ bool QexPODReader_OutOfMemory(int line) {
     return false;
 }
 
-void QexPODReader_Begin(QexPODReader* reader, QexSourceStream* stream, QexPODModel* scene, bool anyway) {
+void QexPODReader_Begin(QexPODReader* reader, QexSourceStream* stream, QexPODModel* scene, bool anyway,
+                        uint32_t piece) {
     *reader = {};
     reader->stream = stream;
     reader->scene = scene;
     reader->anyway = anyway;
+    reader->piece = piece;
     reader->shareKeys = QexResFile_IsMemoryFile(stream->file) != 0;
 }
 
@@ -329,7 +331,7 @@ int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* st
     if (scene) memset(scene, 0, sizeof *scene);
     if (!stream || !stream->file) return -1;
     QexPODReader reader;
-    QexPODReader_Begin(&reader, stream, scene, optionA || optionB);
+    QexPODReader_Begin(&reader, stream, scene, optionA || optionB, kQexWhole);
     const bool read = QexStep_Run(&reader, QexPODReader_Step);
     QexPODReader_End(&reader);
     return read ? 0 : -1;

@@ -54,7 +54,8 @@ struct QexPODReader {
 };
 
 // Begins to read a file. The stream stays where it is until QexPODReader_End, as does the scene.
-void QexPODReader_Begin(QexPODReader* reader, QexSourceStream* stream, QexPODModel* scene, bool anyway);
+void QexPODReader_Begin(QexPODReader* reader, QexSourceStream* stream, QexPODModel* scene, bool anyway,
+                        uint32_t piece);
 
 // A block, a piece of one, or a record checked or mended; the last step leaves a scene that can be drawn.
 QexStep QexPODReader_Step(QexPODReader* reader);
