@@ -166,10 +166,10 @@ const Stage kStages[] = {
     {MakeBuffers, {kGeometryFault, kGeometryFault}, 0, nullptr, nullptr, nullptr},
     {FillBuffers, {kGeometryFault, kGeometryFault}, 0.2f, FilledShare, PauseBuffers, ResumeBuffers},
     {MakeTextures, {kTextureFault, kMemoryFault}, 0, nullptr, nullptr, nullptr},
-    {LoadTextures, {kTextureFault, kMemoryFault}, 0.3f, TexturedShare, nullptr, ResumeTextures},
+    {LoadTextures, {kTextureFault, kMemoryFault}, 0.29f, TexturedShare, nullptr, ResumeTextures},
     {MakeBoxes, {kMemoryFault, kMemoryFault}, 0, nullptr, nullptr, nullptr},
     {CallHooks, {nullptr, nullptr}, 0, nullptr, nullptr, nullptr},
-    {GiveModules, {nullptr, nullptr}, 0, nullptr, nullptr, nullptr},
+    {GiveModules, {nullptr, nullptr}, 0.01f, nullptr, nullptr, nullptr},
 };
 constexpr uint32_t kStageCount = sizeof kStages / sizeof *kStages;
 
@@ -236,18 +236,23 @@ int32_t ReadAll(Load* load, QexModel* model, bool opened) {
     return -1;
 }
 
-// Begins to load into a model in place of what it holds.
-int32_t BeginFile(Load* load, QexModel* model, const char* directory, const char* file) {
+// Empties a model for a load.
+void Begin(Load* load, QexModel* model) {
     QexModel_Unload(model);
     load->model = model;
+    load->other = *model;
+    model->flags |= QEX_MODEL_NO_SHADERS;
+}
+
+int32_t BeginFile(Load* load, QexModel* model, const char* directory, const char* file) {
+    Begin(load, model);
     if (!OpenFile(load, model, directory, file)) return Abandon(load);
     snprintf(load->directory, kPathSize, "%s", directory);
     return 0;
 }
 
 int32_t BeginMemory(Load* load, QexModel* model, const void* data, uint32_t size, QexNameCache* cache) {
-    QexModel_Unload(model);
-    load->model = model;
+    Begin(load, model);
     load->fromCache = true;
     load->cache = cache;
     return OpenMemory(load, model, data, size) ? 0 : Abandon(load);
