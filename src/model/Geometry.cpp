@@ -134,33 +134,21 @@ QexVec4 ReadElement(const Element& element, uint32_t vertex) {
     return value;
 }
 
-// Normal x tangent, turned round where the texture is mirrored: where its coordinates run clockwise around a
-// triangle.
-QexVec3* MakeBinormals(const QexPODMesh& mesh, const Element* elements) {
-    const uint64_t corners = uint64_t{QexPODMesh_CountTriangles(mesh)} * 3;
-    QexScratch<uint32_t> vertices;
-    QexScratch<QexVec3> out;
-    if (!out.Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return nullptr;
-    for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
-        const QexVec4 n = ReadElement(elements[QEX_ELEMENT_NORMAL], v);
-        const QexVec4 t = ReadElement(elements[QEX_ELEMENT_TANGENT], v);
-        out[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+uint32_t CountCorners(const QexPODMesh& mesh) {
+    return QexPODMesh_CountTriangles(mesh) * 3;
+}
+
+// Room for the binormals of a mesh that lacks them.
+bool BeginBinormals(QexMeshUpload* upload, const QexPODMesh& mesh) {
+    upload->madeBinormals = QexMemory_AllocArray<QexVec3>(mesh.vertexCount);
+    if (upload->elements[QEX_ELEMENT_UV0].size) {
+        upload->corners = QexMemory_AllocArray<uint32_t>(CountCorners(mesh));
+        upload->turned = QexMemory_AllocZeroed<uint8_t>(mesh.vertexCount);
+        if (!upload->corners || !upload->turned) return false;
     }
-    const Element& uv = elements[QEX_ELEMENT_UV0];
-    if (!uv.size) return out.Take();
-    QexScratch<uint8_t> turned;
-    if (!turned.Alloc(mesh.vertexCount)) return nullptr;
-    memset(turned.Get(), 0, mesh.vertexCount);
-    QexPODMesh_ListCorners(mesh, vertices.Get());
-    for (uint64_t i = 0; i + 3 <= corners; i += 3) {
-        const QexVec4 a = ReadElement(uv, vertices[i]), b = ReadElement(uv, vertices[i + 1]);
-        const QexVec4 c = ReadElement(uv, vertices[i + 2]);
-        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
-        for (int corner = 0; mirrored && corner < 3; ++corner) turned[vertices[i + corner]] = 1;
-    }
-    for (uint32_t v = 0; v < mesh.vertexCount; ++v)
-        if (turned[v]) QexVec3_Scale(&out[v], &out[v], -1);
-    return out.Take();
+    upload->elements[QEX_ELEMENT_BINORMAL] = {
+        &kMadeData, reinterpret_cast<const uint8_t*>(upload->madeBinormals), false, sizeof(QexVec3)};
+    return upload->madeBinormals != nullptr;
 }
 
 // Describes vertices that are to be laid out anew, interleaved and aligned, and finds room for them.
@@ -180,7 +168,38 @@ bool BeginPack(QexMeshUpload* upload, QexPODMesh* mesh) {
     return upload->packedVertices != nullptr;
 }
 
-// Lays out vertices from `first` to `end`.
+// ---- Laying out, in phases over vertices or triangles from `first` to `end` ----
+
+// Binormals are normal x tangent, turned round where the texture is mirrored: where its coordinates run
+// clockwise around a triangle.
+void CrossNormals(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    for (uint32_t v = first; v < end; ++v) {
+        const QexVec4 n = ReadElement(upload->elements[QEX_ELEMENT_NORMAL], v);
+        const QexVec4 t = ReadElement(upload->elements[QEX_ELEMENT_TANGENT], v);
+        upload->madeBinormals[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+    }
+}
+
+void ListCorners(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t, uint32_t) {
+    QexPODMesh_ListCorners(mesh, upload->corners);
+}
+
+void FindMirrored(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    const Element& uv = upload->elements[QEX_ELEMENT_UV0];
+    for (uint32_t triangle = first; triangle < end; ++triangle) {
+        const uint32_t* corners = upload->corners + uint64_t{triangle} * 3;
+        const QexVec4 a = ReadElement(uv, corners[0]), b = ReadElement(uv, corners[1]);
+        const QexVec4 c = ReadElement(uv, corners[2]);
+        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
+        for (int corner = 0; mirrored && corner < 3; ++corner) upload->turned[corners[corner]] = 1;
+    }
+}
+
+void TurnMirrored(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    for (uint32_t v = first; v < end; ++v)
+        if (upload->turned[v]) QexVec3_Scale(&upload->madeBinormals[v], &upload->madeBinormals[v], -1);
+}
+
 void Pack(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t first, uint32_t end) {
     const uint32_t stride = upload->stride;
     uint8_t* out = upload->packedVertices + uint64_t{first} * stride;
@@ -234,6 +253,34 @@ bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
     return false;
 }
 
+struct Phase {
+    void (*run)(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t first, uint32_t end);
+    uint32_t (*items)(const QexMeshUpload& upload, const QexPODMesh& mesh);
+};
+
+const Phase kPhases[] = {
+    {CrossNormals,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.madeBinormals ? mesh.vertexCount : 0; }},
+    {ListCorners, [](const QexMeshUpload& u, const QexPODMesh&) { return u.corners ? 1u : 0u; }},
+    {FindMirrored,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.corners ? CountCorners(mesh) / 3 : 0; }},
+    {TurnMirrored,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.turned ? mesh.vertexCount : 0; }},
+    {Pack,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.packedVertices ? mesh.vertexCount : 0; }},
+};
+constexpr uint32_t kPhaseCount = sizeof kPhases / sizeof *kPhases;
+constexpr uint32_t kItemBytes = 32;  // that one is taken for
+
+void Measure(const QexMeshUpload& upload, QexPODMesh* mesh) {
+    const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
+    const bool whole = position.componentCount >= 3;
+    QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload.vertices,
+                                      whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
+                                      position.stride);
+    if (whole) QexPODMesh_MeasureBones(mesh, upload.vertices + position.offset, position.stride);
+}
+
 }  // namespace
 
 bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
@@ -242,11 +289,6 @@ bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t me
     Element* elements = upload->elements;
     ListElements(elements, *mesh);
     const bool lacking = LacksBinormals(*mesh);
-    if (lacking) {
-        upload->madeBinormals = MakeBinormals(*mesh, elements);
-        elements[QEX_ELEMENT_BINORMAL] = {&kMadeData, reinterpret_cast<const uint8_t*>(upload->madeBinormals),
-                                          false, sizeof(QexVec3)};
-    }
     if (!lacking && UploadsAsIs(*mesh, elements)) {
         for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
             const CPODData& data = *elements[i].data;
@@ -257,37 +299,34 @@ bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t me
         upload->vertexBytes = mesh->vertices.stride * mesh->vertexCount;
         return true;
     }
-    if ((!lacking || upload->madeBinormals) && BeginPack(upload, mesh)) return true;
+    if ((!lacking || BeginBinormals(upload, *mesh)) && BeginPack(upload, mesh)) return true;
     QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
     return false;
 }
 
 QexStep QexModelGeometry_LayOut(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t piece) {
-    if (upload->packedVertices && upload->laidOut < mesh->vertexCount) {
-        const uint32_t left = mesh->vertexCount - upload->laidOut;
-        const uint32_t most = upload->stride ? piece / upload->stride + 1 : left;
-        const uint32_t first = upload->laidOut;
-        upload->laidOut += left < most ? left : most;
-        Pack(upload, *mesh, first, upload->laidOut);
-        if (upload->laidOut < mesh->vertexCount) return QexStep::kMore;
+    for (; upload->phase < kPhaseCount; ++upload->phase, upload->done = 0) {
+        const uint32_t first = upload->done, left = kPhases[upload->phase].items(*upload, *mesh) - first;
+        if (!left) continue;
+        upload->done += left < piece / kItemBytes ? left : piece / kItemBytes;
+        kPhases[upload->phase].run(upload, *mesh, first, upload->done);
+        return QexStep::kMore;
     }
-    const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
-    const bool whole = position.componentCount >= 3;
-    QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload->vertices,
-                                      whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
-                                      position.stride);
-    if (whole) QexPODMesh_MeasureBones(mesh, upload->vertices + position.offset, position.stride);
+    Measure(*upload, mesh);
     return QexStep::kDone;
 }
 
 bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
     if (!QexModelGeometry_Begin(upload, mesh, meshIndex)) return false;
-    return QexModelGeometry_LayOut(upload, mesh, kQexWhole) == QexStep::kDone;
+    return QexStep_Run(upload,
+                       [mesh](QexMeshUpload* u) { return QexModelGeometry_LayOut(u, mesh, kQexWhole); });
 }
 
 void QexModelGeometry_Release(QexMeshUpload* upload) {
     QexMemory_Free(upload->packedVertices);
     QexMemory_Free(upload->packedIndices);
     QexMemory_Free(upload->madeBinormals);
+    QexMemory_Free(upload->corners);
+    QexMemory_Free(upload->turned);
     memset(upload, 0, sizeof *upload);
 }

@@ -22,16 +22,19 @@ struct QexMeshUpload {
     uint8_t* packedVertices;  // owned, or null
     uint16_t* packedIndices;  // owned, or null
     QexVec3* madeBinormals;   // owned, or null
+    uint32_t* corners;        // of the triangles that say where binormals are turned, owned, or null
+    uint8_t* turned;          // by vertex; owned, or null
     uint32_t stride;          // of packed vertices
-    uint32_t laidOut;         // of them
+    uint32_t phase, done;     // of laying out, and items of it
     QexMeshUploadElement elements[QEX_ELEMENT_COUNT];
 };
 
-// Finds the layout, converts the indices and makes what the file lacks. False, with a line in the log, when
-// the mesh cannot be drawn or memory runs out. Free with Release in any case.
+// Finds the layout, converts the indices and finds room. False, with a line in the log, when the mesh cannot
+// be drawn or memory runs out. Free with Release in any case.
 bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex);
 
-// Lays out at most so many bytes of vertices; the last step measures the boxes.
+// Makes what the file lacks and lays out the vertices, so many bytes of them at most; then measures the
+// boxes.
 QexStep QexModelGeometry_LayOut(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t piece);
 
 // Both at once.
