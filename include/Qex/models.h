@@ -61,6 +61,32 @@ QEX_API int32_t QexModel_LoadContent(QexModel* model, const char* directory, con
 QEX_API int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_t size,
                                               QexNameCache* cache);
 
+/** Begins to load a model as QexModel_LoadContent does, in parts: QexModel_ContinueLoad does the work. A
+ * model that was loaded or is being loaded is unloaded first. Until the load is done the model stands empty:
+ * it draws nothing, may be passed to every function, and what is set in it but for its hooks and its frame is
+ *  lost. Its record stays in place. QexModel_Unload, or another load into it, gives the load up.
+ *  @param directory, file  as in QexModel_LoadContent; copied
+ *  @return 0; -1, with the lines of QexModel_LoadContent in the log and nothing begun, when the file cannot
+ * be opened or memory runs out. */
+QEX_API int32_t QexModel_BeginLoad(QexModel* model, const char* directory, const char* file);
+
+/** QexModel_BeginLoad from memory, as QexModel_LoadContentFromCache loads.
+ *  @param data, size, cache  as there; data and cache must live until the load is done or given up, too
+ *  @return 0; -1, with a line in the log, for null data or when memory runs out. */
+QEX_API int32_t QexModel_BeginLoadFromCache(QexModel* model, const void* data, uint32_t size,
+                                            QexNameCache* cache);
+
+/** Goes on with a load. The end is that of the load at once: the same scene, buffers and textures, hooks
+ * called in the same order, the same lines in the log. GL state may be changed between calls; buffers are
+ * unbound when it returns, and a texture may stay bound to the active unit.
+ *  @param milliseconds  after which it stops; 0 and below: after one piece. The last piece is ended: 128 kB
+ *  read, decoded or uploaded to a buffer, one mip level uploaded, one mesh checked, given binormals or cut
+ * into bone batches, one call of a hook, or the default shaders made
+ *  @param progress      out, 0 to 1, 1 when it is done; never less than before; 0 on failure; may be null
+ *  @return 1 while there is more to do, 0 when the model is loaded; -1 when the load failed, with the lines
+ * of the load at once and nothing left behind, and, with a line, for a model that is not being loaded. */
+QEX_API int32_t QexModel_ContinueLoad(QexModel* model, float milliseconds, float* progress);
+
 /** Reads the scene only, in place of what the model holds. No GL context needed, unless that is GL objects.
  *  @return 0; -1 when the file cannot be opened or does not hold a sound scene (nothing is kept then). */
 QEX_API int32_t QexModel_LoadFromFile(QexModel* model, const char* directory, const char* file);

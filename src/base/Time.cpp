@@ -1,5 +1,8 @@
 // The millisecond clock, the frame-rate meter, and animations of a few floats.
+#include "base/Time.h"
+
 #include <sys/time.h>
+#include <time.h>
 
 #include <cmath>
 #include <cstring>
@@ -69,6 +72,12 @@ float WrapStep(QexFloatAnimation* animation, float delta) {
 }
 
 }  // namespace
+
+uint64_t QexTime_Monotonic() {
+    timespec now = {};
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return static_cast<uint64_t>(now.tv_sec) * 1000000000 + static_cast<uint64_t>(now.tv_nsec);
+}
 
 uint32_t QexTime_Init() {
     timeval now;

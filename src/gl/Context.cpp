@@ -44,6 +44,7 @@ void RenewName(int, GLuint) {}
 }  // namespace
 
 bool g_QexContextLost;
+uint32_t g_QexContexts;
 
 void QexContext_Register(QexContextPart* part) {
     if (part->registered) return;
@@ -94,6 +95,7 @@ int32_t QexEngine_ContextRestored(void) {
     GLint framebuffer = 0;
     ForgetAll();  // a loss that an error told of
     g_QexContextLost = false;
+    ++g_QexContexts;
     const QexMaking making;
     bool whole = true;
     // What the context comes with is not the engine's; one that is lost again has no end of errors.

@@ -46,6 +46,7 @@ enum { kDiffuseUnit = 0, kNormalMapUnit = 1, kShadowMapUnit = 2, kAlphaUnit = 3 
 
 // Between the loss of the context and its restoring: there is nothing to delete, and nothing can be made.
 extern bool g_QexContextLost;
+extern uint32_t g_QexContexts;  // that were restored
 
 // A span in which GL objects are made: errors are read in either way of drawing. When one was found, and the
 // application's handler came back, nothing half-made is to be kept.

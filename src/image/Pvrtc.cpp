@@ -2,6 +2,8 @@
 // colours stand at the words' centres and are interpolated between them; a pixel is a mixture of both by its
 // weight. So the image is decoded in cells between the centres of four words: a cell begins half a word right
 // of and below the upper left one, and takes a quarter of the weights of each.
+#include "image/Pvrtc.h"
+
 #include "image/Image.h"
 #include "image/Lanes.h"
 #include "Qex/images.h"
@@ -256,12 +258,17 @@ void DecodeCellAt(const Image& image, int64_t x, int64_t y, const Column& left, 
                 memcpy(image.Pixel(x + column, y + row), cell[row][column], 4);
 }
 
+// The cells that begin up to two rows above `row` and above those of `end`.
 template <uint32_t kWidth>
-void Decode(const Grid& grid, const Image& image) {
+void Decode(const Grid& grid, const Image& image, int64_t row, int64_t end) {
     // The first row and column of cells hang half over the image's edge. Their outer words are those of the
     // opposite edge.
     size_t upper = grid.rowBits, lower = 0;
-    for (int64_t y = -2; y < image.height; y += 4) {
+    for (int64_t y = 0; y < row; y += 4) {
+        upper = lower;
+        lower = Next(lower, grid.rowBits);
+    }
+    for (int64_t y = row - 2; y < end - 2; y += 4) {
         Column columns[2];
         size_t column = grid.columnBits;
         uint32_t right = 0;
@@ -279,6 +286,21 @@ void Decode(const Grid& grid, const Image& image) {
 
 }  // namespace
 
+void QexPvrtc_DecodeRows(const uint8_t* source, bool twoBits, int32_t width, int32_t height, int32_t row,
+                         int32_t rows, uint8_t* pixels) {
+    const auto blocks = [](int32_t size, int32_t block) {
+        return size > 2 * block ? static_cast<uint32_t>(size / block) : 2u;
+    };
+    const Grid grid = MakeGrid(source, blocks(width, twoBits ? 8 : 4), blocks(height, 4));
+    const Image image = {pixels, width, height};
+    // The last cells hang over the lower edge.
+    const int64_t end = int64_t{row} + rows < height ? int64_t{row} + rows : int64_t{height} + 2;
+    if (twoBits)
+        Decode<8>(grid, image, row, end);
+    else
+        Decode<4>(grid, image, row, end);
+}
+
 void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t width, int32_t height,
                         void* destination) {
     if (width < 1 || height < 1 || !destination) return;
@@ -290,14 +312,6 @@ void QexDecompressPVRTC(const void* source, int32_t twoBits, int32_t width, int3
         memset(destination, 0, static_cast<size_t>(bytes));
         return;
     }
-    const auto blocks = [](int32_t size, int32_t block) {
-        return size > 2 * block ? static_cast<uint32_t>(size / block) : 2u;
-    };
-    const Grid grid =
-        MakeGrid(static_cast<const uint8_t*>(source), blocks(width, twoBits ? 8 : 4), blocks(height, 4));
-    const Image image = {static_cast<uint8_t*>(destination), width, height};
-    if (twoBits)
-        Decode<8>(grid, image);
-    else
-        Decode<4>(grid, image);
+    QexPvrtc_DecodeRows(static_cast<const uint8_t*>(source), twoBits != 0, width, height, 0, height,
+                        static_cast<uint8_t*>(destination));
 }

@@ -42,22 +42,16 @@ GLType ToGLType(uint32_t podType) {
     return {types[type.storage], type.plain != podType};
 }
 
-struct Element {
-    const CPODData* data;
-    const uint8_t* source;  // of the first vertex
-    bool asFloats;          // converted at upload
-    uint32_t size;          // bytes a vertex in the upload
-};
+using Element = QexMeshUploadElement;
+
+// Where a mesh lacks an element.
+const CPODData kNoData = {};
+// Binormals that were made.
+const CPODData kMadeData = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
 
 // The elements that are uploaded, in the order of QexVertexElement.
-struct Elements {
-    Element list[QEX_ELEMENT_COUNT];
-};
-
-Elements ListElements(const QexPODMesh& mesh) {
-    static const CPODData none = {};
-    Elements elements;
-    for (Element& element : elements.list) element = {&none, nullptr, false, 0};
+void ListElements(Element* elements, const QexPODMesh& mesh) {
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) elements[i] = {&kNoData, nullptr, false, 0};
     const uint32_t count = QexPODMesh_ElementCount(&mesh);
     for (uint32_t i = kPODVertices; i < count && i <= kPODUVWs; ++i) {
         const CPODData& data = *QexPODMesh_Element(&mesh, i);
@@ -66,10 +60,8 @@ Elements ListElements(const QexPODMesh& mesh) {
         // Positions are always floats: the mesh's box comes from them, and its unpack matrix goes into them.
         const bool asFloats = i == kPODVertices ? data.type != QEX_POD_FLOAT : !ToGLType(data.type).type;
         const uint32_t bytes = asFloats ? QexPODData_Components(data) * 4 : QexPODData_ElementSize(data);
-        elements.list[attribute] = {&data, QexPODMesh_ElementData(&mesh, data), asFloats,
-                                    (bytes + 3) / 4 * 4};
+        elements[attribute] = {&data, QexPODMesh_ElementData(&mesh, data), asFloats, (bytes + 3) / 4 * 4};
     }
-    return elements;
 }
 
 bool IsIdentity(const QexMatrix& matrix) {
@@ -77,11 +69,12 @@ bool IsIdentity(const QexMatrix& matrix) {
 }
 
 // Whether the interleaved block can go to GL as it is: one stride, everything within it and aligned.
-bool UploadsAsIs(const QexPODMesh& mesh, const Elements& elements) {
+bool UploadsAsIs(const QexPODMesh& mesh, const Element* elements) {
     const uint32_t stride = mesh.vertices.stride;
     if (!mesh.interleaved || !mesh.vertices.componentCount || !IsIdentity(mesh.unpackMatrix)) return false;
     if (uint64_t{stride} * mesh.vertexCount > mesh.interleavedBytes || stride > INT32_MAX) return false;
-    for (const Element& element : elements.list) {
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const Element& element = elements[i];
         const CPODData& data = *element.data;
         if (!data.componentCount) continue;
         const uint32_t unit = QexPODType_Of(data.type).componentSize;
@@ -141,60 +134,82 @@ QexVec4 ReadElement(const Element& element, uint32_t vertex) {
     return value;
 }
 
-// Normal x tangent, turned round where the texture is mirrored: where its coordinates run clockwise around a
-// triangle.
-bool MakeBinormals(QexScratch<QexVec3>* out, const QexPODMesh& mesh, const Elements& elements) {
-    const uint64_t corners = uint64_t{QexPODMesh_CountTriangles(mesh)} * 3;
-    QexScratch<uint32_t> vertices;
-    if (!out->Alloc(mesh.vertexCount) || !vertices.Alloc(corners)) return false;
-    for (uint32_t v = 0; v < mesh.vertexCount; ++v) {
-        const QexVec4 n = ReadElement(elements.list[QEX_ELEMENT_NORMAL], v);
-        const QexVec4 t = ReadElement(elements.list[QEX_ELEMENT_TANGENT], v);
-        (*out)[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
-    }
-    const Element& uv = elements.list[QEX_ELEMENT_UV0];
-    if (!uv.size) return true;
-    QexScratch<uint8_t> turned;
-    if (!turned.Alloc(mesh.vertexCount)) return false;
-    memset(turned.Get(), 0, mesh.vertexCount);
-    QexPODMesh_ListCorners(mesh, vertices.Get());
-    for (uint64_t i = 0; i + 3 <= corners; i += 3) {
-        const QexVec4 a = ReadElement(uv, vertices[i]), b = ReadElement(uv, vertices[i + 1]);
-        const QexVec4 c = ReadElement(uv, vertices[i + 2]);
-        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
-        for (int corner = 0; mirrored && corner < 3; ++corner) turned[vertices[i + corner]] = 1;
-    }
-    for (uint32_t v = 0; v < mesh.vertexCount; ++v)
-        if (turned[v]) QexVec3_Scale(&(*out)[v], &(*out)[v], -1);
-    return true;
+uint32_t CountCorners(const QexPODMesh& mesh) {
+    return QexPODMesh_CountTriangles(mesh) * 3;
 }
 
-// Lays the vertices out anew, interleaved and aligned.
-bool Pack(QexMeshUpload* upload, QexPODMesh* mesh, const Elements& elements) {
-    uint32_t stride = 0;
-    for (const Element& element : elements.list) stride += element.size;
-    const uint64_t bytes = uint64_t{stride} * mesh->vertexCount;
-    upload->packedVertices =
-        bytes > INT32_MAX ? nullptr
-                          : static_cast<uint8_t*>(QexMemory_Alloc(static_cast<uint32_t>(bytes ? bytes : 1)));
-    if (!upload->packedVertices) {
-        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-        return false;
+// Room for the binormals of a mesh that lacks them.
+bool BeginBinormals(QexMeshUpload* upload, const QexPODMesh& mesh) {
+    upload->madeBinormals = QexMemory_AllocArray<QexVec3>(mesh.vertexCount);
+    if (upload->elements[QEX_ELEMENT_UV0].size) {
+        upload->corners = QexMemory_AllocArray<uint32_t>(CountCorners(mesh));
+        upload->turned = QexMemory_AllocZeroed<uint8_t>(mesh.vertexCount);
+        if (!upload->corners || !upload->turned) return false;
     }
-    memset(upload->packedVertices, 0, static_cast<size_t>(bytes));
+    upload->elements[QEX_ELEMENT_BINORMAL] = {
+        &kMadeData, reinterpret_cast<const uint8_t*>(upload->madeBinormals), false, sizeof(QexVec3)};
+    return upload->madeBinormals != nullptr;
+}
+
+// Describes vertices that are to be laid out anew, interleaved and aligned, and finds room for them.
+bool BeginPack(QexMeshUpload* upload, QexPODMesh* mesh) {
     uint32_t offset = 0;
+    for (const Element& element : upload->elements) upload->stride += element.size;
     for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
-        const Element& element = elements.list[i];
-        mesh->attributes[i] =
-            Describe(static_cast<QexVertexElement>(i), *element.data, element.asFloats, stride, offset);
-        for (uint32_t v = 0; element.size && v < mesh->vertexCount; ++v)
-            PackElement(upload->packedVertices + uint64_t{v} * stride + offset, *mesh, element,
-                        i == QEX_ELEMENT_POSITION, v);
+        const Element& element = upload->elements[i];
+        mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), *element.data, element.asFloats,
+                                       upload->stride, offset);
         offset += element.size;
     }
+    const uint64_t bytes = uint64_t{upload->stride} * mesh->vertexCount;
+    if (bytes <= INT32_MAX) upload->packedVertices = QexMemory_AllocArray<uint8_t>(bytes);
     upload->vertices = upload->packedVertices;
     upload->vertexBytes = static_cast<uint32_t>(bytes);
-    return true;
+    return upload->packedVertices != nullptr;
+}
+
+// ---- Laying out, in phases over vertices or triangles from `first` to `end` ----
+
+// Binormals are normal x tangent, turned round where the texture is mirrored: where its coordinates run
+// clockwise around a triangle.
+void CrossNormals(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    for (uint32_t v = first; v < end; ++v) {
+        const QexVec4 n = ReadElement(upload->elements[QEX_ELEMENT_NORMAL], v);
+        const QexVec4 t = ReadElement(upload->elements[QEX_ELEMENT_TANGENT], v);
+        upload->madeBinormals[v] = {n.y * t.z - n.z * t.y, n.z * t.x - n.x * t.z, n.x * t.y - n.y * t.x};
+    }
+}
+
+void ListCorners(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t, uint32_t) {
+    QexPODMesh_ListCorners(mesh, upload->corners);
+}
+
+void FindMirrored(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    const Element& uv = upload->elements[QEX_ELEMENT_UV0];
+    for (uint32_t triangle = first; triangle < end; ++triangle) {
+        const uint32_t* corners = upload->corners + uint64_t{triangle} * 3;
+        const QexVec4 a = ReadElement(uv, corners[0]), b = ReadElement(uv, corners[1]);
+        const QexVec4 c = ReadElement(uv, corners[2]);
+        const bool mirrored = (b.x - a.x) * (c.y - a.y) < (c.x - a.x) * (b.y - a.y);
+        for (int corner = 0; mirrored && corner < 3; ++corner) upload->turned[corners[corner]] = 1;
+    }
+}
+
+void TurnMirrored(QexMeshUpload* upload, const QexPODMesh&, uint32_t first, uint32_t end) {
+    for (uint32_t v = first; v < end; ++v)
+        if (upload->turned[v]) QexVec3_Scale(&upload->madeBinormals[v], &upload->madeBinormals[v], -1);
+}
+
+void Pack(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t first, uint32_t end) {
+    const uint32_t stride = upload->stride;
+    uint8_t* out = upload->packedVertices + uint64_t{first} * stride;
+    memset(out, 0, static_cast<size_t>(uint64_t{end - first} * stride));
+    for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
+        const Element& element = upload->elements[i];
+        for (uint32_t v = first; element.size && v < end; ++v)
+            PackElement(out + uint64_t{v - first} * stride, mesh, element, i == QEX_ELEMENT_POSITION, v);
+        out += element.size;
+    }
 }
 
 bool PrepareIndices(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t meshIndex) {
@@ -238,44 +253,80 @@ bool FitBatches(QexPODMesh* mesh, uint32_t meshIndex) {
     return false;
 }
 
+struct Phase {
+    void (*run)(QexMeshUpload* upload, const QexPODMesh& mesh, uint32_t first, uint32_t end);
+    uint32_t (*items)(const QexMeshUpload& upload, const QexPODMesh& mesh);
+};
+
+const Phase kPhases[] = {
+    {CrossNormals,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.madeBinormals ? mesh.vertexCount : 0; }},
+    {ListCorners, [](const QexMeshUpload& u, const QexPODMesh&) { return u.corners ? 1u : 0u; }},
+    {FindMirrored,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.corners ? CountCorners(mesh) / 3 : 0; }},
+    {TurnMirrored,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.turned ? mesh.vertexCount : 0; }},
+    {Pack,
+     [](const QexMeshUpload& u, const QexPODMesh& mesh) { return u.packedVertices ? mesh.vertexCount : 0; }},
+};
+constexpr uint32_t kPhaseCount = sizeof kPhases / sizeof *kPhases;
+constexpr uint32_t kItemBytes = 32;  // that one is taken for
+
+void Measure(const QexMeshUpload& upload, QexPODMesh* mesh) {
+    const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
+    const bool whole = position.componentCount >= 3;
+    QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload.vertices,
+                                      whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
+                                      position.stride);
+    if (whole) QexPODMesh_MeasureBones(mesh, upload.vertices + position.offset, position.stride);
+}
+
 }  // namespace
 
-bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
+bool QexModelGeometry_Begin(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
     memset(upload, 0, sizeof *upload);
     if (!FitBatches(mesh, meshIndex) || !PrepareIndices(upload, *mesh, meshIndex)) return false;
-    Elements elements = ListElements(*mesh);
-    QexScratch<QexVec3> made;
-    const CPODData binormals = {QEX_POD_FLOAT, 3, sizeof(QexVec3), nullptr};
-    if (LacksBinormals(*mesh)) {
-        if (!MakeBinormals(&made, *mesh, elements)) {
-            QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
-            return false;
-        }
-        elements.list[QEX_ELEMENT_BINORMAL] = {&binormals, reinterpret_cast<const uint8_t*>(made.Get()),
-                                               false, sizeof(QexVec3)};
-    }
-    if (!made && UploadsAsIs(*mesh, elements)) {
+    Element* elements = upload->elements;
+    ListElements(elements, *mesh);
+    const bool lacking = LacksBinormals(*mesh);
+    if (!lacking && UploadsAsIs(*mesh, elements)) {
         for (int i = 0; i < QEX_ELEMENT_COUNT; ++i) {
-            const CPODData& data = *elements.list[i].data;
+            const CPODData& data = *elements[i].data;
             mesh->attributes[i] = Describe(static_cast<QexVertexElement>(i), data, false, data.stride,
                                            static_cast<uint32_t>(reinterpret_cast<uintptr_t>(data.data)));
         }
         upload->vertices = mesh->interleaved;
         upload->vertexBytes = mesh->vertices.stride * mesh->vertexCount;
-    } else if (!Pack(upload, mesh, elements)) {
-        return false;
+        return true;
     }
-    const QexVertexAttribute& position = mesh->attributes[QEX_ELEMENT_POSITION];
-    const bool whole = position.componentCount >= 3;
-    QexBoundingBox_ComputeInterleaved(&mesh->localBox, upload->vertices,
-                                      whole ? static_cast<int32_t>(mesh->vertexCount) : 0, position.offset,
-                                      position.stride);
-    if (whole) QexPODMesh_MeasureBones(mesh, upload->vertices + position.offset, position.stride);
-    return true;
+    if ((!lacking || BeginBinormals(upload, *mesh)) && BeginPack(upload, mesh)) return true;
+    QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+    return false;
+}
+
+QexStep QexModelGeometry_LayOut(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t piece) {
+    for (; upload->phase < kPhaseCount; ++upload->phase, upload->done = 0) {
+        const uint32_t first = upload->done, left = kPhases[upload->phase].items(*upload, *mesh) - first;
+        if (!left) continue;
+        upload->done += left < piece / kItemBytes ? left : piece / kItemBytes;
+        kPhases[upload->phase].run(upload, *mesh, first, upload->done);
+        return QexStep::kMore;
+    }
+    Measure(*upload, mesh);
+    return QexStep::kDone;
+}
+
+bool QexModelGeometry_Prepare(QexMeshUpload* upload, QexPODMesh* mesh, uint32_t meshIndex) {
+    if (!QexModelGeometry_Begin(upload, mesh, meshIndex)) return false;
+    return QexStep_Run(upload,
+                       [mesh](QexMeshUpload* u) { return QexModelGeometry_LayOut(u, mesh, kQexWhole); });
 }
 
 void QexModelGeometry_Release(QexMeshUpload* upload) {
     QexMemory_Free(upload->packedVertices);
     QexMemory_Free(upload->packedIndices);
+    QexMemory_Free(upload->madeBinormals);
+    QexMemory_Free(upload->corners);
+    QexMemory_Free(upload->turned);
     memset(upload, 0, sizeof *upload);
 }

@@ -1,4 +1,6 @@
 // The textures that the materials of a model name.
+#include "model/Textures.h"
+
 #include <cstdio>
 #include <cstring>
 
@@ -14,7 +16,7 @@
 
 namespace {
 
-constexpr size_t kPathSize = 256;
+constexpr size_t kPathSize = kQexPathSize;
 
 QexTexture** AllocEntries(uint32_t count) {
     QexScratch<QexTexture*> entries(count ? count : 1);
@@ -65,24 +67,6 @@ QexTexture* NewTexture() {
     return texture;
 }
 
-// Loads a file into a new record; null when that fails.
-QexTexture* LoadTexture(QexTexture* texture, const char* path) {
-    if (texture && QexTexture_LoadPVRFromFile(texture, path, nullptr, 1, 0) != 0) FreeTexture(texture, false);
-    return texture;
-}
-
-void LoadMaterial(QexModel* model, const char* directory, uint32_t material) {
-    char path[kPathSize], alphaPath[kPathSize];
-    const char* name = DiffuseName(model, material);
-    if (!name || !MakePaths(path, alphaPath, directory, name)) return;
-    model->textures[material] = NewTexture();
-    if (!model->textures[material]) return;
-    if (model->loadTextureHook && model->loadTextureHook(model, path, kPathSize - 1)) return;
-    path[kPathSize - 1] = 0;
-    model->textures[material] = LoadTexture(model->textures[material], path);
-    if (alphaPath[0]) model->alphaTextures[material] = LoadTexture(NewTexture(), alphaPath);
-}
-
 // The texture of that name: caches hold records, or pointers to them.
 QexTexture* FindInCache(QexNameCache* cache, const char* name) {
     void* slot = nullptr;
@@ -91,29 +75,111 @@ QexTexture* FindInCache(QexNameCache* cache, const char* name) {
     return static_cast<QexTexture*>(slot);
 }
 
+// Asks the hook, then the cache.
+QexStep TakeFromCache(QexMaterialLoad* load, QexModel* model) {
+    char* path = load->paths[0];
+    if (model->loadTextureHook && model->loadTextureHook(model, path, kPathSize - 1)) return QexStep::kDone;
+    path[kPathSize - 1] = 0;
+    model->textures[load->material] = FindInCache(load->cache, path);
+    model->alphaTextures[load->material] = FindInCache(load->cache, load->paths[1]);
+    return QexStep::kDone;
+}
+
+// Names the files and asks the hook. Done with the material where there is nothing to load.
+QexStep NameFiles(QexMaterialLoad* load, QexModel* model) {
+    const char* name = DiffuseName(model, load->material);
+    if (!name || !MakePaths(load->paths[0], load->paths[1], load->directory ? load->directory : "", name))
+        return QexStep::kDone;
+    if (!load->directory) return TakeFromCache(load, model);
+    QexTexture*& texture = model->textures[load->material];
+    texture = NewTexture();
+    if (!texture) return QexStep::kDone;
+    if (model->loadTextureHook && model->loadTextureHook(model, load->paths[0], kPathSize - 1))
+        return QexStep::kDone;
+    load->paths[0][kPathSize - 1] = 0;
+    return QexStep::kMore;
+}
+
+// The entry of the file that the load has come to: the diffuse texture's first.
+QexTexture*& EntryOf(const QexMaterialLoad& load, QexModel* model) {
+    return (load.phase == 1 ? model->textures : model->alphaTextures)[load.material];
+}
+
+// Opens the file of a record. A file that cannot be loaded leaves no record.
+bool Open(QexMaterialLoad* load, QexTexture*& texture) {
+    const char* path = load->paths[load->phase - 1];
+    if (!path[0]) return false;
+    if (!texture) texture = NewTexture();
+    if (!texture) return false;
+    load->opened =
+        QexTextureFile_Begin(&load->file, {texture, {}, nullptr, true, 0, nullptr, load->piece}, path);
+    if (!load->opened) FreeTexture(texture, false);
+    return load->opened;
+}
+
+void Close(QexMaterialLoad* load, QexTexture*& texture) {
+    QexTextureFile_End(&load->file);
+    load->opened = false;
+    if (load->file.result != 0) FreeTexture(texture, false);
+}
+
+// A part of one of a material's two files; done behind the last one.
+QexStep LoadFile(QexMaterialLoad* load, QexModel* model) {
+    QexTexture*& texture = EntryOf(*load, model);
+    if (!load->opened && Open(load, texture)) return QexStep::kMore;
+    if (load->opened && QexTextureLoad_Step(&load->file) == QexStep::kMore) return QexStep::kMore;
+    if (load->opened) Close(load, texture);
+    return ++load->phase == 3 ? QexStep::kDone : QexStep::kMore;
+}
+
+int32_t LoadAll(QexModel* model, const char* directory, QexNameCache* cache) {
+    QexMaterialLoad load;
+    if (!QexMaterialLoad_Begin(&load, model, directory, cache, kQexWhole)) return -1;
+    QexStep_Run(&load, [model](QexMaterialLoad* l) { return QexMaterialLoad_Step(l, model); });
+    return 0;
+}
+
 }  // namespace
+
+bool QexMaterialLoad_Begin(QexMaterialLoad* load, QexModel* model, const char* directory, QexNameCache* cache,
+                           uint32_t piece) {
+    load->piece = piece;
+    load->directory = directory;
+    load->cache = cache;
+    load->material = load->phase = 0;
+    load->opened = false;
+    if (!AllocArrays(model)) return false;
+    if (directory) model->flags |= QEX_MODEL_OWNS_TEXTURES;
+    return true;
+}
+
+QexStep QexMaterialLoad_Step(QexMaterialLoad* load, QexModel* model) {
+    if (load->material == model->scene.materialCount) return QexStep::kDone;
+    if (load->phase == 0 && NameFiles(load, model) == QexStep::kMore)
+        load->phase = 1;
+    else if (load->phase == 0 || LoadFile(load, model) == QexStep::kDone) {
+        load->phase = 0;
+        ++load->material;
+    }
+    return QexStep::kMore;
+}
+
+void QexMaterialLoad_Resume(const QexMaterialLoad* load) {
+    if (load->opened) QexTextureLoad_Resume(&load->file);
+}
+
+void QexMaterialLoad_End(QexMaterialLoad* load, QexModel* model) {
+    if (load->opened) Close(load, EntryOf(*load, model));
+}
 
 extern "C" {
 
 int32_t QexModel_LoadTextureFromFile(QexModel* model, const char* directory) {
-    if (!AllocArrays(model)) return -1;
-    model->flags |= QEX_MODEL_OWNS_TEXTURES;
-    for (uint32_t i = 0; i < model->scene.materialCount; ++i) LoadMaterial(model, directory, i);
-    return 0;
+    return LoadAll(model, directory ? directory : "", nullptr);
 }
 
 int32_t QexModel_LoadTextureFromCache(QexModel* model, QexNameCache* cache) {
-    char path[kPathSize], alphaPath[kPathSize];
-    if (!AllocArrays(model)) return -1;
-    for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
-        const char* name = DiffuseName(model, i);
-        if (!name || !MakePaths(path, alphaPath, "", name)) continue;
-        if (model->loadTextureHook && model->loadTextureHook(model, path, kPathSize - 1)) continue;
-        path[kPathSize - 1] = 0;
-        model->textures[i] = FindInCache(cache, path);
-        model->alphaTextures[i] = FindInCache(cache, alphaPath);
-    }
-    return 0;
+    return LoadAll(model, nullptr, cache);
 }
 
 void QexModel_UnloadTextures(QexModel* model) {

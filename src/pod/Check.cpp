@@ -167,21 +167,21 @@ bool CheckCounts(const QexPODModel& scene, QexPODFault* fault) {
     return false;
 }
 
+bool CheckMesh(const Check& at, const uint32_t* extents) {
+    const QexPODMesh& mesh = at.scene.meshes[at.index];
+    return CheckElements(at, mesh, extents) && CheckFaces(at, mesh, extents) && CheckSkin(at, mesh, extents);
+}
+
 }  // namespace
 
 const char* QexPODScene_Check(const QexPODModel& scene, QexPODExtents* const extents[kPODKinds],
-                              QexPODFault* fault) {
-    if (!CheckCounts(scene, fault)) return fault->text;
-    Check at = {scene, fault, "mesh", 0};
-    for (at.index = 0; at.index < scene.meshCount; ++at.index) {
-        const QexPODMesh& mesh = scene.meshes[at.index];
-        const uint32_t* lengths = extents[kPODMesh][at.index];
-        if (!CheckElements(at, mesh, lengths) || !CheckFaces(at, mesh, lengths) ||
-            !CheckSkin(at, mesh, lengths))
-            return fault->text;
-    }
-    at.kind = "node";
-    for (at.index = 0; at.index < scene.nodeCount; ++at.index)
-        if (!CheckNode(at)) return fault->text;
-    return nullptr;
+                              uint32_t part, QexPODFault* fault) {
+    bool sound;
+    if (part == 0)
+        sound = CheckCounts(scene, fault);
+    else if (part <= scene.meshCount)
+        sound = CheckMesh({scene, fault, "mesh", part - 1}, extents[kPODMesh][part - 1]);
+    else
+        sound = CheckNode({scene, fault, "node", part - 1 - scene.meshCount});
+    return sound ? nullptr : fault->text;
 }

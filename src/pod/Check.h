@@ -10,6 +10,11 @@ struct QexPODFault {
     char text[224];
 };
 
-// Null, or what makes a scene that was read whole unfit to be drawn, in the text of the fault.
+// What a scene that was read whole has to be checked for: its counts, then each mesh, then each node.
+inline uint32_t QexPODScene_CheckParts(const QexPODModel& scene) {
+    return 1 + scene.meshCount + scene.nodeCount;
+}
+
+// Null, or what makes that part of the scene unfit to be drawn, in the text of the fault.
 const char* QexPODScene_Check(const QexPODModel& scene, QexPODExtents* const extents[kPODKinds],
-                              QexPODFault* fault);
+                              uint32_t part, QexPODFault* fault);

@@ -19,33 +19,7 @@ bool ReadElementData(QexPODReader& reader, uint32_t length, CPODData* element, u
     element->data = static_cast<uint8_t*>(QexMemory_Alloc(length));
     if (!element->data) return QexPODReader_OutOfMemory(__LINE__);
     extent = length / size * size;
-    return QexSourceStream_Read(reader.stream, element->data, length) != 0;
-}
-
-bool ReadBlocks(QexPODReader& reader, uint32_t id, CPODData* element, bool interleaved, uint32_t& extent) {
-    uint32_t block, length;
-    while (QexSourceStream_ReadMarker(reader.stream, &block, &length)) {
-        uint32_t* word = block == 9000   ? &element->type
-                         : block == 9001 ? &element->componentCount
-                         : block == 9002 ? &element->stride
-                                         : nullptr;
-        const QexPODField field = {block, QexPODFieldKind::Words, 1, 0, -1, 0, nullptr, nullptr};
-        bool read;
-        if (block == (id | kPODEndMark)) return QexPODReader_Skip(reader, block, length);
-        if (word) {
-            read = QexPODReader_ReadWords(reader, field, length, word);
-        } else if (block == 9003 && interleaved) {
-            uint32_t offset = 0;
-            read = QexPODReader_ReadWords(reader, field, length, &offset);
-            element->data = reinterpret_cast<uint8_t*>(static_cast<uintptr_t>(offset));
-        } else if (block == 9003) {
-            read = ReadElementData(reader, length, element, extent);
-        } else {
-            read = QexPODReader_Skip(reader, block, length);
-        }
-        if (!read) return false;
-    }
-    return QexPODReader_Fail(reader, "the file ends inside block %u", id);
+    return QexPODReader_ReadBytes(reader, element->data, length);
 }
 
 }  // namespace
@@ -62,7 +36,7 @@ bool QexPODReader_ReadInterleaved(QexPODReader& reader, const QexPODField& field
     if (!mesh->interleaved) return QexPODReader_OutOfMemory(__LINE__);
     mesh->interleavedBytes = length;
     QexSystem_Printf(field.line, length);
-    return QexSourceStream_Read(reader.stream, mesh->interleaved, length) != 0;
+    return QexPODReader_ReadBytes(reader, mesh->interleaved, length);
 }
 
 bool QexPODReader_ReadUVWCount(QexPODReader& reader, const QexPODField& field, uint32_t length,
@@ -81,15 +55,39 @@ bool QexPODReader_ReadUVWCount(QexPODReader& reader, const QexPODField& field, u
     return true;
 }
 
-bool QexPODReader_ReadElement(QexPODReader& reader, uint32_t number, QexPODMesh* mesh, uint32_t* extents) {
+bool QexPODReader_BeginElement(QexPODReader& reader, uint32_t number, QexPODMesh* mesh, uint32_t* extents) {
     if (number == kPODUVWs) {
         if (reader.uvwRead >= mesh->uvwChannelCount)
             return QexPODReader_Fail(reader, "a mesh has more UV channels than the %u it counts",
                                      mesh->uvwChannelCount);
         number += reader.uvwRead++;
     }
-    return ReadBlocks(reader, QexPODElement_Of(number).block, QexPODMesh_Element(mesh, number),
-                      mesh->interleaved && number != kPODFaces, extents[kExtentElements + number]);
+    reader.level = QexPODLevel::Element;
+    reader.elementBlock = QexPODElement_Of(number).block;
+    reader.element = QexPODMesh_Element(mesh, number);
+    reader.elementInterleaved = mesh->interleaved && number != kPODFaces;
+    reader.elementExtent = &extents[kExtentElements + number];
+    return true;
+}
+
+bool QexPODReader_ReadElementBlock(QexPODReader& reader, uint32_t id, uint32_t length) {
+    CPODData* element = reader.element;
+    uint32_t* word = id == 9000   ? &element->type
+                     : id == 9001 ? &element->componentCount
+                     : id == 9002 ? &element->stride
+                                  : nullptr;
+    const QexPODField field = {id, QexPODFieldKind::Words, 1, 0, -1, 0, nullptr, nullptr};
+    if (word) return QexPODReader_ReadWords(reader, field, length, word);
+    if (id == 9003 && !reader.elementInterleaved)
+        return ReadElementData(reader, length, element, *reader.elementExtent);
+    if (id == 9003) {
+        uint32_t offset = 0;
+        const bool read = QexPODReader_ReadWords(reader, field, length, &offset);
+        element->data = reinterpret_cast<uint8_t*>(static_cast<uintptr_t>(offset));
+        return read;
+    }
+    if (id == (reader.elementBlock | kPODEndMark)) reader.level = QexPODLevel::Record;
+    return QexPODReader_Skip(reader, id, length);
 }
 
 void QexPODMesh_CompleteElements(QexPODMesh* mesh) {

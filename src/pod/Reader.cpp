@@ -1,4 +1,5 @@
-// Reading POD files: markers, the scene, its records one after the other.
+// Reading POD files: markers, the scene, its records one after the other. A step reads a marker of the level
+// that it finds itself in, and what belongs to it.
 #include "pod/Reader.h"
 
 #include <cstdarg>
@@ -70,7 +71,7 @@ bool CompleteStatic(QexPODNode* node, QexPODChannelNumber number, const float* v
     return true;
 }
 
-void BeginRecord(int kind, void* record) {
+void SetDefaults(int kind, void* record) {
     if (kind == kPODMaterial) QexPODMaterial_SetDefaults(static_cast<QexPODMaterial*>(record));
     if (kind == kPODMesh) QexPODMesh_SetDefaults(static_cast<QexPODMesh*>(record));
 }
@@ -125,20 +126,26 @@ void* NextRecord(QexPODReader& reader, int kind) {
     return record;
 }
 
-// A block within a record.
-bool ReadBlock(QexPODReader& reader, int kind, uint32_t id, uint32_t length, void* record,
-               uint32_t* extents) {
+// A block within a record, or its end.
+bool ReadRecordBlock(QexPODReader& reader, uint32_t id, uint32_t length) {
+    const int kind = reader.kind;
+    void* record = reader.record;
+    uint32_t* extents = reader.recordExtents;
+    if (id == (kKinds[kind].blockId | kPODEndMark)) {
+        reader.level = QexPODLevel::Scene;
+        return QexPODReader_Skip(reader, id, length) && EndRecord(reader, kind, record, extents);
+    }
     const QexPODField* field = QexPODFields_Find(kPODRecordFields[kind], id);
     if (field) return QexPODReader_ReadField(reader, *field, length, record, extents);
     const uint32_t element = kind == kPODMesh ? QexPODElement_Find(id) : kPODMaxElements;
     if (element < kPODMaxElements)
-        return QexPODReader_ReadElement(reader, element, static_cast<QexPODMesh*>(record), extents);
+        return QexPODReader_BeginElement(reader, element, static_cast<QexPODMesh*>(record), extents);
     if (kind == kPODMaterial && !(id & kPODEndMark))
         QexLog(QEX_TAG, "<QexPODFile_ReadMaterial> skip unknown block");
     return QexPODReader_Skip(reader, id, length);
 }
 
-bool ReadRecord(QexPODReader& reader, int kind) {
+bool BeginRecord(QexPODReader& reader, int kind) {
     const RecordKind& k = kKinds[kind];
     const uint32_t index = QexPODReader_At<uint32_t>(reader.scene, k.countOffset);
     if (index >= reader.declared[kind])
@@ -146,17 +153,14 @@ bool ReadRecord(QexPODReader& reader, int kind) {
                                  reader.declared[kind]);
     void* record = NextRecord(reader, kind);
     if (!record) return false;
-    uint32_t* extents = reader.extents[kind][index];
+    reader.level = QexPODLevel::Record;
+    reader.kind = kind;
+    reader.record = record;
+    reader.recordExtents = reader.extents[kind][index];
     reader.uvwRead = 0;
     if (k.title) QexSystem_Printf("%s", k.title);
-    BeginRecord(kind, record);
-    uint32_t id, length;
-    while (QexSourceStream_ReadMarker(reader.stream, &id, &length)) {
-        if (id == (k.blockId | kPODEndMark))
-            return QexPODReader_Skip(reader, id, length) && EndRecord(reader, kind, record, extents);
-        if (!ReadBlock(reader, kind, id, length, record, extents)) return false;
-    }
-    return QexPODReader_Fail(reader, "the file ends inside %s %u", k.name, index);
+    SetDefaults(kind, record);
+    return true;
 }
 
 // ---- The scene ----
@@ -169,34 +173,47 @@ bool EndScene(QexPODReader& reader) {
                                      reader.declared[kind], kKinds[kind].name, found);
     }
     reader.sceneRead = true;
-    QexPODFault fault;
-    if (const char* line = QexPODScene_Check(*reader.scene, reader.extents, &fault)) {
-        QexError(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %s", line);
-        return false;
-    }
-    QexPODScene_Repair(reader.scene, reader.extents);
+    reader.level = QexPODLevel::Check;
+    reader.part = 0;
     return true;
 }
 
-bool ReadScene(QexPODReader& reader) {
-    reader.scene->framesPerSecond = 30;
-    uint32_t id, length;
-    while (QexSourceStream_ReadMarker(reader.stream, &id, &length)) {
-        if (id == (kSceneBlock | kPODEndMark))
-            return QexPODReader_Skip(reader, id, length) && EndScene(reader);
-        const QexPODField* field = QexPODFields_Find(kPODSceneFields, id);
-        int kind = 0;
-        while (kind < kPODKinds && id != kKinds[kind].countId && id != kKinds[kind].blockId) ++kind;
-        bool read;
-        if (field)
-            read = QexPODReader_ReadField(reader, *field, length, reader.scene, nullptr);
-        else if (kind < kPODKinds)
-            read = id == kKinds[kind].countId ? ReadCount(reader, kind, length) : ReadRecord(reader, kind);
-        else
-            read = QexPODReader_Skip(reader, id, length);
-        if (!read) return false;
+// A part of the scene that was read; what follows it is the file's again.
+bool CheckPart(QexPODReader& reader) {
+    QexPODFault fault;
+    if (const char* line = QexPODScene_Check(*reader.scene, reader.extents, reader.part, &fault)) {
+        QexError(QEX_TAG, "<QexPODModel_ReadFromSourceStream> %s", line);
+        return false;
     }
-    return QexPODReader_Fail(reader, "the file ends inside the scene");
+    if (++reader.part < QexPODScene_CheckParts(*reader.scene)) return true;
+    reader.level = QexPODLevel::Repair;
+    reader.part = 0;
+    reader.repair = {reader.scene, {}};
+    return true;
+}
+
+bool RepairPart(QexPODReader& reader) {
+    QexPODScene_Repair(&reader.repair, reader.extents, reader.part);
+    if (++reader.part == QexPODScene_RepairParts(*reader.scene)) reader.level = QexPODLevel::File;
+    return true;
+}
+
+bool ReadSceneBlock(QexPODReader& reader, uint32_t id, uint32_t length) {
+    if (id == (kSceneBlock | kPODEndMark)) return QexPODReader_Skip(reader, id, length) && EndScene(reader);
+    const QexPODField* field = QexPODFields_Find(kPODSceneFields, id);
+    if (field) return QexPODReader_ReadField(reader, *field, length, reader.scene, nullptr);
+    for (int kind = 0; kind < kPODKinds; ++kind) {
+        if (id == kKinds[kind].countId) return ReadCount(reader, kind, length);
+        if (id == kKinds[kind].blockId) return BeginRecord(reader, kind);
+    }
+    return QexPODReader_Skip(reader, id, length);
+}
+
+bool BeginScene(QexPODReader& reader) {
+    if (reader.sceneRead) return QexPODReader_Fail(reader, "the file holds two scenes");
+    reader.scene->framesPerSecond = 30;
+    reader.level = QexPODLevel::Scene;
+    return true;
 }
 
 bool ReadVersion(QexPODReader& reader, uint32_t length) {
@@ -212,35 +229,51 @@ bool ReadVersion(QexPODReader& reader, uint32_t length) {
     return true;
 }
 
-bool ReadBlocks(QexPODReader& reader) {
-    uint32_t id, length;
-    while (QexSourceStream_ReadMarker(reader.stream, &id, &length)) {
-        bool read;
-        if (id == kVersionBlock) {
-            read = ReadVersion(reader, length);
-        } else if (id == kSceneBlock && reader.scene) {
-            read =
-                reader.sceneRead ? QexPODReader_Fail(reader, "the file holds two scenes") : ReadScene(reader);
-        } else if (id == kSwappedVersionBlock) {
-            QexSystem_Printf("  - POD endianness mismatch!\n");
-            read = QexPODReader_Fail(reader, "the file is in the other byte order");
-        } else if (id == kSceneBlock) {
-            read = true;  // its sub-blocks are passed over one by one
-        } else if (!reader.versionRead && !reader.sceneRead && length > reader.Remaining()) {
-            read = QexPODReader_Fail(reader, "not a POD file");
-        } else {
-            read = QexPODReader_Skip(reader, id, length);
-        }
-        if (!read) return false;
+bool ReadFileBlock(QexPODReader& reader, uint32_t id, uint32_t length) {
+    if (id == kVersionBlock) return ReadVersion(reader, length);
+    if (id == kSceneBlock && reader.scene) return BeginScene(reader);
+    if (id == kSceneBlock) return true;  // its sub-blocks are passed over one by one
+    if (id == kSwappedVersionBlock) {
+        QexSystem_Printf("  - POD endianness mismatch!\n");
+        return QexPODReader_Fail(reader, "the file is in the other byte order");
     }
-    return true;
+    if (!reader.versionRead && !reader.sceneRead && length > reader.Remaining())
+        return QexPODReader_Fail(reader, "not a POD file");
+    return QexPODReader_Skip(reader, id, length);
 }
 
-bool Finish(QexPODReader& reader, bool anyway) {
-    if (!anyway && !reader.versionRead) return QexPODReader_Fail(reader, "not a POD file: no version block");
-    if (!anyway && !reader.sceneRead) return QexPODReader_Fail(reader, "no scene in the file");
+bool Finish(QexPODReader& reader) {
+    if (!reader.anyway && !reader.versionRead)
+        return QexPODReader_Fail(reader, "not a POD file: no version block");
+    if (!reader.anyway && !reader.sceneRead) return QexPODReader_Fail(reader, "no scene in the file");
     if (!reader.scene || QexPODModel_InitImpl(reader.scene) == 0) return true;
     return QexPODReader_OutOfMemory(__LINE__);
+}
+
+// The end of the file, where it may be.
+QexStep EndFile(QexPODReader& reader) {
+    const uint32_t index =
+        reader.scene ? QexPODReader_At<uint32_t>(reader.scene, kKinds[reader.kind].countOffset) - 1 : 0;
+    switch (reader.level) {
+        case QexPODLevel::Scene: QexPODReader_Fail(reader, "the file ends inside the scene"); break;
+        case QexPODLevel::Record:
+            QexPODReader_Fail(reader, "the file ends inside %s %u", kKinds[reader.kind].name, index);
+            break;
+        case QexPODLevel::Element:
+            QexPODReader_Fail(reader, "the file ends inside block %u", reader.elementBlock);
+            break;
+        default: return Finish(reader) ? QexStep::kDone : QexStep::kFailed;
+    }
+    return QexStep::kFailed;
+}
+
+bool ReadBlock(QexPODReader& reader, uint32_t id, uint32_t length) {
+    switch (reader.level) {
+        case QexPODLevel::Scene: return ReadSceneBlock(reader, id, length);
+        case QexPODLevel::Record: return ReadRecordBlock(reader, id, length);
+        case QexPODLevel::Element: return QexPODReader_ReadElementBlock(reader, id, length);
+        default: return ReadFileBlock(reader, id, length);
+    }
 }
 
 }  // namespace
@@ -261,18 +294,46 @@ bool QexPODReader_OutOfMemory(int line) {
     return false;
 }
 
+void QexPODReader_Begin(QexPODReader* reader, QexSourceStream* stream, QexPODModel* scene, bool anyway,
+                        uint32_t piece) {
+    *reader = {};
+    reader->stream = stream;
+    reader->scene = scene;
+    reader->anyway = anyway;
+    reader->piece = piece;
+    reader->shareKeys = QexResFile_IsMemoryFile(stream->file) != 0;
+}
+
+QexStep QexPODReader_Step(QexPODReader* reader) {
+    uint32_t id, length;
+    bool read;
+    if (reader->pendingBytes)
+        read = QexPODReader_ReadPending(*reader);
+    else if (reader->level == QexPODLevel::Check)
+        read = CheckPart(*reader);
+    else if (reader->level == QexPODLevel::Repair)
+        read = RepairPart(*reader);
+    else if (!QexSourceStream_ReadMarker(reader->stream, &id, &length))
+        return EndFile(*reader);
+    else
+        read = ReadBlock(*reader, id, length);
+    return read ? QexStep::kMore : QexStep::kFailed;
+}
+
+void QexPODReader_End(QexPODReader* reader) {
+    for (QexPODExtents*& extents : reader->extents) QexMemory_FreeArray(extents);
+}
+
 extern "C" {
 
 int32_t QexPODModel_ReadFromSourceStream(QexPODModel* scene, QexSourceStream* stream, uint32_t optionA,
                                          uint32_t, uint32_t optionB, uint32_t) {
     if (scene) memset(scene, 0, sizeof *scene);
     if (!stream || !stream->file) return -1;
-    QexPODReader reader = {};
-    reader.stream = stream;
-    reader.scene = scene;
-    reader.shareKeys = QexResFile_IsMemoryFile(stream->file) != 0;
-    const bool read = ReadBlocks(reader) && Finish(reader, optionA || optionB);
-    for (QexPODExtents* extents : reader.extents) QexMemory_Free(extents);
+    QexPODReader reader;
+    QexPODReader_Begin(&reader, stream, scene, optionA || optionB, kQexWhole);
+    const bool read = QexStep_Run(&reader, QexPODReader_Step);
+    QexPODReader_End(&reader);
     return read ? 0 : -1;
 }
 

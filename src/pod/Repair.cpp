@@ -15,20 +15,8 @@
 
 namespace {
 
-// Indices that may name what the scene does not have: they count as none.
-enum Reference {
-    kMaterialOfNode,
-    kTextureOfMaterial,
-    kTargetOfCamera,
-    kTargetOfLight,
-    kBoneOfBatch,
-    kReferences
-};
-
-struct Repair {
-    QexPODModel* scene;
-    uint32_t dangling[kReferences];  // how many indices of each name nothing
-};
+using Reference = QexPODReference;
+using Repair = QexPODRepair;
 
 // Makes an index that names nothing -1, and counts it.
 void Settle(Repair* repair, Reference reference, int32_t* index, uint32_t count) {
@@ -198,16 +186,24 @@ void RepairCamera(Repair* repair, uint32_t index, uint32_t fovCount) {
     QexMemory_FreeArray(camera.animatedFov);
 }
 
+void RepairRest(Repair* repair, QexPODExtents* const extents[kPODKinds]) {
+    QexPODModel* scene = repair->scene;
+    for (uint32_t i = 0; i < scene->materialCount; ++i) RepairMaterial(repair, &scene->materials[i]);
+    for (uint32_t i = 0; i < scene->cameraCount; ++i)
+        RepairCamera(repair, i, extents[kPODCamera][i][kExtentFov]);
+    for (uint32_t i = 0; i < scene->lightCount; ++i)
+        Settle(repair, kTargetOfLight, &scene->lights[i].targetIndex, scene->nodeCount);
+    ReportDangling(*repair);
+}
+
 }  // namespace
 
-void QexPODScene_Repair(QexPODModel* scene, QexPODExtents* const extents[kPODKinds]) {
-    Repair repair = {scene, {}};
-    for (uint32_t i = 0; i < scene->meshCount; ++i) RepairSkin(&repair, i);
-    for (uint32_t i = 0; i < scene->nodeCount; ++i) RepairNode(&repair, i, extents[kPODNode][i]);
-    for (uint32_t i = 0; i < scene->materialCount; ++i) RepairMaterial(&repair, &scene->materials[i]);
-    for (uint32_t i = 0; i < scene->cameraCount; ++i)
-        RepairCamera(&repair, i, extents[kPODCamera][i][kExtentFov]);
-    for (uint32_t i = 0; i < scene->lightCount; ++i)
-        Settle(&repair, kTargetOfLight, &scene->lights[i].targetIndex, scene->nodeCount);
-    ReportDangling(repair);
+void QexPODScene_Repair(QexPODRepair* repair, QexPODExtents* const extents[kPODKinds], uint32_t part) {
+    const uint32_t meshes = repair->scene->meshCount;
+    if (part < meshes)
+        RepairSkin(repair, part);
+    else if (part - meshes < repair->scene->nodeCount)
+        RepairNode(repair, part - meshes, extents[kPODNode][part - meshes]);
+    else
+        RepairRest(repair, extents);
 }

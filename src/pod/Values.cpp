@@ -5,6 +5,7 @@
 
 #include "base/Diagnostics.h"
 #include "base/Memory.h"
+#include "data/ResFile.h"
 #include "pod/Elements.h"
 #include "Qex/base.h"
 #include "Qex/pod.h"
@@ -49,15 +50,16 @@ bool ReadArray(QexPODReader& reader, const QexPODField& field, uint32_t length, 
     if (words) {
         target = static_cast<uint32_t*>(QexMemory_Alloc(words * 4));
         if (!target) return QexPODReader_OutOfMemory(__LINE__);
-        if (!QexSourceStream_ReadArray32(reader.stream, target, words)) return false;
+        // The files hold rotations with the opposite sense.
+        const bool rotations = field.extent == kExtentKeys + kPODRotation;
+        if (!QexPODReader_ReadBytes(reader, target, words * 4, rotations)) return false;
     }
     extents[field.extent] = words;
     if (field.line) QexSystem_Printf(field.line, length / field.unit);
     return QexSourceStream_Skip(reader.stream, length % 4) != 0;
 }
 
-// A node's keys: left in the source memory where that is allowed, copied otherwise. The files hold rotations
-// with the opposite sense, so w changes its sign.
+// A node's keys: left in the source memory where that is allowed, copied otherwise.
 bool ReadKeys(QexPODReader& reader, const QexPODField& field, uint32_t length, QexPODNode* node,
               uint32_t* extents) {
     uint32_t*& target = QexPODReader_At<uint32_t*>(node, field.offset);
@@ -72,10 +74,7 @@ bool ReadKeys(QexPODReader& reader, const QexPODField& field, uint32_t length, Q
         QexSystem_Printf(field.sharedLine, length / field.unit);
         return QexSourceStream_Skip(reader.stream, length) != 0;
     }
-    if (!ReadArray(reader, field, length, target, extents)) return false;
-    if (field.extent == kExtentKeys + kPODRotation)
-        for (uint32_t i = 3; i < extents[field.extent]; i += 4) node->rotation[i] = -node->rotation[i];
-    return true;
+    return ReadArray(reader, field, length, target, extents);
 }
 
 }  // namespace
@@ -88,6 +87,29 @@ bool QexPODReader_CheckLength(QexPODReader& reader, uint32_t id, uint32_t length
 
 bool QexPODReader_Skip(QexPODReader& reader, uint32_t id, uint32_t length) {
     return QexPODReader_CheckLength(reader, id, length) && QexSourceStream_Skip(reader.stream, length);
+}
+
+bool QexPODReader_ReadBytes(QexPODReader& reader, void* target, uint32_t count, bool rotations) {
+    reader.pending = static_cast<uint8_t*>(target);
+    reader.pendingPosition = reader.stream->position;
+    reader.pendingBytes = count;
+    reader.pendingRotations = rotations;
+    reader.stream->position += count;
+    return QexPODReader_ReadPending(reader);
+}
+
+bool QexPODReader_ReadPending(QexPODReader& reader) {
+    const uint32_t count = reader.pendingBytes < reader.piece ? reader.pendingBytes : reader.piece;
+    if (count && !QexResFile_Copy(reader.stream->file, reader.pendingPosition, reader.pending, count))
+        return false;
+    if (reader.pendingRotations) {
+        float* keys = reinterpret_cast<float*>(reader.pending);
+        for (uint32_t i = 3; i < count / 4; i += 4) keys[i] = -keys[i];
+    }
+    reader.pending += count;
+    reader.pendingPosition += count;
+    reader.pendingBytes -= count;
+    return true;
 }
 
 bool QexPODReader_ReadWords(QexPODReader& reader, const QexPODField& field, uint32_t length, void* target) {

@@ -130,11 +130,12 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
     kept->target = target;
     kept->source = source;
     kept->source.bytes = nullptr;
-    if (s_Path) return Copy(&kept->path, s_Path, strlen(s_Path) + 1);
     uint8_t* bytes = nullptr;
-    if (s_Keeping && source.bytes && !Copy(&bytes, source.bytes, source.size)) return false;
+    const bool copied = s_Path ? Copy(&kept->path, s_Path, strlen(s_Path) + 1)
+                               : !s_Keeping || !source.bytes || Copy(&bytes, source.bytes, source.size);
     kept->source.bytes = bytes;
-    return true;
+    if (!copied) QexKeptTexture_Drop(name);
+    return copied;
 }
 
 void QexKeptTexture_Drop(uint32_t name) {

@@ -3,20 +3,23 @@
 
 #include "base/Memory.h"
 #include "gl/GL.h"
-#include "gl/LeanState.h"
 #include "image/Ktx.h"
 #include "Qex/base.h"
 #include "Qex/images.h"
 #include "Qex/resources.h"
 #include "Qex/textures.h"
-#include "texture/Kept.h"
-#include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 
 namespace {
 
 constexpr char kFunction[] = "QexTexture_LoadKTXFromMem";
+constexpr char kNoMemory[] = "does not fit into memory";
+
+// Whether a file has all levels down to one pixel.
+bool IsComplete(const QexImage& image) {
+    return image.levelCount == QexImage_ChainLength(image.width, image.height);
+}
 
 // Sets what the record says of the pixels. Of those that are not compressed the GL takes RGB and RGBA, kept
 // as what they are.
@@ -89,119 +92,137 @@ uint8_t* CopySwapped(const uint8_t* data, uint64_t size) {
     return copy;
 }
 
-// Uploads one image of a level. Null, or what is wrong with it.
-const char* UploadFace(const QexKtx& ktx, bool decodes, uint32_t face, uint32_t index, const uint8_t* data) {
-    static const char* const noMemory = "does not fit into memory";
-    const QexImage& image = ktx.image;
-    const QexImageLevel& level = image.levels[index];
-    const GLenum target = QexTextureLoad_FaceTarget(image.faces == 6, face);
-    const GLint l = static_cast<GLint>(index);
-    const GLsizei w = static_cast<GLsizei>(level.width), h = static_cast<GLsizei>(level.height);
-    if (decodes)
-        return QexTextureLoad_UploadDecoded(target, l, *image.format, level, data) ? nullptr : noMemory;
-    if (ktx.IsCompressed()) {
-        glCompressedTexImage2D(target, l, ktx.header.glInternalFormat, w, h, 0,
-                               static_cast<GLsizei>(level.bytes), data);
-        return glGetError() == GL_NO_ERROR ? nullptr : "is not of its size";
-    }
+// Uploads pixels of an image as they are. Null, or what is wrong with them.
+const char* UploadPixels(const QexKtx& ktx, GLenum target, GLint index, const QexImageLevel& level,
+                         const uint8_t* data) {
     QexScratch<uint8_t> swapped;
     if (ktx.HasSwappedPixels()) {
         swapped.Own(CopySwapped(data, level.bytes));
-        if (!swapped) return noMemory;
+        if (!swapped) return kNoMemory;
         data = swapped.Get();
     }
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, level.rowBytes % 4 ? 1 : 4));
-    QEX_GL(glTexImage2D(target, l, static_cast<GLint>(ktx.header.glBaseInternalFormat), w, h, 0,
+    QEX_GL(glTexImage2D(target, index, static_cast<GLint>(ktx.header.glBaseInternalFormat),
+                        static_cast<GLsizei>(level.width), static_cast<GLsizei>(level.height), 0,
                         ktx.header.glFormat, ktx.header.glType, data));
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
     return nullptr;
 }
 
-bool UploadLevel(const QexKtx& ktx, bool decodes, const QexImageBytes& file, uint32_t index) {
-    const QexImageLevel& level = ktx.image.levels[index];
-    for (uint32_t face = 0; face < ktx.image.faces; ++face) {
-        const uint8_t* data = file.bytes + level.offset + face * level.stride;
-        const char* fault = UploadFace(ktx, decodes, face, index, data);
-        if (!fault) continue;
-        QexTextureLoad_Refuse(kFunction, "level %u of %u bytes %s.", index,
-                              static_cast<uint32_t>(level.bytes), fault);
-        return false;
+// Uploads the image of a level that the load has come to, or decodes a band of it; what is wrong with it.
+QexStep UploadFace(QexTextureLoad* load, const char** fault) {
+    const QexKtx& ktx = load->ktx;
+    const QexImageLevel& level = ktx.image.levels[load->level];
+    const GLenum target = QexTextureLoad_FaceTarget(ktx.image.faces == 6, load->face);
+    const GLint l = static_cast<GLint>(load->level);
+    const uint8_t* data = load->file.bytes + level.offset + load->face * level.stride;
+    if (load->decodes) {
+        *fault = kNoMemory;
+        return QexTextureLoad_UploadDecoded(load, target, *ktx.image.format, level, l, data);
     }
+    if (ktx.IsCompressed()) {
+        glCompressedTexImage2D(target, l, ktx.header.glInternalFormat, static_cast<GLsizei>(level.width),
+                               static_cast<GLsizei>(level.height), 0, static_cast<GLsizei>(level.bytes),
+                               data);
+        *fault = glGetError() == GL_NO_ERROR ? nullptr : "is not of its size";
+    } else {
+        *fault = UploadPixels(ktx, target, l, level, data);
+    }
+    return *fault ? QexStep::kFailed : QexStep::kDone;
+}
+
+// Finds the levels that the GL takes and that are made from others; false, with a line, when one is not there
+// or not of its size.
+bool ChooseLevels(QexTextureLoad* load) {
+    QexKtx* ktx = &load->ktx;
+    const QexImage& image = ktx->image;
+    const bool mipmaps = QexTextureLoad_TakesMipmaps(image.width, image.height);
+    if (!FindLevels(ktx, load->file, mipmaps ? image.levelCount : 1)) return false;
+    const bool complete = IsComplete(image);
+    if (!complete && image.levelCount > 1 && ktx->IsCompressed() && image.format) load->decodes = true;
+    load->generates = mipmaps && !complete && (!ktx->IsCompressed() || load->decodes);
     return true;
 }
 
-// Uploads the levels that the GL takes; false, with a line, when one is not there or not of its size. The
-// filter that a GL texture starts with asks for all levels: those that are missing at the end are made from
-// level 0, or, of one compressed level, not asked for.
-bool UploadLevels(QexKtx* ktx, bool decodes, const QexImageBytes& file) {
-    const QexImage& image = ktx->image;
-    const bool mipmaps = QexTextureLoad_TakesMipmaps(image.width, image.height);
-    if (!FindLevels(ktx, file, mipmaps ? image.levelCount : 1)) return false;
-    const GLenum target = image.faces == 6 ? GL_TEXTURE_CUBE_MAP : GL_TEXTURE_2D;
-    const bool complete = image.levelCount == QexImage_ChainLength(image.width, image.height);
-    if (!complete && image.levelCount > 1 && ktx->IsCompressed() && image.format) decodes = true;
-    const bool generate = mipmaps && !complete && (!ktx->IsCompressed() || decodes);
-    for (uint32_t i = 0; i < image.levelCount; ++i) {
-        if (!UploadLevel(*ktx, decodes, file, i)) return false;
-        if (i == 0 && generate) QexTextureLoad_GenerateMipmaps(target);
-    }
-    if (!complete && !generate) glTexParameteri(target, GL_TEXTURE_MIN_FILTER, GL_LINEAR);
-    return true;
+// The filter that a GL texture starts with asks for all levels: those that are missing at the end were made
+// from level 0, or, of one compressed level, are not asked for.
+QexStep Finish(QexTextureLoad* load) {
+    const QexImage& image = load->ktx.image;
+    const GLenum target = QexTexture_Target(load->texture);
+    if (!IsComplete(image) && !load->generates) glTexParameteri(target, GL_TEXTURE_MIN_FILTER, GL_LINEAR);
+    QexTextureLoad_SetWrap(target, image.width, image.height);
+    return QexTextureLoad_Complete(load);
+}
+
+QexStep Upload(QexTextureLoad* load) {
+    const QexImage& image = load->ktx.image;
+    const char* fault = nullptr;
+    const QexStep step = UploadFace(load, &fault);
+    if (step == QexStep::kFailed)
+        QexTextureLoad_Refuse(kFunction, "level %u of %u bytes %s.", load->level,
+                              static_cast<uint32_t>(image.levels[load->level].bytes), fault);
+    if (step != QexStep::kDone) return step;
+    if (++load->face < image.faces) return QexStep::kMore;
+    load->face = 0;
+    if (load->level == 0 && load->generates) QexTextureLoad_GenerateMipmaps(QexTexture_Target(load->texture));
+    return ++load->level < image.levelCount ? QexStep::kMore : Finish(load);
+}
+
+QexStep Refuse(QexTextureLoad* load, int32_t result) {
+    load->result = result;
+    return QexStep::kFailed;
+}
+
+int32_t Load(QexTexture* texture, const QexImageBytes& file, const char* path = nullptr) {
+    QexTextureLoad load = {texture, file, nullptr, true, 0, nullptr, kQexWhole};
+    load.path = path;
+    return QexTextureLoad_Run(&load, QexTextureLoad_KTX);
 }
 
 }  // namespace
 
-int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file) {
-    QexKtx ktx;
+QexStep QexTextureLoad_KTX(QexTextureLoad* load) {
+    QexTexture* texture = load->texture;
+    QexKtx& ktx = load->ktx;
     const QexImage& image = ktx.image;
-    bool decodes = false;
-    const QexMaking making;
-    if (!QexKtx_Is(file)) return -3;
-    if (!QexKtx_ReadHeader(&ktx, file))
-        return QexTextureLoad_Refuse(kFunction, "the file is cut short in its header.");
-    if (!SetFormat(texture, ktx)) return -4;
-    if (!CheckHeader(ktx, &decodes)) return -1;
-    if (decodes && image.format->coding == kQexPVRTC) {
+    load->decodes = false;
+    if (!QexKtx_Is(load->file)) return Refuse(load, -3);
+    if (!QexKtx_ReadHeader(&ktx, load->file))
+        return Refuse(load, QexTextureLoad_Refuse(kFunction, "the file is cut short in its header."));
+    if (!SetFormat(texture, ktx)) return Refuse(load, -4);
+    if (!CheckHeader(ktx, &load->decodes)) return Refuse(load, -1);
+    if (load->decodes && image.format->coding == kQexPVRTC) {
         texture->format = QEX_TEXFMT_RGBA8888;
         texture->bytesPerPixel = 4;
     }
     texture->width = static_cast<int32_t>(image.width);
     texture->height = image.height;
-    QexTextureLoad_Begin(texture, &texture->glName, image.faces == 6);
-    if (!UploadLevels(&ktx, decodes, file) || making.Failed()) {
-        QEX_GL(glDeleteTextures(1, &texture->glName));
-        QexLeanState_ForgetTextures();
-        texture->glName = 0;
-        return -1;
-    }
-    QexTextureLoad_SetWrap(QexTexture_Target(texture), image.width, image.height);
-    const bool known = file.size != kQexUnknownSize;
-    if (QexKeptTexture_Note(texture->glName, QexTexture_Target(texture),
-                            {kKeptImage, known ? file.bytes : nullptr, file.size, 0, 0, 0, 1, 0}))
-        return 0;
-    QexTexture_Release(texture);
-    return -1;
+    texture->glName = 0;
+    load->result = -1;
+    QexTextureLoad_Begin(load, image.faces == 6);
+    if (!ChooseLevels(load)) return QexStep::kFailed;
+    load->step = Upload;
+    return QexStep::kMore;
 }
 
 extern "C" {
 
 int32_t QexTexture_LoadKTXFromMem(QexTexture* texture, const void* file, QexPVRHeader*, int32_t, uint32_t,
                                   const void*) {
-    return QexTextureLoad_KTX(texture, {static_cast<const uint8_t*>(file), kQexUnknownSize});
+    return Load(texture, {static_cast<const uint8_t*>(file), kQexUnknownSize});
 }
 
 int32_t QexTexture_LoadKTXFromMemSized(QexTexture* texture, const void* file, uint32_t size, QexPVRHeader*,
                                        int32_t, uint32_t, const void*) {
-    return QexTextureLoad_KTX(texture, {static_cast<const uint8_t*>(file), file ? size : 0});
+    return Load(texture, {static_cast<const uint8_t*>(file), file ? size : 0});
 }
 
 int32_t QexTexture_LoadKTXFromFile(QexTexture* texture, const char* path, QexPVRHeader*, int32_t, uint32_t) {
     QexResFile file;
     int32_t result = -1;
-    const QexKeptPath kept(path);
     QexResFile_Create(&file, path);
     if (QexResFile_IsOpen(&file))
-        result = QexTextureLoad_KTX(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)});
+        result = Load(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)}, path);
     QexResFile_Release(&file);
     return result;
 }

@@ -1,8 +1,7 @@
 // KTX images, for the loader of PVR images, which takes them as well.
 #pragma once
 
-#include "image/Image.h"
-#include "Qex/textures.h"
+#include "texture/Upload.h"
 
-// Loads a KTX image; what QexTexture_LoadKTXFromMem and its siblings do.
-int32_t QexTextureLoad_KTX(QexTexture* texture, const QexImageBytes& file);
+// The first step of loading a KTX image; what QexTexture_LoadKTXFromMem and its siblings do.
+QexStep QexTextureLoad_KTX(QexTextureLoad* load);

@@ -1,15 +1,15 @@
 // PVR textures with the legacy header: all levels of a file, from one of them on, as they are or decoded.
+#include "texture/LoadPvr.h"
+
+#include "base/Memory.h"
 #include "gl/GL.h"
-#include "gl/LeanState.h"
 #include "image/Ktx.h"
 #include "image/Pvr.h"
 #include "Qex/base.h"
 #include "Qex/images.h"
 #include "Qex/resources.h"
 #include "Qex/textures.h"
-#include "texture/Kept.h"
 #include "texture/LoadKtx.h"
-#include "texture/Upload.h"
 
 #define QEX_MODULE "src/QexLoadPODModel"
 
@@ -17,20 +17,15 @@ namespace {
 
 constexpr char kFunction[] = "QexTexture_LoadPVRFromMem";
 
-// A file, and what the GL gets of it.
-struct PVR {
-    QexPvr file;
-    const uint8_t* data;  // of the pixels
-    uint32_t firstLevel;
-    uint32_t uploaded;  // levels, from the first one on
-    bool mipmaps;       // its filter asks for them
-    bool decodes;       // the GL does not take the data
+const QexImageLevel& First(const QexTextureLoad& load) {
+    return load.pvr.image.levels[load.firstLevel];
+}
 
-    const QexImageLevel& First() const { return file.image.levels[firstLevel]; }
-    bool IsPartial() const {
-        return mipmaps && uploaded < QexImage_ChainLength(First().width, First().height);
-    }
-};
+// Whether the filter asks for levels that the file lacks.
+bool IsPartial(const QexTextureLoad& load) {
+    const QexImageLevel& first = First(load);
+    return load.mipmaps && load.uploaded < QexImage_ChainLength(first.width, first.height);
+}
 
 // Reads the header; false when it is not one.
 bool ReadHeader(QexPvr* pvr, const QexImageBytes& file) {
@@ -99,120 +94,151 @@ bool CheckLevels(QexPvr* pvr, uint32_t firstLevel, uint64_t size) {
 }
 
 // Chooses the levels to upload. A GL that has no mipmaps of this size gets the first one alone.
-void ChooseLevels(PVR* pvr) {
-    const QexImageLevel& first = pvr->First();
-    const QexPixelCoding coding = pvr->file.image.format->coding;
-    pvr->uploaded = pvr->file.image.levelCount - pvr->firstLevel;
-    pvr->mipmaps = pvr->file.header.mipmapCount > 0;
-    if (pvr->mipmaps && !QexTextureLoad_TakesMipmaps(first.width, first.height)) {
-        pvr->mipmaps = false;
-        pvr->uploaded = 1;
+void ChooseLevels(QexTextureLoad* load) {
+    const QexImageLevel& first = First(*load);
+    const QexPixelCoding coding = load->pvr.image.format->coding;
+    load->uploaded = load->pvr.image.levelCount - load->firstLevel;
+    load->mipmaps = load->pvr.header.mipmapCount > 0;
+    if (load->mipmaps && !QexTextureLoad_TakesMipmaps(first.width, first.height)) {
+        load->mipmaps = false;
+        load->uploaded = 1;
         QexSystem_Printf("WARNING:<%s> no mipmaps of %u x %u pixels here.\n", kFunction, first.width,
                          first.height);
     }
     // Of a chain that ends early the GL can make the rest from pixels only.
-    pvr->decodes =
+    load->decodes =
         coding == kQexPVRTC ||
-        (coding == kQexETC1 && (pvr->IsPartial() || !QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES)));
+        (coding == kQexETC1 && (IsPartial(*load) || !QexTexture_IsCompressedFormat(GL_ETC1_RGB8_OES)));
 }
 
-// False when memory runs out.
-bool UploadLevel(const PVR& pvr, GLenum target, GLint index, const QexImageLevel& level,
-                 const uint8_t* data) {
-    const QexPixelFormat& format = *pvr.file.image.format;
+// The level that the load has come to. Fails when memory runs out.
+QexStep UploadLevel(QexTextureLoad* load) {
+    const QexPixelFormat& format = *load->pvr.image.format;
+    const QexImageLevel& level = load->pvr.image.levels[load->level];
+    const GLenum target = QexTextureLoad_FaceTarget(load->pvr.IsCube(), load->face);
+    const GLint index = static_cast<GLint>(load->level - load->firstLevel);
+    const uint8_t* data = load->pixels + load->face * level.stride + level.offset;
     const GLsizei w = static_cast<GLsizei>(level.width), h = static_cast<GLsizei>(level.height);
-    if (pvr.decodes) return QexTextureLoad_UploadDecoded(target, index, format, level, data);
+    if (load->decodes) return QexTextureLoad_UploadDecoded(load, target, format, level, index, data);
     if (format.coding == kQexETC1)
         QEX_GL(glCompressedTexImage2D(target, index, GL_ETC1_RGB8_OES, w, h, 0,
                                       static_cast<GLsizei>(level.bytes), data));
     else
         QEX_GL(glTexImage2D(target, index, format.pixelOrder, w, h, 0, format.pixelOrder, format.pixelType,
                             data));
-    return true;
+    return QexStep::kDone;
 }
 
-enum class Upload { kDone, kGLError, kOutOfMemory };
+QexStep Finish(QexTextureLoad* load) {
+    const QexPVRHeader& read = load->pvr.header;
+    const GLenum target = QexTexture_Target(load->texture);
+    if (load->header) *load->header = read;
+    glTexParameteri(target, GL_TEXTURE_MIN_FILTER, load->mipmaps ? GL_LINEAR_MIPMAP_NEAREST : GL_LINEAR);
+    glTexParameteri(target, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
+    QexTextureLoad_SetWrap(target, read.width, read.height);
+    return QexTextureLoad_Complete(load);
+}
 
-// Uploads levels `from` to `end` of one surface.
-Upload UploadSurface(const PVR& pvr, uint32_t surface, uint32_t from, uint32_t end) {
-    const GLenum target = QexTextureLoad_FaceTarget(pvr.file.IsCube(), surface);
-    for (uint32_t i = 0; i < end; ++i) {
-        const QexImageLevel& level = pvr.file.image.levels[i];
-        const uint8_t* data = pvr.data + surface * level.stride + level.offset;
-        if (i >= from && !UploadLevel(pvr, target, static_cast<GLint>(i - pvr.firstLevel), level, data))
-            return Upload::kOutOfMemory;
-#if QEX_GL_CHECKS
-        if (glGetError() != GL_NO_ERROR) return Upload::kGLError;
-#endif
+// On to the next level, surface or pass. Levels that the filter asks for and the file lacks are made from the
+// first one, before those of the file that follow it: these are a second pass then.
+QexStep Advance(QexTextureLoad* load) {
+    const uint32_t first = load->firstLevel, last = first + load->uploaded;
+    const bool partial = IsPartial(*load);
+    const uint32_t end = partial && load->pass == 0 ? first + 1 : last;
+    if (++load->level < end) return QexStep::kMore;
+    load->level = 0;
+    if (++load->face < load->pvr.image.faces) return QexStep::kMore;
+    load->face = 0;
+    if (!partial || load->pass++) return Finish(load);
+    QexTextureLoad_GenerateMipmaps(QexTexture_Target(load->texture));
+    return first + 1 < last ? QexStep::kMore : Finish(load);
+}
+
+// A level, a band of one, or nothing of a level that is passed over.
+QexStep Upload(QexTextureLoad* load) {
+    if (load->level >= load->firstLevel + load->pass) {
+        const QexStep step = UploadLevel(load);
+        if (step == QexStep::kFailed) QexTextureLoad_Refuse(kFunction, "out of memory.");
+        if (step != QexStep::kDone) return step;
     }
-    return Upload::kDone;
+#if QEX_GL_CHECKS
+    if (glGetError() != GL_NO_ERROR) {
+        QexTextureLoad_Refuse(kFunction, "glTexImage2D() failed.");
+        return QexStep::kFailed;
+    }
+#endif
+    return Advance(load);
 }
 
-Upload UploadSurfaces(const PVR& pvr, uint32_t from, uint32_t end) {
-    Upload result = Upload::kDone;
-    const uint32_t surfaces = pvr.file.image.faces;
-    for (uint32_t surface = 0; surface < surfaces && result == Upload::kDone && from < end; ++surface)
-        result = UploadSurface(pvr, surface, from, end);
-    return result;
-}
-
-// Uploads everything that was chosen. Levels that the filter asks for and the file lacks are made from the
-// first one, before those of the file that follow it.
-Upload UploadAll(const PVR& pvr, GLenum target) {
-    const uint32_t first = pvr.firstLevel, end = first + pvr.uploaded;
-    if (!pvr.IsPartial()) return UploadSurfaces(pvr, first, end);
-    const Upload result = UploadSurfaces(pvr, first, first + 1);
-    if (result != Upload::kDone) return result;
-    QexTextureLoad_GenerateMipmaps(target);
-    return UploadSurfaces(pvr, first + 1, end);
-}
-
-int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* header, bool decode,
-             uint32_t firstLevel, const void* pixelData) {
-    if (QexKtx_Is(file)) return QexTextureLoad_KTX(texture, file);
-    PVR pvr;
-    const QexPVRHeader& read = pvr.file.header;
-    const QexMaking making;
+QexStep Begin(QexTextureLoad* load) {
+    QexTexture* texture = load->texture;
+    QexPvr* pvr = &load->pvr;
+    const QexPVRHeader& read = pvr->header;
+    if (QexKtx_Is(load->file)) return QexTextureLoad_KTX(load);
     texture->glName = 0;
-    if (!ReadHeader(&pvr.file, file)) return -1;
-    const bool known = !pixelData && file.size != kQexUnknownSize;
-    const uint64_t size = known ? file.size - read.headerSize : kQexUnknownSize;
-    pvr.data = pixelData ? static_cast<const uint8_t*>(pixelData) : file.bytes + read.headerSize;
-    pvr.firstLevel = firstLevel;
-    if (!CheckFormat(pvr.file, decode) || !CheckLevels(&pvr.file, firstLevel, size)) return -1;
-    ChooseLevels(&pvr);
-    const QexPixelFormat& format = *pvr.file.image.format;
+    if (!ReadHeader(pvr, load->file)) return QexStep::kFailed;
+    const bool known = !load->pixelData && load->file.size != kQexUnknownSize;
+    const uint64_t size = known ? load->file.size - read.headerSize : kQexUnknownSize;
+    load->pixels =
+        load->pixelData ? static_cast<const uint8_t*>(load->pixelData) : load->file.bytes + read.headerSize;
+    if (!CheckFormat(*pvr, load->decode) || !CheckLevels(pvr, load->firstLevel, size))
+        return QexStep::kFailed;
+    ChooseLevels(load);
+    const QexPixelFormat& format = *pvr->image.format;
     if (format.recordBytes >= 0) {
         texture->bytesPerPixel = static_cast<uint8_t>(format.recordBytes);
         texture->format = format.recordCode;
     }
     texture->width = static_cast<int32_t>(read.width);
     texture->height = read.height;
-    uint32_t name = 0;
-    QexTextureLoad_Begin(texture, &name, pvr.file.IsCube());
-    const GLenum target = QexTexture_Target(texture);
-    const Upload result = UploadAll(pvr, target);
-    if (result != Upload::kDone || making.Failed()) {
-        QEX_GL(glDeleteTextures(1, &name));
-        QexLeanState_ForgetTextures();
-        return QexTextureLoad_Refuse(
-            kFunction, result == Upload::kOutOfMemory ? "out of memory." : "glTexImage2D() failed.");
-    }
-    texture->glName = name;
-    if (!QexKeptTexture_Note(
-            name, target,
-            {kKeptImage, known ? file.bytes : nullptr, file.size, 0, 0, 0, decode, firstLevel})) {
-        QexTexture_Release(texture);
-        return -1;
-    }
-    if (header) *header = read;
-    glTexParameteri(target, GL_TEXTURE_MIN_FILTER, pvr.mipmaps ? GL_LINEAR_MIPMAP_NEAREST : GL_LINEAR);
-    glTexParameteri(target, GL_TEXTURE_MAG_FILTER, GL_LINEAR);
-    QexTextureLoad_SetWrap(target, read.width, read.height);
-    return 0;
+    QexTextureLoad_Begin(load, pvr->IsCube());
+    load->step = Upload;
+    return QexStep::kMore;
+}
+
+int32_t Load(QexTexture* texture, const QexImageBytes& file, QexPVRHeader* header, bool decode,
+             uint32_t firstLevel, const void* pixelData) {
+    QexTextureLoad load = {texture, file, header, decode, firstLevel, pixelData, kQexWhole};
+    return QexTextureLoad_Run(&load, Begin);
+}
+
+// A piece of the file; all of it is loaded from the next step on.
+QexStep ReadFile(QexTextureLoad* load) {
+    QexTextureFile* file = static_cast<QexTextureFile*>(load);
+    const uint32_t size = QexResFile_GetSize(&file->unread), left = size - file->read;
+    const uint32_t count = left < load->piece ? left : load->piece;
+    if (count && !QexResFile_Copy(&file->unread, file->read, file->contents + file->read, count))
+        return QexStep::kFailed;
+    file->read += count;
+    if (file->read < size) return QexStep::kMore;
+    QexResFile_Close(&file->unread);
+    load->file = {file->contents, size};
+    load->step = Begin;
+    return QexStep::kMore;
 }
 
 }  // namespace
+
+bool QexTextureFile_Begin(QexTextureFile* file, const QexTextureLoad& load, const char* path) {
+    static_cast<QexTextureLoad&>(*file) = load;
+    file->step = ReadFile;
+    file->path = path;
+    file->contents = nullptr;
+    file->read = 0;
+    if (!QexResFile_Exists(path)) return false;
+    QexResFile_CreateUnread(&file->unread, path);
+    if (!QexResFile_IsOpen(&file->unread)) return false;
+    file->contents = QexMemory_AllocArray<uint8_t>(QexResFile_GetSize(&file->unread));
+    if (file->contents) return true;
+    QexResFile_Close(&file->unread);
+    return false;
+}
+
+void QexTextureFile_End(QexTextureFile* file) {
+    QexTextureLoad_End(file);
+    QexResFile_Close(&file->unread);
+    QexMemory_FreeArray(file->contents);
+}
 
 extern "C" {
 
@@ -231,16 +257,13 @@ int32_t QexTexture_LoadPVRFromMemSized(QexTexture* texture, const void* file, ui
 
 int32_t QexTexture_LoadPVRFromFile(QexTexture* texture, const char* path, QexPVRHeader* header,
                                    int32_t decode, uint32_t firstLevel) {
-    QexResFile file;
-    int32_t result = -1;
-    if (!QexResFile_Exists(path)) return -1;
-    const QexKeptPath kept(path);
-    QexResFile_Create(&file, path);
-    if (QexResFile_IsOpen(&file))
-        result = Load(texture, {QexResFile_DataPtr(&file), QexResFile_GetSize(&file)}, header, decode,
-                      firstLevel, nullptr);
-    QexResFile_Release(&file);
-    return result;
+    QexTextureFile file;
+    if (!QexTextureFile_Begin(&file, {texture, {}, header, decode != 0, firstLevel, nullptr, kQexWhole},
+                              path))
+        return -1;
+    QexTextureLoad_Run(&file, ReadFile);
+    QexTextureFile_End(&file);
+    return file.result;
 }
 
 }  // extern "C"
