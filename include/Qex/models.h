@@ -80,8 +80,8 @@ QEX_API int32_t QexModel_BeginLoadFromCache(QexModel* model, const void* data, u
  * called in the same order, the same lines in the log. GL state may be changed between calls; buffers are
  * unbound when it returns, and a texture may stay bound to the active unit.
  *  @param milliseconds  after which it stops; 0 and below: after one piece. The last piece is ended: 128 kB
- *  read, decoded or uploaded to a buffer, one mip level uploaded, one mesh checked, given binormals or cut
- * into bone batches, one call of a hook, or the default shaders made
+ *  read, decoded, laid out or uploaded to a buffer, one mip level uploaded, one mesh checked, measured or cut
+ *  into bone batches, one call of a hook, or the default shaders made with the first model
  *  @param progress      out, 0 to 1, 1 when it is done; never less than before; 0 on failure; may be null
  *  @return 1 while there is more to do, 0 when the model is loaded; -1 when the load failed, with the lines
  * of the load at once and nothing left behind, and, with a line, for a model that is not being loaded. */
