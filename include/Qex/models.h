@@ -84,7 +84,8 @@ QEX_API int32_t QexModel_BeginLoadFromCache(QexModel* model, const void* data, u
  *  into bone batches, one call of a hook, or the default shaders made with the first model
  *  @param progress      out, 0 to 1, 1 when it is done; never less than before; 0 on failure; may be null
  *  @return 1 while there is more to do, 0 when the model is loaded; -1 when the load failed, with the lines
- * of the load at once and nothing left behind, and, with a line, for a model that is not being loaded. */
+ * of the load at once and nothing left behind, as it does after the GL context was lost and restored, and,
+ * with a line, for a model that is not being loaded. */
 QEX_API int32_t QexModel_ContinueLoad(QexModel* model, float milliseconds, float* progress);
 
 /** Reads the scene only, in place of what the model holds. No GL context needed, unless that is GL objects.

@@ -92,12 +92,12 @@ TEST_F(LostContext, RecordsMayGoMeanwhile) {
     const Picture expected = Frame();
     QexEngine_ContextLost();
     Replace();
-    const uint64_t before = gltapCount("glDeleteTextures") + gltapCount("glDeleteBuffers") +
-                            gltapCount("glDeleteFramebuffers") + gltapCount("glDeleteProgram");
+    const auto deleted = [] {
+        return gltapCount("glDeleteTextures") + gltapCount("glDeleteBuffers") + gltapCount("glDeleteProgram");
+    };
+    const uint64_t before = deleted();
     Release();
-    EXPECT_EQ(gltapCount("glDeleteTextures") + gltapCount("glDeleteBuffers") +
-                  gltapCount("glDeleteFramebuffers") + gltapCount("glDeleteProgram"),
-              before);
+    EXPECT_EQ(deleted(), before);
     EXPECT_EQ(LiveObjects(), "");
     ASSERT_TRUE(Load());  // starts the engine, which ends the loss
     EXPECT_EQ(QexEngine_IsContextLost(), 0u);
@@ -141,6 +141,29 @@ TEST_F(LostContext, TheApplicationIsAskedForItsMemory) {
     EXPECT_EQ(filter, GL_LINEAR);
     QexEngine_SetTextureSource(nullptr, nullptr);
     QexTexture_Release(&texture);
+    QexEngine_Shutdown(&runtime);
+}
+
+// What was being made when the context went is given up by the next call.
+TEST_F(LostContext, ALoadInPartsFails) {
+    QexRuntimeContext runtime;
+    QexEngineConfig config = SurfaceConfig();
+    QexModel model;
+    Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+    QexModel_Create(&model);
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    for (int calls = 1;; ++calls) {
+        int32_t result = QexModel_BeginLoad(&model, OutputPath("").c_str(), "worm.pod");
+        for (int i = 0; result == 0 && i < calls; ++i) result = QexModel_ContinueLoad(&model, 0, nullptr) - 1;
+        const bool under_way = result == 0;
+        ASSERT_EQ(LoseAndRestore(), 0) << calls;
+        EXPECT_EQ(QexModel_ContinueLoad(&model, 0, nullptr), -1) << calls;
+        QexModel_Unload(&model);
+        ASSERT_EQ(QexModel_LoadContent(&model, OutputPath("").c_str(), "worm.pod"), 0);
+        QexModel_Unload(&model);
+        if (!under_way) break;
+        calls += calls / 4;
+    }
     QexEngine_Shutdown(&runtime);
 }
 
