@@ -106,7 +106,7 @@ void ReleaseProgram() {
 }
 
 bool IsRunning(const QexParticleSet* set) {
-    return set && set->active && set->buffer;
+    return set && set->active && set->buffer && s_Program.program;
 }
 
 void SetUniforms(const QexParticleSet& set) {

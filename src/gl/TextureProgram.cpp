@@ -88,19 +88,14 @@ void DeleteShaders() {
     s_VertexShader = s_FragmentShader = 0;
 }
 
-}  // namespace
-
-extern "C" {
-
-int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
-    record->type = type;
-    const bool lit = type == QEX_PROGRAM_TEXTURE_LIGHT;
-    if (!lit && type != QEX_PROGRAM_TEXTURE_COLOUR) return -1;
+// Makes a record's program; without one after an error that was handled.
+bool Build(QexShaderProgram* record) {
+    const bool lit = record->type == QEX_PROGRAM_TEXTURE_LIGHT;
     const QexMaking making;
     DeleteShaders();
     record->program = 0;
     QexProgram_Compile(kSources[lit], {&record->program, &s_VertexShader, &s_FragmentShader});
-    if (making.Failed()) return -1;
+    if (making.Failed()) return false;
     const QexProgramLookup lookup = {QEX_MODULE, record->program};
     record->mvpMatrixLoc = lookup.Uniform("MVPMatrix");
     if (lit)
@@ -108,7 +103,20 @@ int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
                          {&record->lightColorLoc, "LightColor"},
                          {&record->globalAlphaLoc, "GlobalAlpha"}});
     lookup.SetSampler({"sTexture", kDiffuseUnit});
-    if (Note(record) && !making.Failed()) return 0;
+    if (!making.Failed()) return true;
+    if (record->program) glDeleteProgram(record->program);
+    record->program = 0;
+    return false;
+}
+
+}  // namespace
+
+extern "C" {
+
+int32_t QexShaderProgram_Create(QexShaderProgram* record, uint32_t type) {
+    record->type = type;
+    if (type != QEX_PROGRAM_TEXTURE_LIGHT && type != QEX_PROGRAM_TEXTURE_COLOUR) return -1;
+    if (Build(record) && Note(record)) return 0;
     QexShaderProgram_Release(record);
     record->program = 0;
     return -1;
@@ -135,8 +143,7 @@ void Forget() {
 }
 bool Restore() {
     bool whole = true;
-    for (Made* made = s_Made; made; made = made->next)
-        whole &= QexShaderProgram_Create(made->record, made->record->type) == 0;
+    for (Made* made = s_Made; made; made = made->next) whole &= Build(made->record);
     return whole;
 }
 QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};

@@ -155,6 +155,7 @@ int32_t QexTexture_GenerateNormalisationCubeMap(QexTexture* texture, int32_t siz
     if (!texels) {
         QexSystem_Printf(
             "ERROR:<GenerateNormalisationCubeMap> Unable to allocate memory for texture data for cube map\n");
+        QexTexture_Release(texture);
         return -1;
     }
     glPixelStorei(GL_UNPACK_ALIGNMENT, 1);

@@ -21,11 +21,13 @@ struct Kept {
     QexKeptSource source;  // its bytes are ours, or null
     char* path;            // or null
     uint8_t filter, wrap;  // codes; 0: as the source says
+    uint32_t context;      // that it was made in
 };
 
 constexpr uint32_t kRows = 64;  // by name
 Kept* s_Kept[kRows];
 uint32_t s_Renewed;  // the texture that is being made again
+bool s_Handed;       // its name, to who makes it
 bool s_Keeping;
 const char* s_Path;
 QexTextureSource s_Source;
@@ -76,6 +78,7 @@ bool RestoreOne(const Kept& kept) {
     QexTexture texture = {};
     const bool knows = kept.source.bytes || kept.path || kept.source.kind >= kKeptTarget;
     s_Renewed = kept.name;
+    s_Handed = false;
     int32_t result = -1;
     if (knows)
         result = Load(&texture, kept);
@@ -85,7 +88,10 @@ bool RestoreOne(const Kept& kept) {
         QexError(QEX_TAG, "<QexEngine_ContextRestored> texture %u %s", kept.name,
                  knows || s_Source ? "could not be loaded again" : "came from memory that was not kept");
     s_Renewed = 0;
-    if (result != 0 || !texture.glName) return false;
+    if (result != 0 || !texture.glName) {
+        QexContext_ReserveTexture(kept.target, kept.name);  // or another texture would get it
+        return false;
+    }
     if (kept.filter) QexTexture_SetFilter(&texture, kept.filter);
     if (kept.wrap) QexTexture_SetWrapping(&texture, kept.wrap);
     if (texture.flags & QEX_TEXFLAG_OWNS_PIXELS) QexMemory_Free(texture.pixels);
@@ -95,7 +101,8 @@ bool RestoreOne(const Kept& kept) {
 bool Restore() {
     bool whole = true;
     for (const Kept* row : s_Kept)
-        for (; row && !g_QexContextLost; row = row->next) whole &= RestoreOne(*row);
+        for (; row && !g_QexContextLost; row = row->next)
+            if (row->context != g_QexContexts) whole &= RestoreOne(*row);
     return whole;
 }
 
@@ -114,12 +121,16 @@ QexKeptPath::~QexKeptPath() {
 
 uint32_t QexKeptTexture_NewName() {
     GLuint name = s_Renewed;
-    if (!name) QEX_GL(glGenTextures(1, &name));
+    // Once: what a source makes besides has a name of its own.
+    if (name && !s_Handed)
+        s_Handed = true;
+    else
+        QEX_GL(glGenTextures(1, &name));
     return name;
 }
 
 bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& source) {
-    if (s_Renewed || !name) return true;
+    if (!name || name == s_Renewed) return true;
     QexContext_Register(&s_Part);
     QexKeptTexture_Drop(name);
     Kept* kept = QexMemory_AllocZeroed<Kept>(1);
@@ -128,6 +139,7 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
     s_Kept[name % kRows] = kept;
     kept->name = name;
     kept->target = target;
+    kept->context = g_QexContexts;
     kept->source = source;
     kept->source.bytes = nullptr;
     uint8_t* bytes = nullptr;
@@ -139,7 +151,7 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
 }
 
 void QexKeptTexture_Drop(uint32_t name) {
-    if (s_Renewed) return;
+    if (name == s_Renewed) return;
     Kept** at = Find(name);
     Kept* kept = *at;
     if (!kept) return;
@@ -150,7 +162,7 @@ void QexKeptTexture_Drop(uint32_t name) {
 }
 
 void QexKeptTexture_Replace(const QexTexture& texture, const void* pixels, uint64_t size) {
-    Kept* kept = s_Renewed ? nullptr : *Find(texture.glName);
+    Kept* kept = texture.glName == s_Renewed ? nullptr : *Find(texture.glName);
     if (!kept || kept->source.kind != kKeptPixels || !(s_Keeping || kept->source.bytes)) return;
     uint8_t* bytes = nullptr;
     Copy(&bytes, pixels, size);
@@ -160,7 +172,7 @@ void QexKeptTexture_Replace(const QexTexture& texture, const void* pixels, uint6
 }
 
 void QexKeptTexture_SetCodes(uint32_t name, uint8_t filter, uint8_t wrap) {
-    Kept* kept = s_Renewed ? nullptr : *Find(name);
+    Kept* kept = name == s_Renewed ? nullptr : *Find(name);
     if (!kept) return;
     if (filter) kept->filter = filter;
     if (wrap) kept->wrap = wrap;

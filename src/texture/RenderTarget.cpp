@@ -46,13 +46,26 @@ bool Restore() {
     return true;
 }
 
-void Forget() {}
+// Takes a target from the list. The name of its texture, or 0.
+GLuint Forget(GLuint framebuffer) {
+    KeptTarget** at = &s_Targets;
+    while (*at && (*at)->names.framebuffer != framebuffer) at = &(*at)->next;
+    KeptTarget* kept = *at;
+    if (!kept) return 0;
+    const GLuint texture = kept->names.texture;
+    *at = kept->next;
+    QexMemory_Free(kept);
+    return texture;
+}
 
-QexContextPart s_Part = {kRankTargets, Forget, Reserve, Restore, nullptr, false};
+void ForgetNothing() {}
+
+QexContextPart s_Part = {kRankTargets, ForgetNothing, Reserve, Restore, nullptr, false};
 
 }  // namespace
 
 bool QexRenderTarget_Note(const QexTargetNames& names) {
+    Forget(names.framebuffer);  // one of an earlier start that was never released
     KeptTarget* kept = QexMemory_AllocZeroed<KeptTarget>(1);
     if (!kept) return false;
     QexContext_Register(&s_Part);
@@ -63,13 +76,7 @@ bool QexRenderTarget_Note(const QexTargetNames& names) {
 }
 
 void QexRenderTarget_DropNote(uint32_t framebuffer) {
-    KeptTarget** at = &s_Targets;
-    while (*at && (*at)->names.framebuffer != framebuffer) at = &(*at)->next;
-    KeptTarget* kept = *at;
-    if (!kept) return;
-    QexKeptTexture_Drop(kept->names.texture);
-    *at = kept->next;
-    QexMemory_Free(kept);
+    QexKeptTexture_Drop(Forget(framebuffer));
 }
 
 void QexRenderTarget_CreateColourTexture(QexTexture* texture, int32_t width, int32_t height) {

@@ -220,6 +220,7 @@ int32_t QexTexture_Download(QexTexture* texture, const void* pixels) {
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
     QEX_GL(glTexImage2D(GL_TEXTURE_2D, 0, static_cast<GLint>(format.format), texture->width,
                         static_cast<GLsizei>(texture->height), 0, format.format, format.type, pixels));
+    if (making.Failed()) return -1;
     QexKeptTexture_Replace(*texture, pixels, PixelBytes(*texture));
     return making.Failed() ? -1 : 0;
 }
