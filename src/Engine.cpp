@@ -97,7 +97,7 @@ int32_t QexEngine_InitForOwnerDraw(QexRuntimeContext* context, uint32_t configSi
     context->startTime = QexTime_Init();
     QexExtensions_Forget();
     QexRenderState_Reset(context);
-    QexEngine_ContextRestored();
+    if (QexEngine_ContextRestored() != 0 && g_QexContextLost) return -1;
     if (QexTexture_CreateDefault() != 0) return -1;
     QexFont_Create(context->width, context->height);
     s_OwnerDrawInitialized = 1;

@@ -39,11 +39,13 @@ QEX_API extern QexSkinShadowProgram m_SkinShadowShaderProgram;
 QEX_API extern QexModelShadowProgram m_uModelShadowShaderProgram;
 #endif
 
-/** Clears a model record. No GL context needed. @return 0. */
+/** Clears a model record; a load of a model that was there is given up. No GL context needed.
+ *  @return 0, or -1 when a hook calls it for the model whose load has called the hook. */
 QEX_API int32_t QexModel_Create(QexModel* model);
 
 /** Loads a model whole: scene, default shaders, buffers, textures; then calls the hook for each mesh node and
- *  gives all of them the default modules. A model that was loaded before is unloaded first.
+ *  gives all of them the default modules. A model that was loaded before is unloaded first. Hooks may load
+ *  other models; loading or unloading their own one is refused with a line.
  *  @param directory  put in front of the file's and the textures' names as it is, with its separator
  *  @param file       POD file; directory and name together at most 255 characters
  *  @return 0, or the failing step's result, with lines in the log that say what is wrong; the model then

@@ -428,7 +428,8 @@ QEX_API void QexSkinningDepthShader_Render(QexShaderModule* module, QexModel* mo
  *  @param context  its size is the screen's, 1 and more
  *  @return the module, owned by the caller; null when memory runs out. */
 QEX_API QexShaderModule* QexBlurShader_CreateProgram(const QexRuntimeContext* context);
-/** Compiles and links into a module's record, whose projection is set; CreateProgram calls it. @return 0. */
+/** Compiles and links into a module's record, whose projection is set; CreateProgram calls it.
+ *  @return 0, or -1 when it cannot be built. */
 QEX_API int32_t QexBlurShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module,
                                            float sigma, float samples);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
@@ -453,7 +454,7 @@ QEX_API void QexBlurShader_SetParameters(QexShaderModule* module, const void* ig
  *  @return the module, owned by the caller; null when memory runs out. */
 QEX_API QexShaderModule* QexDOFShader_CreateProgram(const QexRuntimeContext* context);
 /** Compiles and links into a module's record, with the projection of the module created last; CreateProgram
- *  calls it. @param context  not read  @return 0. */
+ *  calls it. @param context  not read  @return 0, or -1 when it cannot be built. */
 QEX_API int32_t QexDOFShader_SetupProgram(const QexRuntimeContext* context, QexShaderModule* module);
 /** Deletes the module's GL objects, frees it and sets the caller's pointer to null. A null module is fine. */
 QEX_API void QexDOFShader_Release(QexShaderModule** module);

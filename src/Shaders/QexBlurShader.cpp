@@ -104,11 +104,11 @@ void QexBlurShader_Release(QexShaderModule** module) {
 void QexBlurShader_SetParameters(QexShaderModule* module, const void*, float direction, float sigma,
                                  float samples, float blurSize) {
     const QexMatrix projection = ProjectionOf(module);
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kDirection), direction));
+    QEX_GL(QexShaderModule_SetFloat(module, kDirection, direction));
     // GPUs differ in how they compare what is no number.
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSigma), sigma == sigma ? sigma : 0));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kSamples), samples));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kBlurSize), blurSize));
+    QEX_GL(QexShaderModule_SetFloat(module, kSigma, sigma == sigma ? sigma : 0));
+    QEX_GL(QexShaderModule_SetFloat(module, kSamples, samples));
+    QEX_GL(QexShaderModule_SetFloat(module, kBlurSize, blurSize));
     QEX_GL(
         glUniformMatrix4fv(QexShaderModule_Location(module, kScreenProjection), 1, GL_FALSE, projection.m));
 }

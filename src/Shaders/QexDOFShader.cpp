@@ -68,8 +68,8 @@ void QexDOFShader_Release(QexShaderModule** module) {
 }
 
 void QexDOFShader_SetParameters(QexShaderModule* module, float focus, float range) {
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kFocus), focus));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kRange), range));
+    QEX_GL(QexShaderModule_SetFloat(module, kFocus, focus));
+    QEX_GL(QexShaderModule_SetFloat(module, kRange, range));
 }
 
 }  // extern "C"

@@ -51,8 +51,8 @@ QEX_SHADER_MODULE_LIFETIME(QexDepthShader, &kType)
 QEX_SHADER_MODULE_DRAW_MESH(QexDepthShader, &kType)
 
 void QexDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar) {
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kNear), zNear));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
+    QEX_GL(QexShaderModule_SetFloat(module, kNear, zNear));
+    QEX_GL(QexShaderModule_SetFloat(module, kFar, zFar));
     module->slots[kNearValue].value = zNear;
     module->slots[kFarValue].value = zFar;
 }

@@ -58,6 +58,8 @@ struct Made {
     const QexShaderModuleType* type;
     int32_t (*setup)(QexShaderModule*);  // or null
     bool built;                          // whether it had a program when the context was lost
+    uint32_t set;                        // slots whose uniforms have these values
+    float values[QEX_SHADER_SLOTS];
     QexShaderModule module;
 };
 Made* s_Made;
@@ -85,6 +87,8 @@ bool Restore() {
                                       : QexShaderModule_Setup(made->type, &made->module)) == 0;
         made->built = !set;
         whole &= set;
+        for (uint32_t slot = 0; set && made->set >> slot; ++slot)
+            if (made->set >> slot & 1) glUniform1f(made->module.slots[slot].location, made->values[slot]);
     }
     return whole;
 }
@@ -179,6 +183,15 @@ int32_t QexShaderModule_Setup(const QexShaderModuleType* type, QexShaderModule* 
     if (!making.Failed()) return 0;
     QexProgram_Delete(NamesOf(module), false);
     return -1;
+}
+
+void QexShaderModule_SetFloat(QexShaderModule* module, uint32_t slot, float value) {
+    Made* made = *Find(module);
+    if (made) {
+        made->set |= 1u << slot;
+        made->values[slot] = value;
+    }
+    glUniform1f(module->slots[slot].location, value);
 }
 
 void QexShaderModule_Release(const QexShaderModuleType* type, QexShaderModule** module) {

@@ -132,6 +132,9 @@ inline int32_t QexShaderModule_Location(const QexShaderModule* module, uint32_t 
     return module->slots[uniform].location;
 }
 
+// Sets a float of the module's current program; in another context it is set again.
+void QexShaderModule_SetFloat(QexShaderModule* module, uint32_t slot, float value);
+
 // What a Render works with, found once.
 struct QexShaderDraw {
     const QexShaderModuleType* type;

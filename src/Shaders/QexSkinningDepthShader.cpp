@@ -64,8 +64,8 @@ QEX_SHADER_MODULE_LIFETIME(QexSkinningDepthShader, &kType)
 QEX_SHADER_MODULE_THRESHOLD(QexSkinningDepthShader, kThreshold)
 
 void QexSkinningDepthShader_SetParameters(QexShaderModule* module, float zNear, float zFar) {
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kNear), zNear));
-    QEX_GL(glUniform1f(QexShaderModule_Location(module, kFar), zFar));
+    QEX_GL(QexShaderModule_SetFloat(module, kNear, zNear));
+    QEX_GL(QexShaderModule_SetFloat(module, kFar, zFar));
     module->slots[kNearValue].value = zNear;
     module->slots[kFarValue].value = zFar;
 }

@@ -147,7 +147,7 @@ void QexDiagnostics_Refused(uint32_t code, const char* module, const char* file,
 void QexDiagnostics_NoMemory(uint32_t bytes, const char* module, const char* file, int line) {
     char message[48];
     snprintf(message, sizeof message, "%u bytes are not to be had", bytes);
-    Handle(QEX_ERROR_MEMORY, module, file, line, message);
+    if (s_Handler) Handle(QEX_ERROR_MEMORY, module, file, line, message);
 }
 
 void QexDiagnostics_OutOfMemory(const char* module, int line) {

@@ -115,6 +115,10 @@ int32_t Check(const char* function, bool argumentsAreThere, bool programIsThere)
     return kFailed;
 }
 
+bool IsThere(const QexShaderModule* module) {
+    return module && module->program;
+}
+
 }  // namespace
 
 extern "C" {
@@ -229,7 +233,8 @@ int32_t QexPostProcessing_DrawDOF(QexRuntimeContext* context, void* user1, void*
                                   QexSceneCallback callback, float focus, float range, float blurH,
                                   float blurV, float sigma, float samples, int32_t mode, float zNear,
                                   float zFar) {
-    const int32_t problem = Check("QexPostProcessing_DrawDOF", context && callback, DOFShaderProgram);
+    const int32_t problem =
+        Check("QexPostProcessing_DrawDOF", context && callback, IsThere(DOFShaderProgram));
     if (problem) return problem;
     QexRenderTarget* targets = PostProcessingRenderTargets;
     QexTexture* sharp = &targets[kSharp].colorTexture;
@@ -260,7 +265,7 @@ int32_t QexPP_DrawBlurImage(const QexRuntimeContext* context, void*, void*, void
                             float blurH, float blurV, QexTexture* source, QexRenderTarget* first,
                             QexRenderTarget* second) {
     const int32_t problem =
-        Check("QexPP_DrawBlurImage", context && source && first && second, blurShaderProgram);
+        Check("QexPP_DrawBlurImage", context && source && first && second, IsThere(blurShaderProgram));
     if (problem) return problem;
     BeginScene(first);
     const int32_t width = first->colorTexture.width;
@@ -283,7 +288,7 @@ int32_t QexPP_DrawBlurImage(const QexRuntimeContext* context, void*, void*, void
 
 int32_t QexPP_DrawBlurQuad(const QexRuntimeContext* context, QexTexture* texture, float direction,
                            float sigma, float samples, float blurSize, int32_t half) {
-    const int32_t problem = Check("QexPP_DrawBlurQuad", context && texture, blurShaderProgram);
+    const int32_t problem = Check("QexPP_DrawBlurQuad", context && texture, IsThere(blurShaderProgram));
     if (problem) return problem;
     const float scale = half ? 0.5f : 1.0f;
     const float width = static_cast<float>(texture->width) * scale;
@@ -303,7 +308,7 @@ int32_t QexPP_DrawDepthImage(QexRuntimeContext* context, void*, void*, void*, Qe
                              float zNear, float zFar, QexRenderTarget* target) {
     static const float kWhite[3] = {1, 1, 1};
     const int32_t problem = Check("QexPP_DrawDepthImage", context && callback && target,
-                                  depthShaderProgram && skinningDepthShaderProgram);
+                                  IsThere(depthShaderProgram) && IsThere(skinningDepthShaderProgram));
     if (problem) return problem;
     QexRenderState_UseProgram(depthShaderProgram->program);
     QexDepthShader_SetParameters(depthShaderProgram, zNear, zFar);
@@ -318,7 +323,8 @@ int32_t QexPP_DrawDepthImage(QexRuntimeContext* context, void*, void*, void*, Qe
 
 int32_t QexPP_DrawDOF(const QexRuntimeContext* context, void*, void*, void*, float focus, float range,
                       QexTexture* sharp, QexTexture* depth, QexTexture* blurred, int32_t) {
-    const int32_t problem = Check("QexPP_DrawDOF", context && sharp && depth && blurred, DOFShaderProgram);
+    const int32_t problem =
+        Check("QexPP_DrawDOF", context && sharp && depth && blurred, IsThere(DOFShaderProgram));
     if (problem) return problem;
     QexRenderState_UseProgram(DOFShaderProgram->program);
     QexDOFShader_SetParameters(DOFShaderProgram, focus, range);

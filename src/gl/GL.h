@@ -14,6 +14,9 @@ extern uint32_t g_QexReadsErrors;
 // Reads the GL's error, and reports one with its place.
 void QexGL_Check(const char* module, const char* file, int line);
 
+// Reads the GL's error where one is no fault; a lost context is found there, too.
+uint32_t QexGL_TakeError();
+
 #if QEX_GL_CHECKS
 #define QEX_GL_CHECK()                                                     \
     do {                                                                   \

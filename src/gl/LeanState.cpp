@@ -81,6 +81,7 @@ uint32_t ElementsOf(const QexMeshBuffers& mesh) {
 
 // Makes the mesh's vertex array object and leaves it bound.
 void MakeVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
+    const QexMaking making;
     QexExtensions_Get()->genVertexArrays(1, mesh.vertexArray);
     BindVertexArray(*mesh.vertexArray);
     BindArrayBuffer(mesh.vertexBuffer);
@@ -88,6 +89,7 @@ void MakeVertexArray(const QexMeshBuffers& mesh, uint32_t elements) {
     for (GLuint i = 0; elements >> i; ++i)
         if (elements >> i & 1) glEnableVertexAttribArray(i);
     SetPointers(mesh.attributes, elements);
+    QEX_GL_CHECK();
 }
 
 void BindBuffers(const QexMeshBuffers& mesh, uint32_t elements) {
@@ -118,13 +120,15 @@ QexContextPart s_Part = {kRankOthers, LoseBuffers, nullptr, nullptr, nullptr, fa
 uint32_t g_QexLean = 0;
 uint32_t g_QexReadsErrors = 1;
 
-void QexGL_Check(const char* module, const char* file, int line) {
+uint32_t QexGL_TakeError() {
     const GLenum error = glGetError();
-    if (error == GL_NO_ERROR) return;
-    if (QexContext_IsLoss(error))
-        ++g_QexFaults;
-    else
-        QexDiagnostics_GLError(error, module, file, line);
+    if (error != GL_NO_ERROR && QexContext_IsLoss(error)) ++g_QexFaults;
+    return error;
+}
+
+void QexGL_Check(const char* module, const char* file, int line) {
+    const uint32_t error = QexGL_TakeError();
+    if (error != GL_NO_ERROR && !g_QexContextLost) QexDiagnostics_GLError(error, module, file, line);
 }
 
 void QexLeanState_BindMesh(const QexMeshBuffers& mesh, uint32_t needed) {
@@ -169,10 +173,15 @@ GLuint QexLeanState_QuadIndices() {
         static const uint16_t corners[] = {0, 1, 2, 2, 1, 3};
         for (int c = 0; c < 6; ++c) indices[i][c] = static_cast<uint16_t>(4 * i + corners[c]);
     }
+    const QexMaking making;
     glGenBuffers(1, &s_QuadIndices);
     BindVertexArray(0);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, s_QuadIndices);
-    glBufferData(GL_ELEMENT_ARRAY_BUFFER, sizeof indices, indices, GL_STATIC_DRAW);
+    QEX_GL(glBufferData(GL_ELEMENT_ARRAY_BUFFER, sizeof indices, indices, GL_STATIC_DRAW));
+    if (making.Failed()) {
+        if (!g_QexContextLost) glDeleteBuffers(1, &s_QuadIndices);
+        s_QuadIndices = 0;
+    }
     return s_State.indexBuffer = s_QuadIndices;
 }
 

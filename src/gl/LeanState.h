@@ -46,7 +46,7 @@ GLuint QexLeanState_StreamBuffer();
 
 // Indices of as many quads as one draw shows, two triangles each: 0 1 2, 2 1 3.
 constexpr uint32_t kQuadsOfADraw = 300;
-GLuint QexLeanState_QuadIndices();
+GLuint QexLeanState_QuadIndices();  // 0 where they cannot be made
 
 // Puts vertex array object, attribute arrays and buffers where described drawing has them.
 void QexLeanState_Leave();

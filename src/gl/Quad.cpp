@@ -72,7 +72,8 @@ void QexQuads_Send(const QexQuads& quads, uint32_t buffer) {
 }
 
 void QexQuads_DrawSent(const QexQuads& quads, uint32_t buffer, uint32_t first, uint32_t count) {
-    const uint32_t stride = BytesOfAVertex(quads);
+    const uint32_t stride = BytesOfAVertex(quads), indices = QexLeanState_QuadIndices();
+    if (!indices) return;
     QexFloatAttribute attributes[kQuadArrays];
     uint32_t offset = 4 * first * stride;
     for (int32_t i = 0; i < kQuadArrays; ++i) {
@@ -80,6 +81,6 @@ void QexQuads_DrawSent(const QexQuads& quads, uint32_t buffer, uint32_t first, u
         attributes[i] = {array.components ? array.location : -1, array.components, offset};
         offset += static_cast<uint32_t>(array.components) * sizeof(float);
     }
-    QexLeanState_BindFloats({buffer, QexLeanState_QuadIndices(), stride, attributes, kQuadArrays});
+    QexLeanState_BindFloats({buffer, indices, stride, attributes, kQuadArrays});
     glDrawElements(GL_TRIANGLES, static_cast<GLsizei>(6 * count), GL_UNSIGNED_SHORT, nullptr);
 }

@@ -2,6 +2,8 @@
 // time.
 #include "model/Buffers.h"
 
+#include <algorithm>
+
 #include "base/Memory.h"
 #include "gl/Context.h"
 #include "gl/GL.h"
@@ -31,6 +33,7 @@ Kept* s_Kept;
 
 bool Note(const QexModel& model);
 void Drop(const uint32_t* vertex);
+void DropOutdated(const QexModel& model);
 
 // Uploads to the buffer all at once, or the next piece.
 QexStep Fill(QexBufferLoad* load, GLenum target, uint32_t buffer, const void* data, uint64_t bytes) {
@@ -90,6 +93,7 @@ bool QexBufferLoad_Begin(QexBufferLoad* load, QexModel* model, uint32_t piece) {
     const QexMaking making;
     if (!model->vertexBuffers || !model->indexBuffers || !Note(*model)) return false;
     QEX_GL(glGenBuffers(static_cast<GLsizei>(count), model->vertexBuffers));
+    DropOutdated(*model);
     return !making.Failed();
 }
 
@@ -177,6 +181,24 @@ void Drop(const uint32_t* vertex) {
     if (!kept) return;
     *at = kept->next;
     QexMemory_Free(kept);
+}
+
+bool Has(const Kept& kept, uint32_t name) {
+    const uint32_t* end = kept.vertex + kept.count;
+    return std::find(static_cast<const uint32_t*>(kept.vertex), end, name) != end;
+}
+
+// A GL gives out no name that is in use: who has one of the model's comes from an ended context.
+void DropOutdated(const QexModel& model) {
+    for (uint32_t i = 0; i < model.scene.meshCount; ++i)
+        for (Kept **at = &s_Kept, *kept; (kept = *at);) {
+            if (kept->vertex == model.vertexBuffers || !Has(*kept, model.vertexBuffers[i])) {
+                at = &kept->next;
+                continue;
+            }
+            *at = kept->next;
+            QexMemory_Free(kept);
+        }
 }
 
 }  // namespace

@@ -155,7 +155,7 @@ bool Complete(QexModel* model, QexTexture* texture, const QexMeshColours& colour
 
 extern "C" int32_t QexModel_CreateFromMesh(QexModel* model, const QexMesh* mesh, QexTexture* texture) {
     if (!model) return Refuse("no model");
-    QexModel_Create(model);
+    if (QexModel_Create(model) != 0) return -1;
     if (!mesh || !mesh->positions || (mesh->indexCount && !mesh->indices))
         return Refuse("no mesh, no positions, or no indices");
     if (!Check(*mesh)) return -1;

@@ -14,6 +14,8 @@
 #include "Qex/pod.h"
 #include "Qex/renderer.h"
 
+#define QEX_MODULE "src/QexModel"
+
 namespace {
 
 constexpr uint32_t kMostVertices = 65536;  // that 16-bit indices reach
@@ -72,6 +74,8 @@ bool Fill(QexInstanceMesh* out, const QexPODMesh& mesh, const QexMeshUpload& upl
                  GL_STATIC_DRAW);
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
+    QEX_GL_CHECK();
+    if (making.Failed()) return false;  // both go with the model
     out->indexCount = corners;
     out->count = count;
     return true;

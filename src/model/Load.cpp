@@ -48,8 +48,8 @@ struct Load {
     QexMaterialLoad materials = {};
 };
 
-// Those that do not run now.
-Load* s_Loads;
+// Those that do not run now, and those that do: more than one where a hook loads another model.
+Load *s_Loads, *s_Running;
 
 // ---- Stages ----
 
@@ -248,6 +248,7 @@ void Begin(Load* load, QexModel* model) {
 }
 
 int32_t BeginFile(Load* load, QexModel* model, const char* directory, const char* file) {
+    if (QexModelLoad_Runs(model, "QexModel_LoadContent")) return -1;
     Begin(load, model);
     if (!OpenFile(load, model, directory, file)) return Abandon(load);
     snprintf(load->directory, kPathSize, "%s", directory);
@@ -255,6 +256,7 @@ int32_t BeginFile(Load* load, QexModel* model, const char* directory, const char
 }
 
 int32_t BeginMemory(Load* load, QexModel* model, const void* data, uint32_t size, QexNameCache* cache) {
+    if (QexModelLoad_Runs(model, "QexModel_LoadContentFromCache")) return -1;
     Begin(load, model);
     load->fromCache = true;
     load->cache = cache;
@@ -264,10 +266,13 @@ int32_t BeginMemory(Load* load, QexModel* model, const void* data, uint32_t size
 // At least one step, and others until that time.
 QexStep RunUntil(Load* load, uint64_t end) {
     QexStep step;
+    load->next = s_Running;
+    s_Running = load;
     do {
         step = kStages[load->stage].step(load);
         if (step == QexStep::kDone && ++load->stage < kStageCount) step = QexStep::kMore;
     } while (step == QexStep::kMore && (end == kNever || QexTime_Monotonic() < end));
+    s_Running = load->next;
     return step;
 }
 
@@ -339,6 +344,13 @@ uint64_t EndOf(float milliseconds) {
 
 }  // namespace
 
+bool QexModelLoad_Runs(const QexModel* model, const char* function) {
+    const Load* load = s_Running;
+    while (load && load->model != model) load = load->next;
+    if (load) QexError(QEX_TAG, "<%s> refused: the model's own load is calling a hook", function);
+    return load;
+}
+
 void QexModelLoad_Drop(const QexModel* model) {
     Load* load = Take(model);
     if (!load) return;
@@ -351,12 +363,14 @@ extern "C" {
 
 int32_t QexModel_LoadFromFile(QexModel* model, const char* directory, const char* file) {
     Load load;
+    if (QexModelLoad_Runs(model, "QexModel_LoadFromFile")) return -1;
     QexModel_Discard(model);
     return ReadAll(&load, model, OpenFile(&load, model, directory, file));
 }
 
 int32_t QexModel_LoadFromMemory(QexModel* model, const void* data, uint32_t size) {
     Load load;
+    if (QexModelLoad_Runs(model, "QexModel_LoadFromMemory")) return -1;
     QexModel_Discard(model);
     return ReadAll(&load, model, OpenMemory(&load, model, data, size));
 }

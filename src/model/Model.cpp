@@ -33,11 +33,14 @@ void QexModel_Discard(QexModel* model) {
 extern "C" {
 
 int32_t QexModel_Create(QexModel* model) {
+    if (QexModelLoad_Runs(model, "QexModel_Create")) return -1;
+    QexModelLoad_Drop(model);
     memset(model, 0, sizeof *model);
     return 0;
 }
 
 void QexModel_Unload(QexModel* model) {
+    if (QexModelLoad_Runs(model, "QexModel_Unload")) return;
     const bool loaded = model->scene.runtime != nullptr;
     QexModel_Discard(model);
     if (!loaded || model->flags & QEX_MODEL_NO_SHADERS) return;

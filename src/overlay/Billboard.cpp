@@ -210,6 +210,7 @@ void QexBillboard_Draw(QexBillboard* billboard, const QexCamera* camera) {
         QexBillboardBatch_Draw();
         return;
     }
+    if (!g_BillboardShaderProgramID) return;  // of a lost context
     QexMatrix mvp;
     BuildAnyMVP(&mvp, *billboard, *camera);
     QexRenderState_UseProgram(g_BillboardShaderProgramID);

@@ -60,11 +60,14 @@ QexContextPart s_Part = {kRankPrograms, Forget, nullptr, nullptr, nullptr, false
 
 bool Create() {
     QexContext_Register(&s_Part);
-    if (s_GL.program || s_GL.failed) return !s_GL.failed;
+    if (s_GL.program || s_GL.failed || g_QexContextLost) return s_GL.program != 0;
     const QexMaking making;
     s_GL.failed = !QexProgram_Build({"QexBillboard_Draw", kVertexSource, kFragmentSource, kAttributes, 2},
                                     {&s_GL.program, &s_GL.vertexShader, &s_GL.fragmentShader});
-    if (s_GL.failed) return false;
+    if (s_GL.failed) {
+        s_GL.failed = !g_QexContextLost;
+        return false;
+    }
     QexProgramLookup{"src/QexBillboard", s_GL.program, false}.SetSampler({"sTexture", kDiffuseUnit});
     return true;
 }
@@ -87,7 +90,8 @@ void QexBillboardBatch_Add(const QexBillboard& billboard, const QexMatrix& mvp) 
 }
 
 void QexBillboardBatch_Draw() {
-    if (!s_Count || !Create()) {
+    const GLuint indices = s_Count && Create() ? QexLeanState_QuadIndices() : 0;
+    if (!indices) {
         s_Count = 0;
         return;
     }
@@ -98,7 +102,7 @@ void QexBillboardBatch_Draw() {
     QexLeanState_BindTexture(kDiffuseUnit, GL_TEXTURE_2D, texture->glName);
     const GLuint buffer = QexLeanState_StreamBuffer();
     QexLeanState_Fill(buffer, s_Corners, sizeof s_Corners[0] * s_Count, GL_STREAM_DRAW);
-    QexLeanState_BindFloats({buffer, QexLeanState_QuadIndices(), sizeof(Corner), kLayout, 2});
+    QexLeanState_BindFloats({buffer, indices, sizeof(Corner), kLayout, 2});
     glDisable(GL_CULL_FACE);
     glDrawElements(GL_TRIANGLES, 6 * count, GL_UNSIGNED_SHORT, nullptr);
     glEnable(GL_CULL_FACE);

@@ -134,7 +134,10 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
     QexContext_Register(&s_Part);
     QexKeptTexture_Drop(name);
     Kept* kept = QexMemory_AllocZeroed<Kept>(1);
-    if (!kept) return false;
+    if (!kept) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        return false;
+    }
     kept->next = s_Kept[name % kRows];
     s_Kept[name % kRows] = kept;
     kept->name = name;
@@ -146,7 +149,10 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
     const bool copied = s_Path ? Copy(&kept->path, s_Path, strlen(s_Path) + 1)
                                : !s_Keeping || !source.bytes || Copy(&bytes, source.bytes, source.size);
     kept->source.bytes = bytes;
-    if (!copied) QexKeptTexture_Drop(name);
+    if (!copied) {
+        QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);
+        QexKeptTexture_Drop(name);
+    }
     return copied;
 }
 

@@ -124,7 +124,7 @@ QexStep UploadFace(QexTextureLoad* load, const char** fault) {
         glCompressedTexImage2D(target, l, ktx.header.glInternalFormat, static_cast<GLsizei>(level.width),
                                static_cast<GLsizei>(level.height), 0, static_cast<GLsizei>(level.bytes),
                                data);
-        *fault = glGetError() == GL_NO_ERROR ? nullptr : "is not of its size";
+        *fault = QexGL_TakeError() == GL_NO_ERROR ? nullptr : "is not of its size";
     } else {
         *fault = UploadPixels(ktx, target, l, level, data);
     }

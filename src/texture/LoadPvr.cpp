@@ -162,7 +162,7 @@ QexStep Upload(QexTextureLoad* load) {
         if (step != QexStep::kDone) return step;
     }
 #if QEX_GL_CHECKS
-    if (glGetError() != GL_NO_ERROR) {
+    if (QexGL_TakeError() != GL_NO_ERROR) {
         QexTextureLoad_Refuse(kFunction, "glTexImage2D() failed.");
         return QexStep::kFailed;
     }

@@ -75,6 +75,7 @@ void QexTextureLoad_End(QexTextureLoad* load) {
 void QexTextureLoad_Resume(const QexTextureLoad* load) {
     if (!load->name) return;
     QEX_GL(glPixelStorei(GL_UNPACK_ALIGNMENT, 1));
+    QexLeanState_ForgetTextures();
     QexRenderState_Bind(QexTexture_Target(load->texture), load->name);
 }
 
@@ -126,7 +127,7 @@ bool QexTextureLoad_TakesMipmaps(uint32_t width, uint32_t height) {
 
 void QexTextureLoad_GenerateMipmaps(uint32_t target) {
     glGenerateMipmap(target);
-    glGetError();  // of a GL that knows mipmaps of powers of two only; level 0 is there
+    QexGL_TakeError();  // of a GL that knows mipmaps of powers of two only; level 0 is there
 }
 
 uint32_t QexTextureLoad_FaceTarget(bool cube, uint32_t face) {

@@ -144,6 +144,46 @@ TEST_F(LostContext, TheApplicationIsAskedForItsMemory) {
     QexEngine_Shutdown(&runtime);
 }
 
+// What modules were told once; and the buffers of a model that an ended context left behind, which were under
+// the names of a new one's.
+TEST_F(LostContext, ValuesAndNamesOfOld) {
+    QexRuntimeContext runtime;
+    QexEngineConfig config = SurfaceConfig();
+    Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+    QexModel models[2];
+    QexVec3 corners[] = {{0, 0, 0}, {1, 0, 0}, {0, 1, 0}};
+    QexMesh triangle = {};
+    triangle.positions = corners;
+    triangle.vertexCount = 3;
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    ASSERT_EQ(QexModel_CreateFromMesh(&models[0], &triangle, nullptr), 0);
+    QexEngine_Shutdown(&runtime);
+    Replace();
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    QexModel_Create(&models[1]);
+    ASSERT_EQ(QexModel_LoadContent(&models[1], OutputPath("").c_str(), "worm.pod"), 0);
+    ASSERT_EQ(models[0].vertexBuffers[0], models[1].vertexBuffers[0]);
+    QexShaderModule* depth = QexDepthShader_CreateProgram();
+    QexDepthShader_SetParameters(depth, 2, 30);
+    EXPECT_EQ(LoseAndRestore(), 0);
+    GLint bytes = 0;
+    glBindBuffer(GL_ARRAY_BUFFER, models[1].vertexBuffers[0]);
+    glGetBufferParameteriv(GL_ARRAY_BUFFER, GL_BUFFER_SIZE, &bytes);
+    const QexPODMesh& mesh = models[1].scene.meshes[0];
+    EXPECT_EQ(static_cast<uint32_t>(bytes), mesh.vertexCount * mesh.vertices.stride);
+    float ends[2] = {};
+    glGetUniformfv(depth->program, glGetUniformLocation(depth->program, "near"), &ends[0]);
+    glGetUniformfv(depth->program, glGetUniformLocation(depth->program, "far"), &ends[1]);
+    EXPECT_EQ(ends[0], 2);
+    EXPECT_EQ(ends[1], 30);
+    QexEngine_ContextLost();
+    QexDepthShader_Release(&depth);
+    for (QexModel& model : models) QexModel_Unload(&model);
+    QexEngine_Shutdown(&runtime);
+    Replace();
+    EXPECT_EQ(QexEngine_ContextRestored(), 0);
+}
+
 // What was being made when the context went is given up by the next call.
 TEST_F(LostContext, ALoadInPartsFails) {
     QexRuntimeContext runtime;

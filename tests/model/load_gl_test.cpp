@@ -285,6 +285,18 @@ TEST_F(LoadTest, GivingUpLeavesNothingAtAnyPoint) {
         [&] { QexModel_BeginLoad(&model_, kFolder.c_str(), "rich.pod"); },
         [&] { QexModel_DownloadGeometry(&model_); },
     };
+    // Its own hook does not end a load, nor begin another.
+    model_.meshNodeLoadedHook = [](QexModel* model, QexPODMesh*, uint32_t) -> int32_t {
+        QexModel_Unload(model);
+        EXPECT_EQ(QexModel_LoadContent(model, kFolder.c_str(), "small.pod"), -1);
+        return QexModel_ContinueLoad(model, 0, nullptr);
+    };
+    {
+        BothOutputs outputs;
+        EXPECT_EQ(QexModel_LoadContent(&model_, kFolder.c_str(), "small.pod"), 0);
+    }
+    EXPECT_NE(model_.vertexBuffers, nullptr);
+    QexModel_Unload(&model_);
     for (const auto& [name, stride] : {std::pair("small.pod", 1), std::pair("rich.pod", 29)})
         for (int32_t steps = 0, result = 1; result == 1; steps += stride) {
             BothOutputs outputs;
