@@ -101,6 +101,7 @@ void gltapReset(void) {
     ForgetRecording();
     ForgetInjections();
     ForgetPoorer();
+    ForgetReads();
     ForgetObjects();
     NullForgetPrograms();
     ResetState();

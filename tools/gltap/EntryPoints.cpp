@@ -104,6 +104,7 @@ __attribute__((noinline)) typename Function<function>::Result Watched(A... argum
     if ((tap.watch & kInject) && TakeInjection(function)) return Result();
     // The extra element keeps the array from being empty.
     const gltapValue values[] = {ToValue(arguments)..., ToValue(0)};
+    if (tap.watch & kReads) CheckRead(function, values);
     if constexpr (std::is_void_v<Result>) {
         Perform<function>(arguments...);
         Observe(function, values, ToValue(0));

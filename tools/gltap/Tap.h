@@ -67,7 +67,7 @@ struct FunctionInfo {
 extern const FunctionInfo kFunctions[kFunctionCount];
 
 // Reasons for an entry point to leave its short path.
-enum Watch : uint32_t { kRecord = 1, kLog = 2, kInject = 4 };
+enum Watch : uint32_t { kRecord = 1, kLog = 2, kInject = 4, kReads = 8 };
 
 struct Tap {
     gltapMode mode;
@@ -92,6 +92,10 @@ bool TakeInjection(Fn function);
 void ForgetRecording();
 void ForgetInjections();
 size_t ImageBytes(int64_t width, int64_t height, int64_t format, int64_t type, int64_t alignment);
+
+// Reads.cpp: looks at a call before it is made.
+void CheckRead(Fn function, const gltapValue* arguments);
+void ForgetReads();
 
 // Poorer.cpp: changes the answer of glGetIntegerv and of glGetString, where it is to.
 void MakePoorer(GLenum name, GLint* out);

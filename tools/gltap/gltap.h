@@ -109,6 +109,16 @@ GLTAP_API int gltapInjectError(const char* function, uint32_t nth, uint32_t erro
 /* Injections that still wait for their call. */
 GLTAP_API size_t gltapPendingInjections(void);
 
+/* ---- What a draw reads ---- */
+
+/* From now on, until gltapReset, keeps what buffers hold and looks at each draw before it is made: its
+ * indices and all vertices that they name lie within their buffers, and there is a program. What lies in
+ * memory of the program, images too, is read, so that a sanitizer says where that is too short. To be called
+ * before the first buffer is made. */
+GLTAP_API void gltapBeginReads(void);
+/* The number of faults since then; the first one as a line. */
+GLTAP_API size_t gltapReadFaults(char* text, size_t size);
+
 /* ---- A poorer GL ---- */
 
 /* From now on glGetIntegerv gives this value for a name: a limit lower than the driver's, or a number of
