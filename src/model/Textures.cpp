@@ -11,6 +11,7 @@
 #include "Qex/resources.h"
 #include "Qex/shader_modules.h"
 #include "Qex/textures.h"
+#include "texture/Kept.h"
 
 #define QEX_MODULE "src/QexModel"
 
@@ -75,11 +76,40 @@ QexTexture* FindInCache(QexNameCache* cache, const char* name) {
     return static_cast<QexTexture*>(slot);
 }
 
+// Has a model's hook load a texture again. It finds its record as it did before: the last one in the array.
+int32_t LoadByHook(void* owner, uint32_t name, const char* path, QexTexture* texture) {
+    QexModel* model = static_cast<QexModel*>(owner);
+    uint32_t material = 0;
+    const uint32_t count = model->textures ? model->scene.materialCount : 0;
+    while (material < count && !(model->textures[material] && model->textures[material]->glName == name))
+        ++material;
+    QexScratch<QexTexture*> entries;
+    if (material == count || !model->loadTextureHook || !entries.Alloc(count)) return -1;
+    for (uint32_t i = 0; i < count; ++i) entries[i] = i < material ? model->textures[i] : nullptr;
+    entries[material] = texture;
+    char rewritten[kPathSize];
+    snprintf(rewritten, kPathSize, "%s", path);
+    QexTexture** textures = model->textures;
+    model->textures = entries.Get();
+    const int32_t dealt = model->loadTextureHook(model, rewritten, kPathSize - 1);
+    model->textures = textures;
+    return dealt && texture->glName ? 0 : -1;
+}
+
+bool AskHook(QexModel* model, char* path) {
+    if (!model->loadTextureHook) return false;
+    char given[kPathSize];
+    snprintf(given, kPathSize, "%s", path);
+    const QexKeptOwner owner({LoadByHook, model, given});
+    const bool dealt = model->loadTextureHook(model, path, kPathSize - 1) != 0;
+    path[kPathSize - 1] = 0;
+    return dealt;
+}
+
 // Asks the hook, then the cache.
 QexStep TakeFromCache(QexMaterialLoad* load, QexModel* model) {
     char* path = load->paths[0];
-    if (model->loadTextureHook && model->loadTextureHook(model, path, kPathSize - 1)) return QexStep::kDone;
-    path[kPathSize - 1] = 0;
+    if (AskHook(model, path)) return QexStep::kDone;
     model->textures[load->material] = FindInCache(load->cache, path);
     model->alphaTextures[load->material] = FindInCache(load->cache, load->paths[1]);
     return QexStep::kDone;
@@ -94,10 +124,7 @@ QexStep NameFiles(QexMaterialLoad* load, QexModel* model) {
     QexTexture*& texture = model->textures[load->material];
     texture = NewTexture();
     if (!texture) return QexStep::kDone;
-    if (model->loadTextureHook && model->loadTextureHook(model, load->paths[0], kPathSize - 1))
-        return QexStep::kDone;
-    load->paths[0][kPathSize - 1] = 0;
-    return QexStep::kMore;
+    return AskHook(model, load->paths[0]) ? QexStep::kDone : QexStep::kMore;
 }
 
 // The entry of the file that the load has come to: the diffuse texture's first.
@@ -189,6 +216,7 @@ void QexModel_UnloadTextures(QexModel* model) {
         if (model->alphaTextures) FreeTexture(model->alphaTextures[i], true);
     }
     model->flags &= ~QEX_MODEL_OWNS_TEXTURES;
+    if (model->textures) QexKeptOwner_Forget(model);
     QexMemory_Free(model->textures);
     QexMemory_Free(model->alphaTextures);
     model->textures = nullptr;

@@ -19,7 +19,9 @@ struct Kept {
     Kept* next;
     uint32_t name, target;
     QexKeptSource source;  // its bytes are ours, or null
-    char* path;            // or null
+    char* path;            // of a file, or given to the owner's hook; or null
+    QexKeptLoader loader;  // the owner's, or null
+    void* owner;
     uint8_t filter, wrap;  // codes; 0: as the source says
     uint32_t context;      // that it was made in
 };
@@ -30,6 +32,7 @@ uint32_t s_Renewed;  // the texture that is being made again
 bool s_Handed;       // its name, to who makes it
 bool s_Keeping;
 const char* s_Path;
+QexKeptHook s_Hook;
 QexTextureSource s_Source;
 void* s_SourceUser;
 
@@ -76,17 +79,22 @@ int32_t Load(QexTexture* texture, const Kept& kept) {
 
 bool RestoreOne(const Kept& kept) {
     QexTexture texture = {};
-    const bool knows = kept.source.bytes || kept.path || kept.source.kind >= kKeptTarget;
+    const bool knows = kept.source.bytes || (kept.path && !kept.loader) || kept.source.kind >= kKeptTarget;
     s_Renewed = kept.name;
     s_Handed = false;
     int32_t result = -1;
-    if (knows)
+    if (kept.loader)
+        result = kept.loader(kept.owner, kept.name, kept.path, &texture);
+    else if (knows)
         result = Load(&texture, kept);
-    else if (s_Source)
+    if (!knows && !texture.glName && s_Source) {
+        s_Handed = false;
         result = s_Source(s_SourceUser, kept.name, &texture);
+    }
     if (result != 0 || !texture.glName)
         QexError(QEX_TAG, "<QexEngine_ContextRestored> texture %u %s", kept.name,
-                 knows || s_Source ? "could not be loaded again" : "came from memory that was not kept");
+                 knows || kept.loader || s_Source ? "could not be loaded again"
+                                                  : "came from memory that was not kept");
     s_Renewed = 0;
     if (result != 0 || !texture.glName) {
         QexContext_ReserveTexture(kept.target, kept.name);  // or another texture would get it
@@ -119,6 +127,23 @@ QexKeptPath::~QexKeptPath() {
     s_Path = before_;
 }
 
+QexKeptOwner::QexKeptOwner(const QexKeptHook& hook) : before_(s_Hook) {
+    s_Hook = hook;
+}
+QexKeptOwner::~QexKeptOwner() {
+    s_Hook = before_;
+}
+
+void QexKeptOwner_Forget(const void* owner) {
+    for (Kept* row : s_Kept)
+        for (; row; row = row->next) {
+            if (row->owner != owner) continue;
+            row->loader = nullptr;
+            row->owner = nullptr;
+            QexMemory_FreeArray(row->path);
+        }
+}
+
 uint32_t QexKeptTexture_NewName() {
     GLuint name = s_Renewed;
     // Once: what a source makes besides has a name of its own.
@@ -146,8 +171,14 @@ bool QexKeptTexture_Note(uint32_t name, uint32_t target, const QexKeptSource& so
     kept->source = source;
     kept->source.bytes = nullptr;
     uint8_t* bytes = nullptr;
-    const bool copied = s_Path ? Copy(&kept->path, s_Path, strlen(s_Path) + 1)
-                               : !s_Keeping || !source.bytes || Copy(&bytes, source.bytes, source.size);
+    const char* path = s_Path;
+    if (!path && s_Hook.loader && !(s_Keeping && source.bytes)) {
+        path = s_Hook.path;
+        kept->loader = s_Hook.loader;
+        kept->owner = s_Hook.owner;
+    }
+    const bool copied = path ? Copy(&kept->path, path, strlen(path) + 1)
+                             : !s_Keeping || !source.bytes || Copy(&bytes, source.bytes, source.size);
     kept->source.bytes = bytes;
     if (!copied) {
         QexDiagnostics_OutOfMemory(QEX_MODULE, __LINE__);

@@ -52,3 +52,27 @@ class QexKeptPath {
   private:
     const char* before_;
 };
+
+// Loads a texture of that name again into an empty record, as its owner's hook did, which was given that
+// path. 0, or another value when the owner has no such texture any more.
+using QexKeptLoader = int32_t (*)(void* owner, uint32_t name, const char* path, QexTexture* texture);
+
+struct QexKeptHook {
+    QexKeptLoader loader;
+    void* owner;
+    const char* path;
+};
+
+// While it lives, textures from memory of which no copy is kept are the owner's to load again.
+class QexKeptOwner {
+  public:
+    explicit QexKeptOwner(const QexKeptHook& hook);
+    ~QexKeptOwner();
+    QexKeptOwner(const QexKeptOwner&) = delete;
+    QexKeptOwner& operator=(const QexKeptOwner&) = delete;
+
+  private:
+    QexKeptHook before_;
+};
+// An owner that goes.
+void QexKeptOwner_Forget(const void* owner);

@@ -110,7 +110,7 @@ TEST_F(LostContext, TheApplicationIsAskedForItsMemory) {
     QexEngine_KeepTextures(0);
     QexRuntimeContext runtime;
     QexEngineConfig config = SurfaceConfig();
-    Capture quiet(STDERR_FILENO);
+    Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
     ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
     QexTexture texture = SolidTexture({10, 200, 30, 255});
     QexTexture_SetFilter(&texture, QEX_FILTER_LINEAR);
@@ -135,6 +135,27 @@ TEST_F(LostContext, TheApplicationIsAskedForItsMemory) {
     EXPECT_EQ(LoseAndRestore(), 0);
     EXPECT_EQ(asked, texture.glName);
     EXPECT_EQ(draw(), (Rgba{10, 200, 30, 255}));
+    // A model's hook is asked before it, with the same path and for the same record.
+    static std::string paths;
+    paths.clear();
+    QexModel model;
+    QexModel_Create(&model);
+    model.loadTextureHook = [](QexModel* of, char* path, int32_t) -> int32_t {
+        uint32_t last = of->scene.materialCount;
+        while (last > 0 && !of->textures[last - 1]) --last;
+        paths += std::to_string(last) + path + " ";
+        *of->textures[last - 1] = SolidTexture({1, 2, 3, 255});
+        return 1;
+    };
+    ASSERT_EQ(QexModel_LoadContent(&model, OutputPath("").c_str(), "worm.pod"), 0);
+    const std::string loaded = paths;
+    EXPECT_NE(loaded, "");
+    paths.clear();
+    asked = 0;
+    EXPECT_EQ(LoseAndRestore(), 0);
+    EXPECT_EQ(paths, loaded);
+    EXPECT_EQ(asked, texture.glName);
+    QexModel_Unload(&model);
     GLint filter = 0;
     glBindTexture(GL_TEXTURE_2D, texture.glName);
     glGetTexParameteriv(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, &filter);
