@@ -92,6 +92,15 @@ QEX_API void QexEngine_ContextLost(void);
  *  is not drawn; or when the context was lost again: call this again in the next one. */
 QEX_API int32_t QexEngine_ContextRestored(void);
 
+/** The same a few milliseconds at a time, so that an application may show that it goes on: to be called until
+ *  it gives another result than 1. Until then models are not drawn, nor what has no program again yet;
+ * records may be made and released.
+ *  @param milliseconds  after which no other piece is begun: a block of 128 kB, a mip level, a program
+ *  @param progress      out, how far the parts of the engine are, 0 to 1, or null
+ *  @return 1 when there is more to do, else QexEngine_ContextRestored's result, which does the rest at once
+ */
+QEX_API int32_t QexEngine_ContinueRestore(float milliseconds, float* progress);
+
 /** @return 1 from a loss, told or found, until the context is restored, else 0. */
 QEX_API uint32_t QexEngine_IsContextLost(void);
 

@@ -58,6 +58,7 @@ struct Made {
     const QexShaderModuleType* type;
     int32_t (*setup)(QexShaderModule*);  // or null
     bool built;                          // whether it had a program when the context was lost
+    uint32_t context;                    // in which it was made again
     uint32_t set;                        // slots whose uniforms have these values
     float values[QEX_SHADER_SLOTS];
     QexShaderModule module;
@@ -79,21 +80,21 @@ void Forget() {
     }
 }
 
-bool Restore() {
-    bool whole = true;
+QexStep Restore(uint32_t) {
     for (Made* made = s_Made; made; made = made->next) {
-        if (!made->built) continue;
+        if (!made->built || made->context == g_QexContexts) continue;
+        made->context = g_QexContexts;
         const bool set = (made->setup ? made->setup(&made->module)
                                       : QexShaderModule_Setup(made->type, &made->module)) == 0;
         made->built = !set;
-        whole &= set;
         for (uint32_t slot = 0; set && made->set >> slot; ++slot)
             if (made->set >> slot & 1) glUniform1f(made->module.slots[slot].location, made->values[slot]);
+        return set ? QexStep::kMore : QexStep::kFailed;
     }
-    return whole;
+    return QexStep::kDone;
 }
 
-QexContextPart s_Part = {kRankPrograms, Forget, nullptr, Restore, nullptr, false};
+QexContextPart s_Part = {kRankPrograms, Forget, nullptr, nullptr, nullptr, false, Restore};
 
 QexProgramNames NamesOf(QexShaderModule* module) {
     return {&module->program, &module->vertexShader, &module->fragmentShader};

@@ -79,6 +79,13 @@ uint64_t QexTime_Monotonic() {
     return static_cast<uint64_t>(now.tv_sec) * 1000000000 + static_cast<uint64_t>(now.tv_nsec);
 }
 
+uint64_t QexTime_In(float milliseconds) {
+    const uint64_t now = QexTime_Monotonic();
+    if (!(milliseconds > 0)) return now;
+    return milliseconds < 1e9f ? now + static_cast<uint64_t>(static_cast<double>(milliseconds) * 1e6)
+                               : kQexNever;
+}
+
 uint32_t QexTime_Init() {
     timeval now;
     if (gettimeofday(&now, nullptr) == 0) {

@@ -2,6 +2,7 @@
 #include "gl/Context.h"
 
 #include "base/Diagnostics.h"
+#include "base/Time.h"
 #include "gl/Extensions.h"
 #include "gl/LeanState.h"
 #include "Qex/base.h"
@@ -21,6 +22,8 @@ constexpr GLenum kContextLost = 0x0507, kContextLostWebGL = 0x9242;
 constexpr int kMostErrors = 16;
 
 QexContextPart* s_Parts;
+QexContextPart* s_Restoring;  // the part that a restore in parts has come to
+bool s_Whole;                 // all that it has come to is there
 
 void ForgetAll() {
     for (QexContextPart* part = s_Parts; part; part = part->next) part->forget();
@@ -83,30 +86,46 @@ void QexContext_ReserveRenderbuffer(GLuint name) {
     glBindRenderbuffer(GL_RENDERBUFFER, name);
 }
 
-extern "C" {
-
-void QexEngine_ContextLost(void) {
-    g_QexContextLost = true;
-    ForgetAll();
+bool QexContext_IsRestoring() {
+    return s_Restoring;
 }
 
-int32_t QexEngine_ContextRestored(void) {
-    if (!g_QexContextLost) return 0;
+namespace {
+
+// The first things in a new context: the names of old are the engine's.
+void Begin() {
     GLint framebuffer = 0;
     ForgetAll();  // a loss that an error told of
     g_QexContextLost = false;
     ++g_QexContexts;
-    const QexMaking making;
-    bool whole = true;
+    s_Whole = true;
+    s_Restoring = s_Parts;
     // What the context comes with is not the engine's; one that is lost again has no end of errors.
     for (int i = 0; i < kMostErrors && glGetError() != GL_NO_ERROR; ++i) continue;
     glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer);
     for (QexContextPart* part = s_Parts; part; part = part->next)
         if (part->reserve) part->reserve();
-    glBindBuffer(GL_ARRAY_BUFFER, 0);
     glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(framebuffer));
-    for (QexContextPart* part = s_Parts; part && !g_QexContextLost; part = part->next)
-        if (part->restore) whole &= part->restore();
+}
+
+// Something of the part that the restore has come to, or all of it.
+void RestoreSome(uint32_t piece) {
+    const QexStep step = s_Restoring->step ? s_Restoring->step(piece) : QexStep::kDone;
+    s_Whole &= step != QexStep::kFailed;
+    if (s_Restoring->restore) s_Whole &= s_Restoring->restore();
+    if (step == QexStep::kDone) s_Restoring = s_Restoring->next;
+}
+
+float RestoredShare() {
+    uint32_t done = 0, all = 0;
+    for (const QexContextPart* part = s_Parts; part; part = part->next) {
+        if (part == s_Restoring) done = all;
+        ++all;
+    }
+    return s_Restoring ? static_cast<float>(done) / static_cast<float>(all) : 1;
+}
+
+void LeaveUnbound(GLint framebuffer) {
     QexRenderState_Restore();
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, 0);
@@ -115,14 +134,52 @@ int32_t QexEngine_ContextRestored(void) {
     glActiveTexture(GL_TEXTURE0);
     QexRenderState_Reset(nullptr);
     QEX_GL_CHECK();
-    if (whole && !making.Failed() && !g_QexContextLost) return 0;
+}
+
+// Restores until that time: 1 when there is more, else the end's result.
+int32_t Restore(uint64_t end, uint32_t piece, float* progress) {
+    if (progress) *progress = 1;
+    if (!g_QexContextLost && !s_Restoring) return 0;
+    const QexMaking making;
+    GLint framebuffer = 0;
+    if (!s_Restoring) Begin();
+    QexRenderState_Reset(nullptr);
+    glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer);
+    while (s_Restoring && !g_QexContextLost) {
+        RestoreSome(piece);
+        if (end != kQexNever && QexTime_Monotonic() >= end) break;
+    }
+    LeaveUnbound(framebuffer);
+    s_Whole &= !making.Failed();
+    if (progress) *progress = g_QexContextLost ? 0 : RestoredShare();
+    if (s_Restoring && !g_QexContextLost) return 1;
+    s_Restoring = nullptr;
+    if (s_Whole) return 0;
     QexError(QEX_TAG, "<QexEngine_ContextRestored> %s",
              g_QexContextLost ? "the context was lost again" : "not everything could be made again");
     return -1;
 }
 
+}  // namespace
+
+extern "C" {
+
+void QexEngine_ContextLost(void) {
+    g_QexContextLost = true;
+    s_Restoring = nullptr;
+    ForgetAll();
+}
+
+int32_t QexEngine_ContextRestored(void) {
+    return Restore(kQexNever, kQexWhole, nullptr);
+}
+
+int32_t QexEngine_ContinueRestore(float milliseconds, float* progress) {
+    return Restore(QexTime_In(milliseconds), kQexPiece, progress);
+}
+
 uint32_t QexEngine_IsContextLost(void) {
-    return g_QexContextLost;
+    return g_QexContextLost || s_Restoring;
 }
 
 }  // extern "C"

@@ -6,10 +6,12 @@
 // objects get new names.
 #pragma once
 
+#include "base/Step.h"
 #include "gl/GL.h"
 
 // In the order of restoring.
-enum QexContextRank { kRankTextures, kRankTargets, kRankPrograms, kRankGeometry, kRankOthers };
+// What is drawn with programs that are not there again yet is not drawn; so they come behind what they draw.
+enum QexContextRank { kRankTextures, kRankTargets, kRankGeometry, kRankPrograms, kRankOthers };
 
 // Registered when the part makes its first object, so that a program carries no part that it does not use.
 struct QexContextPart {
@@ -19,8 +21,14 @@ struct QexContextPart {
     bool (*restore)();  // false when something could not be made; may be null
     QexContextPart* next;
     bool registered;
+    // In place of restore where there is much: makes a bit, at most so many bytes where it can be parted.
+    // kFailed: a thing could not be made, and there may be others.
+    QexStep (*step)(uint32_t piece) = nullptr;
 };
 void QexContext_Register(QexContextPart* part);
+
+// Whether the context is being restored, in parts, and models are not drawn yet.
+bool QexContext_IsRestoring();
 
 // Takes an error for a lost context. True when it is one, or one was lost already.
 bool QexContext_IsLoss(uint32_t error);

@@ -28,8 +28,11 @@ struct Kept {
     uint32_t *vertex, *index;
     QexPODMesh* meshes;
     uint32_t count;
+    uint32_t context;  // that they are of
 };
 Kept* s_Kept;
+Kept* s_Filling;  // those that are being made again
+QexBufferLoad s_Load;
 
 bool Note(const QexModel& model);
 void Drop(const uint32_t* vertex);
@@ -135,7 +138,10 @@ bool FillAll(QexBufferLoad* load, QexModel* model) {
     return complete;
 }
 
-void Forget() {}
+void GiveUpFilling() {
+    QexBufferLoad_End(&s_Load);
+    s_Filling = nullptr;
+}
 
 void Reserve() {
     for (const Kept* kept = s_Kept; kept; kept = kept->next)
@@ -145,22 +151,29 @@ void Reserve() {
         }
 }
 
-bool Restore() {
-    bool whole = true;
-    for (const Kept* kept = s_Kept; kept; kept = kept->next) {
-        QexModel model = {};
-        model.scene.meshes = kept->meshes;
-        model.scene.meshCount = kept->count;
-        model.vertexBuffers = kept->vertex;
-        model.indexBuffers = kept->index;
-        QexBufferLoad load = {};
-        load.piece = kQexWhole;
-        whole &= FillAll(&load, &model);
+QexStep Restore(uint32_t piece) {
+    if (!s_Filling) {
+        s_Filling = s_Kept;
+        while (s_Filling && s_Filling->context == g_QexContexts) s_Filling = s_Filling->next;
+        if (!s_Filling) return QexStep::kDone;
+        s_Load = {};
+        s_Filling->context = g_QexContexts;
     }
-    return whole;
+    QexModel model = {};
+    model.scene.meshes = s_Filling->meshes;
+    model.scene.meshCount = s_Filling->count;
+    model.vertexBuffers = s_Filling->vertex;
+    model.indexBuffers = s_Filling->index;
+    s_Load.piece = piece;
+    s_Load.bound = false;
+    const QexStep step = QexBufferLoad_Step(&s_Load, &model);
+    if (step == QexStep::kMore) return step;
+    QexBufferLoad_Pause(&s_Load);
+    GiveUpFilling();
+    return step == QexStep::kDone ? QexStep::kMore : step;
 }
 
-QexContextPart s_Part = {kRankGeometry, Forget, Reserve, Restore, nullptr, false};
+QexContextPart s_Part = {kRankGeometry, GiveUpFilling, Reserve, nullptr, nullptr, false, Restore};
 
 bool Note(const QexModel& model) {
     Kept* kept = QexMemory_AllocZeroed<Kept>(1);
@@ -169,18 +182,23 @@ bool Note(const QexModel& model) {
         return false;
     }
     QexContext_Register(&s_Part);
-    *kept = {s_Kept, model.vertexBuffers, model.indexBuffers, model.scene.meshes, model.scene.meshCount};
+    *kept = {s_Kept,       model.vertexBuffers, model.indexBuffers, model.scene.meshes, model.scene.meshCount,
+             g_QexContexts};
     s_Kept = kept;
     return true;
+}
+
+void Remove(Kept** at) {
+    Kept* kept = *at;
+    if (kept == s_Filling) GiveUpFilling();
+    *at = kept->next;
+    QexMemory_Free(kept);
 }
 
 void Drop(const uint32_t* vertex) {
     Kept** at = &s_Kept;
     while (*at && (*at)->vertex != vertex) at = &(*at)->next;
-    Kept* kept = *at;
-    if (!kept) return;
-    *at = kept->next;
-    QexMemory_Free(kept);
+    if (*at) Remove(at);
 }
 
 bool Has(const Kept& kept, uint32_t name) {
@@ -196,8 +214,7 @@ void DropOutdated(const QexModel& model) {
                 at = &kept->next;
                 continue;
             }
-            *at = kept->next;
-            QexMemory_Free(kept);
+            Remove(at);
         }
 }
 

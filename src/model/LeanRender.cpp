@@ -345,6 +345,7 @@ void QexLeanDrawing_Draw(QexLeanDrawing* drawing, QexLeanEntry* entry) {
 }
 
 bool QexLeanDrawing_Begin(QexLeanDrawing* drawing, QexModel* model, const QexLeanCall& call, bool anyOrder) {
+    if (QexContext_IsRestoring()) return false;
     QexModelDrawing* kept = Keep(model, anyOrder || model->scene.meshNodeCount < 2);
     if (!kept) return false;
     const QexShaderFrame* frame = QexShaderFrame_Set(call.view, call.projection, call.lights, call.shadow);

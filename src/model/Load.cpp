@@ -29,7 +29,6 @@
 namespace {
 
 constexpr size_t kPathSize = kQexPathSize;
-constexpr uint64_t kNever = UINT64_MAX;
 
 struct Load {
     Load* next = nullptr;
@@ -271,7 +270,7 @@ QexStep RunUntil(Load* load, uint64_t end) {
     do {
         step = kStages[load->stage].step(load);
         if (step == QexStep::kDone && ++load->stage < kStageCount) step = QexStep::kMore;
-    } while (step == QexStep::kMore && (end == kNever || QexTime_Monotonic() < end));
+    } while (step == QexStep::kMore && (end == kQexNever || QexTime_Monotonic() < end));
     s_Running = load->next;
     return step;
 }
@@ -334,14 +333,6 @@ int32_t Begun(Load* load, int32_t result) {
     return result;
 }
 
-// The moment up to which a load may go on.
-uint64_t EndOf(float milliseconds) {
-    const uint64_t now = QexTime_Monotonic();
-    if (!(milliseconds > 0)) return now;
-    return milliseconds < 1e9f ? now + static_cast<uint64_t>(static_cast<double>(milliseconds) * 1e6)
-                               : kNever;
-}
-
 }  // namespace
 
 bool QexModelLoad_Runs(const QexModel* model, const char* function) {
@@ -378,13 +369,13 @@ int32_t QexModel_LoadFromMemory(QexModel* model, const void* data, uint32_t size
 int32_t QexModel_LoadContent(QexModel* model, const char* directory, const char* file) {
     Load load;
     const int32_t result = BeginFile(&load, model, directory, file);
-    return result ? result : Finish(&load, RunUntil(&load, kNever));
+    return result ? result : Finish(&load, RunUntil(&load, kQexNever));
 }
 
 int32_t QexModel_LoadContentFromCache(QexModel* model, const void* data, uint32_t size, QexNameCache* cache) {
     Load load;
     if (BeginMemory(&load, model, data, size, cache) != 0) return 0;
-    const int32_t result = Finish(&load, RunUntil(&load, kNever));
+    const int32_t result = Finish(&load, RunUntil(&load, kQexNever));
     return load.stage ? result : 0;
 }
 
@@ -399,7 +390,7 @@ int32_t QexModel_BeginLoadFromCache(QexModel* model, const void* data, uint32_t 
 }
 
 int32_t QexModel_ContinueLoad(QexModel* model, float milliseconds, float* progress) {
-    const uint64_t end = EndOf(milliseconds);
+    const uint64_t end = QexTime_In(milliseconds);
     Load* load = Take(model);
     if (progress) *progress = 0;
     if (!load) {

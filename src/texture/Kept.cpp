@@ -8,6 +8,7 @@
 #include "Qex/base.h"
 #include "Qex/renderer.h"
 #include "Qex/textures.h"
+#include "texture/LoadPvr.h"
 #include "texture/RenderTarget.h"
 #include "texture/Texture.h"
 
@@ -55,68 +56,108 @@ void Reserve() {
         for (; row; row = row->next) QexContext_ReserveTexture(row->target, row->name);
 }
 
+// Whether an image file is loaded again, which is done in steps.
+bool IsImage(const Kept& kept) {
+    return kept.source.kind == kKeptImage && !kept.loader && (kept.source.bytes || kept.path);
+}
+
 // Loads what the bytes, or else the file, hold into the record.
 int32_t Load(QexTexture* texture, const Kept& kept) {
     const QexKeptSource& s = kept.source;
     const uint32_t size = static_cast<uint32_t>(s.size);
-    switch (s.kind) {
-        case kKeptTarget: QexRenderTarget_CreateColourTexture(texture, s.width, s.height); return 0;
-        case kKeptNormals: return QexTexture_GenerateNormalisationCubeMap(texture, s.width);
-        case kKeptTga:
-            return s.bytes ? QexTexture_CreateTGAFromMemSized(texture, 0, 0, QEX_FILTER_NEAREST,
-                                                              QEX_WRAP_CLAMP, s.bytes, size)
-                           : QexTexture_CreateTGAFromFile(texture, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_CLAMP,
-                                                          kept.path);
-        case kKeptPixels:
-            return QexTexture_CreateFromPixels(texture, s.width, s.height, s.format, 0, 0, QEX_FILTER_NEAREST,
-                                               QEX_WRAP_CLAMP, const_cast<void*>(s.bytes));
-        default:
-            return s.bytes ? QexTexture_LoadPVRFromMemSized(texture, s.bytes, size, nullptr, s.decode,
-                                                            s.firstLevel, nullptr)
-                           : QexTexture_LoadPVRFromFile(texture, kept.path, nullptr, s.decode, s.firstLevel);
+    const bool file = kept.path && !kept.loader;
+    if (s.kind == kKeptTarget) {
+        QexRenderTarget_CreateColourTexture(texture, s.width, s.height);
+        return 0;
     }
+    if (s.kind == kKeptNormals) return QexTexture_GenerateNormalisationCubeMap(texture, s.width);
+    if (kept.loader && kept.loader(kept.owner, kept.name, kept.path, texture) == 0) return 0;
+    if (s.kind == kKeptTga && s.bytes)
+        return QexTexture_CreateTGAFromMemSized(texture, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_CLAMP, s.bytes,
+                                                size);
+    if (s.kind == kKeptTga && file)
+        return QexTexture_CreateTGAFromFile(texture, 0, 0, QEX_FILTER_NEAREST, QEX_WRAP_CLAMP, kept.path);
+    if (s.kind == kKeptPixels && s.bytes)
+        return QexTexture_CreateFromPixels(texture, s.width, s.height, s.format, 0, 0, QEX_FILTER_NEAREST,
+                                           QEX_WRAP_CLAMP, const_cast<void*>(s.bytes));
+    if (texture->glName || !s_Source) return -1;
+    s_Handed = false;
+    return s_Source(s_SourceUser, kept.name, texture);
 }
 
-bool RestoreOne(const Kept& kept) {
-    QexTexture texture = {};
-    const bool knows = kept.source.bytes || (kept.path && !kept.loader) || kept.source.kind >= kKeptTarget;
-    s_Renewed = kept.name;
-    s_Handed = false;
-    int32_t result = -1;
-    if (kept.loader)
-        result = kept.loader(kept.owner, kept.name, kept.path, &texture);
-    else if (knows)
-        result = Load(&texture, kept);
-    if (!knows && !texture.glName && s_Source) {
-        s_Handed = false;
-        result = s_Source(s_SourceUser, kept.name, &texture);
-    }
-    if (result != 0 || !texture.glName)
+// The texture that is made again, from its first step to its last one.
+struct {
+    Kept* kept;
+    QexTexture texture;
+    QexTextureFile file;
+} s_Current = {};
+
+void GiveUpCurrent() {
+    if (s_Current.kept && IsImage(*s_Current.kept)) QexTextureFile_End(&s_Current.file);
+    s_Current.kept = nullptr;
+}
+
+QexStep Finish(bool made) {
+    const Kept& kept = *s_Current.kept;
+    QexTexture* texture = &s_Current.texture;
+    GiveUpCurrent();
+    if (!made) {
         QexError(QEX_TAG, "<QexEngine_ContextRestored> texture %u %s", kept.name,
-                 knows || kept.loader || s_Source ? "could not be loaded again"
-                                                  : "came from memory that was not kept");
-    s_Renewed = 0;
-    if (result != 0 || !texture.glName) {
+                 IsImage(kept) || kept.loader || s_Source || kept.path
+                     ? "could not be loaded again"
+                     : "came from memory that was not kept");
         QexContext_ReserveTexture(kept.target, kept.name);  // or another texture would get it
-        return false;
+        return QexStep::kFailed;
     }
-    if (kept.filter) QexTexture_SetFilter(&texture, kept.filter);
-    if (kept.wrap) QexTexture_SetWrapping(&texture, kept.wrap);
-    if (texture.flags & QEX_TEXFLAG_OWNS_PIXELS) QexMemory_Free(texture.pixels);
+    if (kept.filter) QexTexture_SetFilter(texture, kept.filter);
+    if (kept.wrap) QexTexture_SetWrapping(texture, kept.wrap);
+    if (texture->flags & QEX_TEXFLAG_OWNS_PIXELS) QexMemory_Free(texture->pixels);
+    return QexStep::kMore;
+}
+
+// Takes the next texture of a lost context; false when there is none.
+bool Take(uint32_t piece) {
+    for (Kept* row : s_Kept)
+        for (; row && !s_Current.kept; row = row->next)
+            if (row->context != g_QexContexts) s_Current.kept = row;
+    Kept* kept = s_Current.kept;
+    if (!kept) return false;
+    kept->context = g_QexContexts;
+    s_Handed = false;
+    s_Current.texture = {};
+    const QexKeptSource& s = kept->source;
+    const QexTextureLoad load = {&s_Current.texture,
+                                 {static_cast<const uint8_t*>(s.bytes), s.size},
+                                 nullptr,
+                                 s.decode != 0,
+                                 s.firstLevel,
+                                 nullptr,
+                                 piece};
+    if (IsImage(*kept) && (s.bytes || !QexTextureFile_Begin(&s_Current.file, load, kept->path)))
+        QexTextureFile_BeginMemory(&s_Current.file, load);
     return true;
 }
 
-bool Restore() {
-    bool whole = true;
-    for (const Kept* row : s_Kept)
-        for (; row && !g_QexContextLost; row = row->next)
-            if (row->context != g_QexContexts) whole &= RestoreOne(*row);
-    return whole;
+// A part of a texture; one that is no image file is made at once.
+QexStep Restore(uint32_t piece) {
+    if (!s_Current.kept && !Take(piece)) return QexStep::kDone;
+    Kept* kept = s_Current.kept;
+    s_Renewed = kept->name;
+    QexStep step;
+    if (IsImage(*kept)) {
+        QexTextureLoad_Resume(&s_Current.file);
+        s_Current.file.piece = piece;
+        step = QexTextureLoad_Step(&s_Current.file);
+    } else {
+        const bool loaded = Load(&s_Current.texture, *kept) == 0;
+        step = loaded && s_Current.texture.glName ? QexStep::kDone : QexStep::kFailed;
+    }
+    if (step != QexStep::kMore) step = Finish(step == QexStep::kDone);
+    s_Renewed = 0;
+    return step;
 }
 
-void Forget() {}
-
-QexContextPart s_Part = {kRankTextures, Forget, Reserve, Restore, nullptr, false};
+QexContextPart s_Part = {kRankTextures, GiveUpCurrent, Reserve, nullptr, nullptr, false, Restore};
 
 }  // namespace
 
@@ -192,6 +233,7 @@ void QexKeptTexture_Drop(uint32_t name) {
     Kept** at = Find(name);
     Kept* kept = *at;
     if (!kept) return;
+    if (kept == s_Current.kept) GiveUpCurrent();
     *at = kept->next;
     QexMemory_Free(const_cast<void*>(kept->source.bytes));
     QexMemory_Free(kept->path);

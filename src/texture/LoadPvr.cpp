@@ -234,6 +234,13 @@ bool QexTextureFile_Begin(QexTextureFile* file, const QexTextureLoad& load, cons
     return false;
 }
 
+void QexTextureFile_BeginMemory(QexTextureFile* file, const QexTextureLoad& load) {
+    static_cast<QexTextureLoad&>(*file) = load;
+    file->step = Begin;
+    file->unread = {};
+    file->contents = nullptr;
+}
+
 void QexTextureFile_End(QexTextureFile* file) {
     QexTextureLoad_End(file);
     QexResFile_Close(&file->unread);

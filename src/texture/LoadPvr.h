@@ -15,5 +15,8 @@ struct QexTextureFile : QexTextureLoad {
 // opened or memory runs out.
 bool QexTextureFile_Begin(QexTextureFile* file, const QexTextureLoad& load, const char* path);
 
+// The same for a file in memory, whose bytes the load names.
+void QexTextureFile_BeginMemory(QexTextureFile* file, const QexTextureLoad& load);
+
 // Ends the load, in the middle as well.
 void QexTextureFile_End(QexTextureFile* file);

@@ -46,6 +46,10 @@ class LostContext : public ContextTest {
         Replace();
         return Restore();
     }
+    int32_t RestorePart(float* progress = nullptr) {
+        Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+        return QexEngine_ContinueRestore(0, progress);
+    }
     Picture Frame() {
         Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
         all_.Draw();
@@ -77,6 +81,15 @@ TEST_F(LostContext, TheNextFrameIsTheSame) {
         EXPECT_EQ(LoseAndRestore(), 0);
         EXPECT_TRUE(SamePicture(Frame(), lean)) << round;
     }
+    QexEngine_ContextLost();
+    Replace();
+    float progress = 0, before = 0;
+    while (RestorePart(&progress) == 1) {
+        EXPECT_GE(progress, before);
+        before = progress;
+    }
+    EXPECT_EQ(progress, 1);
+    EXPECT_TRUE(SamePicture(Frame(), lean));
     QexRenderer_SetDrawing(QEX_DRAWING_DESCRIBED);
     for (int round = 0; round < 2; ++round) {
         EXPECT_TRUE(SamePicture(Frame(), described)) << round;
@@ -226,6 +239,28 @@ TEST_F(LostContext, ALoadInPartsFails) {
         calls += calls / 4;
     }
     QexEngine_Shutdown(&runtime);
+}
+
+// In the middle of a restore things are drawn, as far as they are there, and released.
+TEST_F(LostNullContext, InTheMiddleOfARestore) {
+    int parts = 0;
+    for (int32_t result = 1; result == 1; parts += 3) {
+        gltapBeginReads();
+        ASSERT_TRUE(Load());
+        QexRenderer_SetDrawing(parts & 1 ? QEX_DRAWING_LEAN : QEX_DRAWING_DESCRIBED);
+        Frame();
+        QexEngine_ContextLost();
+        gltapReset();
+        gltapBeginReads();
+        for (int i = 0; i < parts && result == 1; ++i) result = RestorePart();
+        Frame();
+        char text[200];
+        EXPECT_EQ(gltapReadFaults(text, sizeof text), 0u) << parts << text;
+        Release();
+        EXPECT_EQ(LiveObjects(), "") << parts;
+        EXPECT_EQ(Restore(), 0);
+    }
+    EXPECT_GT(parts, 60);
 }
 
 // Lost at every call of loading and drawing, as the GL says by an error: no end of the process, nothing left.
