@@ -89,11 +89,12 @@ int32_t Load(QexTexture* texture, const Kept& kept) {
 struct {
     Kept* kept;
     QexTexture texture;
-    QexTextureFile file;
-} s_Current = {};
+    QexTextureFile* file;  // of an image, owned
+} s_Current;
 
 void GiveUpCurrent() {
-    if (s_Current.kept && IsImage(*s_Current.kept)) QexTextureFile_End(&s_Current.file);
+    if (s_Current.file) QexTextureFile_End(s_Current.file);
+    QexMemory_FreeArray(s_Current.file);
     s_Current.kept = nullptr;
 }
 
@@ -133,8 +134,9 @@ bool Take(uint32_t piece) {
                                  s.firstLevel,
                                  nullptr,
                                  piece};
-    if (IsImage(*kept) && (s.bytes || !QexTextureFile_Begin(&s_Current.file, load, kept->path)))
-        QexTextureFile_BeginMemory(&s_Current.file, load);
+    s_Current.file = IsImage(*kept) ? QexMemory_AllocArray<QexTextureFile>(1) : nullptr;
+    if (s_Current.file && (s.bytes || !QexTextureFile_Begin(s_Current.file, load, kept->path)))
+        QexTextureFile_BeginMemory(s_Current.file, load);  // of no bytes where there is no file: it fails
     return true;
 }
 
@@ -144,10 +146,10 @@ QexStep Restore(uint32_t piece) {
     Kept* kept = s_Current.kept;
     s_Renewed = kept->name;
     QexStep step;
-    if (IsImage(*kept)) {
-        QexTextureLoad_Resume(&s_Current.file);
-        s_Current.file.piece = piece;
-        step = QexTextureLoad_Step(&s_Current.file);
+    if (s_Current.file) {
+        QexTextureLoad_Resume(s_Current.file);
+        s_Current.file->piece = piece;
+        step = QexTextureLoad_Step(s_Current.file);
     } else {
         const bool loaded = Load(&s_Current.texture, *kept) == 0;
         step = loaded && s_Current.texture.glName ? QexStep::kDone : QexStep::kFailed;
