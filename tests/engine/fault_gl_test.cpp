@@ -90,6 +90,53 @@ TEST_F(FaultTest, EveryCallMayFailWithAHandler) {
     EXPECT_TRUE(whole) << none.place << none.message;
 }
 
+// A handler releases what is not being drawn, asks, and meets an error of its own, which it is not called
+// for.
+TEST_F(FaultTest, AHandlerMayReleaseAndAsk) {
+    struct Owner {
+        QexModel spare, drawn;
+        QexTexture texture;
+        uint32_t calls;
+    } owner = {};
+    QexRuntimeContext runtime;
+    QexEngineConfig config = SurfaceConfig();
+    const QexCamera camera = {};
+    Capture quiet(STDERR_FILENO), silent(STDOUT_FILENO);
+    ASSERT_EQ(QexEngine_Init(&runtime, sizeof config, &config), 0);
+    for (QexModel* model : {&owner.spare, &owner.drawn}) {
+        QexModel_Create(model);
+        ASSERT_EQ(QexModel_LoadContent(model, OutputPath("").c_str(), "worm.pod"), 0);
+    }
+    owner.texture = SolidTexture({1, 2, 3, 255});
+    QexEngine_SetErrorHandler(
+        [](void* user, uint32_t, const char*, const char*, int32_t, const char*) {
+            auto* self = static_cast<Owner*>(user);
+            ++self->calls;
+            gltapInjectError("glDeleteBuffers", 1, GL_INVALID_OPERATION);
+            QexModel_Unload(&self->spare);
+            QexTexture_Release(&self->texture);
+            EXPECT_EQ(QexEngine_IsContextLost(), 0u);
+        },
+        &owner);
+    const auto draws = [&] {
+        gltapResetCounts();
+        QexModel_RenderWithCamera(&owner.drawn, nullptr, &camera, nullptr, 0);
+        return gltapCount("glDrawElements");
+    };
+    const uint64_t all = draws();
+    gltapInjectError("glDrawElements", 1, GL_OUT_OF_MEMORY);
+    draws();
+    EXPECT_EQ(owner.calls, 1u);
+    EXPECT_EQ(owner.spare.vertexBuffers, nullptr);
+    EXPECT_EQ(owner.texture.glName, 0u);
+    EXPECT_EQ(draws(), all);
+    QexEngine_SetErrorHandler(nullptr, nullptr);
+    QexModel_Unload(&owner.drawn);
+    QexEngine_Shutdown(&runtime);
+    EXPECT_EQ(gltapLiveObjects(GLTAP_BUFFER, nullptr, 0), 1u);  // whose deletion failed
+    gltapReset();
+}
+
 // Without a handler each ends the process.
 TEST_F(FaultTest, WithoutAHandlerEachErrorEndsTheProcess) {
     for (const auto& [function, count] : Counts()) {
