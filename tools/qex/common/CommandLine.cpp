@@ -52,20 +52,6 @@ CLI::Validator OneNumber(const char* kind, const NumberRange& range) {
 
 }  // namespace
 
-Talk& GetTalk() {
-    static Talk talk;
-    return talk;
-}
-
-void Say(const std::string& verb, const std::string& text) {
-    fprintf(stderr, "qex %s: %s\n", verb.c_str(), text.c_str());
-}
-
-int Fail(const std::string& verb, const std::string& text, int status) {
-    Say(verb, text);
-    return status;
-}
-
 std::string ReadNumbers(const std::string& text, const NumberShape& shape, Numbers* numbers) {
     const std::vector<std::string> parts = Split(text, shape.separator);
     bool good = parts.size() == shape.needed || parts.size() == shape.ranges.size();
@@ -135,7 +121,6 @@ std::string Alternatives(const std::vector<std::string>& names) {
 }
 
 CLI::Option* AddUpAxis(CLI::App* app, const std::string& help, UpAxis* up) {
-    // In the order of UpAxis.
-    return AddChoice(app, "--up", help, "axis", {"x", "y", "z", "-x", "-y", "-z"},
+    return AddChoice(app, "--up", help, "axis", {std::begin(kUpAxisNames), std::end(kUpAxisNames)},
                      [up](size_t index) { *up = static_cast<UpAxis>(index); });
 }

@@ -7,24 +7,16 @@
 #include <string>
 #include <vector>
 
+#include "common/Talk.h"
+#include "common/UpAxis.h"
+
 namespace CLI {
 class App;
 class Option;
 class Validator;
 }  // namespace CLI
 
-// How much the command says.
-struct Talk {
-    bool quiet = false;    // nothing but warnings and errors
-    bool verbose = false;  // also what the engine and the importer log
-};
-Talk& GetTalk();
-
 constexpr int kMostRepeats = 1000;  // of an option that may be given several times
-
-// "qex VERB: TEXT" on standard error. Fail returns the status.
-void Say(const std::string& verb, const std::string& text);
-int Fail(const std::string& verb, const std::string& text, int status);
 
 using Numbers = std::vector<double>;
 
@@ -75,6 +67,5 @@ std::string Alternatives(const std::vector<std::string>& names);
 CLI::Option* AddTexts(CLI::App* app, const std::string& name, std::vector<std::string>* texts,
                       const std::string& help);
 
-// An axis of a scene that points up, and --up, which names one.
-enum class UpAxis { kX, kY, kZ, kMinusX, kMinusY, kMinusZ };
+// --up, which names an axis.
 CLI::Option* AddUpAxis(CLI::App* app, const std::string& help, UpAxis* up);

@@ -4,7 +4,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "common/CommandLine.h"
+#include "common/Talk.h"
 #include "Qex.h"
 
 namespace {

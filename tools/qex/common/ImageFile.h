@@ -41,3 +41,7 @@ std::vector<uint8_t> ShrinkPixels(const std::vector<uint8_t>& pixels, int width,
 // Lays white over RGBA pixels, as much of it as the red of others, the upper left part of wider ones.
 void BlendWhite(const std::vector<uint8_t>& cover, int coverWidth, std::vector<uint8_t>* pixels, int width);
 Image HalveImage(const Image& image);  // 2 x 2 box, for mipmaps; a side of 1 stays 1
+Image FlipRows(const Image& image);
+
+// A picture whose red, green and blue all hold the alpha channel.
+Image AlphaAsGrey(const Image& image);

@@ -9,7 +9,7 @@
 
 #include "common/CommandLine.h"
 #include "render/Command.h"
-#include "render/Shading.h"
+#include "scene/Shading.h"
 
 namespace {
 
@@ -29,6 +29,11 @@ const NumberShape kOrbit = {',',
                             {{NumberRange::kAny, -3600, 3600}, {NumberRange::kAny, -89, 89, 15}},
                             1,
                             "is no direction; expected YAW[,PITCH] in degrees, PITCH from -89 to 89"};
+const NumberShape kLook = {',',
+                           {kAny, kAny, kAny, kAny, kAny, kAny, {NumberRange::kAny, 1, 170, 45}},
+                           6,
+                           "is no view; expected EX,EY,EZ,TX,TY,TZ[,FOV]: eye, target and 1 to 170 degrees",
+                           [](const Numbers& n) { return n[0] != n[3] || n[1] != n[4] || n[2] != n[5]; }};
 const NumberShape kBackground = {',', {kColour}, 1, "is no colour; expected RRGGBB in hexadecimal"};
 const NumberShape kLight = {',',
                             {kAny, kAny, kAny, {NumberRange::kColour, 0, DBL_MAX, 0xFFFFFF}},
@@ -133,9 +138,19 @@ void AddPicture(CLI::App* app, RenderOptions* options) {
                    options->view.yaw = Float(n[0]);
                    options->view.pitch = Float(n[1]);
                });
+    AddNumbers(app, "--look",
+               "EX,EY,EZ,TX,TY,TZ[,FOV], a camera at a place that looks at another (45 degrees)", kLook,
+               [=](const Numbers& n) {
+                   options->look = LookView{{Float(n[0]), Float(n[1]), Float(n[2])},
+                                            {Float(n[3]), Float(n[4]), Float(n[5])},
+                                            Float(n[6])};
+               })
+        ->excludes(app->get_option("--camera"))
+        ->excludes(app->get_option("--orbit"));
     AddUpAxis(app, "the scene's vertical axis (y)", &options->view.up);
     app->add_option("--turn", options->turn, "N pictures of one turn around the scene")
-        ->check(WholeNumberFrom(1, 10000));
+        ->check(WholeNumberFrom(1, 10000))
+        ->excludes(app->get_option("--look"));
     AddNumbers(app, "--background", "RRGGBB (404858)", kBackground,
                [=](const Numbers& n) { options->background = static_cast<uint32_t>(n[0]); });
     app->add_option("--text", options->text, "line of text on the picture");
@@ -200,6 +215,16 @@ void AddEmitters(CLI::App* app, EmitterScene* emitters) {
         ->needs(emitter);
 }
 
+void AddTextureChoices(CLI::App* app, TextureChoices* choices) {
+    AddTextureOption(app, &choices->overrides);
+    app->add_option(
+           "--flip-textures", choices->flipped,
+           "whether V runs down the pictures beside the scene: yes or no (as its export options say, "
+           "else no)")
+        ->transform(CLI::CheckedTransformer(std::map<std::string, bool>{{"yes", true}, {"no", false}},
+                                            CLI::ignore_case));
+}
+
 }  // namespace
 
 void SetUpRender(CLI::App* app, RenderOptions* options) {
@@ -222,7 +247,7 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
             effects->picks.push_back({Float(n[0]), Float(n[1])});
         },
         kMostRepeats);
-    SetUpTextureChoices(app, &options->textures);
+    AddTextureChoices(app, &options->textures);
     AddParsed(app, "--drawing", "lean, or described, with the GL's errors read after each call (lean)",
               [=](const std::string& text) {
                   options->lean = text == "lean";

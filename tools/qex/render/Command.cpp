@@ -2,6 +2,7 @@
 #include "render/Command.h"
 
 #include <algorithm>
+#include <cfloat>
 #include <chrono>
 #include <cmath>
 #include <cstdio>
@@ -12,11 +13,11 @@
 #include "common/EngineOutput.h"
 #include "common/ImageFile.h"
 #include "common/TextureFiles.h"
+#include "emitter/Description.h"
 #include "gltap.h"
 #include "render/Diagnosis.h"
 #include "render/Renderer.h"
 #include "render/Report.h"
-#include "render/Textures.h"
 
 namespace {
 
@@ -33,13 +34,7 @@ double Milliseconds(Clock::time_point since) {
 
 Renderer::~Renderer() {
     EngineOutput quiet;
-    shaders_.Release();
-    floor_.reset();
-    sky_.reset();
-    emitters_.reset();
-    ReleaseNormalMaps();
-    if (modelLoaded_) QexModel_Unload(&model_);
-    if (engineStarted_ && options_.effects.depthOfField) QexPostProcessing_Finalize();
+    view_.reset();
     if (engineStarted_) QexEngine_Shutdown(&engine_);
 }
 
@@ -73,9 +68,14 @@ bool Renderer::Start() {
     config.height = context_->Height();
     if (options_.effects.shadow && options_.antialias > 1) QexModel_SetShadowMapSize(kFineMap, kFineMap);
     engineStarted_ = QexEngine_Init(&engine_, sizeof config, &config) == 0;
-    if (options_.lean) QexRenderer_SetDrawing(QEX_DRAWING_LEAN);
-    if (options_.effects.depthOfField) QexPostProcessing_Initialize(&engine_);
-    return engineStarted_;
+    if (!engineStarted_) return false;
+    view_ = std::make_unique<SceneView>(&engine_, LoadEmitter);
+    view_->SetScale(scale_);
+    std::vector<std::string> warnings;
+    SceneOptions options = options_;
+    options.autoCamera |= options_.turn != 0;
+    view_->SetOptions(options, &warnings);
+    return true;
 }
 
 bool Renderer::Load() {
@@ -89,26 +89,26 @@ bool Renderer::Load() {
         return false;
     }
     const auto start = Clock::now();
-    EngineOutput output;
-    QexModel_Create(&model_);
-    SetTextureHook(&model_, directory, input_.Path(), options_.textures);
-    const int32_t result = QexModel_LoadContent(&model_, directory.c_str(), file.c_str());
-    modelLoaded_ = true;
+    view_->FitTo(Frames());
     std::vector<std::string> warnings;
-    if (result == 0) lit_ = LitMaterials(model_.scene, options_.effects.shader);
-    if (result == 0) warnings = CompleteTextures(&model_, lit_);
-    if (result == 0 && options_.effects.shader == "normalmap")
-        for (const std::string& line : LoadNormalMaps(&model_)) warnings.push_back(line);
-    output.Stop();
+    std::string failure;
+    using State = SceneView::LoadState;
+    State state =
+        view_->BeginLoad(directory, file, input_.Path(), &failure) ? State::kGoesOn : State::kFailed;
+    while (state == State::kGoesOn) state = view_->ContinueLoad(FLT_MAX, &warnings, &failure);
+    unusable_ = failure;
     loadTime_ = Milliseconds(start);
-    // Whatever of a scene that was read had to be put right.
-    for (const char* part : {"<QexPODModel_ReadFromSourceStream>", "ERROR:"})
-        for (const std::string& line : output.Messages(part))
-            if (result == 0) warnings.push_back(line);
-    for (const std::string& line : warnings) Warn(line);
-    if (result == 0) return true;
-    Fail(input_.Name() + ": " + output.FirstError(), 1);
+    if (state == State::kDone)
+        for (const std::string& line : warnings) Warn(line);
+    if (state == State::kDone) return true;
+    Fail(input_.Name() + ": " + failure, 1);
     return false;
+}
+
+std::vector<double> Renderer::Frames() const {
+    std::vector<double> frames = {FrameAt(0)};
+    for (size_t i = 1; options_.frames && i < PictureCount(); ++i) frames.push_back(FrameAt(i));
+    return frames;
 }
 
 size_t Renderer::PictureCount() const {
@@ -129,29 +129,6 @@ bool Renderer::Save(const std::string& path, const std::vector<uint8_t>& pixels)
     return false;
 }
 
-// Floor, sky and emitters. False, and what is wrong, when one of their files cannot be used.
-bool Renderer::LoadSurroundings(std::string* problem) {
-    const EffectOptions& effects = options_.effects;
-    EngineOutput quiet;
-    if (effects.floor) {
-        floor_ = std::make_unique<Floor>();
-        floor_->Create(points_, *effects.floor, effects.mirror.has_value());
-    }
-    if (!effects.sky.empty()) {
-        SetFrame(FrameAt(0));
-        PlaceCamera(0);
-        sky_ = std::make_unique<Sky>();
-        if (!sky_->Load(effects.sky, camera_, SceneSize(), effects.water, problem)) return false;
-    }
-    if (effects.emitters.emitters.empty()) return true;
-    emitters_ = std::make_unique<Emitters>();
-    std::vector<std::string> warnings;
-    if (!emitters_->Load(effects.emitters, &warnings, problem)) return false;
-    quiet.Stop();
-    for (const std::string& line : warnings) Warn(line);
-    return true;
-}
-
 // What is wrong with the names of the pictures to write; empty when nothing is.
 std::string Renderer::WrongOutput() const {
     const std::string problem = WhyNoPictureName(options_.output);
@@ -163,9 +140,10 @@ std::string Renderer::WrongOutput() const {
     for (const auto* more : {&effects.sky, &effects.emitters.emitters, &effects.emitters.textures})
         inputs.insert(inputs.end(), more->begin(), more->end());
     for (const auto& [material, file] : options_.textures.overrides) inputs.push_back(file);
-    for (uint32_t i = 0; i < model_.scene.textureCount; ++i)
-        if (model_.scene.textures[i].name)
-            inputs.push_back(FindTexture(Directory(options_.input), model_.scene.textures[i].name).path);
+    for (uint32_t i = 0; i < view_->Model()->scene.textureCount; ++i)
+        if (view_->Model()->scene.textures[i].name)
+            inputs.push_back(
+                FindTexture(Directory(options_.input), view_->Model()->scene.textures[i].name).path);
     for (size_t i = 0, count = PictureCount(); i < count; ++i) {
         const std::string path = OutputPath(i), overwrites = WhyNotOutput(path, inputs);
         if (!overwrites.empty()) return path + ": " + overwrites;
@@ -178,20 +156,22 @@ std::string Renderer::OutputPath(size_t index) const {
 }
 
 // What is wrong with options that name parts of the scene; empty when nothing is.
-std::string Renderer::CheckOptions() {
+std::string Renderer::CheckOptions() const {
+    const QexModel& model = *view_->Model();
     const int camera = options_.camera.value_or(0);
-    const uint32_t cameras = model_.scene.cameraCount;
+    const uint32_t cameras = model.scene.cameraCount;
     if (camera > 0 && !options_.autoCamera && static_cast<uint32_t>(camera) >= cameras)
         return "no camera " + std::to_string(camera) + ", the scene has " + std::to_string(cameras);
-    std::string problem = CheckTextureChoices(&model_);
-    if (problem.empty()) problem = ChangeNodes(&model_, options_.effects.nodes);
+    std::string problem = CheckTextureChoices(&model);
+    for (const NodeChange& change : options_.effects.nodes)
+        if (problem.empty()) FindNode(model, change.node, &problem);
     if (!options_.effects.mirrorNode.empty() && problem.empty())
-        FindNode(model_, options_.effects.mirrorNode, &problem);
+        FindNode(model, options_.effects.mirrorNode, &problem);
     return problem;
 }
 
 void Renderer::WarnOfFrames() const {
-    const uint32_t count = model_.scene.frameCount;
+    const uint32_t count = view_->Model()->scene.frameCount;
     const double last = FrameAt(PictureCount() - 1);
     const char* asked = options_.frames ? "--frames" : "--frame";
     if (count < 2 && (options_.frames || last > 0))
@@ -204,21 +184,22 @@ void Renderer::WarnOfFrames() const {
 // Frames the whole scene where its own camera, which nobody asked for, shows nothing at the start, in the
 // middle and at the end.
 void Renderer::ChooseCamera() {
-    if (options_.camera || UsesAutoCamera() || !model_.scene.cameraCount) return;
+    if (options_.camera || options_.look || view_->UsesAutoCamera() || !view_->Model()->scene.cameraCount)
+        return;
     const size_t count = PictureCount();
     std::string reason;
     const auto blank = [&](size_t index) {
         EngineOutput quiet;
         DrawNumber(index);
         if (!ShowsOnly(options_.background, Pixels(false))) return false;
-        if (reason.empty()) reason = WhyNothingShows(model_, camera_, points_);
+        if (reason.empty()) reason = WhyNothingShows(*view_->Model(), view_->Camera(), view_->Points());
         return true;
     };
     for (size_t index : std::set<size_t>{0, count / 2, count - 1})
         if (!blank(index)) return;
-    autoCamera_ = true;
+    view_->autoCamera = true;
     const bool helps = !blank(0);
-    autoCamera_ = helps;
+    view_->autoCamera = helps;
     if (helps)
         Warn("the scene's camera shows nothing: " + reason.substr(0, reason.find(';')) +
              "; the automatic camera is used (--camera 0 for the scene's)");
@@ -230,14 +211,8 @@ int Renderer::Run() {
     if (!problem.empty()) return Fail(problem, 2);
     problem = CheckOptions();
     if (!problem.empty()) return Fail(input_.Name() + ": " + problem, 2);
-    if (options_.effects.shader.empty())
-        shaders_.UseDefault(&model_, options_.effects.shadow, lit_);
-    else
-        shaders_.Use(&model_, options_.effects.shader, lit_);
-    transparent_.resize(model_.scene.meshNodeCount + size_t{1});
-    Frame();
     WarnOfFrames();
-    if (!LoadSurroundings(&problem)) return Fail(problem, 1);
+    if (!unusable_.empty()) return Fail(unusable_, 1);
     ChooseCamera();
     return DrawAll();
 }
@@ -263,19 +238,20 @@ int Renderer::DrawAll() {
         std::string reason;
         {
             EngineOutput quiet;
-            if (emitters_ && options_.frames && i > 0)
-                emitters_->Run(static_cast<float>(options_.frames->step) /
-                               static_cast<float>(std::max(model_.scene.framesPerSecond, 1u)));
+            if (view_->Particles() && options_.frames && i > 0)
+                view_->Particles()->Run(
+                    static_cast<float>(options_.frames->step) /
+                    static_cast<float>(std::max(view_->Model()->scene.framesPerSecond, 1u)));
             DrawNumber(i);
             pixels = Pixels(false);
             if (ShowsOnly(options_.background, pixels) && blank++ == 0)
-                reason = WhyNothingShows(model_, camera_, points_);
+                reason = WhyNothingShows(*view_->Model(), view_->Camera(), view_->Points());
             if (!options_.text.empty()) pixels = Pixels(true);
         }
         drawTime_ += Milliseconds(start);
         if (!reason.empty()) Warn(OutputPath(i) + ": nothing of the scene shows: " + reason);
         if (!Save(OutputPath(i), pixels)) return 2;
-        PrintPicked(&engine_, &model_, camera_, scale_, options_.effects.picks);
+        PrintPicked();
         if (!options_.quiet) ReportProgress(i + 1, count);
     }
     if (blank > 1)
@@ -283,10 +259,22 @@ int Renderer::DrawAll() {
     if (options_.stats) {
         const uint64_t draws = gltapCount("glDrawElements") + gltapCount("glDrawArrays");
         const uint64_t calls = gltapCountAll();
-        ReportStats({model_, *context_, count, loadTime_, drawTime_, draws, calls, options_.lean,
+        ReportStats({*view_->Model(), *context_, count, loadTime_, drawTime_, draws, calls, options_.lean,
                      CallsOfOtherDrawing()});
     }
     return 0;
+}
+
+// Prints the mesh nodes under each point, one line a point.
+void Renderer::PrintPicked() {
+    for (const QexVec2& point : options_.effects.picks) {
+        printf("%g,%g:", static_cast<double>(point.x), static_cast<double>(point.y));
+        for (const uint32_t node : view_->Pick(point.x, point.y)) {
+            const char* name = QexModel_GetNodeName(view_->Model(), node);
+            printf(" %s", name ? name : "(no name)");
+        }
+        printf("\n");
+    }
 }
 
 int RunRender(const RenderOptions& options) {

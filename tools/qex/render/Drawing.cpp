@@ -1,174 +1,11 @@
-// The drawing of one picture.
-#include <algorithm>
-#include <cmath>
-
-#include <GLES2/gl2.h>
-
+// One picture: drawn, with its line of text.
 #include "common/ImageFile.h"
-#include "common/SceneBounds.h"
 #include "render/Renderer.h"
-
-namespace {
-
-constexpr size_t kFramingPoints = 200000;  // of each mesh node over all frames, about
-constexpr size_t kFramingPictures = 200;   // of a sequence that the camera is fitted to, at most
-
-}  // namespace
-
-// The engine plays a loop, in which the last frame is the first again. A picture of the last frame shows its
-// own keys.
-void Renderer::SetFrame(double frame) {
-    QexPODModel& scene = model_.scene;
-    const float f = static_cast<float>(frame);
-    QexPODModel_SetFrame(&scene, f);
-    if (scene.frameCount < 2 || f != static_cast<float>(scene.frameCount - 1)) return;
-    for (uint32_t i = 0; i < scene.nodeCount; ++i) QexPODModel_SetNodeAnimationFrame(&scene, i, f);
-}
-
-// Collects what the automatic camera has to show, over all frames, with its mirror image.
-void Renderer::Frame() {
-    const size_t count = options_.frames ? PictureCount() : 1;
-    // Of long sequences some pictures stand for all.
-    const size_t step = (count + kFramingPictures - 1) / kFramingPictures;
-    const size_t share = std::max<size_t>(1000, kFramingPoints / (count / step));
-    for (size_t picture = 0; picture < count; picture += step) {
-        SetFrame(FrameAt(picture));
-        for (uint32_t i = 0; i < model_.scene.meshNodeCount; ++i)
-            CollectPoints(&model_.scene, i, share, &points_);
-    }
-    const std::optional<float> mirror =
-        options_.effects.mirror ? options_.effects.mirror : options_.effects.water;
-    if (!mirror) return;
-    for (size_t i = 0, seen = points_.size(); i < seen; ++i) {
-        const QexVec3 p = points_[i];
-        points_.push_back({p.x, 2 * *mirror - p.y, p.z});
-    }
-}
-
-float Renderer::SceneSize() const {
-    const Bounds bounds = BoundsOf(points_);
-    const float edge = bounds.empty ? 0 : bounds.LongestEdge();
-    return edge > 0 ? edge : 1;
-}
-
-// With the eyes side by side each has half the picture.
-void Renderer::PlaceCamera(float turned) {
-    const int width = options_.effects.stereo == 3 ? std::max(options_.width / 2, 1) : options_.width;
-    const float aspect = static_cast<float>(width) / static_cast<float>(options_.height);
-    QexCamera_Create(&camera_, 0);
-    OrbitView view = ChooseView(points_, options_.view);
-    view.yaw += turned;
-    const uint32_t camera = static_cast<uint32_t>(options_.camera.value_or(0));
-    if (UsesAutoCamera() || !UseSceneCamera(&model_, camera, aspect, &camera_))
-        FramePoints(points_, view, aspect, &camera_);
-}
-
-void Renderer::Draw(double frame, float turned) {
-    SetFrame(frame);
-    PlaceCamera(turned);
-    glViewport(0, 0, context_->Width(), context_->Height());
-    if (options_.effects.depthOfField) {
-        DrawWithDepthOfField(&engine_, options_.effects, scale_,
-                             [this](QexShaderModule* module, QexShaderModule* skinned) {
-                                 Clear(module ? 0xFFFFFF : options_.background);
-                                 module ? DrawDepth(module, skinned) : DrawScene(camera_);
-                             });
-        return;
-    }
-    Clear(options_.background);
-    if (sky_)
-        sky_->Draw(
-            &engine_, camera_, [this](const QexCamera& camera) { DrawOpaque(camera); },
-            [this](const QexCamera& camera) { DrawBlended(camera); });
-    else if (options_.effects.stereo)
-        DrawBothEyes();
-    else
-        DrawScene(camera_);
-}
 
 void Renderer::DrawNumber(size_t index) {
     const double turns = options_.turn ? static_cast<double>(index) / options_.turn : 0;
-    Draw(FrameAt(index), static_cast<float>(360 * turns));
-}
-
-void Renderer::Clear(uint32_t colour) {
-    const auto channel = [&](int shift) { return static_cast<float>(colour >> shift & 0xFF) / 255.0f; };
-    QexRenderer_SetZWrite(1);
-    glClearColor(channel(16), channel(8), channel(0), 1);
-    glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
-}
-
-// Everything that can be seen, with modules that show its depth.
-void Renderer::DrawDepth(QexShaderModule* module, QexShaderModule* skinned) {
-    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
-    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
-    QexRenderer_SetAlphaBlendMode(QEX_BLEND_NONE);
-    QexModel* floor = floor_ ? floor_->Model() : nullptr;
-    const ShaderOverride floorDepth(floor, module, skinned), modelDepth(&model_, module, skinned);
-    if (floor) QexModel_RenderWithCamera(floor, nullptr, &camera_, nullptr, 0);
-    for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-        QexModel_RenderWithCamera(&model_, nullptr, &camera_, nullptr, pass);
-}
-
-// The eyes are a thirtieth of the way to the target apart.
-void Renderer::DrawBothEyes() {
-    QexVec3 forward, right;
-    QexVec3_Subtract(&forward, &camera_.target, &camera_.eye);
-    QexVec3_CrossProduct(&right, &forward, &camera_.up);
-    QexVec3_Normalize(&right, &right);
-    const float half = sqrtf(QexVec3_DotProduct(&forward, &forward)) / 60;
-    QexRenderer_EnableStereo3D(&engine_, options_.effects.stereo,
-                               options_.effects.separation * static_cast<float>(scale_));
-    for (const float side : {-half, half}) {
-        QexCamera eye = camera_;
-        const QexVec3 place = {eye.eye.x + side * right.x, eye.eye.y + side * right.y,
-                               eye.eye.z + side * right.z};
-        QexCamera_LookAt(&eye, &place, &camera_.target, &camera_.up);
-        (side < 0 ? QexRenderer_PrepareLeft : QexRenderer_PrepareRight)(&engine_);
-        DrawScene(eye);
-    }
-    QexRenderer_FinishStereo3D(&engine_);
-}
-
-void Renderer::DrawScene(const QexCamera& camera) {
-    DrawOpaque(camera);
-    DrawBlended(camera);
-}
-
-void Renderer::DrawOpaque(const QexCamera& camera) {
-    transparentCount_ = 0;
-    const QexLightSet lights = ChooseLights(&model_, options_.effects, camera);
-    QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
-    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
-    QexRenderer_SetAlphaBlendModeSeparate(QEX_BLEND_ALPHA, QEX_BLEND_KEEP_ALPHA);
-    QexModel* floor = floor_ ? floor_->Model() : nullptr;
-    if (floor && options_.effects.mirror)
-        floor_->DrawMirrorImage(&model_, lights, camera);
-    else
-        DrawMirrored(&model_, options_.effects, lights, camera);
-    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
-    if (options_.effects.shadow) {
-        DrawWithShadow(&engine_, floor, &model_, lights, camera);
-        return;
-    }
-    if (floor) QexModel_RenderWithCamera(floor, &lights, &camera, nullptr, 0);
-    for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-        QexModel_RenderWithCameraEx(&model_, &lights, &camera, nullptr, pass, QEX_RENDER_OPAQUE,
-                                    transparent_.data(), &transparentCount_);
-}
-
-// Draws what was put off, and the particles.
-void Renderer::DrawBlended(const QexCamera& camera) {
-    // The far sides of transparent bodies first, then the near ones.
-    QexRenderer_SetZWrite(0);
-    for (int32_t culled : {QEX_CULL_FRONT, QEX_CULL_BACK}) {
-        QexRenderer_SetBackFaceCulling(culled);
-        for (uint32_t pass = 0; pass <= model_.scene.highestPass; ++pass)
-            QexModel_RenderAlphaBlendingNodes(transparent_.data(), transparentCount_, pass);
-    }
-    QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
-    QexRenderer_SetZWrite(1);
-    if (emitters_) emitters_->Draw(camera);
+    view_->SetFrame(FrameAt(index));
+    view_->Draw(static_cast<float>(360 * turns));
 }
 
 void Renderer::DrawText() {
@@ -185,7 +22,7 @@ std::vector<uint8_t> Renderer::Pixels(bool text) {
     for (size_t i = 3; i < pixels.size(); i += 4) pixels[i] = 255;
     if (!text || scale_ == 1) return pixels;
     // Letters have the size that they have in other pictures: they are drawn by themselves and laid over it.
-    Clear(0);
+    view_->Clear(0);
     DrawText();
     BlendWhite(context_->ReadPixels(), context_->Width(), &pixels, options_.width);
     return pixels;

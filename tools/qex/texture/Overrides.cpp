@@ -1,34 +1,13 @@
-// Checks and finds textures that a command line gives to materials.
+// Finds textures that a command line gives to materials.
 #include "texture/Overrides.h"
 
 #include <algorithm>
-
-#include <CLI/CLI.hpp>
-
-#include "common/CommandLine.h"
-#include "common/TextureFiles.h"
 
 namespace {
 
 constexpr size_t kMostListed = 20;
 
-// Names of materials may hold '='; the names of files seldom do.
-std::string Parse(const std::string& text, TextureOverrides* overrides) {
-    const size_t at = text.rfind('=');
-    if (at == std::string::npos || at + 1 == text.size())
-        return "'" + text + "' is no texture; expected MATERIAL=FILE";
-    const std::string file = text.substr(at + 1);
-    overrides->emplace_back(text.substr(0, at), file);
-    return IsRegularFile(file) ? "" : file + ": no such file";
-}
-
 }  // namespace
-
-void AddTextureOption(CLI::App* app, TextureOverrides* overrides) {
-    AddParsed(
-        app, "--texture", "MATERIAL=FILE, a texture for a material, in place of its own; repeatable",
-        [=](const std::string& text) { return Parse(text, overrides); }, kMostRepeats);
-}
 
 std::string OverrideOf(const TextureOverrides& overrides, const std::string& material) {
     const auto found = std::find_if(overrides.rbegin(), overrides.rend(),

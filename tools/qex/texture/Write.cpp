@@ -25,24 +25,6 @@ std::vector<std::vector<std::vector<uint8_t>>> EncodeFaces(const std::vector<Ima
 
 }  // namespace
 
-Image FlipRows(const Image& image) {
-    Image out = image;
-    const size_t row = static_cast<size_t>(image.width) * 4;
-    for (int y = 0; y < image.height; ++y)
-        std::copy_n(image.Pixel(0, image.height - 1 - y), row, &out.pixels[static_cast<size_t>(y) * row]);
-    return out;
-}
-
-Image AlphaAsGrey(const Image& image) {
-    Image out = image;
-    for (size_t i = 0; i < out.pixels.size(); i += 4) {
-        std::fill_n(&out.pixels[i], 3, out.pixels[i + 3]);
-        out.pixels[i + 3] = 255;
-    }
-    out.hasAlpha = false;
-    return out;
-}
-
 std::vector<uint8_t> EncodePvrFile(const std::vector<Image>& faces, const PixelFormat& format, bool mipmaps,
                                    bool flipped) {
     pod::PvrImage pvr;

@@ -6,11 +6,6 @@
 #include "common/ImageFile.h"
 #include "texture/Formats.h"
 
-Image FlipRows(const Image& image);
-
-// A picture whose red, green and blue all hold the alpha channel.
-Image AlphaAsGrey(const Image& image);
-
 // One picture, or six square ones for a cube map in the order +X -X +Y -Y +Z -Z; all of one size. `mipmaps`
 // adds the whole chain. `flipped` says in the header that the first row is the lower edge; no row is moved.
 std::vector<uint8_t> EncodePvrFile(const std::vector<Image>& faces, const PixelFormat& format, bool mipmaps,

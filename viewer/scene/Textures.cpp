@@ -1,30 +1,37 @@
 // The hooks through which the engine asks for a model's textures, and what they find.
-#include "render/Textures.h"
+#include "scene/Textures.h"
 
 #include <cstdio>
 #include <cstring>
+#include <map>
 
 #include <GLES2/gl2.h>
-#include <CLI/CLI.hpp>
 
 #include "common/TextureFiles.h"
 #include "info/Exporter.h"
-#include "texture/Write.h"
 
 namespace {
 
 constexpr uint32_t kNormalMapUnit = 1;  // of the normal-mapped modules
 
-// Where the textures of the model at hand come from; the engine's hook takes no pointer of ours.
+// Where a model's textures come from; the engine's hook takes no pointer of ours.
 struct Lookup {
     std::string directory;
     TextureOverrides overrides;
     bool vRunsDown = false;
+    std::vector<std::string> problems;
+    std::vector<bool> coloured;          // by material: with a texture of its colour
+    std::vector<QexTexture> normalMaps;  // by material
 };
 
-Lookup g_lookup;
-std::vector<std::string> g_problems;
-std::vector<QexTexture> g_normalMaps;  // by material
+std::map<const QexModel*, Lookup>& Lookups() {
+    static std::map<const QexModel*, Lookup> lookups;
+    return lookups;
+}
+
+Lookup& LookupOf(const QexModel* model) {
+    return Lookups()[model];
+}
 
 // A record that the model will release and free.
 QexTexture* NewTexture() {
@@ -47,6 +54,12 @@ int NextPowerOfTwo(int size) {
     return power;
 }
 
+void ReleaseNormalMaps(Lookup* lookup) {
+    for (QexTexture& texture : lookup->normalMaps)
+        if (texture.glName) QexTexture_Release(&texture);
+    lookup->normalMaps.clear();
+}
+
 // Uploads pixels with mipmaps, repeating; GL ES 2.0 wants powers of two for that.
 void Upload(QexTexture* texture, Image image, const std::string& name) {
     GLint most = 0;
@@ -64,20 +77,20 @@ void Upload(QexTexture* texture, Image image, const std::string& name) {
 }
 
 // Reads a picture with the row first that lies at V = 0.
-bool ReadPicture(const char* what, const std::string& path, Image* image) {
+bool ReadPicture(Lookup* lookup, const char* what, const std::string& path, Image* image) {
     std::string error;
     if (!LoadImage(path, image, &error)) {
-        g_problems.push_back(std::string(what) + " " + path + ": " + error);
+        lookup->problems.push_back(std::string(what) + " " + path + ": " + error);
         return false;
     }
-    if (!g_lookup.vRunsDown) *image = FlipRows(*image);
+    if (!lookup->vRunsDown) *image = FlipRows(*image);
     return true;
 }
 
 // Reads a picture into the model's texture of a material.
 bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
     Image image;
-    if (!ReadPicture("texture", path, &image)) return false;
+    if (!ReadPicture(&LookupOf(model), "texture", path, &image)) return false;
     Upload(model->textures[material], image, FileName(path));
     if (!image.hasAlpha) return true;
     model->alphaTextures[material] = NewTexture();
@@ -87,9 +100,9 @@ bool LoadPicture(QexModel* model, uint32_t material, const std::string& path) {
 }
 
 // Pictures hold a normal's x in red and y in green; the engine reads them the other way round.
-bool LoadNormalPicture(QexTexture* texture, const std::string& path) {
+bool LoadNormalPicture(Lookup* lookup, QexTexture* texture, const std::string& path) {
     Image image;
-    if (!ReadPicture("normal map", path, &image)) return false;
+    if (!ReadPicture(lookup, "normal map", path, &image)) return false;
     for (size_t i = 0; i < image.pixels.size(); i += 4) std::swap(image.pixels[i], image.pixels[i + 1]);
     Upload(texture, image, FileName(path));
     return true;
@@ -104,7 +117,7 @@ bool LoadContainer(QexTexture* texture, const std::string& path) {
 // The file given for a material in place of its own texture; empty when none is.
 std::string Chosen(const QexModel* model, uint32_t material) {
     const char* name = model->scene.materials[material].name;
-    return OverrideOf(g_lookup.overrides, name ? name : "");
+    return OverrideOf(LookupOf(model).overrides, name ? name : "");
 }
 
 // Whether a mesh has what a normal map is laid on.
@@ -116,19 +129,20 @@ bool HasTangents(const QexPODMesh& mesh) {
 int32_t BindNormalMap(QexModel* model, uint32_t nodeIndex) {
     const QexPODNode& node = model->scene.nodes[nodeIndex];
     const size_t material = static_cast<size_t>(node.materialIndex);
-    if (node.materialIndex >= 0 && g_normalMaps[material].glName &&
+    std::vector<QexTexture>& maps = LookupOf(model).normalMaps;
+    if (node.materialIndex >= 0 && material < maps.size() && maps[material].glName &&
         HasTangents(model->scene.meshes[node.objectIndex]))
-        QexTexture_Set(&g_normalMaps[material], kNormalMapUnit);
+        QexTexture_Set(&maps[material], kNormalMapUnit);
     return 0;
 }
 
 int32_t LoadTextureHook(QexModel* model, char* path, int32_t capacity) {
     // Those that are given come later, as materials without a texture get them, too.
     if (!Chosen(model, CurrentMaterial(model)).empty()) return 1;
-    const TextureFile found = FindTexture(g_lookup.directory, path + g_lookup.directory.size());
+    const TextureFile found = FindTexture(LookupOf(model).directory, path + LookupOf(model).directory.size());
     if (found.kind == TextureFile::kMissing) {
-        g_problems.push_back("texture " + std::string(path) +
-                             " is missing (no .pvr, .ktx or picture of that name)");
+        LookupOf(model).problems.push_back("texture " + std::string(path) +
+                                           " is missing (no .pvr, .ktx or picture of that name)");
         return 0;
     }
     if (found.kind == TextureFile::kPicture)
@@ -158,7 +172,7 @@ std::string FileOf(const QexModel* model, uint32_t material) {
     const std::string given = Chosen(model, material);
     const int32_t index = model->scene.materials[material].diffuseTexture;
     if (!given.empty() || index < 0 || !model->scene.textures[index].name) return given;
-    return FindTexture(g_lookup.directory, model->scene.textures[index].name).path;
+    return FindTexture(LookupOf(model).directory, model->scene.textures[index].name).path;
 }
 
 void LoadGiven(QexModel* model, uint32_t material, const std::string& path) {
@@ -167,7 +181,7 @@ void LoadGiven(QexModel* model, uint32_t material, const std::string& path) {
     if (extension != "pvr" && extension != "ktx")
         LoadPicture(model, material, path);
     else if (!LoadContainer(model->textures[material], path))
-        g_problems.push_back("texture " + path + " cannot be loaded");
+        LookupOf(model).problems.push_back("texture " + path + " cannot be loaded");
 }
 
 // The alpha texture of a material, where the engine has looked for it under another name.
@@ -177,7 +191,7 @@ void FindAlpha(QexModel* model, uint32_t material, const std::string& file) {
     const bool given = !Chosen(model, material).empty();
     const TextureFile found =
         given ? FindTexture(Directory(file), AlphaPath(FileName(file)))
-              : FindTexture(g_lookup.directory, AlphaPath(model->scene.textures[index].name));
+              : FindTexture(LookupOf(model).directory, AlphaPath(model->scene.textures[index].name));
     if (found.kind != TextureFile::kContainer) return;
     QexTexture* texture = NewTexture();
     if (texture && LoadContainer(texture, found.path)) {
@@ -191,35 +205,56 @@ void FindAlpha(QexModel* model, uint32_t material, const std::string& file) {
 
 std::vector<std::string> LoadNormalMaps(QexModel* model) {
     const QexPODModel& scene = model->scene;
-    g_problems.clear();
-    g_normalMaps.assign(scene.materialCount, {});
+    Lookup& lookup = LookupOf(model);
+    ReleaseNormalMaps(&lookup);
+    lookup.problems.clear();
+    lookup.normalMaps.assign(scene.materialCount, {});
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const int32_t index = scene.materials[i].bumpTexture;
         if (index < 0 || !scene.textures[index].name) continue;
-        const TextureFile found = FindTexture(g_lookup.directory, scene.textures[index].name);
+        const TextureFile found = FindTexture(LookupOf(model).directory, scene.textures[index].name);
         if (found.kind == TextureFile::kMissing)
-            g_problems.push_back("normal map " + g_lookup.directory + scene.textures[index].name +
-                                 " is missing");
+            LookupOf(model).problems.push_back("normal map " + LookupOf(model).directory +
+                                               scene.textures[index].name + " is missing");
         else if (found.kind == TextureFile::kPicture)
-            LoadNormalPicture(&g_normalMaps[i], found.path);
-        else if (!LoadContainer(&g_normalMaps[i], found.path))
-            g_problems.push_back("normal map " + found.path + " cannot be loaded");
+            LoadNormalPicture(&lookup, &lookup.normalMaps[i], found.path);
+        else if (!LoadContainer(&lookup.normalMaps[i], found.path))
+            LookupOf(model).problems.push_back("normal map " + found.path + " cannot be loaded");
     }
     for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
         const QexPODNode& node = scene.nodes[i];
-        if (node.materialIndex >= 0 && g_normalMaps[static_cast<size_t>(node.materialIndex)].glName &&
+        if (node.materialIndex >= 0 && lookup.normalMaps[static_cast<size_t>(node.materialIndex)].glName &&
             !HasTangents(scene.meshes[node.objectIndex]))
-            g_problems.push_back("mesh node " + std::to_string(i) +
-                                 " has no tangents: its normal map is not used");
+            LookupOf(model).problems.push_back("mesh node " + std::to_string(i) +
+                                               " has no tangents: its normal map is not used");
     }
     model->bindTextureHook = BindNormalMap;
-    return g_problems;
+    return lookup.problems;
 }
 
-void ReleaseNormalMaps() {
-    for (QexTexture& texture : g_normalMaps)
-        if (texture.glName) QexTexture_Release(&texture);
-    g_normalMaps.clear();
+void RecolourTextures(QexModel* model, const std::vector<bool>& lit) {
+    const std::vector<bool>& coloured = LookupOf(model).coloured;
+    for (uint32_t i = 0; i < model->scene.materialCount && i < coloured.size(); ++i) {
+        if (!coloured[i]) continue;
+        QexTexture* before =
+            QexModel_ReplaceTextureByIdx(model, ColourTexture(model->scene.materials[i], lit[i]), i);
+        if (before) QexTexture_Release(before);
+        QexMemory_Free(before);
+    }
+}
+
+std::vector<std::string> TextureFilesOf(const QexModel* model) {
+    std::vector<std::string> files;
+    for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
+        const std::string file = FileOf(model, i);
+        if (!file.empty()) files.push_back(file);
+    }
+    return files;
+}
+
+void ForgetTextures(QexModel* model) {
+    ReleaseNormalMaps(&LookupOf(model));
+    Lookups().erase(model);
 }
 
 QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
@@ -228,23 +263,13 @@ QexTexture* NewPictureTexture(const Image& image, const std::string& name) {
     return texture;
 }
 
-void SetUpTextureChoices(CLI::App* app, TextureChoices* choices) {
-    AddTextureOption(app, &choices->overrides);
-    app->add_option(
-           "--flip-textures", choices->flipped,
-           "whether V runs down the pictures beside the scene: yes or no (as its export options say, "
-           "else no)")
-        ->transform(CLI::CheckedTransformer(std::map<std::string, bool>{{"yes", true}, {"no", false}},
-                                            CLI::ignore_case));
-}
-
 void SetTextureHook(QexModel* model, const std::string& directory, const std::string& scenePath,
                     const TextureChoices& choices) {
-    g_problems.clear();
-    g_lookup.directory = directory;
-    g_lookup.overrides = choices.overrides;
-    g_lookup.vRunsDown =
-        choices.flipped.value_or(ReadExporterText(scenePath).FlipsTextureV().value_or(false));
+    Lookup& lookup = LookupOf(model);
+    lookup = {};
+    lookup.directory = directory;
+    lookup.overrides = choices.overrides;
+    lookup.vRunsDown = choices.flipped.value_or(ReadExporterText(scenePath).FlipsTextureV().value_or(false));
     model->loadTextureHook = LoadTextureHook;
 }
 
@@ -254,11 +279,12 @@ std::string CheckTextureChoices(const QexModel* model) {
         const char* name = model->scene.materials[i].name;
         names.push_back(name ? name : "");
     }
-    return UnknownMaterial(g_lookup.overrides, names);
+    return UnknownMaterial(LookupOf(model).overrides, names);
 }
 
 std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<bool>& lit) {
     QexPODModel& scene = model->scene;
+    Lookup& lookup = LookupOf(model);
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const std::string given = Chosen(model, i), file = FileOf(model, i);
         if (!given.empty()) LoadGiven(model, i, given);
@@ -268,6 +294,7 @@ std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<boo
             QexMemory_Free(QexModel_ReplaceTextureByIdx(model, nullptr, i));
             texture = nullptr;
         }
+        lookup.coloured.push_back(!texture);
         if (!texture) QexModel_ReplaceTextureByIdx(model, ColourTexture(scene.materials[i], lit[i]), i);
         FindAlpha(model, i, file);
         // A KTX file sets no filter, and GL's own takes the nearest texel of each level.
@@ -278,5 +305,5 @@ std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<boo
         if (node.materialIndex >= 0 && model->alphaTextures[node.materialIndex])
             node.blendFlags &= static_cast<uint8_t>(~QEX_NODE_OPAQUE);
     }
-    return g_problems;
+    return lookup.problems;
 }

@@ -1,11 +1,11 @@
-// How qex render shades a scene: the modules that draw its nodes, and the lights.
+// How a scene is shaded: the modules that draw its nodes, and the lights.
 #pragma once
 
 #include <string>
 #include <vector>
 
 #include "Qex.h"
-#include "render/Effects.h"
+#include "scene/Effects.h"
 
 // The clip-space z of a camera's near and far plane.
 constexpr float kNearDepth = 0, kFarDepth = 1;

@@ -1,5 +1,5 @@
 // Emitters run at a fixed rate and from a fixed seed.
-#include "render/Emitters.h"
+#include "scene/Emitters.h"
 
 #include <algorithm>
 #include <cmath>
@@ -9,10 +9,8 @@
 
 #include "common/EngineOutput.h"
 #include "common/TextureFiles.h"
-#include "emitter/Description.h"
 #include "Paint.h"
-#include "render/Textures.h"
-#include "texture/Write.h"
+#include "scene/Textures.h"
 
 namespace {
 
@@ -34,6 +32,12 @@ int32_t ModeOf(const QexParticleEmitter& e) {
 
 }  // namespace
 
+QexParticleEmitter* LoadEmitterFile(const std::string& path, std::string* problem) {
+    QexParticleEmitter* emitter = QexParticleEmitter_CreateFromBinFile(path.c_str());
+    *problem = emitter ? "" : "is no emitter file";
+    return emitter;
+}
+
 Emitters::~Emitters() {
     for (QexParticleEmitter* emitter : emitters_) QexParticleEmitter_Release(emitter);
     for (QexTexture* texture : textures_) {
@@ -51,7 +55,8 @@ void Emitters::AddTexture(const Image& image, const std::string& name) {
     textures_.push_back(texture);
 }
 
-bool Emitters::Load(const EmitterScene& scene, std::vector<std::string>* warnings, std::string* problem) {
+bool Emitters::Load(const EmitterScene& scene, EmitterLoader load, std::vector<std::string>* warnings,
+                    std::string* problem) {
     for (const std::string& path : scene.textures) {
         Image image;
         if (!LoadImage(path, &image, problem)) {
@@ -63,7 +68,7 @@ bool Emitters::Load(const EmitterScene& scene, std::vector<std::string>* warning
     if (scene.textures.empty())
         AddTexture({kSpotSize, kSpotSize, pod::Spot(kSpotSize, {255, 255, 255})}, "spot");
     for (const std::string& path : scene.emitters) {
-        QexParticleEmitter* emitter = LoadEmitter(path, problem);
+        QexParticleEmitter* emitter = load(path, problem);
         if (!emitter) {
             *problem = path + ": " + *problem;
             return false;

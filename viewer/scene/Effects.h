@@ -1,4 +1,4 @@
-// What qex render can do with a scene beyond drawing it as it is: moved nodes, shadow, mirror, stereo,
+// What can be done with a scene beyond drawing it as it is: moved nodes, shadow, mirror, stereo,
 // picking.
 #pragma once
 
@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "Qex.h"
-#include "render/Emitters.h"
+#include "scene/Emitters.h"
 
 struct NodeChange {
     enum What { kHide, kMove, kRotate, kFace };
@@ -16,10 +16,19 @@ struct NodeChange {
     std::string node;
     What what;
     QexVec3 value;  // a place, or degrees
+
+    bool operator==(const NodeChange& o) const {
+        return node == o.node && what == o.what && value.x == o.value.x && value.y == o.value.y &&
+               value.z == o.value.z;
+    }
 };
 
 struct DepthOfField {
     float focus, range, sigma, samples;  // as QexPostProcessing_DrawDOF takes them
+
+    bool operator==(const DepthOfField& o) const {
+        return focus == o.focus && range == o.range && sigma == o.sigma && samples == o.samples;
+    }
 };
 
 struct EffectOptions {
@@ -61,8 +70,3 @@ void DrawMirrored(QexModel* model, const EffectOptions& options, const QexLightS
 using DrawPass = std::function<void(QexShaderModule* module, QexShaderModule* skinned)>;
 void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& options, int scale,
                           const DrawPass& draw);
-
-// Prints the mesh nodes under each point of a picture that was drawn `scale` times as large, one line a
-// point.
-void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera, int scale,
-                 const std::vector<QexVec2>& points);

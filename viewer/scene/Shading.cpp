@@ -1,5 +1,5 @@
 // The table of the shader modules, and the default look.
-#include "render/Shading.h"
+#include "scene/Shading.h"
 
 namespace {
 

@@ -1,9 +1,9 @@
-// The camera that qex render looks through.
+// The cameras that a scene is seen through.
 #pragma once
 
 #include <vector>
 
-#include "common/CommandLine.h"
+#include "common/UpAxis.h"
 #include "Qex.h"
 
 struct OrbitView {
@@ -11,6 +11,12 @@ struct OrbitView {
     float pitch = 15;  // degrees above the horizon
     UpAxis up = UpAxis::kY;
     bool given = false;  // otherwise flat scenes, such as writing, are seen from the front
+};
+
+// From a place to another.
+struct LookView {
+    QexVec3 eye, target;
+    float fov = 45;  // vertical, degrees
 };
 
 // Fills the camera from a scene camera at the current frame. False when the scene has no such camera.
@@ -21,3 +27,11 @@ OrbitView ChooseView(const std::vector<QexVec3>& points, OrbitView view);
 
 // Places the camera so that all points are in the picture, from the direction of the view.
 void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, float aspect, QexCamera* camera);
+
+// The vertical of an axis, and where the camera stands at yaw 0.
+QexVec3 UpOf(UpAxis up);
+QexVec3 FrontOf(UpAxis up);
+
+// Looks as told, with depths around all points and what lies `margin` beyond them.
+void LookAlong(const LookView& look, UpAxis up, const std::vector<QexVec3>& points, float margin,
+               float aspect, QexCamera* camera);

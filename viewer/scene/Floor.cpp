@@ -1,5 +1,5 @@
 // A plane of the size of the scene, as a model of its own.
-#include "render/Floor.h"
+#include "scene/Floor.h"
 
 #include <algorithm>
 
@@ -7,7 +7,7 @@
 
 #include "common/SceneBounds.h"
 #include "PodBuild.h"
-#include "render/Textures.h"
+#include "scene/Textures.h"
 
 namespace {
 

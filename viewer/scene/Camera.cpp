@@ -1,7 +1,8 @@
 // The scene's own camera, and one that is placed so that everything is in the picture.
-#include "render/Camera.h"
+#include "scene/Camera.h"
 
 #include <algorithm>
+#include <cfloat>
 #include <cmath>
 
 #include "common/SceneBounds.h"
@@ -79,4 +80,36 @@ void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, floa
     const QexVec3 target = Combine(right, up, back, cx, cy, distance - 1);
     QexCamera_LookAt(camera, &eye, &target, &up);
     QexCamera_Project(camera, 2 * std::atan(tanX), aspect, zNear, (distance - bounds.low.z) * 1.5f + zNear);
+}
+
+QexVec3 UpOf(UpAxis up) {
+    return kAxes[static_cast<int>(up)].up;
+}
+
+QexVec3 FrontOf(UpAxis up) {
+    return kAxes[static_cast<int>(up)].front;
+}
+
+void LookAlong(const LookView& look, UpAxis axis, const std::vector<QexVec3>& points, float margin,
+               float aspect, QexCamera* camera) {
+    QexVec3 forward, right, up = UpOf(axis);
+    QexVec3_Subtract(&forward, &look.target, &look.eye);
+    QexVec3_Normalize(&forward, &forward);
+    QexVec3_CrossProduct(&right, &forward, &up);
+    // Straight up or down the vertical is no up.
+    if (QexVec3_DotProduct(&right, &right) < 1e-8f) {
+        up = FrontOf(axis);
+        if (Along(forward, UpOf(axis)) > 0) QexVec3_Scale(&up, &up, -1);
+        QexVec3_Scale(&up, &up, -1);
+    }
+    float nearest = FLT_MAX, farthest = 0;
+    for (const QexVec3& p : points) {
+        const float depth = Along(p, forward) - Along(look.eye, forward);
+        nearest = std::min(nearest, depth - margin);
+        farthest = std::max(farthest, depth + margin);
+    }
+    farthest = std::max(farthest, 1e-3f) * 1.5f;
+    const float zNear = std::clamp(nearest * 0.5f, farthest * 5e-4f, farthest * 0.5f);
+    QexCamera_LookAt(camera, &look.eye, &look.target, &up);
+    QexCamera_Project(camera, look.fov * kDegree, aspect, zNear, farthest);
 }

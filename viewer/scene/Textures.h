@@ -1,4 +1,4 @@
-// Textures of the models that qex render draws: found beside the scene under several names and formats.
+// Textures of the models that are shown: found beside the scene under several names and formats.
 #pragma once
 
 #include <optional>
@@ -9,21 +9,20 @@
 #include "Qex.h"
 #include "texture/Overrides.h"
 
-namespace CLI {
-class App;
-}
-
-// What the command line says about textures.
+// What is said about textures besides what the scene says.
 struct TextureChoices {
     TextureOverrides overrides;
     std::optional<bool> flipped;  // V runs down the pictures; as the scene's export options say
+
+    bool operator==(const TextureChoices& o) const {
+        return overrides == o.overrides && flipped == o.flipped;
+    }
 };
 
-void SetUpTextureChoices(CLI::App* app, TextureChoices* choices);
-
-// Puts the texture hook into a model that will be loaded from `scenePath`, its textures from `directory`. For
-// NAME.png it looks for NAME.pvr, NAME.ktx, then NAME.png and other picture formats of that name (see
-// FindTexture); pictures are decoded here, with their alpha channel as the alpha texture.
+// Puts the texture hook into a model that will be loaded from `scenePath`, its textures from `directory`;
+// what the functions below need to know of it is kept until ForgetTextures. For NAME.png it looks for
+// NAME.pvr, NAME.ktx, then NAME.png and other picture formats of that name (see FindTexture); pictures are
+// decoded here, with their alpha channel as the alpha texture.
 void SetTextureHook(QexModel* model, const std::string& directory, const std::string& scenePath,
                     const TextureChoices& choices);
 
@@ -43,4 +42,12 @@ std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<boo
 // Loads the materials' bump textures and has them bound for the normal-mapped modules. Returns what is wrong
 // with them, one line each.
 std::vector<std::string> LoadNormalMaps(QexModel* model);
-void ReleaseNormalMaps();
+
+// After loading: the textures of one colour again, white where materials are `lit` now.
+void RecolourTextures(QexModel* model, const std::vector<bool>& lit);
+
+// The files that the model's textures came from.
+std::vector<std::string> TextureFilesOf(const QexModel* model);
+
+// Before a model is unloaded: releases its normal maps.
+void ForgetTextures(QexModel* model);

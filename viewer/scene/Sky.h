@@ -1,4 +1,4 @@
-// The sky that qex render draws around a scene, and still water in it.
+// The sky that is drawn around a scene, and still water in it.
 #pragma once
 
 #include <functional>

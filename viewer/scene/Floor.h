@@ -1,4 +1,4 @@
-// The floor that qex render can put under a scene: chequered, lit, in the XZ plane. It takes the scene's
+// The floor that can be put under a scene: chequered, lit, in the XZ plane. It takes the scene's
 // shadow and, half transparent, shows its mirror image.
 #pragma once
 

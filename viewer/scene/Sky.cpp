@@ -1,5 +1,5 @@
 // Cuts pictures into the squares of a cube map, and draws the scene in units that suit the water.
-#include "render/Sky.h"
+#include "scene/Sky.h"
 
 #include <algorithm>
 #include <cmath>
@@ -7,7 +7,7 @@
 #include <GLES2/gl2.h>
 
 #include "Paint.h"
-#include "render/Textures.h"
+#include "scene/Textures.h"
 
 namespace {
 

@@ -1,12 +1,11 @@
 // The engine's effects with the figures that suit a scene of any size.
-#include "render/Effects.h"
+#include "scene/Effects.h"
 
-#include <cstdio>
 #include <cstring>
 
 #include <GLES2/gl2.h>
 
-#include "render/Shading.h"
+#include "scene/Shading.h"
 
 namespace {
 
@@ -128,24 +127,4 @@ void DrawWithDepthOfField(QexRuntimeContext* engine, const EffectOptions& option
                               stepX, stepY, effect.sigma, effect.samples, options.fullBlur ? 2 : 0,
                               kNearDepth, kFarDepth);
     s_drawPass = nullptr;
-}
-
-void PrintPicked(QexRuntimeContext* engine, QexModel* model, const QexCamera& camera, int scale,
-                 const std::vector<QexVec2>& points) {
-    std::vector<uint32_t> hit(model->scene.meshNodeCount + size_t{1});
-    QexModel_UpdateModelBoundingBox(model, nullptr);
-    QexModel_CalcScreenBBox(engine, model, &camera);
-    for (const QexVec2& point : points) {
-        int32_t count = 0;
-        const float s = static_cast<float>(scale);
-        const QexVec2 drawn = {point.x * s, point.y * s};
-        QexModel_Pick(model, nullptr, &drawn, &count, hit.data(),
-                      static_cast<int32_t>(model->scene.meshNodeCount));
-        printf("%g,%g:", static_cast<double>(point.x), static_cast<double>(point.y));
-        for (int32_t i = 0; i < count; ++i) {
-            const char* name = QexModel_GetNodeName(model, hit[static_cast<size_t>(i)]);
-            printf(" %s", name ? name : "(no name)");
-        }
-        printf("\n");
-    }
 }
