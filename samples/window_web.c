@@ -51,6 +51,8 @@ static void DrawFrame(void* user) {
     }
     Window_BeginFrame(window);
     s_Page.draw(window, s_Page.user);
+    if (window->frames == 1 || window->picture)
+        EM_ASM({ Module["onFrame"] && Module["onFrame"]($0); }, window->frames);
     if (window->picture) emscripten_pause_main_loop();
 }
 
