@@ -10,7 +10,7 @@ int main(int argc, char** argv) {
     QexModel_Create(&model);
     QexModel_LoadContent(&model, window.files, "grid.pod");  // a folder and a file
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         QexCamera camera;
         const QexVec3 eye = {3, 3, 4}, target = {1, 1, 0};
         QexCamera_Create(&camera, 0);
@@ -25,7 +25,7 @@ int main(int argc, char** argv) {
         glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
         QexModel_RenderWithCamera(&model, nullptr, &camera, nullptr, 0);
         QexFont_DrawTempString(&window.engine, 8, 40, "Hello from Qex", 0xFFFFC040);
-    }
+    });
 
     QexModel_Unload(&model);
     return Window_Close(&window);

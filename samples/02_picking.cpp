@@ -29,7 +29,7 @@ int main(int argc, char** argv) {
     Window_LoadModel(&window, &cubes, "grid.pod");
     int hit = -1;
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {3, 2, 4}, {1, 1, 0});
         const QexVec2 point = {0.75f * static_cast<float>(window.width),
                                0.54f * static_cast<float>(window.height)};
@@ -43,7 +43,7 @@ int main(int argc, char** argv) {
         const char* name = hit >= 0 ? QexModel_GetNodeName(&cubes, static_cast<uint32_t>(hit)) : "nothing";
         QexFont_DrawTempString(&window.engine, static_cast<int32_t>(point.x), static_cast<int32_t>(point.y),
                                name, 0xFFFF4040);
-    }
+    });
     printf("hit: node %d\n", hit);
 
     QexModel_Unload(&cubes);

@@ -22,7 +22,7 @@ int main(int argc, char** argv) {
     QexNode_SetPosition(&moon, 0.8f, 0, 0);
     QexNode_SetScale(&moon, 0.5f, 0.5f, 0.5f);
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         QexNode_SetRotation(&orbit, 0, 20 * window.seconds + 15, 20);
         QexNode_SetRotation(&moonOrbit, 0, 0, -70 * window.seconds);
         QexNode_Update(nullptr, &sun, window.elapsed);
@@ -35,7 +35,7 @@ int main(int argc, char** argv) {
             QexNode_RenderWithCamera(&sun, &camera);
         }
         QexRenderer_FinishStereo3D(&window.engine);
-    }
+    });
 
     QexModel_Unload(&cube);
     return Window_Close(&window);

@@ -21,7 +21,7 @@ int main(int argc, char** argv) {
     QexLightSet lights = {};
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-1, -1, -2}, {1, 1, 1, 1}};
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {0, 2.5f, 15}, {0, 2, 0});
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         for (int i = 0; i < 5; ++i) {
@@ -32,7 +32,7 @@ int main(int argc, char** argv) {
             QexMatrix_Translate(&place, 2.6f * static_cast<float>(i - 2), 0, 0);
             QexModel_RenderWithCamera(&worm, &lights, &camera, &place, 0);
         }
-    }
+    });
 
     QexModel_Unload(&worm);
     QexGouraudShader_Release(&still);

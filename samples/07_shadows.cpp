@@ -25,7 +25,7 @@ int main(int argc, char** argv) {
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {direction.x, direction.y, direction.z}, {1, 1, 1, 1}};
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const int half = window.width / 2;
         QexCamera camera = Window_Camera(&window, {0.3f, 3.4f, 5}, {-0.8f, 1.1f, 0});
         QexCamera_Project(&camera, 1, static_cast<float>(half) / static_cast<float>(window.height), 0.1f,
@@ -44,7 +44,7 @@ int main(int argc, char** argv) {
             }
         }
         QexModel_ReleaseShadowInfo(shadow);
-    }
+    });
 
     QexModel_Unload(&worm);
     QexModel_Unload(&ball);

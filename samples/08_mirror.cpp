@@ -19,7 +19,7 @@ int main(int argc, char** argv) {
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_POINT, {-4, 6, 5}, {1, 1, 1, 1}};
     const QexShadowCaster everything = {&worm, 1, nullptr, 0};
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {1, 4, 10}, {0, 0.8f, 0});
         QexPODModel_SetFrame(&worm.scene, 1 + std::fmod(20 * window.seconds - 1, 58.0f));
 
@@ -31,7 +31,7 @@ int main(int argc, char** argv) {
         QexReflection_RenderReflection(mirror, &lights, &camera);
         QexModel_RenderWithCamera(&worm, &lights, &camera, nullptr, 0);
         QexReflection_Release(mirror);
-    }
+    });
 
     QexModel_Unload(&worm);
     QexGouraudShader_Release(&still);

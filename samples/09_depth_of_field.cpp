@@ -45,7 +45,7 @@ int main(int argc, char** argv) {
     s_Row.lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {1, -2, -1.5f}, {1, 1, 1, 1}};
     QexRuntimeContext quarter = {};
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         if (quarter.width != window.width / 2 || quarter.height != window.height / 2)
             StartEffect(&quarter, window);
         const int width = quarter.width, height = quarter.height;
@@ -61,7 +61,7 @@ int main(int argc, char** argv) {
                                           2.5f, step / static_cast<float>(width),
                                           step / static_cast<float>(height), sigma, 9, half ? 0 : 2, 0, 1);
             }
-    }
+    });
 
     QexPostProcessing_Finalize();
     QexModel_Unload(&s_Row.model);

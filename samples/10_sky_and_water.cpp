@@ -40,14 +40,15 @@ int main(int argc, char** argv) {
     box.drawScene = DrawScene;
     const int32_t created = QexSkyBox_Create(&box);
 
-    while (created == 0 && Window_Frame(&window)) {
-        camera = Window_Camera(&window, {90, 40, 190}, {-15, 22, 0});
-        QexCamera_Project(&camera, 0.9f, static_cast<float>(window.width) / static_cast<float>(window.height),
-                          1, 4000);
-        box.centre = camera.eye;
-        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
-        QexSkyBox_Update(&window.engine, &box, window.elapsed);
-    }
+    if (created == 0)
+        Window_Run(&window, [&] {
+            camera = Window_Camera(&window, {90, 40, 190}, {-15, 22, 0});
+            QexCamera_Project(&camera, 0.9f,
+                              static_cast<float>(window.width) / static_cast<float>(window.height), 1, 4000);
+            box.centre = camera.eye;
+            Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+            QexSkyBox_Update(&window.engine, &box, window.elapsed);
+        });
 
     QexSkyBox_Release();
     QexTexture_Release(&normals);

@@ -16,7 +16,7 @@ int main(int argc, char** argv) {
     QexFont_AddString(engine, 8, 48, "Text that stays until it is replaced", 255, 255, 255, 255);
     QexFont_AddString(engine, 8, 66, "and may be added to, in another colour", 160, 220, 255, 255);
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const float width = static_cast<float>(window.width), height = static_cast<float>(window.height);
         const QexCamera camera = Window_Camera(&window, {2.5f, 2.2f, 4}, {1, 1, 0});
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
@@ -37,7 +37,7 @@ int main(int argc, char** argv) {
         QexFont_Draw();
         QexFont_DrawTempString(engine, 144, window.height + 8, "energy", 0xFFFFE080);
         QexFont_DrawNum(engine, 200, window.height + 8, 75, 0xFFFFFFFF);
-    }
+    });
 
     QexPicture_Release(&gauge);
     QexPicture_Release(&view);

@@ -14,7 +14,7 @@ int main(int argc, char** argv) {
     if (!billboard) return 1;
     billboard->scale = {0.9f / 64, 0.9f / 64, 1};
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         QexCamera camera = Window_Camera(&window, {5, 3.5f, 6}, {0, 0, 0});
         const QexVec3 up = {0.15f, 1, 0};
         QexCamera_LookAt(&camera, &camera.eye, &camera.target, &up);
@@ -29,7 +29,7 @@ int main(int argc, char** argv) {
                 QexRenderer_SetBackFaceCulling(QEX_CULL_NONE);
                 QexBillboard_Draw(billboard, &camera);
             }
-    }
+    });
 
     QexBillboard_Release(billboard);
     QexTexture_Release(&arrow);

@@ -24,7 +24,7 @@ int main(int argc, char** argv) {
     QexModel_CreateFromMesh(&screen, &box, &picture.colorTexture);
     QexMesh_Release(&box);
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
 
@@ -47,7 +47,7 @@ int main(int argc, char** argv) {
 
         QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
         QexTexture_Draw(&window.engine, &corner.colorTexture, 8, 8, nullptr, 1, 1, 0xFFFFFFFF);
-    }
+    });
 
     QexModel_Unload(&screen);
     QexModel_Unload(&cubes);

@@ -52,7 +52,7 @@ int main(int argc, char** argv) {
         Update(&kind, 2);
     }
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {0, 1.6f, 5.5f}, {0, 1.1f, 0});
         Window_Clear(&window, 0.1f, 0.12f, 0.16f);
         for (Kind& kind : s_Kinds) {
@@ -60,7 +60,7 @@ int main(int argc, char** argv) {
             QexRenderer_SetAlphaBlendMode(kind.blending);
             QexParticleEmitter_Draw(kind.emitter, &camera);
         }
-    }
+    });
 
     for (Kind& kind : s_Kinds) {
         QexParticleEmitter_Release(kind.emitter);

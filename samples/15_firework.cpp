@@ -65,7 +65,7 @@ int main(int argc, char** argv) {
     Load(&set);
     Fire(&set, 0, 0);
 
-    while (Window_Frame(&window)) {
+    Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {0, 0, 5}, {0, 0.3f, 0});
         Window_Clear(&window, 0.02f, 0.02f, 0.08f);
         QexRenderer_SetAlphaBlendMode(QEX_BLEND_ADD_ALPHA);
@@ -75,7 +75,7 @@ int main(int argc, char** argv) {
             QexParticleSet_Update(&set, window.elapsed, &camera, nullptr);
             QexParticleSet_Draw(&set);
         }
-    }
+    });
 
     set.onFinished = nullptr;
     QexParticleSet_Release(&set);

@@ -1,25 +1,29 @@
 /* Sample 18: a HUD in a few lines: a round picture, a bar of energy, a score, a line of text. */
 #include "window.h"
 
+static QexPicture s_View, s_Gauge;
+
+static void Draw(Window* window, void* user) {
+    static const QexRect part = {0, 0, 95, 15}; /* three quarters of the gauge */
+    (void)user;
+    Window_Clear(window, 0.2f, 0.35f, 0.3f);
+    QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
+    QexPicture_Draw(&window->engine, NULL, NULL, 40, 16, 216, 40, 0x80000000); /* behind it all */
+    QexPicture_Draw(&window->engine, &s_View, NULL, 8, 4, 64, 64, 0xFFFFFFFF);
+    QexPicture_Draw(&window->engine, &s_Gauge, &part, 80, 24, 120, 24, 0xFFFFFFFF);
+    QexFont_DrawNum(&window->engine, 210, 60, (int)(100 * window->seconds), 0xFFFFE080);
+    QexFont_DrawTempString(&window->engine, 16, window->height, "Press Escape to leave", 0xFFFFFFFF);
+}
+
 int main(int argc, char** argv) {
     Window window;
-    QexPicture view, gauge;
-    const QexRect part = {0, 0, 95, 15}; /* three quarters of the gauge */
     if (Window_Open(&window, "Score", argc, argv) != 0) return 1;
-    Window_LoadPicture(&window, &view, "view.pvr");
-    Window_LoadPicture(&window, &gauge, "gauge.pvr");
+    Window_LoadPicture(&window, &s_View, "view.pvr");
+    Window_LoadPicture(&window, &s_Gauge, "gauge.pvr");
 
-    while (Window_Frame(&window)) {
-        Window_Clear(&window, 0.2f, 0.35f, 0.3f);
-        QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
-        QexPicture_Draw(&window.engine, NULL, NULL, 40, 16, 216, 40, 0x80000000); /* behind it all */
-        QexPicture_Draw(&window.engine, &view, NULL, 8, 4, 64, 64, 0xFFFFFFFF);
-        QexPicture_Draw(&window.engine, &gauge, &part, 80, 24, 120, 24, 0xFFFFFFFF);
-        QexFont_DrawNum(&window.engine, 210, 60, (int)(100 * window.seconds), 0xFFFFE080);
-        QexFont_DrawTempString(&window.engine, 16, window.height, "Press Escape to leave", 0xFFFFFFFF);
-    }
+    Window_Run(&window, Draw, NULL);
 
-    QexPicture_Release(&view);
-    QexPicture_Release(&gauge);
+    QexPicture_Release(&s_View);
+    QexPicture_Release(&s_Gauge);
     return Window_Close(&window);
 }

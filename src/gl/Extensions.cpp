@@ -20,10 +20,6 @@ QexGetProcAddress s_GetProcAddress;
 
 #if defined(__EMSCRIPTEN__)
 
-void* Find(const char* name) {
-    return s_GetProcAddress ? s_GetProcAddress(name) : nullptr;
-}
-
 void FindVertexArrays() {
     s_Extensions.genVertexArrays = glGenVertexArraysOES;
     s_Extensions.deleteVertexArrays = glDeleteVertexArraysOES;
