@@ -17,8 +17,6 @@ int main(int argc, char** argv) {
     Window_LoadModel(&window, &ball, "ball.pod");
     Window_LoadTexture(&window, &s_Normals, "knobs.pvr");
     QexTexture_SetWrapping(&s_Normals, QEX_WRAP_REPEAT);
-    glGenerateMipmap(GL_TEXTURE_2D);
-    glTexParameteri(GL_TEXTURE_2D, GL_TEXTURE_MIN_FILTER, GL_LINEAR_MIPMAP_LINEAR);
 
     QexShaderModule* module = QexGouraudNormalMapShader_CreateProgram();
     QexModel_SetShaderProgram(&ball, 0, module);

@@ -1,7 +1,6 @@
 // Sample 15: a firework from a particle set. The vertex shader moves all sparks of a rocket; when they have
 // burnt out the set says so, and the next rocket goes off in another place and colour.
 #include <cmath>
-#include <cstdlib>
 
 #include "window.h"
 
@@ -25,7 +24,7 @@ static void Load(QexParticleSet* set) {
         const float turn = 2.399963f * static_cast<float>(i);  // the golden angle
         const float height = 1 - 2 * (static_cast<float>(i) + 0.5f) / static_cast<float>(count);
         const float radius = std::sqrt(1 - height * height);
-        const float speed = 0.9f + 0.4f * static_cast<float>(rand()) / static_cast<float>(RAND_MAX);
+        const float speed = 0.9f + 0.4f * std::fmod(0.618034f * static_cast<float>(i * i), 1.0f);
         sparks[i].velocity = {speed * radius * std::cos(turn), speed * height,
                               speed * radius * std::sin(turn)};
         sparks[i].startPosition = {0, 0, 0};
@@ -61,7 +60,6 @@ int main(int argc, char** argv) {
     QexParticleSet set;
     if (QexParticleSet_Create(&set, &spark, &shape, kSparks, 22, kDuration) != 0) return 1;
     set.onFinished = Fire;
-    srand(1);
     Load(&set);
     Fire(&set, 0, 0);
 

@@ -59,6 +59,11 @@ static void DrawFrame(void* user) {
 static EM_BOOL Restore(int type, const void* reserved, void* user) {
     (void)type, (void)reserved, (void)user;
     emscripten_webgl_make_context_current(s_Page.context);
+    /* Extensions are to be asked for anew. */
+    EM_ASM({
+        GL.currentContext.initExtensionsDone = false;
+        GL.initExtensions(GL.currentContext);
+    });
     if (QexEngine_ContextRestored() != 0) Window_Fail("context", "not everything could be made again");
     emscripten_resume_main_loop();
     return EM_TRUE;
@@ -78,6 +83,7 @@ int WindowPlatform_Open(Window* window, const char* title, int samples) {
     s_Page.window = window;
     s_Page.context = emscripten_webgl_create_context(kCanvas, &attributes);
     if (s_Page.context <= 0) return Window_Fail("canvas", "this browser has no WebGL");
+    QexEngine_KeepTextures(1); /* pictures come back as well */
     emscripten_set_webglcontextlost_callback(kCanvas, NULL, EM_FALSE, Lose);
     emscripten_set_webglcontextrestored_callback(kCanvas, NULL, EM_FALSE, Restore);
     emscripten_set_mousemove_callback(kCanvas, NULL, EM_FALSE, Move);

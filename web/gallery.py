@@ -120,7 +120,7 @@ def main(build, native, out):
                              previous=link(i - 1, "← ", ""), next=link(i + 1, "", " →"),
                              source=highlight(sample.source), data=json.dumps(data))
         write(os.path.join(out, sample.name + ".html"), PAGE.format(title="Qex: " + html.escape(sample.title), body=body))
-    cards = "\n".join(CARD.format(name=s.name, title=html.escape(s.title), text=html.escape(s.text.split(". ")[0].rstrip(".") + "."))
+    cards = "\n".join(CARD.format(name=s.name, title=html.escape(s.title), text=html.escape(s.text))
                       for s in samples)
     write(os.path.join(out, "index.html"), PAGE.format(title="Qex: samples", body=INDEX.format(cards=cards)))
 

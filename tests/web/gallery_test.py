@@ -53,7 +53,7 @@ class Gallery(unittest.TestCase):
                     browser.open(f"{self.url}/site/gallery/{name}.html?picture&samples=1")
                     browser.wait("document.body.dataset.frames === '1' || document.body.dataset.state === 'failed'")
                     far, count = browser.run(COMPARE, f"{self.url}/native/{name}.png")
-                    print(f"{name}: {100 * far / count:.2f} % of the pixels differ by more than 3")
+                    print(f"\n{name}: {100 * far / count:.2f} % of the pixels differ by more than 3")
                     self.assertEqual(count, 960 * 540)
                     self.assertLess(far, 0.01 * count, "unlike the native picture")
                     self.assertEqual(browser.run(GL_ERROR), 0)
