@@ -70,7 +70,8 @@ void QexContext_ReserveTexture(GLenum target, GLuint name) {
 
 void QexContext_ReserveBuffer(GLuint name) {
     RenewName(1, name);
-#if !defined(__EMSCRIPTEN__)  // there it exists now, and takes no other kind of data than that of its first target
+#if !defined( \
+    __EMSCRIPTEN__)  // there it exists now, and takes no other kind of data than that of its first target
     glBindBuffer(GL_ARRAY_BUFFER, name);
 #endif
 }
