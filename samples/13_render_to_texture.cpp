@@ -45,7 +45,7 @@ int main(int argc, char** argv) {
         QexRenderTarget_EndScene(&picture);
 
         // The cube, small in the corner and large on the screen.
-        camera = Window_Camera(&window, {3, 2, 4}, {0, 0, 0});
+        camera = Window_Camera(&window, {3.4f, 2.3f, 4.6f}, {0, 0, 0});
         QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);
         QexRenderTarget_EndScene(&corner);
         QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);

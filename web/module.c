@@ -1,10 +1,11 @@
-/* What the JavaScript module needs besides the engine's own functions: calls that take numbers in place of records. */
+/* What the JavaScript module needs besides the engine's own functions: calls that take numbers in place of
+ * records. */
 #include <stdlib.h>
 #include <string.h>
 
+#include <emscripten.h>
 #include <GLES2/gl2.h>
 #include <Qex.h>
-#include <emscripten.h>
 
 typedef struct WebModel {
     QexModel model;
@@ -79,7 +80,8 @@ EMSCRIPTEN_KEEPALIVE QexMatrix* QexWeb_GetPlace(WebModel* model) {
     return &model->place;
 }
 
-EMSCRIPTEN_KEEPALIVE void QexWeb_SetCamera(const QexVec3* eyeAndTarget, float fov, float nearPlane, float farPlane) {
+EMSCRIPTEN_KEEPALIVE void QexWeb_SetCamera(const QexVec3* eyeAndTarget, float fov, float nearPlane,
+                                           float farPlane) {
     QexCamera_Create(&s_Camera, 0);
     QexCamera_LookAt(&s_Camera, &eyeAndTarget[0], &eyeAndTarget[1], NULL);
     QexCamera_Project(&s_Camera, fov, (float)s_Engine.width / (float)s_Engine.height, nearPlane, farPlane);
