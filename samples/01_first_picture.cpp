@@ -8,25 +8,33 @@ int main(int argc, char** argv) {
 
     QexModel model;
     QexModel_Create(&model);
-    QexModel_LoadContent(&model, window.files, "grid.pod");  // a folder and a file
+    QexModel_LoadContent(&model, window.files, "playground.pod");  // a folder and a file
+    // Light from the upper left; the engine's own choice is to draw without.
+    QexShaderModule* lit = QexGouraudShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&model, lit, nullptr);
+    QexLightSet lights = {};
+    lights.count = 1;
+    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {0.6f, -1, -0.8f}, {1, 0.97f, 0.9f, 1}};
 
     Window_Run(&window, [&] {
         QexCamera camera;
-        const QexVec3 eye = {3, 3, 4}, target = {1, 1, 0};
+        const QexVec3 eye = {2.2f, 2.1f, 4.4f}, target = {0.1f, 0.7f, 0};
         QexCamera_Create(&camera, 0);
         QexCamera_LookAt(&camera, &eye, &target, nullptr);
-        QexCamera_Project(&camera, 0.8f, static_cast<float>(window.width) / static_cast<float>(window.height),
+        QexCamera_Project(&camera, 1, static_cast<float>(window.width) / static_cast<float>(window.height),
                           0.1f, 100);
 
         glViewport(0, 0, window.width, window.height);
         QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
         QexRenderer_SetAlphaBlendMode(QEX_BLEND_ALPHA);
-        glClearColor(0.25f, 0.3f, 0.4f, 1);
+        glClearColor(0.62f, 0.75f, 0.86f, 1);
         glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
-        QexModel_RenderWithCamera(&model, nullptr, &camera, nullptr, 0);
-        QexFont_DrawTempString(&window.engine, 8, 40, "Hello from Qex", 0xFFFFC040);
+        QexModel_RenderWithCamera(&model, &lights, &camera, nullptr, 0);
+        QexFont_SetScale(2);
+        QexFont_DrawTempString(&window.engine, 24, 80, "Hello from Qex", 0xFF203850);
     });
 
     QexModel_Unload(&model);
+    QexGouraudShader_Release(&lit);
     return Window_Close(&window);
 }

@@ -30,9 +30,8 @@ int main(int argc, char** argv) {
     int hit = -1;
 
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {3, 2, 4}, {1, 1, 0});
-        const QexVec2 point = {0.75f * static_cast<float>(window.width),
-                               0.54f * static_cast<float>(window.height)};
+        const QexCamera camera = Window_Camera(&window, {3, 1.9f, 4.2f}, {1, 1, 0});
+        const QexVec2 point = window.pointer;
         for (uint32_t i = 0; i < QexModel_GetNumMeshNodes(&cubes); ++i)
             QexModel_SetNodePosition(&cubes, i, 0, 0, 0);
         hit = Nearest(&window, &cubes, camera, point);
@@ -41,6 +40,7 @@ int main(int argc, char** argv) {
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         QexModel_RenderWithCamera(&cubes, nullptr, &camera, nullptr, 0);
         const char* name = hit >= 0 ? QexModel_GetNodeName(&cubes, static_cast<uint32_t>(hit)) : "nothing";
+        QexFont_SetScale(2);
         QexFont_DrawTempString(&window.engine, static_cast<int32_t>(point.x), static_cast<int32_t>(point.y),
                                name, 0xFFFF4040);
     });

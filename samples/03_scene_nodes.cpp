@@ -31,7 +31,8 @@ int main(int argc, char** argv) {
         QexRenderer_EnableStereo3D(&window.engine, QEX_STEREO_RED_CYAN, 2);
         for (const bool left : {true, false}) {
             left ? QexRenderer_PrepareLeft(&window.engine) : QexRenderer_PrepareRight(&window.engine);
-            const QexCamera camera = Window_Camera(&window, {left ? -0.05f : 0.05f, 1, 3}, {0.3f, 0.1f, 0});
+            const QexCamera camera =
+                Window_Camera(&window, {left ? -0.05f : 0.05f, 0.9f, 2.3f}, {0.3f, 0.05f, 0});
             QexNode_RenderWithCamera(&sun, &camera);
         }
         QexRenderer_FinishStereo3D(&window.engine);

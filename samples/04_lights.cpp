@@ -20,7 +20,7 @@ int main(int argc, char** argv) {
     lights.lights[0] = {QEX_LIGHT_POINT, {-4, 5, 6}, {1, 1, 1, 1}};
     lights.lights[1] = {QEX_LIGHT_DIRECTIONAL, {-1, 0, 0}, {0.2f, 0.3f, 0.9f, 1}};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {0, 0, 8}, {0, 0, 0});
+        const QexCamera camera = Window_Camera(&window, {0, 0, 6.6f}, {0, 0, 0});
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         QexModel_RenderWithCamera(&spheres, &lights, &camera, nullptr, 0);
     });

@@ -25,7 +25,7 @@ int main(int argc, char** argv) {
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_POINT, {-5, 5, 6}, {1, 1, 1, 1}};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {0, 0, 3.2f}, {0, 0, 0});
+        const QexCamera camera = Window_Camera(&window, {0, 0, 3.6f}, {0, 0, 0});
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         QexModel_SetNodeRotation(&ball, 0, 0, 20 * (window.seconds - 1), 0);
         QexModel_RenderWithCamera(&ball, &lights, &camera, nullptr, 0);

@@ -22,7 +22,7 @@ int main(int argc, char** argv) {
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-1, -1, -2}, {1, 1, 1, 1}};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {0, 2.5f, 15}, {0, 2, 0});
+        const QexCamera camera = Window_Camera(&window, {0, 2.6f, 13.6f}, {0, 1.9f, 0});
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         for (int i = 0; i < 5; ++i) {
             // Frame 0 is the bind pose; the animation is 59 frames from 1 on.

@@ -20,7 +20,7 @@ int main(int argc, char** argv) {
     lights.lights[0] = {QEX_LIGHT_POINT, {-4, 6, 5}, {1, 1, 1, 1}};
     const QexShadowCaster everything = {&worm, 1, nullptr, 0};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {1, 4, 10}, {0, 0.8f, 0});
+        const QexCamera camera = Window_Camera(&window, {1, 3.4f, 9}, {0, 1.1f, 0});
         QexPODModel_SetFrame(&worm.scene, 1 + std::fmod(20 * window.seconds - 1, 58.0f));
 
         // The mirror image and the floor over it first; then the scene, in which the floor is switched off by

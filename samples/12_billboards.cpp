@@ -15,7 +15,7 @@ int main(int argc, char** argv) {
     billboard->scale = {0.9f / 64, 0.9f / 64, 1};
 
     Window_Run(&window, [&] {
-        QexCamera camera = Window_Camera(&window, {5, 3.5f, 6}, {0, 0, 0});
+        QexCamera camera = Window_Camera(&window, {5.5f, 3.8f, 6.6f}, {0, 0, 0});
         const QexVec3 up = {0.15f, 1, 0};
         QexCamera_LookAt(&camera, &camera.eye, &camera.target, &up);
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);

@@ -10,11 +10,16 @@ static void ClearTarget(float red, float green, float blue) {
 int main(int argc, char** argv) {
     Window window;
     if (Window_Open(&window, "Render to texture", argc, argv) != 0) return 1;
-    QexModel cubes, screen;
-    Window_LoadModel(&window, &cubes, "grid.pod");
+    QexModel models, screen;
+    Window_LoadModel(&window, &models, "playground.pod");
+    QexShaderModule* lit = QexGouraudShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&models, lit, nullptr);
+    QexLightSet lights = {};
+    lights.count = 1;
+    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {0.6f, -1, -0.8f}, {1, 0.97f, 0.9f, 1}};
     QexRenderTarget picture, corner;
-    QexRenderTarget_Create(&picture, 128, 128, 0);
-    QexRenderTarget_Create(&corner, 96, 72, 0);
+    QexRenderTarget_Create(&picture, 512, 512, 0);
+    QexRenderTarget_Create(&corner, 256, 192, 0);
     QexTexture_SetFilter(&picture.colorTexture, QEX_FILTER_LINEAR);
 
     // The cube shows the picture as it is: without normals there is no light.
@@ -33,24 +38,25 @@ int main(int argc, char** argv) {
         QexRenderTarget_BeginScene(&corner);
         ClearTarget(0.1f, 0.1f, 0.1f);
         QexRenderTarget_BeginScene(&picture);
-        ClearTarget(0.6f, 0.3f, 0.3f);
-        QexCamera camera = Window_Camera(&window, {2.5f, 2.2f, 3}, {1, 1, 0});
+        ClearTarget(0.62f, 0.75f, 0.86f);
+        QexCamera camera = Window_Camera(&window, {2, 2, 3.6f}, {0.1f, 0.6f, 0});
         QexCamera_Project(&camera, 0.8f, 1, 0.1f, 100);
-        QexModel_RenderWithCamera(&cubes, nullptr, &camera, nullptr, 0);
+        QexModel_RenderWithCamera(&models, &lights, &camera, nullptr, 0);
         QexRenderTarget_EndScene(&picture);
 
         // The cube, small in the corner and large on the screen.
-        camera = Window_Camera(&window, {3, 2, 4}, {0, 0, 0});
+        camera = Window_Camera(&window, {3.4f, 2.3f, 4.6f}, {0, 0, 0});
         QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);
         QexRenderTarget_EndScene(&corner);
         QexModel_RenderWithCamera(&screen, nullptr, &camera, nullptr, 0);
 
         QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
-        QexTexture_Draw(&window.engine, &corner.colorTexture, 8, 8, nullptr, 1, 1, 0xFFFFFFFF);
+        QexTexture_Draw(&window.engine, &corner.colorTexture, 16, 16, nullptr, 1, 1, 0xFFFFFFFF);
     });
 
     QexModel_Unload(&screen);
-    QexModel_Unload(&cubes);
+    QexModel_Unload(&models);
+    QexGouraudShader_Release(&lit);
     QexRenderTarget_Release(&corner);
     QexRenderTarget_Release(&picture);
     return Window_Close(&window);

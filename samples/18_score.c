@@ -6,13 +6,14 @@ static QexPicture s_View, s_Gauge;
 static void Draw(Window* window, void* user) {
     static const QexRect part = {0, 0, 95, 15}; /* three quarters of the gauge */
     (void)user;
+    QexFont_SetScale(2);
     Window_Clear(window, 0.2f, 0.35f, 0.3f);
     QexRenderer_SetZTestFunc(QEX_DEPTH_ALWAYS);
-    QexPicture_Draw(&window->engine, NULL, NULL, 40, 16, 216, 40, 0x80000000); /* behind it all */
-    QexPicture_Draw(&window->engine, &s_View, NULL, 8, 4, 64, 64, 0xFFFFFFFF);
-    QexPicture_Draw(&window->engine, &s_Gauge, &part, 80, 24, 120, 24, 0xFFFFFFFF);
-    QexFont_DrawNum(&window->engine, 210, 60, (int)(100 * window->seconds), 0xFFFFE080);
-    QexFont_DrawTempString(&window->engine, 16, window->height, "Press Escape to leave", 0xFFFFFFFF);
+    QexPicture_Draw(&window->engine, NULL, NULL, 80, 32, 432, 80, 0x80000000); /* behind it all */
+    QexPicture_Draw(&window->engine, &s_View, NULL, 16, 8, 128, 128, 0xFFFFFFFF);
+    QexPicture_Draw(&window->engine, &s_Gauge, &part, 160, 48, 240, 48, 0xFFFFFFFF);
+    QexFont_DrawNum(&window->engine, 420, 88, (int)(100 * window->seconds), 0xFFFFE080);
+    QexFont_DrawTempString(&window->engine, 24, window->height - 16, "Press Escape to leave", 0xFFFFFFFF);
 }
 
 int main(int argc, char** argv) {

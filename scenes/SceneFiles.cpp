@@ -49,6 +49,31 @@ pod::Scene Ball() {
     return Painted(scenes::Still({{"ball", sphere, {0, 0, 0}}}), {{"steel.pvr", 1, 0.1f}});
 }
 
+pod::MeshArrays Scaled(pod::MeshArrays mesh, float factor) {
+    for (pod::Vec3& position : mesh.positions)
+        for (float& axis : position) axis *= factor;
+    return mesh;
+}
+
+// Crates and balls on a floor, 8 across.
+pod::Scene Playground() {
+    const pod::MeshArrays crate = Scaled(scenes::Cube(), 0.5f), ball = scenes::Sphere(24);
+    return Painted(scenes::Still({{"floor", pod::FloorMesh(8), {0, 0, 0}},
+                                  {"crate", crate, {-1.1f, 0.5f, -0.6f}},
+                                  {"second crate", crate, {0.1f, 0.5f, -0.9f}},
+                                  {"upper crate", crate, {-0.5f, 1.5f, -0.75f}},
+                                  {"red ball", Scaled(ball, 0.6f), {1.4f, 0.6f, -0.2f}},
+                                  {"blue ball", Scaled(ball, 0.4f), {-0.2f, 0.4f, 0.8f}},
+                                  {"wooden ball", Scaled(ball, 0.25f), {0.7f, 0.25f, 1}}}),
+                   {{"floor.pvr", 0.75f, 0.3f},
+                    {"crate.pvr", 0.8f, 0.3f},
+                    {"crate.pvr", 0.8f, 0.3f},
+                    {"crate.pvr", 0.8f, 0.3f},
+                    {"red.pvr", 0.8f, 0.3f},
+                    {"blue.pvr", 0.8f, 0.3f},
+                    {"wood.pvr", 0.8f, 0.3f}});
+}
+
 // Away from the viewer, to the right and up.
 pod::Scene RowOfSpheres() {
     std::vector<scenes::Object> objects;
@@ -93,6 +118,7 @@ int main(int argc, char** argv) {
         {"red_ball.pod", Painted(scenes::Still({{"ball", scenes::Sphere(24), {-2, 0.8f, -0.5f}}}),
                                  {{"plain.pvr", 0.8f, 0.2f}})},
         {"row.pod", RowOfSpheres()},
+        {"playground.pod", Playground()},
         {"boat.pod", Painted(scenes::Boat(), {{"hull.pvr", 0.8f, 0.35f}, {"sails.pvr", 0.8f, 0.35f}})},
         {"walker.pod", Painted(scenes::Walker(33), {{"walker.pvr", 0.8f, 0.25f}})},
     };

@@ -63,6 +63,7 @@ class Browser:
         finally:
             self.driver.terminate()
             self.driver.wait()
+            self.driver.stdout.close()
 
     def call(self, method, path, body=None):
         request = urllib.request.Request(self.url + path, method=method, headers={"Content-Type": "application/json"},
@@ -80,10 +81,10 @@ class Browser:
     def run(self, script, *arguments):
         """The result of the body of an asynchronous function."""
         body = f"const done = arguments[arguments.length - 1]; (async (...a) => {{ {script} }})(...arguments)" \
-               ".then(done, error => done({error: String(error)}))"
+               ".then(done, error => done({thrown: String(error)}))"
         result = self.call("POST", "/execute/async", {"script": body, "args": list(arguments)})
-        if isinstance(result, dict) and "error" in result:
-            raise RuntimeError(result["error"])
+        if isinstance(result, dict) and "thrown" in result:
+            raise RuntimeError(result["thrown"])
         return result
 
     def wait(self, condition, seconds=20):
