@@ -16,6 +16,9 @@
 #include "render/Command.h"
 #include "sheet/Command.h"
 #include "texture/Command.h"
+#ifdef QEX_VIEWER
+#include "view/Command.h"
+#endif
 
 namespace {
 
@@ -55,12 +58,19 @@ int RunVerb(int argc, char** argv) {
     TextureOptions texture;
     EmitterOptions emitter;
     SheetOptions sheet;
+#ifdef QEX_VIEWER
+    ViewOptions view;
+#endif
     std::string shell, page;
     const Verb verbs[] = {
         {"info", "what is in a POD, PVR, KTX or TGA file", [&](CLI::App* a) { SetUpInfo(a, &info); },
          [&] { return RunInfo(info); }},
         {"render", "draw a POD scene to PNG", [&](CLI::App* a) { SetUpRender(a, &render); },
          [&] { return RunRender(render); }},
+#ifdef QEX_VIEWER
+        {"view", "show scenes in a window", [&](CLI::App* a) { SetUpView(a, &view); },
+         [&] { return RunWindow(view); }},
+#endif
         {"convert", "make a POD scene from another format", [&](CLI::App* a) { SetUpConvert(a, &convert); },
          [&] { return RunConvert(convert); }},
         {"texture", "make a texture of a picture, or a picture of one",
