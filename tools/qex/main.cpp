@@ -16,6 +16,7 @@
 #include "render/Command.h"
 #include "sheet/Command.h"
 #include "texture/Command.h"
+#include "thumbnail/Command.h"
 #ifdef QEX_VIEWER
 #include "view/Command.h"
 #endif
@@ -58,6 +59,7 @@ int RunVerb(int argc, char** argv) {
     TextureOptions texture;
     EmitterOptions emitter;
     SheetOptions sheet;
+    ThumbnailOptions thumbnail;
 #ifdef QEX_VIEWER
     ViewOptions view;
 #endif
@@ -79,6 +81,8 @@ int RunVerb(int argc, char** argv) {
          [&] { return RunEmitter(emitter); }},
         {"sheet", "put several pictures into one", [&](CLI::App* a) { SetUpSheet(a, &sheet); },
          [&] { return RunSheet(sheet); }},
+        {"thumbnail", "draw a small picture of any scene",
+         [&](CLI::App* a) { SetUpThumbnail(a, &thumbnail); }, [&] { return RunThumbnail(thumbnail); }},
         {"completion", "print what a shell needs to complete the command line",
          [&](CLI::App* a) {
              a->add_option("SHELL", shell, "bash")->required()->check(CLI::IsMember({"bash"}));

@@ -269,8 +269,12 @@ void Inspector::ShowEmitters() {
 void Inspector::ShowStatistics() {
     const ViewerStatistics& s = viewer_->Statistics();
     float sum = 0;
-    for (const float time : s.frameTimes) sum += time;
-    const float mean = sum / static_cast<float>(s.frameTimes.size());
+    int count = 0;
+    for (const float time : s.frameTimes) {
+        sum += time;
+        count += time > 0;
+    }
+    const float mean = count ? sum / static_cast<float>(count) : 0;
     char words[32];
     snprintf(words, sizeof words, "%.1f ms", static_cast<double>(mean));
     ImGui::SetNextItemWidth(-1);
@@ -284,7 +288,7 @@ void Inspector::ShowStatistics() {
 InspectorWishes Inspector::Show(const std::vector<std::string>& recent) {
     InspectorWishes wishes;
     const ImVec2 screen = ImGui::GetIO().DisplaySize;
-    const float width = std::min(340.0f, screen.x);
+    const float width = std::min(static_cast<float>(kWidth), screen.x);
     ImGui::SetNextWindowPos({screen.x - width, 0});
     ImGui::SetNextWindowSize({width, screen.y});
     ImGui::Begin("Inspector", nullptr,

@@ -13,6 +13,8 @@ struct InspectorWishes {
 
 class Inspector {
   public:
+    static constexpr int kWidth = 340;  // points
+
     explicit Inspector(Viewer* viewer) : viewer_(viewer) {}
 
     // Between ImGui::NewFrame and ImGui::Render.

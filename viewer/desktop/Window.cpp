@@ -65,6 +65,7 @@ class Window {
 
   private:
     bool OpenContext(int samples);
+    int PictureWidth() const;
     void Open(const std::string& file);
     void Page(int by);
     void Poll(double seconds);
@@ -154,7 +155,7 @@ bool Window::Start(std::string* problem) {
     SDL_GL_GetDrawableSize(window_, &width_, &height_);
     glGetIntegerv(GL_SAMPLES, &samples_);
     QexRenderer_SetGetProcAddress([](const char* name) { return SDL_GL_GetProcAddress(name); });
-    viewer_ = std::make_unique<Viewer>(width_, height_, LoadEmitter, gltapCountAll);
+    viewer_ = std::make_unique<Viewer>(PictureWidth(), height_, LoadEmitter, gltapCountAll);
     IMGUI_CHECKVERSION();
     ImGui::CreateContext();
     ImGui::GetIO().IniFilename = nullptr;
@@ -164,6 +165,14 @@ bool Window::Start(std::string* problem) {
     draw_ = std::make_unique<GuiDraw>();
     inspector_ = std::make_unique<Inspector>(viewer_.get());
     return true;
+}
+
+// The picture is what the panel leaves of the window, if that is more than half of it.
+int Window::PictureWidth() const {
+    int points = 0;
+    SDL_GetWindowSize(window_, &points, nullptr);
+    const int panel = points > 0 ? Inspector::kWidth * width_ / points : 0;
+    return settings_.inspector && panel * 2 < width_ ? width_ - panel : width_;
 }
 
 // Emitters are shown with the scene that is there; what is no POD file is converted first.
@@ -241,7 +250,7 @@ void Window::Take(const SDL_Event& event) {
             SDL_GL_GetDrawableSize(window_, &width_, &height_);
             SDL_GetWindowSize(window_, &settings_.width, &settings_.height);
             out.kind = ViewerEvent::kResize;
-            out.x = static_cast<float>(width_);
+            out.x = static_cast<float>(PictureWidth());
             out.y = static_cast<float>(height_);
             break;
         case SDL_DROPFILE: {
@@ -325,13 +334,13 @@ void Window::Frame(double seconds) {
     if (wishes.turntable) Turntable();
     if (wishes.copyLine) SDL_SetClipboardText(Line("picture.png").c_str());
     if (!wishes.open.empty()) Open(wishes.open);
-    viewer_->Draw(width_, height_);
+    viewer_->Draw(PictureWidth(), height_);
     draw_->Draw(ImGui::GetDrawData());
     SDL_GL_SwapWindow(window_);
 }
 
 std::string Window::Line(const std::string& output) {
-    RenderOptions options = viewer_->AsRenderOptions(width_, height_);
+    RenderOptions options = viewer_->AsRenderOptions(PictureWidth(), height_);
     options.output = output;
     options.antialias = samples_ > 1 ? 4 : 1;
     return "qex " + ShellLine(RenderWords(options));
@@ -339,8 +348,8 @@ std::string Window::Line(const std::string& output) {
 
 bool Window::Screenshot(const std::string& path) {
     std::string problem;
-    const std::vector<uint8_t> pixels = viewer_->Picture(width_, height_);
-    const bool saved = SavePicture(path, width_, height_, pixels.data(), &problem);
+    const std::vector<uint8_t> pixels = viewer_->Picture(PictureWidth(), height_);
+    const bool saved = SavePicture(path, PictureWidth(), height_, pixels.data(), &problem);
     viewer_->Say(path + (saved ? ": saved" : ": " + problem));
     return saved;
 }
@@ -355,7 +364,7 @@ void Window::Turntable() {
 bool Window::SaveWindow(const std::string& path) {
     Frame(0);
     // Drawn once more into the buffer that is read.
-    viewer_->Draw(width_, height_);
+    viewer_->Draw(PictureWidth(), height_);
     draw_->Draw(ImGui::GetDrawData());
     const size_t row = static_cast<size_t>(width_) * 4;
     std::vector<uint8_t> pixels(row * static_cast<size_t>(height_)), turned(pixels.size());
