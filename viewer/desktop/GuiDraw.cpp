@@ -61,6 +61,7 @@ GuiDraw::GuiDraw() {
 }
 
 GuiDraw::~GuiDraw() {
+    QexRenderState_Restore();
     glDeleteTextures(1, &font_);
     glDeleteBuffers(2, buffers_);
     glDeleteProgram(program_);

@@ -343,12 +343,17 @@ std::string Window::Line(const std::string& output) {
     RenderOptions options = viewer_->AsRenderOptions(PictureWidth(), height_);
     options.output = output;
     options.antialias = samples_ > 1 ? 4 : 1;
-    return "qex " + ShellLine(RenderWords(options));
+    std::string line;
+    if (viewer_->Name() != viewer_->Path()) {
+        options.input = WithoutExtension(FileName(viewer_->Name())) + ".pod";
+        line = "qex " + ShellLine({"convert", viewer_->Name(), "-o", options.input}) + " && ";
+    }
+    return line + "qex " + ShellLine(RenderWords(options));
 }
 
 bool Window::Screenshot(const std::string& path) {
     std::string problem;
-    const std::vector<uint8_t> pixels = viewer_->Picture(PictureWidth(), height_);
+    const std::vector<uint8_t> pixels = viewer_->Picture(PictureWidth(), height_, samples_);
     const bool saved = SavePicture(path, PictureWidth(), height_, pixels.data(), &problem);
     viewer_->Say(path + (saved ? ": saved" : ": " + problem));
     return saved;

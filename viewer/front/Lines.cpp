@@ -18,6 +18,7 @@ const char kFragment[] = "varying lowp vec4 seen; void main() { gl_FragColor = s
 
 Lines::~Lines() {
     if (!program_) return;
+    QexRenderState_Restore();
     glDeleteProgram(program_);
     for (const uint32_t shader : shaders_) glDeleteShader(shader);
     QexRenderState_Reset(nullptr);

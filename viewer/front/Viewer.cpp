@@ -130,7 +130,15 @@ void Viewer::Loaded() {
     selected_ = -1;
     view_->SetFrame(0);
     view_->FitTo({0});
-    sceneCamera_ = false;
+    // What was meant for the parts and the place of another scene.
+    SceneOptions options = options_;
+    options.effects.nodes.clear();
+    options.effects.lights.clear();
+    options.effects.mirrorNode.clear();
+    const Bounds box = BoundsOf(view_->Points());
+    for (std::optional<float>* height : {&options.effects.floor, &options.effects.mirror, &options.effects.water})
+        if (*height) *height = box.empty ? 0 : box.low.y;
+    SetOptions(options);
     FrameAll();
 }
 

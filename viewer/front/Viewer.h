@@ -60,8 +60,9 @@ class Viewer {
     void Tick(double seconds);
     // Draws into the framebuffer that is bound. Nothing for a surface without pixels.
     void Draw(int width, int height, bool overlays = true);
-    // Draws without overlays and reads it, the top row first: the picture of CommandLine().
-    std::vector<uint8_t> Picture(int width, int height);
+    // Draws without overlays and reads it, the top row first: the picture of AsRenderOptions. `samples` are
+    // those of a pixel of the surface.
+    std::vector<uint8_t> Picture(int width, int height, int samples);
 
     // Whatever people look at and change.
     const SceneOptions& Options() const { return options_; }
@@ -90,7 +91,7 @@ class Viewer {
     size_t FailedLoads() const { return failed_; }
     size_t Loads() const { return loads_; }  // that ended well
 
-    // The command line, without "qex", that makes this picture.
+    // What makes this picture with qex render.
     RenderOptions AsRenderOptions(int width, int height) const;
 
     struct Key {
@@ -109,6 +110,7 @@ class Viewer {
         int button;
         unsigned modifiers;
     };
+    static std::vector<uint8_t> Read(int width, int height);
     void Resize(int width, int height);
     void Drag(const ViewerEvent& event);
     void Click(float x, float y, unsigned modifiers);
@@ -132,7 +134,7 @@ class Viewer {
     std::vector<std::string> messages_;
     std::string path_, name_, loadingPath_, loadingName_, folder_;
     std::array<bool, static_cast<size_t>(Overlay::kCount)> overlays_ = {};
-    bool help_ = false, keep_ = false, sceneCamera_ = false;
+    bool help_ = false, keep_ = false;
     int selected_ = -1;
     size_t failed_ = 0, said_ = 0, loads_ = 0;
     std::vector<Touch> touches_;

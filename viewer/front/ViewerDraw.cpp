@@ -1,10 +1,12 @@
 // The picture, and what is drawn over it.
 #include <algorithm>
 #include <cmath>
+#include <initializer_list>
 
 #include <GLES2/gl2.h>
 
 #include "common/EngineOutput.h"
+#include "common/ImageFile.h"
 #include "common/SceneBounds.h"
 #include "front/Viewer.h"
 
@@ -105,12 +107,60 @@ void Viewer::Draw(int width, int height, bool overlays) {
     if (overlays && !view_->Model() && !view_->IsLoading()) DrawGreeting();
 }
 
-std::vector<uint8_t> Viewer::Picture(int width, int height) {
-    std::vector<std::string> warnings;
-    const double frame = view_->Frame();
-    view_->FitTo({frame});
-    view_->Refit(&warnings);
-    Draw(width, height, false);
+namespace {
+
+// A framebuffer apart from the window's, with depth and stencil; binds the one before again at its end.
+class Offscreen {
+  public:
+    Offscreen(int width, int height) {
+        QexRenderState_Restore();
+        glGetIntegerv(GL_FRAMEBUFFER_BINDING, &before_);
+        glGenFramebuffers(1, &framebuffer_);
+        glGenTextures(1, &colour_);
+        glGenRenderbuffers(1, &depth_);
+        glBindTexture(GL_TEXTURE_2D, colour_);
+        glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA, width, height, 0, GL_RGBA, GL_UNSIGNED_BYTE, nullptr);
+        for (const GLenum filter : {GL_TEXTURE_MIN_FILTER, GL_TEXTURE_MAG_FILTER})
+            glTexParameteri(GL_TEXTURE_2D, filter, GL_NEAREST);
+        for (const GLenum wrap : {GL_TEXTURE_WRAP_S, GL_TEXTURE_WRAP_T})
+            glTexParameteri(GL_TEXTURE_2D, wrap, GL_CLAMP_TO_EDGE);
+        glBindRenderbuffer(GL_RENDERBUFFER, depth_);
+        glRenderbufferStorage(GL_RENDERBUFFER, kDepthStencil, width, height);
+        glBindFramebuffer(GL_FRAMEBUFFER, framebuffer_);
+        glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, colour_, 0);
+        for (const GLenum part : {GL_DEPTH_ATTACHMENT, GL_STENCIL_ATTACHMENT})
+            glFramebufferRenderbuffer(GL_FRAMEBUFFER, part, GL_RENDERBUFFER, depth_);
+        complete_ = glCheckFramebufferStatus(GL_FRAMEBUFFER) == GL_FRAMEBUFFER_COMPLETE;
+        if (!complete_) Leave();
+        while (glGetError() != GL_NO_ERROR) {
+        }
+        QexRenderState_Reset(nullptr);
+    }
+    ~Offscreen() {
+        QexRenderState_Restore();
+        Leave();
+        glDeleteFramebuffers(1, &framebuffer_);
+        glDeleteRenderbuffers(1, &depth_);
+        glDeleteTextures(1, &colour_);
+        QexRenderState_Reset(nullptr);
+    }
+    Offscreen(const Offscreen&) = delete;
+    Offscreen& operator=(const Offscreen&) = delete;
+    bool IsComplete() const { return complete_; }
+
+  private:
+    static constexpr GLenum kDepthStencil = 0x88F0;  // GL_DEPTH24_STENCIL8_OES
+
+    void Leave() { glBindFramebuffer(GL_FRAMEBUFFER, static_cast<GLuint>(before_)); }
+
+    GLint before_ = 0;
+    GLuint framebuffer_ = 0, colour_ = 0, depth_ = 0;
+    bool complete_ = false;
+};
+
+}  // namespace
+
+std::vector<uint8_t> Viewer::Read(int width, int height) {
     const size_t row = static_cast<size_t>(width) * 4;
     std::vector<uint8_t> pixels(row * static_cast<size_t>(height));
     glPixelStorei(GL_PACK_ALIGNMENT, 4);
@@ -119,6 +169,30 @@ std::vector<uint8_t> Viewer::Picture(int width, int height) {
         std::swap_ranges(pixels.begin() + static_cast<std::ptrdiff_t>(y * row),
                          pixels.begin() + static_cast<std::ptrdiff_t>((y + 1) * row),
                          pixels.end() - static_cast<std::ptrdiff_t>((y + 1) * row));
+    return pixels;
+}
+
+std::vector<uint8_t> Viewer::Picture(int width, int height, int samples) {
+    std::vector<std::string> warnings;
+    const EffectOptions& effects = options_.effects;
+    view_->FitTo({view_->Frame()});
+    view_->Refit(&warnings);
+    std::vector<uint8_t> pixels;
+    // As qex render does: what is drawn by way of targets is drawn larger, else the surface has the samples.
+    if (samples > 1 && (effects.shadow || effects.depthOfField || effects.stereo)) {
+        const Offscreen large(2 * width, 2 * height);
+        if (large.IsComplete()) {
+            view_->SetScale(2);
+            Draw(2 * width, 2 * height, false);
+            pixels = ShrinkPixels(Read(2 * width, 2 * height), width, height, 2);
+            view_->SetScale(1);
+        }
+    }
+    if (pixels.empty()) {
+        Draw(width, height, false);
+        pixels = Read(width, height);
+    }
+    Resize(width, height);
     for (size_t i = 3; i < pixels.size(); i += 4) pixels[i] = 255;
     return pixels;
 }
