@@ -142,7 +142,9 @@ bool Window::Start(std::string* problem) {
     SDL_SetMainReady();
     SDL_SetHint(SDL_HINT_OPENGL_ES_DRIVER, "1");
     SDL_SetHint(SDL_HINT_VIDEO_X11_FORCE_EGL, "1");
-    const char* driver = SDL_Init(SDL_INIT_VIDEO) == 0 ? SDL_GetCurrentVideoDriver() : nullptr;
+    // Without one SDL's drivers would say so, each in its own way.
+    const bool display = getenv("DISPLAY") || getenv("WAYLAND_DISPLAY") || getenv("SDL_VIDEODRIVER");
+    const char* driver = display && SDL_Init(SDL_INIT_VIDEO) == 0 ? SDL_GetCurrentVideoDriver() : nullptr;
     if (!driver || strcmp(driver, "offscreen") == 0 || strcmp(driver, "dummy") == 0) {
         *problem = "there is no display; qex render draws pictures without one";
         return false;

@@ -136,7 +136,8 @@ void Viewer::Loaded() {
     options.effects.lights.clear();
     options.effects.mirrorNode.clear();
     const Bounds box = BoundsOf(view_->Points());
-    for (std::optional<float>* height : {&options.effects.floor, &options.effects.mirror, &options.effects.water})
+    for (std::optional<float>* height :
+         {&options.effects.floor, &options.effects.mirror, &options.effects.water})
         if (*height) *height = box.empty ? 0 : box.low.y;
     SetOptions(options);
     FrameAll();

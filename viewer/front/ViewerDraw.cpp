@@ -174,12 +174,11 @@ std::vector<uint8_t> Viewer::Read(int width, int height) {
 
 std::vector<uint8_t> Viewer::Picture(int width, int height, int samples) {
     std::vector<std::string> warnings;
-    const EffectOptions& effects = options_.effects;
     view_->FitTo({view_->Frame()});
     view_->Refit(&warnings);
     std::vector<uint8_t> pixels;
-    // As qex render does: what is drawn by way of targets is drawn larger, else the surface has the samples.
-    if (samples > 1 && (effects.shadow || effects.depthOfField || effects.stereo)) {
+    // Drawn larger: shadows and targets of effects are smooth then, too, and nothing depends on the window.
+    if (samples > 1) {
         const Offscreen large(2 * width, 2 * height);
         if (large.IsComplete()) {
             view_->SetScale(2);
