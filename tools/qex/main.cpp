@@ -16,6 +16,10 @@
 #include "render/Command.h"
 #include "sheet/Command.h"
 #include "texture/Command.h"
+#include "thumbnail/Command.h"
+#ifdef QEX_VIEWER
+#include "view/Command.h"
+#endif
 
 namespace {
 
@@ -55,12 +59,20 @@ int RunVerb(int argc, char** argv) {
     TextureOptions texture;
     EmitterOptions emitter;
     SheetOptions sheet;
+    ThumbnailOptions thumbnail;
+#ifdef QEX_VIEWER
+    ViewOptions view;
+#endif
     std::string shell, page;
     const Verb verbs[] = {
         {"info", "what is in a POD, PVR, KTX or TGA file", [&](CLI::App* a) { SetUpInfo(a, &info); },
          [&] { return RunInfo(info); }},
         {"render", "draw a POD scene to PNG", [&](CLI::App* a) { SetUpRender(a, &render); },
          [&] { return RunRender(render); }},
+#ifdef QEX_VIEWER
+        {"view", "show scenes in a window", [&](CLI::App* a) { SetUpView(a, &view); },
+         [&] { return RunWindow(view); }},
+#endif
         {"convert", "make a POD scene from another format", [&](CLI::App* a) { SetUpConvert(a, &convert); },
          [&] { return RunConvert(convert); }},
         {"texture", "make a texture of a picture, or a picture of one",
@@ -69,6 +81,8 @@ int RunVerb(int argc, char** argv) {
          [&] { return RunEmitter(emitter); }},
         {"sheet", "put several pictures into one", [&](CLI::App* a) { SetUpSheet(a, &sheet); },
          [&] { return RunSheet(sheet); }},
+        {"thumbnail", "draw a small picture of any scene",
+         [&](CLI::App* a) { SetUpThumbnail(a, &thumbnail); }, [&] { return RunThumbnail(thumbnail); }},
         {"completion", "print what a shell needs to complete the command line",
          [&](CLI::App* a) {
              a->add_option("SHELL", shell, "bash")->required()->check(CLI::IsMember({"bash"}));

@@ -111,5 +111,7 @@ void LookAlong(const LookView& look, UpAxis axis, const std::vector<QexVec3>& po
     farthest = std::max(farthest, 1e-3f) * 1.5f;
     const float zNear = std::clamp(nearest * 0.5f, farthest * 5e-4f, farthest * 0.5f);
     QexCamera_LookAt(camera, &look.eye, &look.target, &up);
-    QexCamera_Project(camera, look.fov * kDegree, aspect, zNear, farthest);
+    // The engine's angle is the horizontal one.
+    const float across = 2 * std::atan(std::tan(look.fov * kDegree / 2) * aspect);
+    QexCamera_Project(camera, across, aspect, zNear, farthest);
 }

@@ -44,6 +44,8 @@ pod::Scene PlaneScene(float size, const pod::Vec3& place) {
 Floor::~Floor() {
     if (!created_) return;
     QexModel_Unload(&model_);
+    if (texture_) QexTexture_Release(texture_);
+    QexMemory_Free(texture_);
     QexGouraudShadowShader_Release(&shader_);
 }
 
@@ -55,7 +57,9 @@ void Floor::Create(const std::vector<QexVec3>& points, float height, bool mirror
     QexModel_Create(&model_);
     QexModel_LoadContentFromCache(&model_, file_.data(), static_cast<uint32_t>(file_.size()), nullptr);
     created_ = true;
-    QexModel_ReplaceTextureByIdx(&model_, NewPictureTexture(Chequers(), "floor"), 0);
+    // A model from memory does not own its textures.
+    texture_ = NewPictureTexture(Chequers(), "floor");
+    QexModel_ReplaceTextureByIdx(&model_, texture_, 0);
     opacity_ = mirrors ? kMirroring : 1.0f;
     QexPODMaterial& material = model_.scene.materials[0];
     material.opacity = opacity_;

@@ -26,5 +26,6 @@ class Floor {
     float opacity_ = 1;
     std::vector<uint8_t> file_;  // that the model's keys lie in
     QexModel model_ = {};
+    QexTexture* texture_ = nullptr;
     QexShaderModule* shader_ = nullptr;
 };

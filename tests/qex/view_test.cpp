@@ -1,0 +1,111 @@
+// qex view in a window of a virtual screen.
+#include <thread>
+
+#include "qex/QexCommandTest.h"
+
+namespace {
+
+class QexView : public QexCommandTest {
+  protected:
+    // Runs in the test's folder, so that nothing of the user's settings is seen.
+    CommandResult View(const std::string& words) const {
+        const std::string line = "cd '" + Path("") + "' && XDG_CONFIG_HOME='" + Path("") +
+                                 "' xvfb-run -a -s '-screen 0 640x480x24' '" QEX_COMMAND
+                                 "' view --size 400x300 " +
+                                 words + " >out.txt 2>err.txt";
+        const int status = system(line.c_str());
+        return {WEXITSTATUS(status), ReadText(Path("out.txt")), ReadText(Path("err.txt"))};
+    }
+    CommandResult Script(const std::string& files, const std::string& script) const {
+        WriteText(Path("script"), script);
+        return View(files + " --script script");
+    }
+};
+
+// Of a hundred pixels those that differ by more than so much in some channel.
+double Differing(const Image& a, const Image& b, int most) {
+    if (a.pixels.size() != b.pixels.size()) return 100;
+    size_t count = 0;
+    for (size_t i = 0; i < a.pixels.size(); i += 4) {
+        int difference = 0;
+        for (size_t c = i; c < i + 4; ++c)
+            difference = std::max(difference, std::abs(a.pixels[c] - b.pixels[c]));
+        count += difference > most;
+    }
+    return 400.0 * static_cast<double>(count) / static_cast<double>(a.pixels.size());
+}
+
+}  // namespace
+
+TEST_F(QexView, ScreenshotIsThePictureOfTheCopiedLine) {
+    pod::Scene scene = QuadScene();
+    PlaceQuad(&scene, {{{0, 0, 0}, {-0.5f, 0, 0}, {-1, 0, 0}}, {}, {}, {}});
+    scene.frameCount = 3;
+    WriteScene(Path("a b.pod"), scene);
+    const CommandResult result =
+        Script("'a b.pod'",
+               "drag 100 100 130 80\nwheel 2\nscrub 1\nkey L\nclick 200 150\nselect\n"
+               "screenshot shown.png\nline drawn.png\ndrag 200 150 260 150\nscreenshot other.png\n");
+    ASSERT_EQ(result.status, 0) << result.err;
+    EXPECT_TRUE(Contains(result.out, "selected quad\n")) << result.out;
+    std::string line = result.out.substr(result.out.find("qex render"));
+    line = "cd '" + Path("") + "' && '" QEX_COMMAND "'" + line.substr(3, line.find('\n') - 3);
+    ASSERT_EQ(system(line.c_str()), 0) << line;
+    const Image shown = LoadPicture("shown.png");
+    // The samples of edges lie elsewhere in a surface of another kind.
+    EXPECT_LT(Differing(shown, LoadPicture("drawn.png"), 1), 1.5) << line;
+    EXPECT_LT(Differing(shown, LoadPicture("drawn.png"), 64), 0.1) << line;
+    EXPECT_GT(Differing(shown, LoadPicture("other.png"), 64), 5);
+}
+
+TEST_F(QexView, FilesThatChangeAreShownAnewFromTheSamePlace) {
+    pod::Scene scene = QuadScene();
+    WriteScene(Path("quad.pod"), scene);
+    scene.materials[0].diffuse = {0, 1, 0};
+    WriteScene(Path("green"), scene);
+    std::thread change([this] {
+        for (int i = 0; i < 300 && !std::filesystem::exists(Path("one.png")); ++i) usleep(20000);
+        std::filesystem::rename(Path("green"), Path("quad.pod"));
+    });
+    const CommandResult result = Script(
+        "quad.pod", "drag 100 100 120 80\nscreenshot one.png\nline x\nwait 2\nscreenshot two.png\nline x\n");
+    change.join();
+    ASSERT_EQ(result.status, 0) << result.err;
+    const Image one = LoadPicture("one.png"), two = LoadPicture("two.png");
+    const size_t middle = one.pixels.size() / 2 + 4 * static_cast<size_t>(one.width / 2);
+    EXPECT_GT(one.pixels[middle], one.pixels[middle + 1] + 50);
+    EXPECT_GT(two.pixels[middle + 1], two.pixels[middle] + 50);
+    const std::string first = result.out.substr(0, result.out.find('\n') + 1);
+    EXPECT_EQ(result.out, first + first);  // the camera
+}
+
+TEST_F(QexView, SaysWhatItCannotShow) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    WriteText(Path("broken.pod"), "no scene");
+    WriteText(Path("quad.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    WriteText(Path("odd.xyz"), "no scene");
+    WriteText(Path("qex/view.json"), "{broken");
+    const CommandResult result = View("--batch quad.pod quad.obj broken.pod odd.xyz nowhere.pod");
+    EXPECT_EQ(result.status, 3) << result.err;
+    for (const char* part :
+         {"view.json: is no JSON object", "broken.pod: ", "odd.xyz: ", "nowhere.pod: no such file"})
+        EXPECT_TRUE(Contains(result.err, part)) << part << "\n" << result.err;
+    unsetenv("DISPLAY");
+    unsetenv("WAYLAND_DISPLAY");
+    ExpectRefused({"view", Path("quad.pod")}, 1, "qex render");
+}
+
+TEST_F(QexView, LivesThroughRandomEvents) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    const CommandResult result = View("quad.pod --random-events 2000 --seed 5");
+    EXPECT_EQ(result.status, 0) << result.err;
+}
+
+TEST_F(QexView, ThumbnailsOfScenesThatAreConverted) {
+    WriteText(Path("quad.obj"), "v 0 0 0\nv 1 0 0\nv 0 1 0\nf 1 2 3\n");
+    EXPECT_EQ(Run({"thumbnail", Path("quad.obj"), Path("small.png"), "--size", "64"}).err, "");
+    const Image image = LoadPicture("small.png");
+    EXPECT_EQ(std::pair(image.width, image.height), std::pair(64, 64));
+    EXPECT_GT(Differing(image, {64, 64, Bytes(image.pixels.size(), 0x40), false}, 60), 10);
+    ExpectRefused({"thumbnail", Path("nowhere.obj"), Path("x.png")}, 1, "nowhere.obj");
+}

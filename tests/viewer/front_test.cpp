@@ -1,0 +1,151 @@
+// The viewer without a window: camera, playback, and what a scene does under it.
+#include <cmath>
+#include <set>
+
+#include "common/ImageFile.h"
+#include "front/Viewer.h"
+#include "Headless.h"
+#include "qex/QexCommandTest.h"
+
+namespace {
+
+void ExpectNear(const QexVec3& a, const QexVec3& b, float tolerance) {
+    EXPECT_NEAR(a.x, b.x, tolerance);
+    EXPECT_NEAR(a.y, b.y, tolerance);
+    EXPECT_NEAR(a.z, b.z, tolerance);
+}
+
+ViewerEvent At(ViewerEvent::Kind kind, float x, float y) {
+    ViewerEvent event = {};
+    event.kind = kind;
+    event.x = x;
+    event.y = y;
+    event.button = 1;
+    return event;
+}
+
+class Front : public FolderTest {
+  protected:
+    Front() : context_(qex::HeadlessContext::Create(200, 100, nullptr)), viewer_(200, 100) {}
+
+    void Load(const std::string& path) {
+        viewer_.Open(path);
+        while (viewer_.IsLoading()) viewer_.Tick(0.01);
+    }
+    void Press(const std::string& key) {
+        ViewerEvent event = {};
+        event.kind = ViewerEvent::kKey;
+        event.text = key;
+        viewer_.Handle(event);
+    }
+    void Pointer(float x, float y, float toX, float toY) {
+        ViewerEvent event = At(ViewerEvent::kPointerDown, x, y);
+        viewer_.Handle(event);
+        event = At(ViewerEvent::kPointerMove, toX, toY);
+        viewer_.Handle(event);
+        event.kind = ViewerEvent::kPointerUp;
+        viewer_.Handle(event);
+    }
+    // Pixels that are not of the background.
+    size_t Covered() {
+        const Bytes pixels = viewer_.Picture(200, 100, 1);
+        size_t count = 0;
+        for (size_t i = 0; i < pixels.size(); i += 4) count += std::abs(pixels[i] - 0x40) > 3;
+        return count;
+    }
+
+    std::unique_ptr<qex::HeadlessContext> context_;
+    Viewer viewer_;
+};
+
+}  // namespace
+
+TEST(OrbitCamera, StandsWhereItIsMoved) {
+    OrbitCamera camera;  // 5 units from the origin
+    const struct {
+        UpAxis up;
+        float yaw, pitch;
+        QexVec3 eye;
+    } cases[] = {{UpAxis::kY, 0, 0, {0, 0, 5}},
+                 {UpAxis::kY, 90, 0, {5, 0, 0}},
+                 {UpAxis::kY, 180, 30, {0, 2.5f, -4.3301f}},
+                 {UpAxis::kZ, 0, 0, {0, -5, 0}},
+                 {UpAxis::kMinusZ, 0, 89, {0, 0.0873f, -4.9992f}}};
+    for (const auto& c : cases) {
+        camera.SetUp(c.up);
+        camera.Look(c.yaw, c.pitch);
+        ExpectNear(camera.View().eye, c.eye, 1e-3f);
+    }
+    camera.SetUp(UpAxis::kY);
+    camera.Look(0, 0);
+    camera.Orbit(0, 400);
+    EXPECT_EQ(camera.Pitch(), 89);
+    camera.Look(0, 0);
+    camera.Dolly(0.5f);
+    camera.Fly(1, 0, 0);  // onto its target
+    ExpectNear(camera.View().eye, {0, 0, 0}, 1e-5f);
+    camera.FrameAll({{-1, -1, 2}, {1, 1, 2}}, 1);
+    // 2 units and a margin of 6 in 100 in 40 degrees.
+    ExpectNear(camera.View().eye, {0, 0, 2 + 1.06f / std::tan(20 * 3.14159265f / 180)}, 1e-3f);
+}
+
+TEST(Playback, GoesRoundItsRange) {
+    Playback play;
+    play.Start(11, 10);
+    play.Tick(0.55);
+    EXPECT_NEAR(play.Frame(), 5.5, 1e-9);
+    play.Tick(0.5);
+    EXPECT_NEAR(play.Frame(), 0.5, 1e-9);
+    play.SetSpeed(-2);
+    play.Tick(0.1);
+    EXPECT_NEAR(play.Frame(), 8.5, 1e-9);
+    play.Step(1);
+    EXPECT_EQ(play.Frame(), 9);
+    EXPECT_FALSE(play.Plays());
+    play.Keep(5, 10);  // written anew, shorter
+    EXPECT_EQ(play.Frame(), 4);
+}
+
+TEST_F(Front, ShowsPicksAndKeepsAScene) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    Load(Path("quad.pod"));
+    Press("1");
+    const size_t covered = Covered();
+    EXPECT_GT(covered, 2000u);
+    Pointer(100, 50, 100, 50);
+    EXPECT_EQ(viewer_.Selected(), 0);
+    Pointer(2, 2, 2, 2);
+    EXPECT_EQ(viewer_.Selected(), -1);
+    // A quarter of a turn shows nothing of it, half a turn its other side.
+    Pointer(20, 20, 245, 20);
+    EXPECT_LT(Covered(), covered / 20);
+    Pointer(20, 20, 245, 20);
+    EXPECT_NEAR(static_cast<double>(Covered()), static_cast<double>(covered), 300.0);
+    // What cannot be read leaves it where it is, and is said.
+    WriteText(Path("broken.pod"), "no scene");
+    for (const char* name : {"broken.pod", "nowhere.pod", "."}) Load(Path(name));
+    EXPECT_EQ(viewer_.FailedLoads(), 3u);
+    EXPECT_EQ(viewer_.Messages().size(), 3u);
+    EXPECT_EQ(viewer_.Path(), Path("quad.pod"));
+    Press("1");
+    EXPECT_NEAR(static_cast<double>(Covered()), static_cast<double>(covered), 300.0);
+    for (const auto& [width, height] : {std::pair(0, 0), {1, 1}, {0, 5}, {200, 100}})
+        viewer_.Draw(width, height);
+    EXPECT_NEAR(static_cast<double>(Covered()), static_cast<double>(covered), 300.0);
+}
+
+TEST_F(Front, KeysChangeThePictureAndChangeItBack) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    Load(Path("quad.pod"));
+    Press("2");
+    const Bytes before = viewer_.Picture(200, 100, 1);
+    Press("L");
+    EXPECT_NE(viewer_.Picture(200, 100, 1), before);
+    Press("L");
+    EXPECT_EQ(viewer_.Picture(200, 100, 1), before);
+    std::set<Bytes> pictures;
+    for (size_t i = 0; i < ShaderNames().size() + 1; ++i, Press("M"))
+        pictures.insert(viewer_.Picture(200, 100, 1));
+    EXPECT_GE(pictures.size(), 3u);  // in colour, white, depth
+    EXPECT_EQ(viewer_.Picture(200, 100, 1), before);
+}

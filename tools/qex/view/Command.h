@@ -1,0 +1,10 @@
+// qex view: a window that shows scenes.
+#pragma once
+
+#include "desktop/Window.h"
+
+namespace CLI {
+class App;
+}
+
+void SetUpView(CLI::App* app, ViewOptions* options);

@@ -1,0 +1,71 @@
+// "qex convert" of this very program, its output and messages in a temporary folder.
+#include "desktop/Conversion.h"
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <vector>
+
+extern char** environ;
+
+Conversion::~Conversion() {
+    Stop();
+}
+
+void Conversion::Stop() {
+    if (child_ > 0) {
+        kill(child_, SIGTERM);
+        waitpid(child_, nullptr, 0);
+    }
+    child_ = 0;
+    std::error_code ignored;
+    if (!folder_.empty()) std::filesystem::remove_all(folder_, ignored);
+    folder_.clear();
+}
+
+bool Conversion::Start(const std::string& input, std::string* problem) {
+    Stop();
+    input_ = input;
+    std::string pattern = (std::filesystem::temp_directory_path() / "qex-view-XXXXXX").string();
+    if (!mkdtemp(&pattern[0])) {
+        *problem = std::string("no temporary folder: ") + strerror(errno);
+        return false;
+    }
+    folder_ = pattern;
+    // A name that begins with a minus is no option.
+    const std::string from = std::filesystem::absolute(input).string(), to = Output(),
+                      said = folder_ + "/said";
+    const std::vector<const char*> words = {"qex",      "convert", from.c_str(), "-o",
+                                            to.c_str(), "--quiet", nullptr};
+    posix_spawn_file_actions_t files;
+    posix_spawn_file_actions_init(&files);
+    posix_spawn_file_actions_addopen(&files, STDERR_FILENO, said.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+    const int error = posix_spawn(&child_, "/proc/self/exe", &files, nullptr,
+                                  const_cast<char* const*>(words.data()), environ);
+    posix_spawn_file_actions_destroy(&files);
+    if (error == 0) return true;
+    *problem = std::string("no process can be started for it: ") + strerror(error);
+    child_ = 0;
+    return false;
+}
+
+Conversion::State Conversion::Poll(std::string* problem) {
+    int status = 0;
+    if (child_ <= 0) return State::kNone;
+    const pid_t ended = waitpid(child_, &status, WNOHANG);
+    if (ended == 0 || (ended < 0 && errno == EINTR)) return State::kAtWork;
+    child_ = 0;
+    if (WIFEXITED(status) && WEXITSTATUS(status) == 0) return State::kDone;
+    std::ifstream said(folder_ + "/said");
+    for (std::string line; std::getline(said, line);)
+        if (line.find("warning: ") == std::string::npos) *problem = line;
+    if (problem->empty()) *problem = input_ + ": cannot be converted";
+    return State::kFailed;
+}

@@ -1,0 +1,327 @@
+// A section a subject; what is edited becomes the viewer's options at the end.
+#include "desktop/Inspector.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include <imgui.h>
+#include <unistd.h>
+
+#include "common/OutputFile.h"
+#include "common/SceneBounds.h"
+#include "common/TextureFiles.h"
+#include "emitter/Description.h"
+
+namespace {
+
+// A switch for a value that may be left out, and the value.
+bool Optional(const char* label, std::optional<float>* value, float otherwise, float speed) {
+    bool on = value->has_value(), changed = ImGui::Checkbox(label, &on);
+    if (changed) *value = on ? std::optional<float>(otherwise) : std::nullopt;
+    if (!on) return changed;
+    ImGui::SameLine(120);
+    ImGui::PushID(label);
+    ImGui::SetNextItemWidth(-1);
+    changed |= ImGui::DragFloat("##value", &**value, speed);
+    ImGui::PopID();
+    return changed;
+}
+
+std::string NameOf(const QexPODNode& node, uint32_t index) {
+    return node.name && *node.name ? node.name : "node " + std::to_string(index);
+}
+
+double MegabytesInUse() {
+    unsigned long pages = 0, resident = 0;
+    if (FILE* file = fopen("/proc/self/statm", "r")) {
+        if (fscanf(file, "%lu %lu", &pages, &resident) != 2) resident = 0;
+        fclose(file);
+    }
+    return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / (1 << 20);
+}
+
+const char* FormatName(uint32_t format) {
+    static const char* const kNames[] = {"compressed or other", "RGBA 8888", "RGBA 4444", "RGBA 5551",
+                                         "RGB 565"};
+    return format < sizeof kNames / sizeof kNames[0] ? kNames[format] : "other";
+}
+
+int MipLevels(const QexTexture& texture) {
+    int levels = 1;
+    for (uint32_t side = std::max(static_cast<uint32_t>(texture.width), texture.height); side > 1; side /= 2)
+        ++levels;
+    return levels;
+}
+
+bool IsHidden(const SceneOptions& options, const std::string& name) {
+    const auto& nodes = options.effects.nodes;
+    return std::any_of(nodes.begin(), nodes.end(),
+                       [&](const NodeChange& c) { return c.what == NodeChange::kHide && c.node == name; });
+}
+
+}  // namespace
+
+void Inspector::ShowPlayback() {
+    Playback& play = viewer_->Play();
+    if (play.Last() <= 0) return ImGui::TextDisabled("no animation");
+    if (ImGui::Button(play.Plays() ? "Pause" : "Play")) play.Play(!play.Plays());
+    ImGui::SameLine();
+    if (ImGui::Button("<")) play.Step(-1);
+    ImGui::SameLine();
+    if (ImGui::Button(">")) play.Step(1);
+    ImGui::SameLine();
+    float frame = static_cast<float>(play.Frame());
+    ImGui::SetNextItemWidth(-1);
+    if (ImGui::SliderFloat("##frame", &frame, 0, static_cast<float>(play.Last()), "frame %.1f"))
+        play.Scrub(static_cast<double>(frame));
+    float range[2] = {static_cast<float>(play.First()), static_cast<float>(play.Until())};
+    if (ImGui::DragFloat2("range", range, 0.5f, 0, static_cast<float>(play.Last()), "%.0f"))
+        play.SetRange(static_cast<double>(range[0]), static_cast<double>(range[1]));
+    float speed = static_cast<float>(play.Speed());
+    if (ImGui::SliderFloat("speed", &speed, -4, 4, "%.2f")) play.SetSpeed(static_cast<double>(speed));
+}
+
+void Inspector::ShowView() {
+    if (ImGui::Button("Frame all")) viewer_->FrameAll();
+    const QexModel* model = viewer_->View().Model();
+    for (uint32_t i = 0; model && i < model->scene.cameraCount; ++i) {
+        ImGui::SameLine();
+        if (ImGui::Button(("Camera " + std::to_string(i)).c_str()))
+            viewer_->SetSceneCamera(static_cast<int>(i));
+    }
+    edited_ = viewer_->Options();
+    int up = static_cast<int>(viewer_->Camera().Up());
+    if (ImGui::Combo("up", &up, kUpAxisNames, 6)) {
+        viewer_->Camera().SetUp(static_cast<UpAxis>(up));
+        viewer_->FrameAll();
+        edited_ = viewer_->Options();
+    }
+    float colour[3];
+    for (int i = 0; i < 3; ++i)
+        colour[i] = static_cast<float>(edited_.background >> (16 - 8 * i) & 255) / 255;
+    if (ImGui::ColorEdit3("background", colour)) {
+        edited_.background = 0;
+        for (const float c : colour)
+            edited_.background = edited_.background << 8 | static_cast<uint32_t>(c * 255 + 0.5f);
+    }
+    int drawing = edited_.lean ? 0 : 1;
+    if (ImGui::Combo("drawing", &drawing, "lean\0described\0")) edited_.lean = drawing == 0;
+    std::vector<std::string> names = ShaderNames();
+    names.insert(names.begin(), "default look");
+    const std::string current = edited_.effects.shader.empty() ? names[0] : edited_.effects.shader;
+    if (ImGui::BeginCombo("shader", current.c_str())) {
+        for (const std::string& name : names)
+            if (ImGui::Selectable(name.c_str(), name == current))
+                edited_.effects.shader = name == names[0] ? "" : name;
+        ImGui::EndCombo();
+    }
+    static const char* const kOverlays[] = {"grid", "wireframe", "boxes", "bones", "normals"};
+    for (int i = 0; i < static_cast<int>(Overlay::kCount); ++i) {
+        bool on = viewer_->Shows(static_cast<Overlay>(i));
+        if (i % 3) ImGui::SameLine(static_cast<float>(i % 3) * 110);
+        if (ImGui::Checkbox(kOverlays[i], &on)) viewer_->Show(static_cast<Overlay>(i), on);
+    }
+}
+
+void Inspector::ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children) {
+    const QexPODModel& scene = viewer_->View().Model()->scene;
+    const std::string name = NameOf(scene.nodes[index], index);
+    ImGui::PushID(static_cast<int>(index));
+    bool shown = !IsHidden(edited_, name);
+    if (ImGui::Checkbox("##shown", &shown)) {
+        auto& nodes = edited_.effects.nodes;
+        if (!shown)
+            nodes.push_back({name, NodeChange::kHide, {0, 0, 0}});
+        else
+            nodes.erase(std::remove_if(nodes.begin(), nodes.end(),
+                                       [&](const NodeChange& c) {
+                                           return c.what == NodeChange::kHide && c.node == name;
+                                       }),
+                        nodes.end());
+    }
+    ImGui::SameLine();
+    ImGuiTreeNodeFlags flags =
+        ImGuiTreeNodeFlags_DefaultOpen | ImGuiTreeNodeFlags_OpenOnArrow | ImGuiTreeNodeFlags_SpanAvailWidth;
+    if (children[index].empty()) flags |= ImGuiTreeNodeFlags_Leaf;
+    if (viewer_->Selected() == static_cast<int>(index)) flags |= ImGuiTreeNodeFlags_Selected;
+    const bool open = ImGui::TreeNodeEx(name.c_str(), flags);
+    if (ImGui::IsItemClicked()) viewer_->Select(static_cast<int>(index));
+    if (open) {
+        for (const uint32_t child : children[index]) ShowNode(child, children);
+        ImGui::TreePop();
+    }
+    ImGui::PopID();
+}
+
+void Inspector::ShowNodes() {
+    const QexPODModel& scene = viewer_->View().Model()->scene;
+    std::vector<std::vector<uint32_t>> children(scene.nodeCount);
+    for (uint32_t i = 0; i < scene.nodeCount; ++i)
+        if (scene.nodes[i].parentIndex >= 0)
+            children[static_cast<size_t>(scene.nodes[i].parentIndex)].push_back(i);
+    for (uint32_t i = 0; i < scene.nodeCount; ++i)
+        if (scene.nodes[i].parentIndex < 0) ShowNode(i, children);
+}
+
+void Inspector::ShowMaterials() {
+    QexModel* model = viewer_->View().Model();
+    for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
+        const char* name = model->scene.materials[i].name;
+        ImGui::PushID(static_cast<int>(i));
+        if (ImGui::TreeNode(name && *name ? name : "material")) {
+            QexPODMaterial material = viewer_->View().MaterialOf(i);
+            bool changed = ImGui::ColorEdit3("diffuse", material.diffuse);
+            changed |= ImGui::ColorEdit3("specular", material.specular);
+            changed |= ImGui::DragFloat("shininess", &material.shininess, 0.5f, 0, 1000);
+            changed |= ImGui::SliderFloat("opacity", &material.opacity, 0, 1);
+            if (changed) viewer_->View().SetMaterial(i, material);
+            if (const QexTexture* texture = model->textures[i]) {
+                ImGui::Text("%s: %d x %u, %s, up to %d levels", texture->name, texture->width,
+                            texture->height, FormatName(texture->format), MipLevels(*texture));
+                // The first row is the lower edge.
+                ImGui::Image(reinterpret_cast<ImTextureID>(static_cast<uintptr_t>(texture->glName)),
+                             {160, 160}, {0, 1}, {1, 0});
+            }
+            ImGui::TreePop();
+        }
+        ImGui::PopID();
+    }
+}
+
+void Inspector::ShowLights() {
+    std::vector<QexLight>& lights = edited_.effects.lights;
+    const float size = viewer_->View().Size();
+    for (size_t i = 0; i < lights.size(); ++i) {
+        ImGui::PushID(static_cast<int>(i));
+        ImGui::DragFloat3("place", lights[i].vector, size / 100);
+        ImGui::ColorEdit3("colour", lights[i].colour);
+        const bool gone = ImGui::Button("Remove");
+        ImGui::PopID();
+        if (gone) lights.erase(lights.begin() + static_cast<std::ptrdiff_t>(i--));
+    }
+    if (lights.size() < QEX_MAX_LIGHTS && ImGui::Button("Add a light")) {
+        const QexVec3 eye = viewer_->View().Camera().eye;
+        lights.push_back({QEX_LIGHT_POINT, {eye.x, eye.y + size / 2, eye.z}, {1, 1, 1, 1}});
+    }
+}
+
+void Inspector::ShowEffects() {
+    EffectOptions& e = edited_.effects;
+    const Bounds box = BoundsOf(viewer_->View().Points());
+    const float low = box.empty ? 0 : box.low.y, speed = viewer_->View().Size() / 200;
+    const bool wholePicture = e.depthOfField || !e.sky.empty();
+    Optional("floor", &e.floor, low, speed);
+    if (!e.water) ImGui::Checkbox("shadow", &e.shadow);
+    if (!wholePicture) Optional("mirror", &e.mirror, low, speed);
+    if (!e.sky.empty() && !e.shadow) Optional("water", &e.water, low, speed);
+    bool blur = e.depthOfField.has_value();
+    if (!e.mirror && !e.stereo && e.sky.empty() && ImGui::Checkbox("depth of field", &blur))
+        e.depthOfField = blur ? std::optional<DepthOfField>({0.5f, 3, 5, 9}) : std::nullopt;
+    if (e.depthOfField) {
+        ImGui::SliderFloat("focus", &e.depthOfField->focus, 0, 1, "%.3f");
+        ImGui::DragFloat("range", &e.depthOfField->range, 0.05f, 0, 100);
+        ImGui::SliderFloat("sigma", &e.depthOfField->sigma, 0.1f, 20);
+        ImGui::Checkbox("full resolution", &e.fullBlur);
+    } else {
+        e.fullBlur = false;
+    }
+    int stereo = static_cast<int>(e.stereo);
+    if (!wholePicture && ImGui::Combo("stereo", &stereo, "off\0red, blue\0red, cyan\0side by side\0"))
+        e.stereo = static_cast<uint32_t>(stereo);
+    if (e.stereo) ImGui::DragFloat("separation", &e.separation, 0.1f, -100, 100);
+}
+
+// All values of an emitter, written into it as they change; a description of them is saved on demand.
+void Inspector::ShowEmitters() {
+    Emitters* particles = viewer_->View().Particles();
+    for (size_t i = 0; particles && i < particles->All().size(); ++i) {
+        QexParticleEmitter* emitter = particles->All()[i];
+        const std::string file = edited_.effects.emitters.emitters[i];
+        ImGui::PushID(static_cast<int>(i));
+        if (ImGui::TreeNodeEx(FileName(file).c_str(), ImGuiTreeNodeFlags_DefaultOpen)) {
+            for (const Field& field : EmitterFields()) {
+                std::vector<Row> rows = GetRows(*emitter, field);
+                bool changed = false;
+                for (Row& row : rows) {
+                    ImGui::PushID(&row);
+                    changed |=
+                        ImGui::DragScalarN(field.name, ImGuiDataType_Double, row.data(),
+                                           static_cast<int>(row.size()), 0.05f, nullptr, nullptr, "%.4g");
+                    ImGui::PopID();
+                }
+                FieldValues values;
+                if (changed && FaultOf(field, rows).empty() && values.Add(field.name, rows).empty())
+                    values.Apply(emitter);
+            }
+            if (ImGui::Button("Save the description")) {
+                const std::string to = WithoutExtension(file) + ".json", text = DescribeEmitter(*emitter);
+                std::string problem;
+                const bool saved = WriteOutput(to, text.data(), text.size(), &problem);
+                viewer_->Say(to + (saved ? ": saved" : ": " + problem));
+            }
+            ImGui::TreePop();
+        }
+        ImGui::PopID();
+    }
+    if (!particles) ImGui::TextDisabled("none; drop an emitter file or a description of one");
+}
+
+void Inspector::ShowStatistics() {
+    const ViewerStatistics& s = viewer_->Statistics();
+    float sum = 0;
+    int count = 0;
+    for (const float time : s.frameTimes) {
+        sum += time;
+        count += time > 0;
+    }
+    const float mean = count ? sum / static_cast<float>(count) : 0;
+    char words[32];
+    snprintf(words, sizeof words, "%.1f ms", static_cast<double>(mean));
+    ImGui::SetNextItemWidth(-1);
+    ImGui::PlotLines("##times", s.frameTimes.data(), static_cast<int>(s.frameTimes.size()),
+                     static_cast<int>(s.next), words, 0, mean * 3 + 1, {0, 50});
+    ImGui::Text("%llu GL calls a picture", static_cast<unsigned long long>(s.calls));
+    ImGui::Text("%llu triangles", static_cast<unsigned long long>(s.triangles));
+    ImGui::Text("%.1f MB in use", MegabytesInUse());
+}
+
+InspectorWishes Inspector::Show(const std::vector<std::string>& recent) {
+    InspectorWishes wishes;
+    const ImVec2 screen = ImGui::GetIO().DisplaySize;
+    const float width = std::min(static_cast<float>(kWidth), screen.x);
+    ImGui::SetNextWindowPos({screen.x - width, 0});
+    ImGui::SetNextWindowSize({width, screen.y});
+    ImGui::Begin("Inspector", nullptr,
+                 ImGuiWindowFlags_NoMove | ImGuiWindowFlags_NoResize | ImGuiWindowFlags_NoCollapse |
+                     ImGuiWindowFlags_NoSavedSettings);
+    const auto section = [](const char* name, bool open) {
+        return ImGui::CollapsingHeader(name, open ? ImGuiTreeNodeFlags_DefaultOpen : 0);
+    };
+    ImGui::PushItemWidth(-100);
+    edited_ = viewer_->Options();
+    const bool scene = viewer_->View().Model() != nullptr;
+    if (section("File", true)) {
+        wishes.screenshot = ImGui::Button("Screenshot");
+        ImGui::SameLine();
+        wishes.turntable = ImGui::Button("Turntable");
+        ImGui::SameLine();
+        wishes.copyLine = ImGui::Button("Copy command");
+        if (!recent.empty() && ImGui::BeginCombo("recent", "...")) {
+            for (const std::string& file : recent)
+                if (ImGui::Selectable(file.c_str())) wishes.open = file;
+            ImGui::EndCombo();
+        }
+    }
+    if (scene && section("Animation", true)) ShowPlayback();
+    if (section("View", true)) ShowView();
+    if (scene && section("Nodes", true)) ShowNodes();
+    if (scene && section("Materials", false)) ShowMaterials();
+    if (scene && section("Lights", false)) ShowLights();
+    if (scene && section("Effects", false)) ShowEffects();
+    if (scene && section("Emitters", false)) ShowEmitters();
+    if (section("Statistics", true)) ShowStatistics();
+    ImGui::PopItemWidth();
+    ImGui::End();
+    viewer_->SetOptions(edited_);
+    return wishes;
+}
