@@ -10,6 +10,10 @@ import urllib.error
 import urllib.request
 
 SOFTWARE_GL = ("--use-gl=angle", "--use-angle=swiftshader", "--enable-unsafe-swiftshader")
+with open(os.path.join(os.path.dirname(os.path.abspath(__file__)), "compare.js"), encoding="utf-8") as file:
+    COMPARE = file.read()
+FIND_LOSS = "window.loss = document.getElementById('canvas').getContext('webgl').getExtension('WEBGL_lose_context'); "
+GL_ERROR = "return document.getElementById('canvas').getContext('webgl').getError()"
 
 
 def serve(folders):
@@ -97,6 +101,14 @@ class Browser:
     def console(self):
         """Errors on the console since the last call."""
         return [e["message"] for e in self.call("POST", "/se/log", {"type": "browser"}) if e["level"] == "SEVERE"]
+
+    def act(self, kind, *pointers):
+        """Pointers of a kind, a list of (x, y) in the page each: down at the first place, along the others, up."""
+        def source(i, places):
+            move = [{"type": "pointerMove", "x": int(x), "y": int(y), "duration": 40} for x, y in places]
+            return {"type": "pointer", "id": f"{kind}{i}", "parameters": {"pointerType": kind},
+                    "actions": [move[0], {"type": "pointerDown", "button": 0}, *move[1:], {"type": "pointerUp", "button": 0}]}
+        self.call("POST", "/actions", {"actions": [source(i, places) for i, places in enumerate(pointers)]})
 
     def screenshot(self, path):
         import base64

@@ -7,29 +7,10 @@ import sys
 import unittest
 from concurrent.futures import ThreadPoolExecutor
 
-from browser import SOFTWARE_GL, Browser, serve
+from browser import COMPARE, FIND_LOSS, GL_ERROR, SOFTWARE_GL, Browser, serve
 
 site, native, out = (os.path.abspath(path) for path in sys.argv[1:4])
 NAMES = sys.argv[4:] or sorted(name[:-4] for name in os.listdir(os.path.join(site, "gallery/pictures")))
-# How many of the pixels are further than 3 from the other picture's in a channel, and how many pixels there are.
-COMPARE = """
-    const pixels = async source => {
-        const image = await createImageBitmap(source);
-        const canvas = new OffscreenCanvas(image.width, image.height), to = canvas.getContext('2d');
-        to.drawImage(image, 0, 0);
-        return to.getImageData(0, 0, image.width, image.height).data;
-    };
-    const mine = await pixels(document.getElementById('canvas'));
-    const other = a[0] ? await pixels(await (await fetch(a[0])).blob()) : window.before;
-    if (mine.length !== other.length) throw new Error('sizes differ');
-    window.before = mine;
-    let far = 0;
-    for (let i = 0; i < mine.length; i += 4)
-        if ([0, 1, 2].some(c => Math.abs(mine[i + c] - other[i + c]) > 3)) ++far;
-    return [far, mine.length / 4];
-"""
-FIND_LOSS = "window.loss = document.getElementById('canvas').getContext('webgl').getExtension('WEBGL_lose_context'); "
-GL_ERROR = "return document.getElementById('canvas').getContext('webgl').getError()"
 
 
 def draw(name):

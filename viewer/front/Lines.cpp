@@ -1,4 +1,4 @@
-// One program, lines from the application's memory.
+// One program, lines from a buffer that is filled for each drawing.
 #include "front/Lines.h"
 
 #include <cmath>
@@ -20,6 +20,7 @@ Lines::~Lines() {
     if (!program_) return;
     QexRenderState_Restore();
     glDeleteProgram(program_);
+    glDeleteBuffers(1, &buffer_);
     for (const uint32_t shader : shaders_) glDeleteShader(shader);
     QexRenderState_Reset(nullptr);
 }
@@ -31,6 +32,7 @@ bool Lines::Prepare() {
     QexShader_Create(&shaders_[1], kFragment, GL_FRAGMENT_SHADER);
     if (QexShader_CreateProgram(&program_, shaders_[0], shaders_[1], names, 2, nullptr) != 0) return false;
     matrix_ = glGetUniformLocation(program_, "matrix");
+    glGenBuffers(1, &buffer_);
     return true;
 }
 
@@ -75,16 +77,20 @@ void Lines::Draw(const QexCamera& camera, bool hidden) {
     QexRenderer_SetZTestFunc(hidden ? QEX_DEPTH_LESS_EQUAL : QEX_DEPTH_ALWAYS);
     QexRenderer_SetAlphaBlendMode(QEX_BLEND_NONE);
     QexRenderState_Restore();
-    glBindBuffer(GL_ARRAY_BUFFER, 0);
+    glBindBuffer(GL_ARRAY_BUFFER, buffer_);
+    glBufferData(GL_ARRAY_BUFFER, static_cast<GLsizeiptr>(points_.size() * sizeof(Point)), points_.data(),
+                 GL_STREAM_DRAW);
     glUseProgram(program_);
     glUniformMatrix4fv(matrix_, 1, GL_FALSE, matrix.m);
-    glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, sizeof(Point), &points_[0].place);
-    glVertexAttribPointer(1, 4, GL_UNSIGNED_BYTE, GL_TRUE, sizeof(Point), points_[0].colour);
+    glVertexAttribPointer(0, 3, GL_FLOAT, GL_FALSE, sizeof(Point), nullptr);
+    glVertexAttribPointer(1, 4, GL_UNSIGNED_BYTE, GL_TRUE, sizeof(Point),
+                          reinterpret_cast<const void*>(offsetof(Point, colour)));
     glEnableVertexAttribArray(0);
     glEnableVertexAttribArray(1);
     glDrawArrays(GL_LINES, 0, static_cast<GLsizei>(points_.size()));
     glDisableVertexAttribArray(0);
     glDisableVertexAttribArray(1);
+    glBindBuffer(GL_ARRAY_BUFFER, 0);
     QexRenderState_Reset(nullptr);
     QexRenderer_SetZWrite(1);
 }

@@ -13,6 +13,8 @@ class Lines {
     Lines(const Lines&) = delete;
     Lines& operator=(const Lines&) = delete;
 
+    // The context is gone, and all that was made in it.
+    void Forget() { program_ = buffer_ = 0; }
     void Clear() { points_.clear(); }
     void Add(const QexVec3& from, const QexVec3& to, uint32_t colour);  // RRGGBB
     void AddBox(const QexVec3 corners[8], uint32_t colour);             // as QexBoundingBox's corners
@@ -29,6 +31,6 @@ class Lines {
     bool Prepare();
 
     std::vector<Point> points_;
-    uint32_t shaders_[2] = {0, 0}, program_ = 0;
+    uint32_t shaders_[2] = {0, 0}, program_ = 0, buffer_ = 0;
     int matrix_ = -1;
 };

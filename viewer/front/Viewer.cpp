@@ -85,24 +85,6 @@ void Viewer::Reload(const std::string& path) {
     keep_ = true;
 }
 
-void Viewer::OpenBytes(const std::string& name, const void* bytes, size_t size) {
-    const std::filesystem::path temporary = std::filesystem::temp_directory_path();
-    std::error_code error;
-    for (int i = 0; folder_.empty() && i < 1000; ++i) {
-        const std::string folder = (temporary / ("qex-view-" + std::to_string(i))).string();
-        if (std::filesystem::create_directory(folder, error)) folder_ = folder + "/";
-    }
-    // A name from elsewhere leads nowhere else.
-    const std::string path = folder_ + FileName(SlashedPath(name));
-    FILE* file = folder_.empty() ? nullptr : fopen(path.c_str(), "wb");
-    const bool whole = file && fwrite(bytes, 1, size, file) == size;
-    if (file) fclose(file);
-    if (!whole)
-        Say(name + ": there is no room for it among the temporary files");
-    else if (Extension(name) == "pod")
-        Open(path, name);
-}
-
 void Viewer::ContinueLoad() {
     std::vector<std::string> warnings;
     std::string problem;
@@ -259,6 +241,8 @@ void Viewer::Handle(const ViewerEvent& event) {
 void Viewer::Tick(double seconds) {
     statistics_.frameTimes[statistics_.next] = static_cast<float>(seconds * 1000);
     statistics_.next = (statistics_.next + 1) % statistics_.frameTimes.size();
+    if (QexEngine_IsContextLost()) return;
+    OpenAdded();
     ContinueLoad();
     const double step = std::clamp(seconds, 0.0, kLongestTick);
     playback_.Tick(step);

@@ -49,17 +49,25 @@ class Viewer {
     // Begins to load a POD scene; the one that is shown stays until it is there, and if it fails. What is
     // shown to people as its name may be another file that it was made from.
     void Open(const std::string& path, const std::string& name = "");
-    // The same from memory: bytes of scenes and of what lies beside them, kept in a folder of their own; a
-    // scene is opened.
+    // The same from memory: bytes of scenes and of what lies beside them, kept in a folder of their own. The
+    // next Tick opens a scene, shows its textures that came later, or shows a texture that is of no scene by
+    // itself; emitters are drawn with what is there.
     void OpenBytes(const std::string& name, const void* bytes, size_t size);
     // The scene again, with camera and playback as they are.
     void Reload(const std::string& path);
     bool IsLoading() const { return view_->IsLoading(); }
 
+    // The GL context is gone; nothing is drawn until there is one again.
+    void ContextLost();
+    // Another one is current: all is made again, the scene from its file, as it is shown.
+    void ContextRestored();
+
     void Handle(const ViewerEvent& event);
     void Tick(double seconds);
     // Draws into the framebuffer that is bound. Nothing for a surface without pixels.
     void Draw(int width, int height, bool overlays = true);
+    // Fits what is around the scene to it as it is now, as pictures by the command have it.
+    void FitToFrame();
     // Draws without overlays and reads it, the top row first: the picture of AsRenderOptions. `samples` are
     // those of a pixel of the surface.
     std::vector<uint8_t> Picture(int width, int height, int samples);
@@ -115,6 +123,8 @@ class Viewer {
     void Drag(const ViewerEvent& event);
     void Click(float x, float y, unsigned modifiers);
     void ContinueLoad();
+    void OpenAdded();
+    void ShowTexture(const std::string& name);
     void Loaded();
     void DrawOverlays();
     void AddMesh(uint32_t node, bool wires, bool normals);
@@ -132,7 +142,7 @@ class Viewer {
     Lines inside_, over_;
     ViewerStatistics statistics_;
     std::vector<std::string> messages_;
-    std::string path_, name_, loadingPath_, loadingName_, folder_;
+    std::string path_, name_, loadingPath_, loadingName_, folder_, addedScene_, addedTexture_;
     std::array<bool, static_cast<size_t>(Overlay::kCount)> overlays_ = {};
     bool help_ = false, keep_ = false;
     int selected_ = -1;

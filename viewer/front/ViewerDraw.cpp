@@ -97,7 +97,7 @@ void Viewer::DrawGreeting() {
 }
 
 void Viewer::Draw(int width, int height, bool overlays) {
-    if (width < 1 || height < 1) return;
+    if (width < 1 || height < 1 || QexEngine_IsContextLost()) return;
     Resize(width, height);
     EngineOutput quiet;
     const uint64_t before = calls_ ? calls_() : 0;
@@ -172,10 +172,14 @@ std::vector<uint8_t> Viewer::Read(int width, int height) {
     return pixels;
 }
 
-std::vector<uint8_t> Viewer::Picture(int width, int height, int samples) {
+void Viewer::FitToFrame() {
     std::vector<std::string> warnings;
     view_->FitTo({view_->Frame()});
     view_->Refit(&warnings);
+}
+
+std::vector<uint8_t> Viewer::Picture(int width, int height, int samples) {
+    FitToFrame();
     std::vector<uint8_t> pixels;
     // Drawn larger: shadows and targets of effects are smooth then, too, and nothing depends on the window.
     if (samples > 1) {

@@ -4,7 +4,6 @@
 #include <cstdio>
 #include <filesystem>
 #include <memory>
-#include <sstream>
 #include <vector>
 
 #include "image/Image.h"
@@ -16,11 +15,10 @@ constexpr uint32_t kSceneBlock = 1001, kOptionsBlock = 1002, kHistoryBlock = 100
 }  // namespace
 
 std::optional<bool> ExporterText::FlipsTextureV() const {
-    const std::string name = "bFlipTextureV=";
-    std::istringstream lines(options.value_or(""));
-    for (std::string line; std::getline(lines, line);)
-        if (line.compare(0, name.size(), name) == 0) return line[name.size()] != '0';
-    return {};
+    // At the beginning of a line.
+    const std::string name = "\nbFlipTextureV=", lines = "\n" + options.value_or("");
+    const size_t at = lines.find(name);
+    return at == lines.npos ? std::nullopt : std::optional<bool>(lines[at + name.size()] != '0');
 }
 
 ExporterText ReadExporterText(const std::string& path) {
