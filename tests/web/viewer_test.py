@@ -1,11 +1,15 @@
 """The viewer's page in Chromium: files dropped, mouse and fingers, the inspector, pictures as qex render draws them.
 
 Usage: viewer_test.py SITE NATIVE_BIN OUT    with the folder of QEX_REAL_FILES, if there is one, its dragon, too"""
+import base64
 import gzip
-import io
+import itertools
+import json
 import os
+import re
 import shlex
 import shutil
+import struct
 import subprocess
 import sys
 import unittest
@@ -34,6 +38,26 @@ CONTROL = """
     input.value = a[1];
     for (const name of ['input', 'change']) input.dispatchEvent(new Event(name));
 """
+
+
+def write_cubes(path, count):
+    """Nodes of one cube with normals, in rows of 32."""
+    points, normals = [], []
+    for axis, sign in itertools.product(range(3), (-1, 1)):
+        for a, b in ((-1, -1), (1, -1), (1, 1), (-1, -1), (1, 1), (-1, 1)):
+            face = (sign, a * sign, b)  # along the axis and the two that follow it
+            points += [0.4 * face[(i - axis) % 3] for i in range(3)]
+            normals += [sign * (i == axis) for i in range(3)]
+    data = struct.pack(f"<{len(points) * 2}f", *points, *normals)
+    view = [{"buffer": 0, "byteOffset": i * len(points) * 4, "byteLength": len(points) * 4} for i in (0, 1)]
+    accessors = [{"bufferView": i, "componentType": 5126, "count": 36, "type": "VEC3"} for i in (0, 1)]
+    accessors[0].update({"min": [-0.4] * 3, "max": [0.4] * 3})
+    with open(path, "w", encoding="utf-8") as file:
+        json.dump({"asset": {"version": "2.0"}, "scene": 0, "scenes": [{"nodes": list(range(count))}],
+                   "nodes": [{"mesh": 0, "translation": [i % 32, i // 32, 0]} for i in range(count)],
+                   "meshes": [{"primitives": [{"attributes": {"POSITION": 0, "NORMAL": 1}}]}],
+                   "buffers": [{"byteLength": len(data), "uri": "data:application/octet-stream;base64," + base64.b64encode(data).decode()}],
+                   "bufferViews": view, "accessors": accessors}, file)
 
 
 class ViewerPage(unittest.TestCase):
@@ -166,6 +190,26 @@ class ViewerPage(unittest.TestCase):
             self.wait_for(turn + 1)
             self.assertEqual(self.far(), 0, f"not the picture from before loss {turn}")
         self.assertEqual(browser.run(GL_ERROR), 0)
+
+    def test_a_thousand_nodes_take_few_calls(self):
+        """Lean drawing holds in the page: a node is a matrix or two and a draw."""
+        write_cubes(os.path.join(self.files, "cubes.gltf"), 1000)
+        subprocess.run([os.path.join(native, "qex"), "convert", "cubes.gltf", "-o", "cubes.pod"], cwd=self.files, check=True,
+                       stdout=subprocess.DEVNULL)
+        browser = self.browser
+        for label in ("floor", "shadow"):
+            browser.run(CONTROL, label)
+        self.drop(2, f"{self.url}/files/cubes.pod")
+        browser.run("""[...document.querySelectorAll('summary')].find(s => s.textContent === 'Statistics').click();
+            for (let i = 0; i < 140; ++i) {
+                document.getElementById('canvas').dispatchEvent(new WheelEvent('wheel', {deltaY: i % 2 ? 1 : -1}));
+                await new Promise(requestAnimationFrame);
+            }""")
+        self.settle()
+        browser.screenshot(os.path.join(out, "cubes.png"))
+        figures = browser.run("return document.getElementById('figures').textContent")
+        print("\n1,000 lit cubes: " + figures)
+        self.assertLess(int(re.search(r"(\d+) GL calls", figures)[1]), 6500)
 
     def test_without_webgl_a_sentence_is_on_the_page(self):
         with Browser("--disable-3d-apis") as browser:

@@ -310,12 +310,12 @@ std::string DescribeScene(Viewer* viewer) {
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
         const QexPODMaterial& m = viewer->View().MaterialOf(i);
         json texture;
-        if (const QexTexture* t = model->textures[i])
-            if (*t->name)
-                texture = {{"name", t->name},
-                           {"width", t->width},
-                           {"height", t->height},
-                           {"format", kFormatNames[t->format < 5 ? t->format : 0]}};
+        const QexTexture* t = model->textures[i];
+        if (HasTexture(model, i))
+            texture = {{"name", t->name},
+                       {"width", t->width},
+                       {"height", t->height},
+                       {"format", kFormatNames[t->format < 5 ? t->format : 0]}};
         materials.push_back({{"name", NameOf(m.name, "material", i)},
                              {"diffuse", Numbers(m.diffuse, 3)},
                              {"specular", Numbers(m.specular, 3)},

@@ -232,6 +232,11 @@ std::vector<std::string> LoadNormalMaps(QexModel* model) {
     return lookup.problems;
 }
 
+bool HasTexture(const QexModel* model, uint32_t material) {
+    const std::vector<bool>& coloured = LookupOf(model).coloured;
+    return model->textures[material] && material < coloured.size() && !coloured[material];
+}
+
 void RecolourTextures(QexModel* model, const std::vector<bool>& lit) {
     const std::vector<bool>& coloured = LookupOf(model).coloured;
     for (uint32_t i = 0; i < model->scene.materialCount && i < coloured.size(); ++i) {

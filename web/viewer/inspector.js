@@ -54,7 +54,7 @@ const section = (title, open, ...rows) => make('details', {open}, make('summary'
 // `set` changes properties, `memory` tells the program's bytes.
 export function inspector(root, choices, canvas, {set, memory}) {
     let controls = new Controls(set), scene = null, lightRows = null, calls = 0, lastCalls = 0, times = [], counts = false;
-    const graph = make('canvas', {id: 'graph', width: 280, height: 48}), figures = make('div', {className: 'faint'});
+    const graph = make('canvas', {id: 'graph', width: 280, height: 48}), figures = make('div', {id: 'figures', className: 'faint'});
     const statistics = section('Statistics', false, graph, figures), lights = make('div');
 
     // GL calls are counted while the section is open.
@@ -178,7 +178,7 @@ export function inspector(root, choices, canvas, {set, memory}) {
             const c = controls;
             root.replaceChildren(section('View', true, ...view(c)));
             if (scene)
-                root.append(section('Nodes', true, ...nodes(c)),
+                root.append(section('Nodes', true, make('div', {className: 'nodes'}, ...nodes(c))),
                     section('Materials', false, ...scene.materials.map((m, i) => material(c, m, i))),
                     section('Lights', false, lights), section('Effects', true, ...effects(c)));
             root.append(statistics);

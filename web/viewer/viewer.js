@@ -243,12 +243,12 @@ async function run() {
     const choices = JSON.parse(ask('Choices'));
     element('keys').textContent = `${choices.help}two fingers  pan, nearer and farther`;
     panel = inspector(element('inspector'), choices, canvas, {set, memory: () => module.HEAPU8.length});
-    if (window.innerWidth <= 700) element('panel').click();
     takeDrops();
     takePointers();
     takeKeys();
     takeButtons();
     takeLosses();
+    if (window.innerWidth <= 700) element('panel').click();
     document.body.dataset.state = 'runs';
     say('');
     requestAnimationFrame(now => frame(now, now));
