@@ -2,7 +2,11 @@
 #include <cmath>
 #include <set>
 
+#include <nlohmann/json.hpp>
+
 #include "common/ImageFile.h"
+#include "common/SceneBounds.h"
+#include "front/Properties.h"
 #include "front/Viewer.h"
 #include "Headless.h"
 #include "qex/QexCommandTest.h"
@@ -22,6 +26,15 @@ ViewerEvent At(ViewerEvent::Kind kind, float x, float y) {
     event.y = y;
     event.button = 1;
     return event;
+}
+
+using nlohmann::json;
+
+// Red, without compression.
+Bytes Tga(uint8_t width, uint8_t height) {
+    Bytes file = {0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, width, 0, height, 0, 24, 0};
+    for (int i = 0; i < width * height; ++i) file.insert(file.end(), {0, 0, 255});
+    return file;
 }
 
 class Front : public FolderTest {
@@ -148,4 +161,77 @@ TEST_F(Front, KeysChangeThePictureAndChangeItBack) {
         pictures.insert(viewer_.Picture(200, 100, 1));
     EXPECT_GE(pictures.size(), 3u);  // in colour, white, depth
     EXPECT_EQ(viewer_.Picture(200, 100, 1), before);
+}
+
+TEST_F(Front, PropertiesAreReadAndSetAsJson) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    Load(Path("quad.pod"));
+    const std::string node = json::parse(DescribeScene(&viewer_))["nodes"][0]["name"];
+    const json wanted = {{"shader", "gouraud"},
+                         {"lean", false},
+                         {"background", "#102030"},
+                         {"floor", -2.5},
+                         {"shadow", true},
+                         {"up", "-z"},
+                         {"overlays", {{"grid", true}}},
+                         {"hidden", {node}},
+                         {"lights", {{{"place", {1, 2, 3}}, {"colour", {1, 0.5, 0}}}}},
+                         {"selected", 0},
+                         {"material", {{"index", 0}, {"opacity", 0.25}}}};
+    EXPECT_TRUE(SetProperties(&viewer_, wanted.dump()));
+    const json state = json::parse(DescribeState(&viewer_));
+    for (const auto& [name, value] : wanted.items())
+        if (name != "overlays" && name != "material") {
+            EXPECT_EQ(state[name], value) << name;
+        }
+    EXPECT_EQ(state["overlays"]["grid"], true);
+    EXPECT_EQ(json::parse(DescribeScene(&viewer_))["materials"][0]["opacity"], 0.25);
+    EXPECT_EQ(viewer_.AsRenderOptions(9, 9).background, 0x102030u);
+    // What is no property or value is said and changes nothing.
+    const char* const wrong[] = {"[1]",
+                                 "{",
+                                 R"({"nothing": 1})",
+                                 R"({"shader": "none"})",
+                                 R"({"floor": "low"})",
+                                 R"({"background": "#12345g"})",
+                                 R"({"lights": [{"place": [1, 2]}]})",
+                                 R"({"hidden": [3]})",
+                                 R"({"material": {"index": 1e300, "opacity": 1}})",
+                                 R"({"material": {"index": 0, "diffuse": [1, "a", 2]}})",
+                                 R"({"depthOfField": {"sigma": null}})"};
+    const std::string before = json::parse(DescribeState(&viewer_))["lights"].dump();
+    for (const char* text : wrong) {
+        const size_t said = viewer_.Said();
+        EXPECT_FALSE(SetProperties(&viewer_, text)) << text;
+        EXPECT_EQ(viewer_.Said(), said + 1) << text;
+    }
+    EXPECT_EQ(json::parse(DescribeState(&viewer_))["lights"].dump(), before);
+}
+
+TEST_F(Front, ShowsFilesThatComeAsBytes) {
+    const auto add = [this](const std::string& name, const Bytes& bytes) {
+        viewer_.OpenBytes(name, bytes.data(), bytes.size());
+        do viewer_.Tick(0.01);
+        while (viewer_.IsLoading());
+    };
+    pod::Scene scene = QuadScene();
+    scene.textures = {"picture.pvr"};
+    scene.materials.resize(1);
+    scene.materials[0].diffuseTexture = 0;
+    add("folder/../quad.pod", pod::WritePod(scene));
+    EXPECT_EQ(viewer_.Name(), "quad.pod");
+    EXPECT_EQ(viewer_.Messages().size(), 1u);  // its texture is missing
+    Press("1");
+    const Bytes before = viewer_.Picture(200, 100, 1);
+    add("words.txt", {'w'});
+    EXPECT_EQ(viewer_.FailedLoads(), 1u);
+    add("picture.tga", Tga(2, 4));
+    EXPECT_EQ(viewer_.Loads(), 2u);  // again, with its texture
+    EXPECT_EQ(viewer_.Name(), "quad.pod");
+    EXPECT_NE(viewer_.Picture(200, 100, 1), before);
+    // By itself it is twice as high as wide.
+    add("other.tga", Tga(2, 4));
+    EXPECT_EQ(viewer_.Name(), "other.tga");
+    const Bounds box = BoundsOf(viewer_.View().Points());
+    EXPECT_FLOAT_EQ((box.high.y - box.low.y) / (box.high.x - box.low.x), 2);
 }

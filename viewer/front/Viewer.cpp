@@ -246,7 +246,7 @@ void Viewer::Tick(double seconds) {
     ContinueLoad();
     const double step = std::clamp(seconds, 0.0, kLongestTick);
     playback_.Tick(step);
-    if (view_->Model()) view_->SetFrame(playback_.Frame());
+    if (view_->Model() && view_->Frame() != playback_.Frame()) view_->SetFrame(playback_.Frame());
     if (view_->Particles()) view_->Particles()->Run(static_cast<float>(step));
 }
 
