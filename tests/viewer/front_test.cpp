@@ -30,10 +30,10 @@ ViewerEvent At(ViewerEvent::Kind kind, float x, float y) {
 
 using nlohmann::json;
 
-// Red, without compression.
+// Green, without compression.
 Bytes Tga(uint8_t width, uint8_t height) {
     Bytes file = {0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, width, 0, height, 0, 24, 0};
-    for (int i = 0; i < width * height; ++i) file.insert(file.end(), {0, 0, 255});
+    for (int i = 0; i < width * height; ++i) file.insert(file.end(), {0, 255, 0});
     return file;
 }
 
