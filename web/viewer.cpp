@@ -4,6 +4,7 @@
 #include <emscripten.h>
 #include <emscripten/html5.h>
 
+#include "emitter/Description.h"
 #include "front/Properties.h"
 #include "front/Viewer.h"
 
@@ -33,7 +34,7 @@ EMSCRIPTEN_KEEPALIVE int Page_Start(int width, int height, int antialias, int ke
     s_Context = emscripten_webgl_create_context("#canvas", &attributes);
     if (s_Context <= 0) return -1;
     emscripten_webgl_make_context_current(s_Context);
-    s_Viewer = new Viewer(width, height);
+    s_Viewer = new Viewer(width, height, LoadEmitter);
     return 0;
 }
 
@@ -64,6 +65,10 @@ EMSCRIPTEN_KEEPALIVE const char* Page_Choices() {
 
 EMSCRIPTEN_KEEPALIVE const char* Page_Scene() {
     return Return(DescribeScene(s_Viewer));
+}
+
+EMSCRIPTEN_KEEPALIVE const char* Page_Emitters() {
+    return Return(DescribeEmitters(s_Viewer));
 }
 
 EMSCRIPTEN_KEEPALIVE const char* Page_State() {

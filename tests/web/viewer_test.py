@@ -166,7 +166,7 @@ class ViewerPage(unittest.TestCase):
         self.expect_as_native(SCENES, "walker.png")
         self.far()
         for name, words in (("cut.pod", "cut.pod: "), ("no.zip", "no.zip: is no zip archive"),
-                            ("words.txt", "words.txt: is neither a POD scene nor a texture")):
+                            ("words.txt", "words.txt: is no POD scene, texture or emitter")):
             browser.run(DROP, f"{self.url}/files/{name}")
             browser.wait(f"document.getElementById('message').textContent.startsWith('{words}')")
         self.assertEqual(self.far(), 0, "the former scene stays")

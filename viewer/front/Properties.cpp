@@ -8,11 +8,13 @@
 #include <nlohmann/json.hpp>
 
 #include "common/SceneBounds.h"
+#include "common/TextureFiles.h"
+#include "emitter/Description.h"
 #include "front/Viewer.h"
 
 namespace {
 
-using nlohmann::json;
+using json = nlohmann::ordered_json;
 
 constexpr double kMost = 1e9;  // of any number
 const char* const kOverlayNames[] = {"grid", "wireframe", "boxes", "bones", "normals"};
@@ -216,6 +218,37 @@ bool SetMaterial(Viewer* v, const json& value) {
     return true;
 }
 
+json EmitterNames(Viewer* v) {
+    json names = json::array();
+    for (const std::string& file : v->Options().effects.emitters.emitters) names.push_back(FileName(file));
+    return names;
+}
+
+// Keeps those that are named.
+bool SetEmitterNames(Viewer* v, const json& value) {
+    if (!value.is_array()) return false;
+    return Alter(v, [&](SceneOptions* o) {
+        std::vector<std::string>& files = o->effects.emitters.emitters;
+        const auto unnamed = [&](const std::string& file) {
+            return std::find(value.begin(), value.end(), FileName(file)) == value.end();
+        };
+        files.erase(std::remove_if(files.begin(), files.end(), unnamed), files.end());
+        return true;
+    });
+}
+
+bool SetEmitter(Viewer* v, const json& value) {
+    double index = -1;
+    Emitters* particles = v->View().Particles();
+    if (!particles || !value.is_object() || !value.contains("index") || !ReadNumber(value["index"], &index) ||
+        !value.contains("fields") || index < 0 || index >= static_cast<double>(particles->All().size()))
+        return false;
+    const std::string problem =
+        SetFields(value["fields"].dump(), particles->All()[static_cast<size_t>(index)]);
+    if (!problem.empty()) v->Say(problem);
+    return problem.empty();
+}
+
 bool SetRange(Viewer* v, const json& value) {
     float range[2];
     if (!ReadNumbers(value, range, 2)) return false;
@@ -289,6 +322,8 @@ const struct {
     {"camera", nullptr,
      [](V v, J j) { return WithNumber(j, [v](double n) { v->SetSceneCamera(static_cast<int>(n)); }); }},
     {"material", nullptr, SetMaterial},
+    {"emitters", EmitterNames, SetEmitterNames},
+    {"emitter", nullptr, SetEmitter},
 };
 
 // Names in files may be of any encoding; what is no UTF-8 is replaced.
@@ -337,6 +372,16 @@ std::string DescribeChoices() {
                  {"axes", kUpAxisNames},
                  {"overlays", kOverlayNames},
                  {"help", Viewer::HelpText()}});
+}
+
+std::string DescribeEmitters(Viewer* viewer) {
+    json emitters = json::array();
+    const json names = EmitterNames(viewer);
+    Emitters* particles = viewer->View().Particles();
+    for (size_t i = 0; particles && i < particles->All().size(); ++i)
+        emitters.push_back({{"name", names[i]},
+                            {"fields", json::parse(DescribeEmitter(*particles->All()[i]), nullptr, false)}});
+    return Text(emitters);
 }
 
 std::string DescribeState(Viewer* viewer) {

@@ -18,6 +18,10 @@ std::string DescribeChoices();
 // null, "messages", "selected": node or -1, "frame", ...}.
 std::string DescribeState(Viewer* viewer);
 
+// The emitters that are drawn with the scene: [{"name", "fields": as in their descriptions}].
+std::string DescribeEmitters(Viewer* viewer);
+
 // Sets the properties of an object as in DescribeState; besides, "frameAll": true, "camera": index,
-// "material": {"index", ...}. False, and a message of the viewer, for what is no such property or value.
+// "material": {"index", ...}, "emitter": {"index", "fields"}. False, and a message of the viewer, for what is
+// no such property or value.
 bool SetProperties(Viewer* viewer, const std::string& json);

@@ -32,14 +32,14 @@ void Viewer::OpenBytes(const std::string& name, const void* bytes, size_t size) 
     if (!whole) return Fail(name + ": there is no room for it among the temporary files");
     if (extension == "pod") {
         addedScene_ = path;
-    } else if (extension == "emitter") {
+    } else if (extension == "emitter" || extension == "json") {
         SceneOptions options = options_;
         options.effects.emitters.emitters.push_back(path);
         SetOptions(options);
     } else if (std::find(std::begin(kTextures), std::end(kTextures), extension) != std::end(kTextures)) {
         addedTexture_ = path;
     } else {
-        Fail(name + ": is neither a POD scene nor a texture; qex convert makes scenes of other files");
+        Fail(name + ": is no POD scene, texture or emitter; qex convert makes scenes of other files");
     }
 }
 

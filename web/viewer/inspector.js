@@ -51,11 +51,12 @@ class Controls {
 
 const section = (title, open, ...rows) => make('details', {open}, make('summary', {textContent: title}), ...rows);
 
-// `set` changes properties, `memory` tells the program's bytes.
-export function inspector(root, choices, canvas, {set, memory}) {
+// `set` changes properties, `save` writes a file, `memory` tells the program's bytes, `emitters` what emitters there are.
+export function inspector(root, choices, canvas, {set, save, memory, emitters}) {
     let controls = new Controls(set), scene = null, lightRows = null, calls = 0, lastCalls = 0, times = [], counts = false;
     const graph = make('canvas', {id: 'graph', width: 280, height: 48}), figures = make('div', {id: 'figures', className: 'faint'});
-    const statistics = section('Statistics', false, graph, figures), lights = make('div');
+    const statistics = section('Statistics', false, graph, figures), lights = make('div'), particles = make('div');
+    let emitterNames = null;
 
     // GL calls are counted while the section is open.
     statistics.addEventListener('toggle', () => {
@@ -159,6 +160,41 @@ export function inspector(root, choices, canvas, {set, memory}) {
         c.updates.forEach(update => update(state));
     }
 
+    // A row of numbers is as many inputs; several rows are a text.
+    function field(index, name, value) {
+        const change = rows => set({emitter: {index, fields: {[name]: rows}}});
+        const plain = !Array.isArray(value) || (!Array.isArray(value[0]) && value.length <= 4);
+        if (!plain) {
+            const input = make('input', {value: JSON.stringify(value)});
+            input.onchange = () => {
+                try {
+                    change(JSON.parse(input.value));
+                } catch {
+                    input.value = JSON.stringify(value);
+                }
+            };
+            return controls.row(name, input);
+        }
+        const inputs = [value].flat().map(number => make('input', {type: 'number', step: 'any', value: number}));
+        for (const input of inputs) input.oninput = () => change(Array.isArray(value) ? inputs.map(i => Number(i.value)) : Number(input.value));
+        return controls.row(name, ...inputs);
+    }
+
+    function showEmitters(state) {
+        const names = JSON.stringify(state.emitters);
+        if (names === emitterNames) return;
+        emitterNames = names;
+        const all = emitters();
+        particles.replaceChildren(...all.map(({name, fields}, index) => section(name, all.length === 1,
+            ...Object.entries(fields).map(([key, value]) => field(index, key, value)),
+            make('button', {
+                textContent: 'Save the description',
+                onclick: () => save(new Blob([JSON.stringify(emitters()[index].fields, null, 2)]), name.replace(/\.\w+$/, '.json')),
+            }),
+            make('button', {textContent: 'Remove', onclick: () => set({emitters: state.emitters.filter((_, i) => i !== index)})}))));
+        if (!all.length) particles.textContent = 'none; drop an emitter file or a description of one';
+    }
+
     function drawGraph() {
         const to = graph.getContext('2d'), most = Math.max(4, ...times);
         to.clearRect(0, 0, graph.width, graph.height);
@@ -174,19 +210,21 @@ export function inspector(root, choices, canvas, {set, memory}) {
             const open = new Map([...root.children].map(part => [part.firstChild.textContent, part.open]));
             scene = newScene;
             controls = new Controls(set);
-            lightRows = null;
+            lightRows = emitterNames = null;
             const c = controls;
             root.replaceChildren(section('View', true, ...view(c)));
             if (scene)
                 root.append(section('Nodes', true, make('div', {className: 'nodes'}, ...nodes(c))),
                     section('Materials', false, ...scene.materials.map((m, i) => material(c, m, i))),
-                    section('Lights', false, lights), section('Effects', true, ...effects(c)));
+                    section('Lights', false, lights), section('Effects', true, ...effects(c)),
+                    section('Emitters', false, particles));
             root.append(statistics);
             for (const part of root.children) part.open = open.get(part.firstChild.textContent) ?? part.open;
         },
         update(state) {
             controls.state = state;
             if (scene) showLights(state);
+            if (scene) showEmitters(state);
             for (const update of controls.updates) update(state);
             if (statistics.open) drawGraph();
         },

@@ -242,7 +242,7 @@ async function run() {
         return fail('This browser has no WebGL, or it is switched off: the viewer cannot draw.');
     const choices = JSON.parse(ask('Choices'));
     element('keys').textContent = `${choices.help}two fingers  pan, nearer and farther`;
-    panel = inspector(element('inspector'), choices, canvas, {set, memory: () => module.HEAPU8.length});
+    panel = inspector(element('inspector'), choices, canvas, {set, save, memory: () => module.HEAPU8.length, emitters: () => JSON.parse(ask('Emitters'))});
     takeDrops();
     takePointers();
     takeKeys();

@@ -5,13 +5,14 @@
 #include <cmath>
 #include <cstdlib>
 #include <set>
-#include <sstream>
 
 #include "common/EngineOutput.h"
 #include "common/TextureFiles.h"
 #include "info/Info.h"
 
 namespace {
+
+constexpr char kSpace[] = " \t\r\v\f";
 
 // Numbers with white space or commas between them, ";" between rows. False for anything else.
 bool ParseRows(const std::string& text, std::vector<Row>* rows, std::string* word) {
@@ -39,14 +40,16 @@ std::string AddText(const std::string& name, const std::string& text, FieldValue
 
 // "name values # remark" on each line.
 bool ReadLines(const std::string& text, FieldValues* values, std::string* problem) {
-    std::istringstream lines(text);
     size_t number = 0;
-    for (std::string line; std::getline(lines, line) && problem->empty(); ++number) {
-        std::istringstream words(line.substr(0, line.find('#')));
-        std::string name, rest;
-        if (!(words >> name)) continue;
-        std::getline(words, rest);
-        *problem = AddText(name, rest, values);
+    for (size_t at = 0; at < text.size() && problem->empty(); ++number) {
+        const size_t end = std::min(text.find('\n', at), text.size());
+        std::string line = text.substr(at, end - at);
+        line.resize(std::min(line.find('#'), line.size()));
+        at = end + 1;
+        const size_t first = line.find_first_not_of(kSpace);
+        if (first == line.npos) continue;
+        const size_t last = std::min(line.find_first_of(kSpace, first), line.size());
+        *problem = AddText(line.substr(first, last - first), line.substr(last), values);
     }
     if (!problem->empty()) *problem = "line " + std::to_string(number) + ": " + *problem;
     return problem->empty();
@@ -73,6 +76,41 @@ bool JsonRows(const Json& value, std::vector<Row>* rows) {
     return true;
 }
 
+std::string AddJson(const Json& fields, FieldValues* values) {
+    for (const auto& [name, value] : fields.items()) {
+        std::vector<Row> rows;
+        const bool numbers = JsonRows(value, &rows);
+        const std::string problem =
+            values->Add(name, rows, numbers ? "" : "is neither a number nor an array of numbers");
+        if (!problem.empty()) return problem;
+    }
+    return "";
+}
+
+// Where a text is no JSON, and why.
+struct JsonFault : nlohmann::json_sax<Json> {
+    bool null() override { return true; }
+    bool boolean(bool) override { return true; }
+    bool number_integer(number_integer_t) override { return true; }
+    bool number_unsigned(number_unsigned_t) override { return true; }
+    bool number_float(number_float_t, const string_t&) override { return true; }
+    bool string(string_t&) override { return true; }
+    bool binary(binary_t&) override { return true; }
+    bool start_object(std::size_t) override { return true; }
+    bool key(string_t&) override { return true; }
+    bool end_object() override { return true; }
+    bool start_array(std::size_t) override { return true; }
+    bool end_array() override { return true; }
+    bool parse_error(std::size_t position, const std::string&, const Json::exception& error) override {
+        at = position;
+        isSyntax = error.id < 200;  // the library's numbers of parse errors
+        return false;
+    }
+
+    size_t at = 0;
+    bool isSyntax = true;
+};
+
 bool ReadJson(const std::string& text, FieldValues* values, std::string* problem) {
     Json document;
     std::set<std::string> names;
@@ -82,27 +120,20 @@ bool ReadJson(const std::string& text, FieldValues* values, std::string* problem
         if (name && !names.insert(parsed.get<std::string>()).second) twice = parsed.get<std::string>();
         return true;
     };
-    try {
-        document = Json::parse(text, watch, true, true);
-    } catch (const Json::parse_error& error) {
-        const auto lines = std::count(text.begin(), text.begin() + static_cast<long>(error.byte) - 1, '\n');
-        *problem = "line " + std::to_string(lines + 1) + ": is not JSON";
-        return false;
-    } catch (const Json::exception&) {
-        *problem = "has a number that is too large";
+    JsonFault fault;
+    if (!Json::sax_parse(text, &fault, nlohmann::detail::input_format_t::json, true, true)) {
+        const auto lines = std::count(text.begin(), text.begin() + static_cast<long>(fault.at) - 1, '\n');
+        *problem = fault.isSyntax ? "line " + std::to_string(lines + 1) + ": is not JSON"
+                                  : "has a number that is too large";
         return false;
     }
+    document = Json::parse(text, watch, false, true);
     if (!twice.empty()) {
         *problem = CleanText(twice.substr(0, 40)) + ": expected once";
         return false;
     }
-    for (const auto& [name, value] : document.items()) {
-        std::vector<Row> rows;
-        const bool numbers = JsonRows(value, &rows);
-        *problem = values->Add(name, rows, numbers ? "" : "is neither a number nor an array of numbers");
-        if (!problem->empty()) return false;
-    }
-    return true;
+    *problem = AddJson(document, values);
+    return problem->empty();
 }
 
 bool IsText(const std::vector<uint8_t>& bytes) {
@@ -112,6 +143,13 @@ bool IsText(const std::vector<uint8_t>& bytes) {
 }
 
 }  // namespace
+
+std::string SetFields(const std::string& json, QexParticleEmitter* emitter) {
+    FieldValues values;
+    std::string problem;
+    if (ReadJson(json, &values, &problem)) values.Apply(emitter);
+    return problem;
+}
 
 std::string ReadSetting(const std::string& assignment, FieldValues* values) {
     const size_t equals = assignment.find('=');

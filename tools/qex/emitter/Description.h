@@ -12,6 +12,10 @@
 // empty text.
 std::string ReadSetting(const std::string& assignment, FieldValues* values);
 
+// Sets the fields that a JSON object names. Returns what is wrong with it, and sets none then, or an empty
+// text.
+std::string SetFields(const std::string& json, QexParticleEmitter* emitter);
+
 // All fields. Where they are in range, what is read again gives the same bits.
 std::string DescribeEmitter(const QexParticleEmitter& emitter);
 

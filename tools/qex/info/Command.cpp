@@ -43,14 +43,6 @@ bool Describe(const std::string& path, Json* document, std::string* error) {
 
 }  // namespace
 
-std::string CleanText(const std::string& text) {
-    const auto replace = Json::error_handler_t::replace;
-    std::string clean = Json::parse(Json(text).dump(-1, ' ', false, replace)).get<std::string>();
-    for (char& c : clean)
-        if ((c >= 0 && c < ' ') || c == 127) c = c == '\n' || c == '\r' || c == '\t' ? ' ' : '?';
-    return clean;
-}
-
 bool DescribeContainer(const std::string& path, Json* document, std::string* error) {
     std::vector<uint8_t> bytes;
     if (!ReadFileBytes(path, SIZE_MAX, &bytes, error)) return false;

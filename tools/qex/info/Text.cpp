@@ -207,6 +207,14 @@ void PrintTexture(const Json& document) {
 
 }  // namespace
 
+std::string CleanText(const std::string& text) {
+    const auto replace = Json::error_handler_t::replace;
+    std::string clean = Json::parse(Json(text).dump(-1, ' ', false, replace)).get<std::string>();
+    for (char& c : clean)
+        if ((c >= 0 && c < ' ') || c == 127) c = c == '\n' || c == '\r' || c == '\t' ? ' ' : '?';
+    return clean;
+}
+
 void PrintInfo(const Json& document) {
     printf("%s: %s, %s bytes\n", Words(document["file"]).c_str(), Words(document["format"]).c_str(),
            Words(document["bytes"]).c_str());
