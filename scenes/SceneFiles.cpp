@@ -7,6 +7,7 @@
 #include <sys/stat.h>
 
 #include "Scenes.h"
+#include "Village.h"
 
 namespace {
 
@@ -120,10 +121,14 @@ int main(int argc, char** argv) {
         {"row.pod", RowOfSpheres()},
         {"playground.pod", Playground()},
         {"boat.pod", Painted(scenes::Boat(), {{"hull.pvr", 0.8f, 0.35f}, {"sails.pvr", 0.8f, 0.35f}})},
+        {"still.pod", scenes::StillLife()},
+        {"vases.pod", scenes::RowOfVases()},
+        {"village.pod", scenes::Village()},
         {"walker.pod", Painted(scenes::Walker(33), {{"walker.pvr", 0.8f, 0.25f}})},
     };
     for (const auto& file : files) WriteFile(folder + file.name, pod::WritePod(file.scene));
     WriteTextures(folder);
+    WriteVillageTextures(folder);
     WriteEmitters(folder);
     return 0;
 }

@@ -10,4 +10,5 @@ void WriteFile(const std::string& path, const std::vector<uint8_t>& bytes);
 
 // Each writes its kind of files; `folder` ends with a slash.
 void WriteTextures(const std::string& folder);
+void WriteVillageTextures(const std::string& folder);
 void WriteEmitters(const std::string& folder);
