@@ -8,17 +8,17 @@ int main(int argc, char** argv) {
 
     QexModel model;
     QexModel_Create(&model);
-    QexModel_LoadContent(&model, window.files, "playground.pod");  // a folder and a file
+    QexModel_LoadContent(&model, window.files, "village.pod");  // a folder and a file
     // Light from the upper left; the engine's own choice is to draw without.
     QexShaderModule* lit = QexGouraudShader_CreateProgram();
     QexModel_SetShaderProgramForAllNode(&model, lit, nullptr);
     QexLightSet lights = {};
     lights.count = 1;
-    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {0.6f, -1, -0.8f}, {1, 0.97f, 0.9f, 1}};
+    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {0.55f, -0.8f, -0.5f}, {1, 0.97f, 0.9f, 1}};
 
     Window_Run(&window, [&] {
         QexCamera camera;
-        const QexVec3 eye = {2.2f, 2.1f, 4.4f}, target = {0.1f, 0.7f, 0};
+        const QexVec3 eye = {4.6f, 2.4f, 12}, target = {0, 2, 0};
         QexCamera_Create(&camera, 0);
         QexCamera_LookAt(&camera, &eye, &target, nullptr);
         QexCamera_Project(&camera, 1, static_cast<float>(window.width) / static_cast<float>(window.height),
@@ -31,7 +31,7 @@ int main(int argc, char** argv) {
         glClear(GL_COLOR_BUFFER_BIT | GL_DEPTH_BUFFER_BIT);
         QexModel_RenderWithCamera(&model, &lights, &camera, nullptr, 0);
         QexFont_SetScale(2);
-        QexFont_DrawTempString(&window.engine, 24, 80, "Hello from Qex", 0xFF203850);
+        QexFont_DrawTempString(&window.engine, 24, window.height - 20, "Hello from Qex", 0xFFFFFFFF);
     });
 
     QexModel_Unload(&model);

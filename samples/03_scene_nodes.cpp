@@ -7,16 +7,16 @@
 int main(int argc, char** argv) {
     Window window;
     if (Window_Open(&window, "Scene nodes", argc, argv) != 0) return 1;
-    QexModel cube;
-    Window_LoadModel(&window, &cube, "cube.pod");
+    QexModel globe;
+    Window_LoadModel(&window, &globe, "globe.pod");
 
     // A plain node turns what hangs on it; the records are the application's.
     QexNode sun, orbit, planet, moonOrbit, moon;
-    QexModelNode_Create(&sun, "sun", nullptr, &cube);
+    QexModelNode_Create(&sun, "sun", nullptr, &globe);
     QexNode_Create(&orbit, "orbit", &sun, nullptr);
-    QexModelNode_Create(&planet, "planet", &orbit, &cube);
+    QexModelNode_Create(&planet, "planet", &orbit, &globe);
     QexNode_Create(&moonOrbit, "moon orbit", &planet, nullptr);
-    QexModelNode_Create(&moon, "moon", &moonOrbit, &cube);
+    QexModelNode_Create(&moon, "moon", &moonOrbit, &globe);
     QexNode_SetPosition(&planet, 1, 0, 0);
     QexNode_SetScale(&planet, 0.6f, 0.6f, 0.6f);
     QexNode_SetPosition(&moon, 0.8f, 0, 0);
@@ -27,7 +27,7 @@ int main(int argc, char** argv) {
         QexNode_SetRotation(&moonOrbit, 0, 0, -70 * window.seconds);
         QexNode_Update(nullptr, &sun, window.elapsed);
 
-        Window_Clear(&window, 0, 0, 0);
+        Window_Clear(&window, 0.01f, 0.01f, 0.03f);
         QexRenderer_EnableStereo3D(&window.engine, QEX_STEREO_RED_CYAN, 2);
         for (const bool left : {true, false}) {
             left ? QexRenderer_PrepareLeft(&window.engine) : QexRenderer_PrepareRight(&window.engine);
@@ -38,6 +38,6 @@ int main(int argc, char** argv) {
         QexRenderer_FinishStereo3D(&window.engine);
     });
 
-    QexModel_Unload(&cube);
+    QexModel_Unload(&globe);
     return Window_Close(&window);
 }

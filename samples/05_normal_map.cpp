@@ -15,7 +15,7 @@ int main(int argc, char** argv) {
     if (Window_Open(&window, "Normal map", argc, argv) != 0) return 1;
     QexModel ball;
     Window_LoadModel(&window, &ball, "ball.pod");
-    Window_LoadTexture(&window, &s_Normals, "knobs.pvr");
+    Window_LoadTexture(&window, &s_Normals, "stones_n.pvr");
     QexTexture_SetWrapping(&s_Normals, QEX_WRAP_REPEAT);
 
     QexShaderModule* module = QexGouraudNormalMapShader_CreateProgram();
@@ -25,8 +25,8 @@ int main(int argc, char** argv) {
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_POINT, {-5, 5, 6}, {1, 1, 1, 1}};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {0, 0, 3.6f}, {0, 0, 0});
-        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        const QexCamera camera = Window_Camera(&window, {0, 0.4f, 3.6f}, {0, 0, 0});
+        Window_Clear(&window, 0.12f, 0.13f, 0.15f);
         QexModel_SetNodeRotation(&ball, 0, 0, 20 * (window.seconds - 1), 0);
         QexModel_RenderWithCamera(&ball, &lights, &camera, nullptr, 0);
     });

@@ -1,40 +1,37 @@
-// Sample 8: a mirror. The floor is drawn half transparent over the mirror image of all other nodes; the
-// stencil keeps the image inside the floor's edges.
-#include <cmath>
-
+// Sample 8: a mirror. A polished table is drawn half transparent over the mirror image of all other nodes;
+// the stencil keeps the image inside its edges.
 #include "window.h"
 
 int main(int argc, char** argv) {
     Window window;
     if (Window_Open(&window, "Mirror", argc, argv) != 0) return 1;
-    QexModel worm;
-    Window_LoadModel(&window, &worm, "worm.pod");
-    const uint32_t floor = 0;
-    QexModel_SetOpacity(&worm, floor, 0.6f);
-    QexShaderModule* still = QexGouraudShader_CreateProgram();
-    QexShaderModule* skinned = QexSkinningGouraudShader_CreateProgram();
-    QexModel_SetShaderProgramForAllNode(&worm, still, skinned);
+    QexModel still;
+    Window_LoadModel(&window, &still, "still.pod");
+    const uint32_t table = 3;
+    QexModel_SetOpacity(&still, table, 0.6f);
+    QexShaderModule* lit = QexGouraudSpecularShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&still, lit, nullptr);
 
     QexLightSet lights = {};
     lights.count = 1;
     lights.lights[0] = {QEX_LIGHT_POINT, {-4, 6, 5}, {1, 1, 1, 1}};
-    const QexShadowCaster everything = {&worm, 1, nullptr, 0};
+    const QexShadowCaster everything = {&still, 1, nullptr, 0};
     Window_Run(&window, [&] {
-        const QexCamera camera = Window_Camera(&window, {1, 3.4f, 9}, {0, 1.1f, 0});
-        QexPODModel_SetFrame(&worm.scene, 1 + std::fmod(20 * window.seconds - 1, 58.0f));
+        const QexCamera camera = Window_Camera(&window, {0.6f, 2.3f, 6.6f}, {0.1f, 0.6f, 0});
+        for (uint32_t vase = 0; vase < 3; ++vase)
+            QexModel_SetNodeRotation(&still, vase, 0, 25 * window.seconds, 0);
 
-        // The mirror image and the floor over it first; then the scene, in which the floor is switched off by
+        // The mirror image and the table over it first; then the scene, in which the table is switched off by
         // then.
-        QexModel_EnableNodeRendering(&worm, floor, 1);
-        QexReflection* mirror = QexReflection_InitReflectionInfo(&worm, floor, &everything, 1, 1);
-        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        QexModel_EnableNodeRendering(&still, table, 1);
+        QexReflection* mirror = QexReflection_InitReflectionInfo(&still, table, &everything, 1, 1);
+        Window_Clear(&window, 0.35f, 0.33f, 0.36f);
         QexReflection_RenderReflection(mirror, &lights, &camera);
-        QexModel_RenderWithCamera(&worm, &lights, &camera, nullptr, 0);
+        QexModel_RenderWithCamera(&still, &lights, &camera, nullptr, 0);
         QexReflection_Release(mirror);
     });
 
-    QexModel_Unload(&worm);
-    QexGouraudShader_Release(&still);
-    QexSkinningGouraudShader_Release(&skinned);
+    QexModel_Unload(&still);
+    QexGouraudSpecularShader_Release(&lit);
     return Window_Close(&window);
 }

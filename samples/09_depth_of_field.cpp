@@ -1,4 +1,4 @@
-// Sample 9: depth of field. A row of spheres goes away from the camera. On the left of the picture the near
+// Sample 9: depth of field. A row of vases goes away from the camera. On the left of the picture the near
 // ones are sharp, on the right the far ones; above the rest is blurred at full resolution, below at half.
 #include <initializer_list>
 
@@ -16,7 +16,7 @@ static Row s_Row;
 // Draws the row lit, or with modules that show depth.
 static int32_t DrawRow(QexRuntimeContext*, void*, void*, void*, QexShaderModule* module,
                        QexShaderModule* skinned, const float* colour) {
-    static const float background[] = {0.25f, 0.3f, 0.4f};
+    static const float background[] = {0.2f, 0.19f, 0.2f};
     const float* c = colour ? colour : background;
     QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);
     glClearColor(c[0], c[1], c[2], 1);
@@ -39,17 +39,17 @@ static void StartEffect(QexRuntimeContext* quarter, const Window& window) {
 int main(int argc, char** argv) {
     Window window;
     if (Window_Open(&window, "Depth of field", argc, argv) != 0) return 1;
-    Window_LoadModel(&window, &s_Row.model, "row.pod");
+    Window_LoadModel(&window, &s_Row.model, "vases.pod");
     s_Row.lit = QexGouraudShader_CreateProgram();
     s_Row.lights.count = 1;
-    s_Row.lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {1, -2, -1.5f}, {1, 1, 1, 1}};
+    s_Row.lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {0.7f, -1.2f, -0.8f}, {1, 0.96f, 0.9f, 1}};
     QexRuntimeContext quarter = {};
 
     Window_Run(&window, [&] {
         if (quarter.width != window.width / 2 || quarter.height != window.height / 2)
             StartEffect(&quarter, window);
         const int width = quarter.width, height = quarter.height;
-        s_Row.camera = Window_Camera(&window, {0.3f, 0.5f, 7.4f}, {0.7f, 0.8f, 0});
+        s_Row.camera = Window_Camera(&window, {0.1f, 0.5f, 6.4f}, {0.5f, -0.25f, 0});
         QexCamera_Project(&s_Row.camera, 0.7f, static_cast<float>(width) / static_cast<float>(height), 1, 22);
         Window_Clear(&window, 0.25f, 0.3f, 0.4f);
         for (const bool half : {false, true})

@@ -18,7 +18,7 @@ int main(int argc, char** argv) {
         QexCamera camera = Window_Camera(&window, {5.5f, 3.8f, 6.6f}, {0, 0, 0});
         const QexVec3 up = {0.15f, 1, 0};
         QexCamera_LookAt(&camera, &camera.eye, &camera.target, &up);
-        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        Window_Clear(&window, 0.9f, 0.88f, 0.82f);
         for (int column = 0; column < 5; ++column)
             for (int row = 0; row < 4; ++row) {
                 billboard->mode = modes[column];

@@ -30,7 +30,7 @@ int main(int argc, char** argv) {
     QexMesh_Release(&box);
 
     Window_Run(&window, [&] {
-        Window_Clear(&window, 0.25f, 0.3f, 0.4f);
+        Window_Clear(&window, 0.42f, 0.4f, 0.38f);
         QexRenderer_SetBackFaceCulling(QEX_CULL_BACK);
 
         // Drawing into one target inside drawing into another: the end of the inner one goes back to the

@@ -1,7 +1,8 @@
-// Sample 14: a fountain, a fire and its smoke, each an emitter from a file; textures are not in the files and
-// are set afterwards.
+// Sample 14: a fountain, a fire and its smoke on a square at night, each an emitter from a file; textures are
+// not in the files and are set afterwards.
 #define QEX_UNPREFIXED_NAMES  // for GetRandomNumber
 
+#include <cmath>
 #include <cstdio>
 #include <cstdlib>
 
@@ -51,10 +52,28 @@ int main(int argc, char** argv) {
         if (!Load(window, &kind)) return 1;
         Update(&kind, 2);
     }
+    QexModel village;
+    Window_LoadModel(&window, &village, "village.pod");
+    QexShaderModule* lit = QexGouraudShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&village, lit, nullptr);
+    QexModel_EnableNodeRendering(&village, 0, 0);  // the day's sky
+    for (uint32_t i = 0; i < village.scene.materialCount; ++i)
+        for (float& channel : village.scene.materials[i].ambient)
+            if (channel < 1) channel *= 0.2f;  // but for the lamps
+    QexLightSet lights = {};
+    lights.count = 2;
+    lights.lights[0] = {QEX_LIGHT_DIRECTIONAL, {-0.5f, -1, -0.3f}, {0.1f, 0.13f, 0.22f, 1}};
+    QexMatrix place;
+    QexMatrix_Translate(&place, 0, 0, -2.2f);
 
     Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {0, 1.6f, 5.5f}, {0, 1.1f, 0});
-        Window_Clear(&window, 0.1f, 0.12f, 0.16f);
+        const float flicker = 0.9f + 0.1f * std::sin(17 * window.seconds) * std::sin(11 * window.seconds);
+        lights.lights[1] = {
+            QEX_LIGHT_POINT, {1.1f, 1.2f, 0.8f}, {flicker, 0.55f * flicker, 0.2f * flicker, 1}};
+        Window_Clear(&window, 0.03f, 0.04f, 0.09f);
+        QexModel_RenderWithCamera(&village, &lights, &camera, &place, 0);
+        QexRenderer_SetZWrite(0);
         for (Kind& kind : s_Kinds) {
             Update(&kind, window.elapsed);
             QexRenderer_SetAlphaBlendMode(kind.blending);
@@ -62,6 +81,8 @@ int main(int argc, char** argv) {
         }
     });
 
+    QexModel_Unload(&village);
+    QexGouraudShader_Release(&lit);
     for (Kind& kind : s_Kinds) {
         QexParticleEmitter_Release(kind.emitter);
         for (QexTexture& texture : kind.textures) QexTexture_Release(&texture);

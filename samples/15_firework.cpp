@@ -62,10 +62,25 @@ int main(int argc, char** argv) {
     set.onFinished = Fire;
     Load(&set);
     Fire(&set, 0, 0);
+    // A village below, dark but for its lamps.
+    QexModel village;
+    Window_LoadModel(&window, &village, "village.pod");
+    QexModel_EnableNodeRendering(&village, 0, 0);  // the day's sky
+    QexShaderModule* lit = QexGouraudShader_CreateProgram();
+    QexModel_SetShaderProgramForAllNode(&village, lit, nullptr);
+    for (uint32_t i = 0; i < village.scene.materialCount; ++i)
+        for (float& channel : village.scene.materials[i].ambient)
+            if (channel < 1) channel *= 0.7f;
+    QexMatrix size, place;
+    QexMatrix_Scale(&size, 0.14f, 0.14f, 0.14f);
+    QexMatrix_Translate(&place, 0, -1.3f, 0);
+    QexMatrix_Multiply(&place, &place, &size);
 
     Window_Run(&window, [&] {
         const QexCamera camera = Window_Camera(&window, {0, 0, 5}, {0, 0.3f, 0});
         Window_Clear(&window, 0.02f, 0.02f, 0.08f);
+        QexModel_RenderWithCamera(&village, nullptr, &camera, &place, 0);
+        QexRenderer_SetZWrite(0);
         QexRenderer_SetAlphaBlendMode(QEX_BLEND_ADD_ALPHA);
         if (window.picture) {
             Expose(&set, camera);
@@ -76,6 +91,8 @@ int main(int argc, char** argv) {
     });
 
     set.onFinished = nullptr;
+    QexModel_Unload(&village);
+    QexGouraudShader_Release(&lit);
     QexParticleSet_Release(&set);
     QexTexture_Release(&spark);
     QexTexture_Release(&shape);

@@ -5,7 +5,7 @@ static void Draw(Window* window, void* crate) {
     static const QexVec3 eye = {0, 1.1f, 2.7f}, middle = {0, 0, 0};
     static const QexLightSet lights = {1, {{QEX_LIGHT_DIRECTIONAL, {-1, -1.5f, -2}, {1, 1, 1, 1}}}};
     const QexCamera camera = Window_Camera(window, eye, middle);
-    Window_Clear(window, 0.25f, 0.3f, 0.4f);
+    Window_Clear(window, 0.58f, 0.66f, 0.72f);
     QexModel_SetNodeRotation(crate, 0, 0, 40 * window->seconds, 0); /* degrees */
     QexModel_RenderWithCamera(crate, &lights, &camera, NULL, 0);
 }

@@ -46,8 +46,8 @@ pod::Scene ThreeSpheres() {
 // Several repetitions of a texture around a ball.
 pod::Scene Ball() {
     pod::MeshArrays sphere = scenes::Sphere(32);
-    for (pod::Vec2& uv : sphere.uvs) uv = {12 * uv[0], 6 * uv[1]};
-    return Painted(scenes::Still({{"ball", sphere, {0, 0, 0}}}), {{"steel.pvr", 1, 0.1f}});
+    for (pod::Vec2& uv : sphere.uvs) uv = {4 * uv[0], 2 * uv[1]};
+    return Painted(scenes::Still({{"ball", sphere, {0, 0, 0}}}), {{"stones.pvr", 1, 0.1f}});
 }
 
 pod::MeshArrays Scaled(pod::MeshArrays mesh, float factor) {
@@ -75,19 +75,6 @@ pod::Scene Playground() {
                     {"wood.pvr", 0.8f, 0.3f}});
 }
 
-// Away from the viewer, to the right and up.
-pod::Scene RowOfSpheres() {
-    std::vector<scenes::Object> objects;
-    std::vector<Surface> surfaces;
-    for (int i = 0; i < 5; ++i) {
-        const float step = static_cast<float>(i);
-        objects.push_back(
-            {"ball", scenes::Sphere(32), {-1.1f + 1.2f * step, -1.6f + 1.4f * step, -2.5f * step}});
-        surfaces.push_back({i % 2 ? "blue.pvr" : "red.pvr", 0.8f, 0.3f});
-    }
-    return Painted(scenes::Still(objects), surfaces);
-}
-
 }  // namespace
 
 void WriteFile(const std::string& path, const std::vector<uint8_t>& bytes) {
@@ -110,19 +97,18 @@ int main(int argc, char** argv) {
         const char* name;
         pod::Scene scene;
     } files[] = {
-        {"grid.pod", Painted(scenes::Grid(9), {{"blue.pvr", 1, 1}})},
-        {"cube.pod", Painted(scenes::Grid(1), {{"steps.pvr", 1, 1}})},
         {"spheres.pod", ThreeSpheres()},
         {"ball.pod", Ball()},
         {"tentacle.pod", Painted(scenes::Worm(40, 60), {{"floor.pvr", 1, 0.2f}, rings})},
         {"worm.pod", Painted(scenes::Worm(20, 60), {{"floor.pvr", 0.8f, 0.2f}, {"rings.pvr", 0.8f, 0.2f}})},
         {"red_ball.pod", Painted(scenes::Still({{"ball", scenes::Sphere(24), {-2, 0.8f, -0.5f}}}),
                                  {{"plain.pvr", 0.8f, 0.2f}})},
-        {"row.pod", RowOfSpheres()},
         {"playground.pod", Playground()},
         {"boat.pod", Painted(scenes::Boat(), {{"hull.pvr", 0.8f, 0.35f}, {"sails.pvr", 0.8f, 0.35f}})},
         {"still.pod", scenes::StillLife()},
         {"vases.pod", scenes::RowOfVases()},
+        {"globe.pod", Painted(scenes::Still({{"globe", Scaled(scenes::Sphere(24), 0.42f), {0, 0, 0}}}),
+                              {{"globe.pvr", 1, 1}})},
         {"village.pod", scenes::Village()},
         {"walker.pod", Painted(scenes::Walker(33), {{"walker.pvr", 0.8f, 0.25f}})},
     };

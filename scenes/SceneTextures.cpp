@@ -45,14 +45,6 @@ Painter Chequers(uint32_t first, uint32_t second) {
     return [=](float s, float t) { return Rgb((s < 0.5f) == (t < 0.5f) ? first : second); };
 }
 
-// Round knobs on a flat ground, as normals: x in green, y in red, z in blue.
-Colour Knobs(float s, float t) {
-    constexpr float kRadius = 0.4f;
-    float x = (s - 0.5f) / kRadius, y = (t - 0.5f) / kRadius;
-    if (x * x + y * y >= 1) x = y = 0;
-    return {0.5f + 0.5f * y, 0.5f + 0.5f * x, 0.5f + 0.5f * std::sqrt(1 - x * x - y * y), 1};
-}
-
 // Segments from red to green.
 Colour Gauge(float s, float) {
     const float segment = std::floor(s * 16), bright = s * 16 - segment < 0.8f ? 1 : 0.2f;
@@ -119,21 +111,9 @@ void WriteTextures(const std::string& folder) {
         {"blue.pvr", 64, 64, Chequers(0xF0D890, 0x3070A0)},
         {"red.pvr", 64, 64, Chequers(0xF0D890, 0xC05030)},
         {"wood.pvr", 64, 64, Chequers(0xE0C080, 0xB08040)},
-        {"steel.pvr", 64, 64, Chequers(0xA8A8B0, 0xA0A0A8)},
-        {"steps.pvr", 64, 64, Chequers(0xFFFFFF, 0x909090)},
         {"floor.pvr", 64, 64, Chequers(0xE0E0E0, 0xA0B0C0)},
-        {"rings.pvr", 64, 64, Chequers(0xF0D890, 0xC07030)},
         {"plain.pvr", 4, 4, Chequers(0xD06050, 0xD06050)},
-        {"hull.pvr", 64, 64, Chequers(0xA04030, 0x803020)},
-        {"sails.pvr", 64, 64, Chequers(0xFFFFF0, 0xF0F0E0)},
-        {"crate.pvr", 64, 64,
-         [](float s, float t) {
-             const float edge = std::min({s, t, 1 - s, 1 - t});
-             const bool board = std::fmod(5 * t, 1.0f) > 0.08f;
-             return Rgb(edge < 0.1f ? 0x8A5A2C : board ? 0xC89858 : 0x6A4420);
-         }},
         {"walker.pvr", 128, 256, Clothes},
-        {"knobs.pvr", 64, 64, Knobs},
         {"gauge.pvr", 128, 16, Gauge},
         {"view.pvr", 64, 64, View},
         {"view_a.pvr", 64, 64, Disc},

@@ -228,6 +228,77 @@ Rgb Table(float s, float t) {
     return Times(wood, board < 0.015f ? 0.4f : 1);
 }
 
+// The stones of Blocks as normals: x in green, y in red, z in blue.
+Rgb BlockNormals(float s, float t) {
+    const auto height = [](float x, float y) {
+        const Stone stone = StoneAt(x, y, 4, 8);
+        const float rim = std::clamp((1 - stone.edge) / 0.3f, 0.0f, 1.0f);
+        return 0.02f * std::sqrt(1 - (1 - rim) * (1 - rim)) +
+               0.008f * Rough(x - std::floor(x), y - std::floor(y), 16);
+    };
+    constexpr float kStep = 1 / 256.0f;
+    const float x = (height(s - kStep, t) - height(s + kStep, t)) / (2 * kStep),
+                y = (height(s, t - kStep) - height(s, t + kStep)) / (2 * kStep);
+    const float length = std::sqrt(x * x + y * y + 1);
+    return {0.5f + 0.5f * y / length, 0.5f + 0.5f * x / length, 0.5f + 0.5f / length};
+}
+
+// Land, seas, ice and clouds.
+Rgb Globe(float s, float t) {
+    const float land = 0.55f * Noise(s, t, 6, 4) + 0.3f * Noise(s, t, 14, 8) + 0.15f * Noise(s, t, 36, 20),
+                pole = std::fabs(t - 0.5f) * 2;
+    Rgb colour = Mix(Hex(0x103060), Hex(0x2868A8), land * 1.6f);
+    if (land > 0.52f) colour = Mix(Hex(0x4C8038), Hex(0xB89858), 6 * (land - 0.55f) + 0.5f * (0.4f - pole));
+    if (pole + 0.3f * (land - 0.5f) > 0.82f) colour = Hex(0xF0F4F8);
+    return Mix(colour, Hex(0xFFFFFF), 3 * (0.5f * Noise(s, t, 10, 12) + 0.5f * Noise(s, t, 24, 30) - 0.58f));
+}
+
+// Boards in a frame, with nails.
+Rgb Crate(float s, float t) {
+    const float edge = std::min({s, t, 1 - s, 1 - t}), across = std::fabs(s - t);
+    const bool frame = edge < 0.12f, brace = across < 0.085f;
+    const bool upright = frame && std::min(s, 1 - s) < 0.12f;
+    const float grain =
+        frame || brace ? (upright ? Noise(s, t, 48, 5) : Noise(s, t, 5, 48)) : Noise(s, t, 4, 64);
+    const float board = std::fmod(5 * t, 1.0f);
+    Rgb wood = frame || brace ? Mix(Hex(0x8A5C30), Hex(0xB8844C), grain)
+                              : Mix(Hex(0x9C6C3C), Hex(0xD8A868),
+                                    0.7f * grain + 0.3f * Hash(static_cast<int>(5 * t), 2));
+    if (!frame && !brace && board < 0.07f) wood = Times(wood, 0.4f);
+    // The shade of the frame on the boards, and its own edges.
+    if (!frame) wood = Times(wood, std::clamp(0.55f + 8 * (edge - 0.12f), 0.55f, 1.0f));
+    if (!frame && !brace) wood = Times(wood, std::clamp(0.6f + 8 * (across - 0.085f), 0.6f, 1.0f));
+    if (std::fabs(edge - 0.12f) < 0.006f || (!frame && std::fabs(across - 0.085f) < 0.006f))
+        wood = Times(wood, 0.6f);
+    for (const float x : {0.06f, 0.94f})
+        for (const float y : {0.06f, 0.2f, 0.5f, 0.8f, 0.94f})
+            if (std::hypot(s - x, t - y) < 0.013f) wood = Hex(0x403830);
+    return wood;
+}
+
+Rgb Scales(float s, float t) {
+    const Stone scale = StoneAt(s, t, 6, 6);
+    const float x = std::fmod(6 * s + (scale.row % 2 ? 0.5f : 0), 1.0f) - 0.5f, y = std::fmod(6 * t, 1.0f);
+    const float round = std::hypot(x * 1.7f, y);
+    return Times(Mix(Hex(0x40784C), Hex(0xA8C060), 0.6f * Hash(scale.column, scale.row) + 0.5f * (1 - y)),
+                 round > 0.95f ? 0.55f : 1.1f - 0.35f * round);
+}
+
+// By the boat's own height and length: planks, a white line, red below it.
+Rgb Hull(float s, float t) {
+    const float board = std::fmod(12 * t, 1.0f);
+    const Rgb wood = Mix(Hex(0x8C5830), Hex(0xC08850), Noise(s, t, 6, 64));
+    return Times(wood, board < 0.12f ? 0.55f : 1);
+}
+
+Rgb Sail(float s, float t) {
+    const float seam = std::fmod(4 * t, 1.0f);
+    const Rgb cloth = Mix(Hex(0xF4ECD8), Hex(0xFFFAF0), Noise(s, t, 32, 32));
+    const Rgb stripe =
+        std::fmod(2 * t, 1.0f) < 0.5f ? cloth : Mix(Hex(0xC84838), Hex(0xD85C48), Noise(s, t, 32, 32));
+    return Times(stripe, seam < 0.04f ? 0.8f : 1);
+}
+
 // A level half as large in each direction that is larger than one.
 std::vector<Rgb> Halve(const std::vector<Rgb>& from, uint32_t* width, uint32_t* height) {
     const uint32_t w = std::max(*width / 2, 1u), h = std::max(*height / 2, 1u);
@@ -292,6 +363,12 @@ void WriteVillageTextures(const std::string& folder) {
                     {"stones.pvr", 128, 128, Blocks},
                     {"planks.pvr", 64, 64, Planks},
                     {"lamp.pvr", 8, 8, Lamp},
+                    {"stones_n.pvr", 128, 128, BlockNormals},
+                    {"globe.pvr", 256, 128, Globe},
+                    {"crate.pvr", 128, 128, Crate},
+                    {"rings.pvr", 128, 128, Scales},
+                    {"hull.pvr", 64, 64, Hull},
+                    {"sails.pvr", 64, 64, Sail},
                     {"amphora.pvr", 256, 256, Amphora},
                     {"porcelain.pvr", 256, 128, Porcelain},
                     {"fruit.pvr", 64, 64, Fruit},
