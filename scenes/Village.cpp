@@ -358,7 +358,7 @@ pod::Scene RowOfVases() {
     for (int i = 0; i < 6; ++i) {
         const float step = static_cast<float>(i);
         builder.Place((i % 2 ? "bottle " : "vase ") + std::to_string(i), kinds[i % 2],
-                      i % 2 ? "porcelain.pvr" : "amphora.pvr", {-1 + 0.85f * step, -1.6f, 0.6f - 2.4f * step},
+                      i % 2 ? "porcelain.pvr" : "fruit.pvr", {-1 + 0.85f * step, -1.6f, 0.6f - 2.4f * step},
                       50 * step, i % 2 ? 1.25f : 1.1f);
     }
     return builder.Take();
