@@ -11,7 +11,6 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "common/ImageFile.h"
 #include "common/OutputFile.h"
 #include "common/Talk.h"
 #include "common/TextureFiles.h"
@@ -21,7 +20,6 @@
 
 namespace {
 
-constexpr int kTurntable = 36;  // pictures of a turn
 constexpr float kMessageSeconds = 8;
 
 // NAME-0000.png or the first number after it that is not taken.
@@ -52,8 +50,7 @@ const std::vector<Window::Key>& Window::Keys() {
         {SDLK_PAGEUP, 0, "Page Up", "the file before", [](Window* w) { w->Page(-1); }},
         {SDLK_s, kControl, "Ctrl+S", "screenshot",
          [](Window* w) { w->Screenshot(FreeName("qex-view.png")); }},
-        {SDLK_c, kControl, "Ctrl+C", "copy the command that draws this",
-         [](Window* w) { SDL_SetClipboardText(w->Line("picture.png").c_str()); }},
+        {SDLK_c, kControl, "Ctrl+C", "copy the command that draws this", [](Window* w) { w->CopyLine(); }},
         {SDLK_q, kControl, "Ctrl+Q", "quit", [](Window* w) { w->ends_ = true; }},
     };
     return keys;
@@ -265,7 +262,7 @@ void Window::ShowMessages(double seconds) {
 void Window::Grant(const InspectorWishes& wishes) {
     if (wishes.screenshot) Screenshot(FreeName("qex-view.png"));
     if (wishes.turntable) Turntable();
-    if (wishes.copyLine) SDL_SetClipboardText(Line("picture.png").c_str());
+    if (wishes.copyLine) CopyLine();
     if (!wishes.open.empty()) Open(wishes.open);
 }
 
@@ -293,48 +290,6 @@ void Window::Run() {
         Frame(static_cast<double>(now - last) / static_cast<double>(SDL_GetPerformanceFrequency()));
         last = now;
     }
-}
-
-std::string Window::Line(const std::string& output) const {
-    RenderOptions options = viewer_->AsRenderOptions(PictureWidth(), height_);
-    options.output = output;
-    options.antialias = samples_ > 1 ? 4 : 1;
-    std::string line;
-    if (viewer_->Name() != viewer_->Path()) {
-        options.input = WithoutExtension(FileName(viewer_->Name())) + ".pod";
-        line = "qex " + ShellLine({"convert", viewer_->Name(), "-o", options.input}) + " && ";
-    }
-    return line + "qex " + ShellLine(RenderWords(options));
-}
-
-bool Window::Screenshot(const std::string& path) {
-    std::string problem;
-    const std::vector<uint8_t> pixels = viewer_->Picture(PictureWidth(), height_, samples_);
-    const bool saved = SavePicture(path, PictureWidth(), height_, pixels.data(), &problem);
-    viewer_->Say(path + (saved ? ": saved" : ": " + problem));
-    return saved;
-}
-
-void Window::Turntable() {
-    for (int i = 0; i < kTurntable; ++i) {
-        if (!Screenshot(NumberedOutput("qex-view-turn.png", static_cast<size_t>(i)))) return;
-        viewer_->Turn(360.0f / kTurntable);
-    }
-}
-
-bool Window::SaveWindow(const std::string& path) {
-    Frame(0);
-    // Drawn once more into the buffer that is read.
-    viewer_->Draw(PictureWidth(), height_);
-    draw_->Draw(ImGui::GetDrawData());
-    const size_t row = static_cast<size_t>(width_) * 4;
-    std::vector<uint8_t> pixels(row * static_cast<size_t>(height_)), turned(pixels.size());
-    glReadPixels(0, 0, width_, height_, GL_RGBA, GL_UNSIGNED_BYTE, pixels.data());
-    for (size_t i = 3; i < pixels.size(); i += 4) pixels[i] = 255;
-    for (size_t y = 0; y < static_cast<size_t>(height_); ++y)
-        memcpy(&turned[y * row], &pixels[(static_cast<size_t>(height_) - 1 - y) * row], row);
-    std::string problem;
-    return SavePicture(path, width_, height_, turned.data(), &problem);
 }
 
 void Window::Settle() {

@@ -36,6 +36,7 @@ class Window {
 
     bool Screenshot(const std::string& path);
     void Turntable();
+    bool SaveFront(const std::string& path);
     bool SaveWindow(const std::string& path);  // with the panel
     // The command that draws the picture into a file.
     std::string Line(const std::string& output) const;
@@ -52,6 +53,8 @@ class Window {
     void ReloadChanged();
     void ShowMessages(double seconds);
     void Grant(const InspectorWishes& wishes);
+    void CopyLine();
+    void SayWhatIsLeftOut();
     void WatchFiles();
     bool Busy() const { return conversion_.AtWork() || viewer_->IsLoading(); }
 
