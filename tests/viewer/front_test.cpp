@@ -1,5 +1,6 @@
 // The viewer without a window: camera, playback, and what a scene does under it.
 #include <cmath>
+#include <functional>
 #include <set>
 
 #include <nlohmann/json.hpp>
@@ -234,4 +235,48 @@ TEST_F(Front, ShowsFilesThatComeAsBytes) {
     EXPECT_EQ(viewer_.Name(), "other.tga");
     const Bounds box = BoundsOf(viewer_.View().Points());
     EXPECT_FLOAT_EQ((box.high.y - box.low.y) / (box.high.x - box.low.x), 2);
+
+    // What the command draws is what the viewer shows, but for the samples of edges.
+}
+
+TEST_F(Front, CommandLinesSayWhatIsShown) {
+    WriteScene(Path("quad.pod"), QuadScene());
+    Load(Path("quad.pod"));
+    Press("1");
+    const Bytes plain = viewer_.Picture(200, 100, 1);
+    const std::function<void(EffectOptions*)> changes[] = {
+        [](EffectOptions* e) {
+            e->materials = {{"#0", MaterialChange::kDiffuse, {0.1f, 0.2f, 1}}};
+        },
+        [](EffectOptions* e) {
+            e->materials = {{"#0", MaterialChange::kOpacity, {0.25f, 0, 0}}};
+        },
+        [](EffectOptions* e) {
+            e->nodes = {{"quad", NodeChange::kMove, {0.4f, 0.1f, 0}}};
+        },
+        [](EffectOptions* e) {
+            e->lights = {{QEX_LIGHT_POINT, {-2, 1, 1}, {1, 0.2f, 0, 1}}};
+        },
+    };
+    for (const auto& change : changes) {
+        SceneOptions options = viewer_.Options();
+        options.effects = {};
+        change(&options.effects);
+        viewer_.SetOptions(options);
+        const Bytes shown = viewer_.Picture(200, 100, 1);
+        RenderOptions render = viewer_.AsRenderOptions(200, 100);
+        render.output = Path("drawn.png");
+        const std::string line = ShellLine(RenderWords(render));
+        ASSERT_EQ(system(("'" QEX_COMMAND "' " + line).c_str()), 0) << line;
+        Image drawn;
+        std::string problem;
+        ASSERT_TRUE(LoadImage(Path("drawn.png"), &drawn, &problem)) << problem;
+        size_t wrong = 0, changed = 0;
+        for (size_t i = 0; i < shown.size(); ++i) {
+            wrong += std::abs(shown[i] - drawn.pixels[i]) > 64;
+            changed += std::abs(shown[i] - plain[i]) > 3;
+        }
+        EXPECT_LT(wrong, shown.size() / 400) << line;
+        EXPECT_GT(changed, shown.size() / 50) << line;
+    }
 }

@@ -71,7 +71,7 @@ int RunVerb(int argc, char** argv) {
          [&] { return RunRender(render); }},
 #ifdef QEX_VIEWER
         {"view", "show scenes in a window", [&](CLI::App* a) { SetUpView(a, &view); },
-         [&] { return RunWindow(view); }},
+         [&] { return RunView(view); }},
 #endif
         {"convert", "make a POD scene from another format", [&](CLI::App* a) { SetUpConvert(a, &convert); },
          [&] { return RunConvert(convert); }},

@@ -2,7 +2,6 @@
 #include "desktop/Conversion.h"
 
 #include <fcntl.h>
-#include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -11,9 +10,8 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <vector>
 
-extern char** environ;
+#include "desktop/Child.h"
 
 Conversion::~Conversion() {
     Stop();
@@ -42,15 +40,11 @@ bool Conversion::Start(const std::string& input, std::string* problem) {
     // A name that begins with a minus is no option.
     const std::string from = std::filesystem::absolute(input).string(), to = Output(),
                       said = folder_ + "/said";
-    const std::vector<const char*> words = {"qex",      "convert", from.c_str(), "-o",
-                                            to.c_str(), "--quiet", nullptr};
-    posix_spawn_file_actions_t files;
-    posix_spawn_file_actions_init(&files);
-    posix_spawn_file_actions_addopen(&files, STDERR_FILENO, said.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
-    const int error = posix_spawn(&child_, "/proc/self/exe", &files, nullptr,
-                                  const_cast<char* const*>(words.data()), environ);
-    posix_spawn_file_actions_destroy(&files);
-    if (error == 0) return true;
+    const int messages = open(said.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    child_ = StartQex({"convert", from, "-o", to, "--quiet"}, messages);
+    const int error = errno;
+    if (messages >= 0) close(messages);
+    if (child_ > 0) return true;
     *problem = std::string("no process can be started for it: ") + strerror(error);
     child_ = 0;
     return false;

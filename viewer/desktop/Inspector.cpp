@@ -2,6 +2,7 @@
 #include "desktop/Inspector.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstring>
 
 #include <imgui.h>
@@ -25,10 +26,6 @@ bool Optional(const char* label, std::optional<float>* value, float otherwise, f
     changed |= ImGui::DragFloat("##value", &**value, speed);
     ImGui::PopID();
     return changed;
-}
-
-std::string NameOf(const QexPODNode& node, uint32_t index) {
-    return node.name && *node.name ? node.name : "node " + std::to_string(index);
 }
 
 double MegabytesInUse() {
@@ -125,7 +122,7 @@ void Inspector::ShowView() {
 
 void Inspector::ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children) {
     const QexPODModel& scene = viewer_->View().Model()->scene;
-    const std::string name = NameOf(scene.nodes[index], index);
+    const std::string name = NodeWord(scene, index);
     ImGui::PushID(static_cast<int>(index));
     bool shown = !IsHidden(edited_, name);
     if (ImGui::Checkbox("##shown", &shown)) {
@@ -163,18 +160,34 @@ void Inspector::ShowNodes() {
         if (scene.nodes[i].parentIndex < 0) ShowNode(i, children);
 }
 
+// What differs becomes a change.
+void Inspector::ChangeMaterial(const std::string& name, const QexPODMaterial& before,
+                               const QexPODMaterial& after) {
+    const float* const values[][2] = {{before.diffuse, after.diffuse},
+                                      {before.specular, after.specular},
+                                      {&before.shininess, &after.shininess},
+                                      {&before.opacity, &after.opacity}};
+    for (int what = 0; what < 4; ++what) {
+        const auto& [old, now] = values[what];
+        const bool colour = kMaterialChanges[what].numbers == 3;
+        if (std::equal(old, old + (colour ? 3 : 1), now)) continue;
+        const QexVec3 value = colour ? QexVec3{now[0], now[1], now[2]} : QexVec3{now[0], 0, 0};
+        SetChange(&edited_.effects.materials, {name, static_cast<MaterialChange::What>(what), value});
+    }
+}
+
 void Inspector::ShowMaterials() {
     QexModel* model = viewer_->View().Model();
     for (uint32_t i = 0; i < model->scene.materialCount; ++i) {
-        const char* name = model->scene.materials[i].name;
         ImGui::PushID(static_cast<int>(i));
-        if (ImGui::TreeNode(name && *name ? name : "material")) {
+        if (ImGui::TreeNode(MaterialWord(model->scene, i).c_str())) {
             QexPODMaterial material = viewer_->View().MaterialOf(i);
             bool changed = ImGui::ColorEdit3("diffuse", material.diffuse);
             changed |= ImGui::ColorEdit3("specular", material.specular);
             changed |= ImGui::DragFloat("shininess", &material.shininess, 0.5f, 0, 1000);
             changed |= ImGui::SliderFloat("opacity", &material.opacity, 0, 1);
-            if (changed) viewer_->View().SetMaterial(i, material);
+            if (changed)
+                ChangeMaterial(MaterialWord(model->scene, i), viewer_->View().MaterialOf(i), material);
             if (const QexTexture* texture = model->textures[i]) {
                 ImGui::Text("%s: %d x %u, %s, up to %d levels", texture->name, texture->width,
                             texture->height, FormatName(texture->format), MipLevels(*texture));
@@ -194,7 +207,9 @@ void Inspector::ShowLights() {
     for (size_t i = 0; i < lights.size(); ++i) {
         ImGui::PushID(static_cast<int>(i));
         ImGui::DragFloat3("place", lights[i].vector, size / 100);
-        ImGui::ColorEdit3("colour", lights[i].colour);
+        // A command line has colours of 8 bits.
+        if (ImGui::ColorEdit3("colour", lights[i].colour))
+            for (float& c : lights[i].colour) c = std::round(std::clamp(c, 0.0f, 1.0f) * 255) / 255;
         const bool gone = ImGui::Button("Remove");
         ImGui::PopID();
         if (gone) lights.erase(lights.begin() + static_cast<std::ptrdiff_t>(i--));
@@ -231,6 +246,31 @@ void Inspector::ShowEffects() {
     if (e.stereo) ImGui::DragFloat("separation", &e.separation, 0.1f, -100, 100);
 }
 
+// From then on its description is shown.
+void Inspector::SaveEmitter(size_t index, const QexParticleEmitter& emitter) {
+    std::string& file = edited_.effects.emitters.emitters[index];
+    const std::string to = WithoutExtension(file) + ".json", text = DescribeEmitter(emitter);
+    std::string problem;
+    const bool saved = WriteOutput(to, text.data(), text.size(), &problem);
+    viewer_->Say(to + (saved ? ": saved" : ": " + problem));
+    if (!saved) return;
+    unsaved_.erase(file);
+    file = to;
+}
+
+std::string Inspector::LeftOut() const {
+    std::string text;
+    const Emitters* particles = viewer_->View().Particles();
+    const auto& files = viewer_->Options().effects.emitters.emitters;
+    for (size_t i = 0; particles && i < std::min(particles->All().size(), files.size()); ++i) {
+        const auto found = unsaved_.find(files[i]);
+        if (found != unsaved_.end() && found->second == particles->All()[i])
+            text += (text.empty() ? "" : ", ") + FileName(files[i]);
+    }
+    return text.empty() ? ""
+                        : "the command draws emitters as they were saved; save the description of " + text;
+}
+
 // All values of an emitter, written into it as they change; a description of them is saved on demand.
 void Inspector::ShowEmitters() {
     Emitters* particles = viewer_->View().Particles();
@@ -250,15 +290,12 @@ void Inspector::ShowEmitters() {
                     ImGui::PopID();
                 }
                 FieldValues values;
-                if (changed && FaultOf(field, rows).empty() && values.Add(field.name, rows).empty())
+                if (changed && FaultOf(field, rows).empty() && values.Add(field.name, rows).empty()) {
                     values.Apply(emitter);
+                    unsaved_[file] = emitter;
+                }
             }
-            if (ImGui::Button("Save the description")) {
-                const std::string to = WithoutExtension(file) + ".json", text = DescribeEmitter(*emitter);
-                std::string problem;
-                const bool saved = WriteOutput(to, text.data(), text.size(), &problem);
-                viewer_->Say(to + (saved ? ": saved" : ": " + problem));
-            }
+            if (ImGui::Button("Save the description")) SaveEmitter(i, *emitter);
             ImGui::TreePop();
         }
         ImGui::PopID();

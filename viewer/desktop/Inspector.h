@@ -1,6 +1,7 @@
 // The panel beside the picture: everything about a scene that can be seen and changed.
 #pragma once
 
+#include <map>
 #include <string>
 
 #include "front/Viewer.h"
@@ -19,6 +20,8 @@ class Inspector {
 
     // Between ImGui::NewFrame and ImGui::Render.
     InspectorWishes Show(const std::vector<std::string>& recent);
+    // What is shown and a command line does not say; empty when it says all.
+    std::string LeftOut() const;
 
   private:
     void ShowPlayback();
@@ -26,11 +29,15 @@ class Inspector {
     void ShowNodes();
     void ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children);
     void ShowMaterials();
+    void ChangeMaterial(const std::string& name, const QexPODMaterial& before, const QexPODMaterial& after);
     void ShowLights();
     void ShowEffects();
     void ShowEmitters();
+    void SaveEmitter(size_t index, const QexParticleEmitter& emitter);
     void ShowStatistics();
 
     Viewer* viewer_;
     SceneOptions edited_;
+    // Emitters whose values no file has, and which record they were changed in.
+    std::map<std::string, const QexParticleEmitter*> unsaved_;
 };

@@ -18,6 +18,7 @@ using json = nlohmann::ordered_json;
 
 constexpr double kMost = 1e9;  // of any number
 const char* const kOverlayNames[] = {"grid", "wireframe", "boxes", "bones", "normals"};
+const char* const kMaterialFields[] = {"diffuse", "specular", "shininess", "opacity"};  // as changes' What
 const char* const kFormatNames[] = {"compressed or other", "RGBA 8888", "RGBA 4444", "RGBA 5551", "RGB 565"};
 
 bool ReadNumber(const json& value, double* number) {
@@ -42,10 +43,6 @@ bool ReadFlag(const json& value, bool* flag) {
 
 json Numbers(const float* numbers, size_t count) {
     return std::vector<float>(numbers, numbers + count);
-}
-
-std::string NameOf(const char* name, const char* kind, uint32_t index) {
-    return name && *name ? name : kind + std::string(" ") + std::to_string(index);
 }
 
 // Changes a copy of the options, which the viewer takes if `read` could use the value.
@@ -199,23 +196,25 @@ bool SetOverlays(Viewer* v, const json& value) {
 
 bool SetMaterial(Viewer* v, const json& value) {
     const QexModel* model = v->View().Model();
-    double index = -1, number = 0;
+    double index = -1;
     if (!model || !value.is_object() || !value.contains("index") || !ReadNumber(value["index"], &index) ||
         index < 0 || index >= static_cast<double>(model->scene.materialCount))
         return false;
-    const uint32_t at = static_cast<uint32_t>(index);
-    QexPODMaterial material = v->View().MaterialOf(at);
-    for (const auto& [name, colour] :
-         {std::pair<const char*, float*>{"diffuse", material.diffuse}, {"specular", material.specular}})
-        if (value.contains(name) && !ReadNumbers(value[name], colour, 3)) return false;
-    for (const auto& [name, field] :
-         {std::pair<const char*, float*>{"shininess", &material.shininess}, {"opacity", &material.opacity}}) {
-        if (!value.contains(name)) continue;
-        if (!ReadNumber(value[name], &number)) return false;
-        *field = static_cast<float>(number);
-    }
-    v->View().SetMaterial(at, material);
-    return true;
+    const std::string material = MaterialWord(model->scene, static_cast<uint32_t>(index));
+    return Alter(v, [&](SceneOptions* o) {
+        for (int what = 0; what < 4; ++what) {
+            const char* const word = kMaterialFields[what];
+            const size_t count = kMaterialChanges[what].numbers;
+            if (!value.contains(word)) continue;
+            float numbers[3] = {0, 0, 0};
+            if (!ReadNumbers(count == 1 ? json::array({value[word]}) : value[word], numbers, count))
+                return false;
+            SetChange(
+                &o->effects.materials,
+                {material, static_cast<MaterialChange::What>(what), {numbers[0], numbers[1], numbers[2]}});
+        }
+        return true;
+    });
 }
 
 json EmitterNames(Viewer* v) {
@@ -339,7 +338,7 @@ std::string DescribeScene(Viewer* viewer) {
     const QexPODModel& scene = model->scene;
     json nodes = json::array(), materials = json::array();
     for (uint32_t i = 0; i < scene.nodeCount; ++i)
-        nodes.push_back({{"name", NameOf(scene.nodes[i].name, "node", i)},
+        nodes.push_back({{"name", NodeWord(scene, i)},
                          {"parent", scene.nodes[i].parentIndex},
                          {"mesh", i < scene.meshNodeCount}});
     for (uint32_t i = 0; i < scene.materialCount; ++i) {
@@ -351,7 +350,7 @@ std::string DescribeScene(Viewer* viewer) {
                        {"width", t->width},
                        {"height", t->height},
                        {"format", kFormatNames[t->format < 5 ? t->format : 0]}};
-        materials.push_back({{"name", NameOf(m.name, "material", i)},
+        materials.push_back({{"name", MaterialWord(scene, i)},
                              {"diffuse", Numbers(m.diffuse, 3)},
                              {"specular", Numbers(m.specular, 3)},
                              {"shininess", m.shininess},

@@ -115,6 +115,7 @@ void Viewer::Loaded() {
     // What was meant for the parts and the place of another scene.
     SceneOptions options = options_;
     options.effects.nodes.clear();
+    options.effects.materials.clear();
     options.effects.lights.clear();
     options.effects.mirrorNode.clear();
     const Bounds box = BoundsOf(view_->Points());
@@ -304,11 +305,18 @@ void NextUp(V* v) {
 
 void HideSelected(V* v) {
     const QexModel* model = v->View().Model();
-    const char* name = model && v->Selected() >= 0
-                           ? QexModel_GetNodeName(model, static_cast<uint32_t>(v->Selected()))
-                           : nullptr;
-    if (name)
-        Alter(v, [&](SceneOptions* o) { o->effects.nodes.push_back({name, NodeChange::kHide, {0, 0, 0}}); });
+    if (!model || v->Selected() < 0) return;
+    const std::string node = NodeWord(model->scene, static_cast<uint32_t>(v->Selected()));
+    Alter(v, [&](SceneOptions* o) { SetChange(&o->effects.nodes, {node, NodeChange::kHide, {0, 0, 0}}); });
+}
+
+void ShowAllNodes(V* v) {
+    Alter(v, [](SceneOptions* o) {
+        auto& nodes = o->effects.nodes;
+        nodes.erase(std::remove_if(nodes.begin(), nodes.end(),
+                                   [](const NodeChange& c) { return c.what == NodeChange::kHide; }),
+                    nodes.end());
+    });
 }
 
 }  // namespace
@@ -345,8 +353,7 @@ const std::vector<Viewer::Key>& Viewer::Keys() {
         {"K", 0, "bones", [](V* v) { Toggle(v, Overlay::kBones); }},
         {"N", 0, "normals", [](V* v) { Toggle(v, Overlay::kNormals); }},
         {"H", 0, "hide the selected node", HideSelected},
-        {"H", kShift, "show all nodes",
-         [](V* v) { Alter(v, [](SceneOptions* o) { o->effects.nodes.clear(); }); }},
+        {"H", kShift, "show all nodes", ShowAllNodes},
         {"Escape", 0, "select nothing", [](V* v) { v->Select(-1); }},
         {"?", 0, "this help", [](V* v) { v->help_ = !v->help_; }},
     };

@@ -69,7 +69,7 @@ class Viewer {
     // Fits what is around the scene to it as it is now, as pictures by the command have it.
     void FitToFrame();
     // Draws without overlays and reads it, the top row first: the picture of AsRenderOptions. `samples` are
-    // those of a pixel of the surface.
+    // those of a pixel of the surface, which is at least as large and may be drawn over.
     std::vector<uint8_t> Picture(int width, int height, int samples);
 
     // Whatever people look at and change.
@@ -99,7 +99,7 @@ class Viewer {
     size_t FailedLoads() const { return failed_; }
     size_t Loads() const { return loads_; }  // that ended well
 
-    // What makes this picture with qex render.
+    // What makes this picture with qex render, with particles as emitters' files have them.
     RenderOptions AsRenderOptions(int width, int height) const;
 
     struct Key {

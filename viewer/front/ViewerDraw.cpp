@@ -14,6 +14,7 @@ namespace {
 
 constexpr uint32_t kSelected = 0xFFA030, kBox = 0x60C0FF, kBone = 0xFFFF60, kWire = 0x101418,
                    kNormal = 0x60FF90;
+constexpr int kSamples = 4;             // of a pixel of a picture
 constexpr uint32_t kMostEdges = 60000;  // of wires and normals that are drawn, a node
 
 }  // namespace
@@ -181,8 +182,8 @@ void Viewer::FitToFrame() {
 std::vector<uint8_t> Viewer::Picture(int width, int height, int samples) {
     FitToFrame();
     std::vector<uint8_t> pixels;
-    // Drawn larger: shadows and targets of effects are smooth then, too, and nothing depends on the window.
-    if (samples > 1) {
+    // As qex render: on a surface of four samples where they smooth everything, else larger.
+    if (samples < kSamples || NeedsLargerDrawing(options_.effects)) {
         const Offscreen large(2 * width, 2 * height);
         if (large.IsComplete()) {
             view_->SetScale(2);
@@ -208,5 +209,6 @@ RenderOptions Viewer::AsRenderOptions(int width, int height) const {
     options.width = width;
     options.height = height;
     options.frame = playback_.Frame();
+    if (view_->Particles()) options.effects.emitters.time = view_->Particles()->Time();
     return options;
 }

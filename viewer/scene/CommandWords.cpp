@@ -35,6 +35,11 @@ std::string Colour(uint32_t rgb) {
     return text;
 }
 
+std::string ChangeText(const ChangeWord& kind, const QexVec3& value) {
+    if (kind.numbers == 3) return kind.word + Place(value);
+    return kind.word + (kind.numbers ? Number(static_cast<double>(value.x)) : "");
+}
+
 class Words {
   public:
     // "--name=value": a value may begin with a minus.
@@ -97,10 +102,11 @@ void AddEffects(const EffectOptions& effects, Words* words) {
     words->AddAll("emitter-texture", effects.emitters.textures);
     if (effects.emitters.time != EmitterScene().time)
         words->Add("emitter-time", Number(static_cast<double>(effects.emitters.time)));
-    static const char* const kChanges[] = {"hide", "move:", "rotate:", "face:"};  // in the order of What
     for (const NodeChange& change : effects.nodes)
-        words->Add("node", change.node + "=" + kChanges[change.what] +
-                               (change.what == NodeChange::kHide ? "" : Place(change.value)));
+        words->Add("node", change.node + "=" + ChangeText(kNodeChanges[change.what], change.value));
+    for (const MaterialChange& change : effects.materials)
+        words->Add("material",
+                   change.material + "=" + ChangeText(kMaterialChanges[change.what], change.value));
     for (const QexVec2& p : effects.picks)
         words->Add("pick", Join({static_cast<double>(p.x), static_cast<double>(p.y)}));
 }

@@ -12,17 +12,6 @@ namespace {
 constexpr float kShadowIntensity = 0.4f, kShadowBias = 0.01f;
 constexpr float kMirrorOpacity = 0.6f;  // of the plane over its image
 
-// The names of the scene's nodes, as many as a line may hold.
-std::string NodeNames(const QexPODModel& scene) {
-    std::string names;
-    for (uint32_t i = 0; i < scene.nodeCount; ++i) {
-        if (!scene.nodes[i].name) continue;
-        if (names.size() > 400) return names + ", ...";
-        names += (names.empty() ? "" : ", ") + std::string(scene.nodes[i].name);
-    }
-    return names.empty() ? "none with a name" : names;
-}
-
 // What draws the passes of a frame: the depth pass gets no arguments of its caller.
 const DrawPass* s_drawPass;
 
@@ -49,25 +38,8 @@ QexVec3 ShadowDirection(const QexLightSet& lights, const QexCamera& camera) {
 
 }  // namespace
 
-int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem) {
-    const int32_t index = QexModel_FindNodeIdxByName(&model, name.c_str());
-    if (index < 0) *problem = "no node '" + name + "'; the scene has " + NodeNames(model.scene);
-    return index;
-}
-
-std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes) {
-    std::string problem;
-    for (const NodeChange& change : changes) {
-        const int32_t found = FindNode(*model, change.node, &problem);
-        if (found < 0) return problem;
-        const uint32_t node = static_cast<uint32_t>(found);
-        const QexVec3& v = change.value;
-        if (change.what == NodeChange::kHide) QexModel_EnableNodeRenderingR(model, node, 0);
-        if (change.what == NodeChange::kMove) QexModel_SetNodePosition(model, node, v.x, v.y, v.z);
-        if (change.what == NodeChange::kRotate) QexModel_SetNodeRotation(model, node, v.x, v.y, v.z);
-        if (change.what == NodeChange::kFace) QexModel_SetNodeFaceTo(model, node, &v);
-    }
-    return "";
+bool NeedsLargerDrawing(const EffectOptions& options) {
+    return options.shadow || options.depthOfField || options.stereo;
 }
 
 void DrawWithShadow(QexRuntimeContext* engine, QexModel* floor, QexModel* model, const QexLightSet& lights,

@@ -1,5 +1,4 @@
-// What can be done with a scene beyond drawing it as it is: moved nodes, shadow, mirror, stereo,
-// picking.
+// What can be done with a scene beyond drawing it as it is: shadow, mirror, stereo, depth of field.
 #pragma once
 
 #include <functional>
@@ -8,20 +7,8 @@
 #include <vector>
 
 #include "Qex.h"
+#include "scene/Changes.h"
 #include "scene/Emitters.h"
-
-struct NodeChange {
-    enum What { kHide, kMove, kRotate, kFace };
-
-    std::string node;
-    What what;
-    QexVec3 value;  // a place, or degrees
-
-    bool operator==(const NodeChange& o) const {
-        return node == o.node && what == o.what && value.x == o.value.x && value.y == o.value.y &&
-               value.z == o.value.z;
-    }
-};
 
 struct DepthOfField {
     float focus, range, sigma, samples;  // as QexPostProcessing_DrawDOF takes them
@@ -35,6 +22,7 @@ struct EffectOptions {
     std::string shader;            // a name of ShaderNames, or empty: the default look
     std::vector<QexLight> lights;  // instead of the scene's own
     std::vector<NodeChange> nodes;
+    std::vector<MaterialChange> materials;
     std::vector<QexVec2> picks;  // pixels
     bool shadow = false;
     std::optional<float> mirror;  // height of the plane
@@ -49,11 +37,9 @@ struct EffectOptions {
     bool fullBlur = false;  // depth of field blurs at full resolution, not at half
 };
 
-// Carries the changes out. Returns a line that says which node there is not, or nothing.
-std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes);
-
-// The index of a node of that name; when there is none it is -1 and `problem` names those that there are.
-int32_t FindNode(const QexModel& model, const std::string& name, std::string* problem);
+// Whether multisampling does not smooth everything in the picture: within shadows and in the targets of
+// effects edges stay as they are, so that all is drawn larger.
+bool NeedsLargerDrawing(const EffectOptions& options);
 
 // Draws all nodes of a floor, which may be null, and of the model. Those with shadow-receiving modules show
 // the shadows of the model's nodes.

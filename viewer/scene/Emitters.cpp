@@ -100,6 +100,10 @@ void Emitters::Run(float seconds) {
     }
 }
 
+float Emitters::Time() const {
+    return static_cast<float>(updates_) / kUpdatesPerSecond;
+}
+
 void Emitters::Draw(const QexCamera& camera) const {
     if (emitters_.empty()) return;
     QexRenderer_SetZTestFunc(QEX_DEPTH_LESS_EQUAL);

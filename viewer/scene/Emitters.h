@@ -37,6 +37,8 @@ class Emitters {
               std::string* problem);
 
     void Run(float seconds);
+    // Seconds that they have run, as EmitterScene has them.
+    float Time() const;
     // Blended over what is there, nothing hidden by what is behind.
     void Draw(const QexCamera& camera) const;
     // To read and change; in the order of the files.

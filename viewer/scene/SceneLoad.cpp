@@ -92,6 +92,7 @@ void SceneView::Adopt(std::vector<std::string>* warnings) {
     materials_.assign(scene.materials, scene.materials + scene.materialCount);
     nodes_.assign(scene.nodes, scene.nodes + scene.nodeCount);
     transparent_.assign(scene.meshNodeCount + size_t{1}, {});
+    coloured_.clear();
     normalMaps_ = false;
     autoCamera = false;
 }
@@ -116,11 +117,16 @@ std::string SceneView::Apply(std::vector<std::string>* warnings) {
         for (const std::string& line : LoadNormalMaps(model_.get())) warnings->push_back(line);
         normalMaps_ = true;
     }
+    std::string problem = ChangeMaterials(model_.get(), effects.materials);
+    const QexPODMaterial* materials = model_->scene.materials;
+    changed_.assign(materials, materials + model_->scene.materialCount);
     const std::vector<bool> lit = LitMaterials(model_->scene, effects.shader);
-    if (lit != lit_) RecolourTextures(model_.get(), lit);
+    if (lit != lit_ || effects.materials != coloured_) RecolourTextures(model_.get(), lit);
     lit_ = lit;
+    coloured_ = effects.materials;
     SetFrame(frame_);
-    std::string problem = ChangeNodes(model_.get(), effects.nodes);
+    const std::string wrongNode = ChangeNodes(model_.get(), effects.nodes);
+    if (problem.empty()) problem = wrongNode;
     if (!effects.mirrorNode.empty() && problem.empty()) FindNode(*model_, effects.mirrorNode, &problem);
     if (effects.shader.empty())
         shaders_.UseDefault(model_.get(), effects.shadow, lit_);
@@ -172,22 +178,9 @@ std::string SceneView::SetOptions(const SceneOptions& options, std::vector<std::
         QexRenderer_DisableStereo3D(engine_);
     if (!model_) return "";
     const EffectOptions &a = before.effects, &b = options.effects;
-    const bool same = a.shader == b.shader && a.nodes == b.nodes && a.shadow == b.shadow &&
-                      a.mirror == b.mirror && a.floor == b.floor && a.mirrorNode == b.mirrorNode &&
-                      a.sky == b.sky && a.water == b.water && a.emitters == b.emitters &&
-                      SameLights(a.lights, b.lights);
+    const bool same = a.shader == b.shader && a.nodes == b.nodes && a.materials == b.materials &&
+                      a.shadow == b.shadow && a.mirror == b.mirror && a.floor == b.floor &&
+                      a.mirrorNode == b.mirrorNode && a.sky == b.sky && a.water == b.water &&
+                      a.emitters == b.emitters && SameLights(a.lights, b.lights);
     return same ? "" : Apply(warnings);
-}
-
-void SceneView::SetMaterial(uint32_t index, const QexPODMaterial& colours) {
-    if (index >= materials_.size()) return;
-    for (int i = 0; i < 3; ++i) {
-        materials_[index].diffuse[i] = colours.diffuse[i];
-        materials_[index].specular[i] = colours.specular[i];
-    }
-    materials_[index].shininess = colours.shininess;
-    materials_[index].opacity = colours.opacity;
-    std::vector<std::string> warnings;
-    Apply(&warnings);
-    RecolourTextures(model_.get(), lit_);
 }

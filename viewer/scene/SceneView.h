@@ -54,9 +54,8 @@ class SceneView {
 
     // The mesh nodes whose boxes are under a pixel of the last picture.
     std::vector<uint32_t> Pick(float x, float y);
-    const QexPODMaterial& MaterialOf(uint32_t index) const { return materials_[index]; }
-    // A material's own colours, as the file has them or as they were set.
-    void SetMaterial(uint32_t index, const QexPODMaterial& colours);
+    // A material as the file has it and as it was changed, without what a way of shading makes of it.
+    const QexPODMaterial& MaterialOf(uint32_t index) const { return changed_[index]; }
 
     QexModel* Model() { return model_.get(); }
     const QexModel* Model() const { return model_.get(); }
@@ -87,9 +86,10 @@ class SceneView {
     std::vector<std::string> loadLines_;  // the engine's, about the load
     float progress_ = 0;
     // As they were before options changed them.
-    std::vector<QexPODMaterial> materials_;
+    std::vector<QexPODMaterial> materials_, changed_;  // and as changes left them
     std::vector<QexPODNode> nodes_;
-    std::vector<bool> lit_;  // materials
+    std::vector<bool> lit_;                 // materials
+    std::vector<MaterialChange> coloured_;  // that textures show
     SceneShaders shaders_;
     std::unique_ptr<Floor> floor_;
     std::unique_ptr<Sky> sky_;

@@ -39,10 +39,10 @@ const NumberShape kLight = {',',
                             {kAny, kAny, kAny, {NumberRange::kColour, 0, DBL_MAX, 0xFFFFFF}},
                             3,
                             "is no light; expected X,Y,Z or X,Y,Z,RRGGBB, at most 4 of them"};
-const NumberShape kPlace = {',',
-                            {kAny, kAny, kAny},
-                            3,
-                            "is no change; expected NAME=hide, NAME=move:X,Y,Z, rotate: (degrees) or face:"};
+const char kNoNodeChange[] = "is no change; expected NAME=hide, NAME=move:X,Y,Z, rotate: (degrees) or face:";
+const char kNoMaterialChange[] =
+    "is no change; expected NAME=diffuse:R,G,B, specular:R,G,B, shininess:N or opacity:N, all but shininess "
+    "0 to 1";
 const NumberShape kPick = {
     ',', {kAny, kAny}, 2, "is no point; expected X,Y in pixels from the upper left corner"};
 const NumberShape kStereo = {
@@ -90,28 +90,25 @@ std::string ParseLight(const std::string& text, std::vector<QexLight>* lights) {
     return problem;
 }
 
-// NAME=hide or NAME=CHANGE:X,Y,Z; a name may hold '='.
-std::string ParseNode(const std::string& text, std::vector<NodeChange>* changes) {
-    const struct {
-        const char* name;
-        NodeChange::What what;
-    } kinds[] = {{"hide", NodeChange::kHide},
-                 {"move:", NodeChange::kMove},
-                 {"rotate:", NodeChange::kRotate},
-                 {"face:", NodeChange::kFace}};
+// NAME=CHANGE, which may be NAME=CHANGE:X,Y,Z; a name may hold '='. `ranges`: of the numbers of each kind.
+template <class Change, size_t kKinds>
+std::string ParseChange(const std::string& text, const ChangeWord (&words)[kKinds], const char* fault,
+                        const NumberRange (&ranges)[kKinds], std::vector<Change>* changes) {
     const size_t equals = std::min(text.rfind('='), text.size());
     const std::string change = text.substr(std::min(equals + 1, text.size()));
-    for (const auto& kind : kinds) {
-        const size_t length = strlen(kind.name);
-        Numbers n = {0, 0, 0};
-        if (change.compare(0, length, kind.name) != 0) continue;
-        if (kind.what == NodeChange::kHide ? change.size() > length
-                                           : !ReadNumbers(change.substr(length), kPlace, &n).empty())
-            continue;
-        changes->push_back({text.substr(0, equals), kind.what, {Float(n[0]), Float(n[1]), Float(n[2])}});
+    for (size_t kind = 0; kind < kKinds; ++kind) {
+        const auto& [word, count] = words[kind];
+        if (change.compare(0, strlen(word), word) != 0) continue;
+        const NumberShape numbers = {',', std::vector<NumberRange>(count, ranges[kind]), count, fault};
+        Numbers n;
+        if (count ? !ReadNumbers(change.substr(strlen(word)), numbers, &n).empty() : change != word) continue;
+        n.resize(3);
+        changes->push_back({text.substr(0, equals),
+                            static_cast<typename Change::What>(kind),
+                            {Float(n[0]), Float(n[1]), Float(n[2])}});
         return "";
     }
-    return "'" + text + "' " + kPlace.fault;
+    return "'" + text + "' " + fault;
 }
 
 CLI::Option* AddHeight(CLI::App* app, const char* name, const std::string& help,
@@ -240,7 +237,19 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     AddEmitters(app, &effects->emitters);
     AddParsed(
         app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:",
-        [=](const std::string& text) { return ParseNode(text, &effects->nodes); }, kMostRepeats);
+        [=](const std::string& text) {
+            static const NumberRange kRanges[] = {kAny, kAny, kAny, kAny};
+            return ParseChange(text, kNodeChanges, kNoNodeChange, kRanges, &effects->nodes);
+        },
+        kMostRepeats);
+    AddParsed(
+        app, "--material", "NAME=diffuse:R,G,B, specular:R,G,B, shininess:N or opacity:N",
+        [=](const std::string& text) {
+            static const NumberRange kShare = {NumberRange::kAny, 0, 1};
+            static const NumberRange kRanges[] = {kShare, kShare, {NumberRange::kAny, 0, 1000}, kShare};
+            return ParseChange(text, kMaterialChanges, kNoMaterialChange, kRanges, &effects->materials);
+        },
+        kMostRepeats);
     AddNumbers(
         app, "--pick", "X,Y, prints the nodes whose boxes are there", kPick,
         [=](const Numbers& n) {

@@ -38,10 +38,8 @@ Renderer::~Renderer() {
     if (engineStarted_) QexEngine_Shutdown(&engine_);
 }
 
-// Multisampling smooths the edges of what is drawn to the screen. Within shadows and in the targets of
-// effects it does not: these are drawn larger, as everything is where the GL has no multisampling.
+// Everything is drawn larger, too, where the GL has no multisampling.
 bool Renderer::CreateContext(std::string* error) {
-    const EffectOptions& effects = options_.effects;
     const auto create = [&](int scale, int samples) {
         scale_ = scale;
         context_ = qex::HeadlessContext::Create(options_.width * scale, options_.height * scale, error,
@@ -49,8 +47,9 @@ bool Renderer::CreateContext(std::string* error) {
         return context_ != nullptr;
     };
     if (options_.antialias == 1) return create(1, 1);
-    const bool targets = effects.shadow || effects.depthOfField || effects.stereo;
-    if (!targets && create(1, options_.antialias) && context_->Samples() >= options_.antialias) return true;
+    if (!NeedsLargerDrawing(options_.effects) && create(1, options_.antialias) &&
+        context_->Samples() >= options_.antialias)
+        return true;
     if (create(kLarger, 1)) return true;
     Warn("no room for antialiasing: " + *error);
     return create(1, 1);
@@ -165,6 +164,8 @@ std::string Renderer::CheckOptions() const {
     std::string problem = CheckTextureChoices(&model);
     for (const NodeChange& change : options_.effects.nodes)
         if (problem.empty()) FindNode(model, change.node, &problem);
+    for (const MaterialChange& change : options_.effects.materials)
+        if (problem.empty()) FindMaterial(model, change.material, &problem);
     if (!options_.effects.mirrorNode.empty() && problem.empty())
         FindNode(model, options_.effects.mirrorNode, &problem);
     return problem;

@@ -1,7 +1,7 @@
 // qex view: a window that shows scenes.
 #pragma once
 
-#include "desktop/Window.h"
+#include "desktop/View.h"
 
 namespace CLI {
 class App;
