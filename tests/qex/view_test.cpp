@@ -113,7 +113,7 @@ TEST_F(QexView, SaysWhatItCannotShow) {
 
 TEST_F(QexView, LivesThroughRandomEvents) {
     WriteScene(Path("quad.pod"), QuadScene());
-    const CommandResult result = View("quad.pod --random-events 2000 --seed 5");
+    const CommandResult result = View("quad.pod --random-events 10000 --seed 5");
     EXPECT_EQ(result.status, 0) << result.err;
 }
 

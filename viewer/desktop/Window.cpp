@@ -130,6 +130,17 @@ int Window::PictureWidth() const {
     return settings_.inspector && panel * 2 < width_ ? width_ - panel : width_;
 }
 
+// Whether a file is made into a POD file first.
+bool Window::IsConverted(const std::string& file) {
+    const std::string extension = Extension(file);
+    return extension != "pod" && extension != "emitter" && extension != "json" && IsRegularFile(file);
+}
+
+void Window::Expect(const std::string& file) {
+    std::string problem;
+    if (IsConverted(file) && conversion_.Start(file, &problem)) expected_ = file;
+}
+
 // Emitters are shown with the scene that is there; what is no POD file is converted first.
 void Window::Open(const std::string& file) {
     const std::string extension = Extension(file);
@@ -141,7 +152,10 @@ void Window::Open(const std::string& file) {
         return WatchFiles();
     }
     keep_ = false;
-    if (extension == "pod" || !IsRegularFile(file)) return viewer_->Open(file);
+    const bool begun = file == expected_;
+    expected_.clear();
+    if (begun) return;
+    if (!IsConverted(file)) return viewer_->Open(file);
     if (!conversion_.Start(file, &problem)) viewer_->Say(file + ": " + problem);
 }
 
@@ -168,6 +182,7 @@ void Window::Poll(double seconds) {
     if (state == Conversion::State::kDone)
         keep_ ? viewer_->Reload(conversion_.Output())
               : viewer_->Open(conversion_.Output(), conversion_.Input());
+    viewer_->SetWaiting(conversion_.AtWork());
     if (viewer_->Loads() != loads_) {
         loads_ = viewer_->Loads();
         shownPath_ = viewer_->Path();
@@ -295,7 +310,7 @@ void Window::Run() {
 void Window::Settle() {
     do {
         Frame(1.0 / 60);
-        if (conversion_.AtWork()) SDL_Delay(10);
+        if (conversion_.AtWork()) SDL_Delay(5);
     } while (Busy());
     Frame(0);
 }

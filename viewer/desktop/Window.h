@@ -22,6 +22,8 @@ class Window {
     Window(const Window&) = delete;
     Window& operator=(const Window&) = delete;
 
+    // A file that will be opened: if it is to be converted, that begins before there is a window.
+    void Expect(const std::string& file);
     // False, and why, when there is no display or no OpenGL ES 2.0.
     bool Start(std::string* problem);
     // Until it is closed.
@@ -47,6 +49,7 @@ class Window {
   private:
     bool OpenContext(int samples);
     int PictureWidth() const;
+    static bool IsConverted(const std::string& file);
     void Page(int by);
     void Resized();
     void Poll(double seconds);
@@ -72,7 +75,7 @@ class Window {
     std::unique_ptr<Inspector> inspector_;
     Conversion conversion_;
     Watch watch_;
-    std::string shownPath_;
+    std::string shownPath_, expected_;
     std::vector<std::string> files_;
     size_t page_ = 0, said_ = 0, loads_ = 0;
     float sayFor_ = 0;

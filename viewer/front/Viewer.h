@@ -62,6 +62,9 @@ class Viewer {
     // Another one is current: all is made again, the scene from its file, as it is shown.
     void ContextRestored();
 
+    // A scene is on its way: nothing is shown in its place.
+    void SetWaiting(bool waits) { waits_ = waits; }
+
     void Handle(const ViewerEvent& event);
     void Tick(double seconds);
     // Draws into the framebuffer that is bound. Nothing for a surface without pixels.
@@ -129,6 +132,7 @@ class Viewer {
     void DrawOverlays();
     void AddMesh(uint32_t node, bool wires, bool normals);
     void DrawGreeting();
+    bool IsEmpty() const;
     float Aspect() const;
     void CameraMoved();
     const SceneOptions& Moved();
@@ -144,7 +148,7 @@ class Viewer {
     std::vector<std::string> messages_;
     std::string path_, name_, loadingPath_, loadingName_, folder_, addedScene_, addedTexture_;
     std::array<bool, static_cast<size_t>(Overlay::kCount)> overlays_ = {};
-    bool help_ = false, keep_ = false;
+    bool help_ = false, keep_ = false, waits_ = false;
     int selected_ = -1;
     size_t failed_ = 0, said_ = 0, loads_ = 0;
     std::vector<Touch> touches_;

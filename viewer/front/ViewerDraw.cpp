@@ -60,7 +60,7 @@ void Viewer::DrawOverlays() {
     QexModel* model = view_->Model();
     inside_.Clear();
     over_.Clear();
-    if (Shows(Overlay::kGrid) || !model) {
+    if (Shows(Overlay::kGrid) || IsEmpty()) {
         const float size = model ? view_->Size() : 2;
         const float unit = std::pow(10.0f, std::round(std::log10(size)));
         inside_.AddGrid(unit * 2, 20, UpOf(camera_.Up()));
@@ -81,6 +81,10 @@ void Viewer::DrawOverlays() {
     }
     inside_.Draw(view_->Camera(), true);
     over_.Draw(view_->Camera(), false);
+}
+
+bool Viewer::IsEmpty() const {
+    return !view_->Model() && !view_->IsLoading() && !waits_;
 }
 
 // What to do where there is nothing to see.
@@ -105,7 +109,7 @@ void Viewer::Draw(int width, int height, bool overlays) {
     view_->Draw();
     if (calls_) statistics_.calls = calls_() - before;
     if (overlays) DrawOverlays();
-    if (overlays && !view_->Model() && !view_->IsLoading()) DrawGreeting();
+    if (overlays && IsEmpty()) DrawGreeting();
 }
 
 namespace {

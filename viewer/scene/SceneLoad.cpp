@@ -23,6 +23,7 @@ SceneView::~SceneView() {
     EngineOutput quiet;
     Unload();
     GiveUpLoad();
+    shaders_.Release();
     if (depthOfField_) QexPostProcessing_Finalize();
 }
 
@@ -35,7 +36,6 @@ void SceneView::GiveUpLoad() {
 
 void SceneView::Unload() {
     EngineOutput quiet;
-    shaders_.Release();
     floor_.reset();
     sky_.reset();
     emitters_.reset();
@@ -100,7 +100,6 @@ void SceneView::Adopt(std::vector<std::string>* warnings) {
 // Undoes what options have changed.
 void SceneView::Restore() {
     QexPODModel& scene = model_->scene;
-    shaders_.Release();
     for (uint32_t i = 0; i < scene.materialCount; ++i) scene.materials[i] = materials_[i];
     for (uint32_t i = 0; i < scene.nodeCount; ++i) {
         QexModel_ResetNodeTransform(model_.get(), i);

@@ -1,6 +1,8 @@
 // The table of the shader modules, and the default look.
 #include "scene/Shading.h"
 
+#include <iterator>
+
 namespace {
 
 // Of the default look: what of a surface's colour shows where no light falls, and what a white light adds
@@ -84,21 +86,24 @@ std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shad
 void SceneShaders::Use(QexModel* model, const std::string& name, const std::vector<bool>& lit) {
     const ShaderRow* row = FindShader(name);
     if (!row) return;
-    Release();
-    row_ = static_cast<size_t>(row - kShaders);
-    static_ = row->create();
-    if (row->createSkinned) skinned_ = row->createSkinned();
-    const std::pair<SetParameters, QexShaderModule*> modules[] = {{row->setDepth, static_},
-                                                                  {row->setSkinnedDepth, skinned_}};
-    for (const auto& [set, module] : modules) {
-        if (!set || !module) continue;
-        QexRenderState_UseProgram(module->program);
-        set(module, kNearDepth, kFarDepth);
-    }
+    made_.resize(std::size(kShaders));
+    Pair& made = made_[static_cast<size_t>(row - kShaders)];
+    const auto need = [](QexShaderModule** module, Create create, SetParameters set) {
+        if (*module || !create) return *module;
+        *module = create();
+        if (*module && set) {
+            QexRenderState_UseProgram((*module)->program);
+            set(*module, kNearDepth, kFarDepth);
+        }
+        return *module;
+    };
     for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
         QexPODNode& node = model->scene.nodes[i];
-        QexShaderModule* module = model->scene.meshes[node.objectIndex].skinned == 1 ? skinned_ : static_;
-        if (module && (!row->lit || IsLit(model->scene, i, lit))) node.shader = module;
+        if (row->lit && !IsLit(model->scene, i, lit)) continue;
+        QexShaderModule* module = model->scene.meshes[node.objectIndex].skinned == 1
+                                      ? need(&made.skinned, row->createSkinned, row->setSkinnedDepth)
+                                      : need(&made.still, row->create, row->setDepth);
+        if (module) node.shader = module;
     }
 }
 
@@ -114,8 +119,11 @@ void SceneShaders::UseDefault(QexModel* model, bool shadow, const std::vector<bo
 }
 
 void SceneShaders::Release() {
-    if (static_) kShaders[row_].release(&static_);
-    if (skinned_) kShaders[row_].releaseSkinned(&skinned_);
+    for (size_t i = 0; i < made_.size(); ++i) {
+        if (made_[i].still) kShaders[i].release(&made_[i].still);
+        if (made_[i].skinned) kShaders[i].releaseSkinned(&made_[i].skinned);
+    }
+    made_.clear();
 }
 
 ShaderOverride::ShaderOverride(QexModel* model, QexShaderModule* module, QexShaderModule* skinned)

@@ -17,7 +17,7 @@ std::vector<std::string> ShaderNames();
 // look, which has no name, those are lit whose meshes all have normals.
 std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shader);
 
-// The modules that draw a model instead of the engine's choice.
+// The modules that draw a model instead of the engine's choice. Each is made when a model first needs it.
 class SceneShaders {
   public:
     SceneShaders() = default;
@@ -34,9 +34,10 @@ class SceneShaders {
     void Release();
 
   private:
-    size_t row_ = 0;
-    QexShaderModule* static_ = nullptr;
-    QexShaderModule* skinned_ = nullptr;
+    struct Pair {
+        QexShaderModule *still = nullptr, *skinned = nullptr;
+    };
+    std::vector<Pair> made_;  // by row of the table
 };
 
 // Gives all nodes of a model, which may be null, other modules for as long as it lives.
