@@ -160,6 +160,33 @@ void Inspector::ShowNodes() {
         if (scene.nodes[i].parentIndex < 0) ShowNode(i, children);
 }
 
+// Where the selected node is moved, how it is turned, and whether the scene is mirrored in it.
+void Inspector::ShowSelected() {
+    const QexPODModel& scene = viewer_->View().Model()->scene;
+    if (viewer_->Selected() < 0) return;
+    const uint32_t index = static_cast<uint32_t>(viewer_->Selected());
+    const std::string name = NodeWord(scene, index);
+    EffectOptions& e = edited_.effects;
+    const struct {
+        const char* label;
+        NodeChange::What what;
+        float step;
+    } kinds[] = {{"move", NodeChange::kMove, viewer_->View().Size() / 200}, {"turn", NodeChange::kRotate, 1}};
+    for (const auto& kind : kinds) {
+        const auto found = std::find_if(e.nodes.begin(), e.nodes.end(), [&](const NodeChange& c) {
+            return c.node == name && c.what == kind.what;
+        });
+        const QexVec3 now = found == e.nodes.end() ? QexVec3{0, 0, 0} : found->value;
+        float value[3] = {now.x, now.y, now.z};
+        if (ImGui::DragFloat3(kind.label, value, kind.step))
+            SetChange(&e.nodes, {name, kind.what, {value[0], value[1], value[2]}});
+    }
+    bool mirrors = e.mirrorNode == name;
+    if (index < scene.meshNodeCount && !e.depthOfField && e.sky.empty() &&
+        ImGui::Checkbox("mirrors", &mirrors))
+        e.mirrorNode = mirrors ? name : "";
+}
+
 // What differs becomes a change.
 void Inspector::ChangeMaterial(const std::string& name, const QexPODMaterial& before,
                                const QexPODMaterial& after) {
@@ -228,6 +255,7 @@ void Inspector::ShowEffects() {
     Optional("floor", &e.floor, low, speed);
     if (!e.water) ImGui::Checkbox("shadow", &e.shadow);
     if (!wholePicture) Optional("mirror", &e.mirror, low, speed);
+    if (!e.mirror && e.mirrorNode.empty() && !e.stereo && !e.depthOfField) ShowSky();
     if (!e.sky.empty() && !e.shadow) Optional("water", &e.water, low, speed);
     bool blur = e.depthOfField.has_value();
     if (!e.mirror && !e.stereo && e.sky.empty() && ImGui::Checkbox("depth of field", &blur))
@@ -244,6 +272,24 @@ void Inspector::ShowEffects() {
     if (!wholePicture && ImGui::Combo("stereo", &stereo, "off\0red, blue\0red, cyan\0side by side\0"))
         e.stereo = static_cast<uint32_t>(stereo);
     if (e.stereo) ImGui::DragFloat("separation", &e.separation, 0.1f, -100, 100);
+}
+
+// Files of one picture or six, with ";" between them.
+void Inspector::ShowSky() {
+    std::vector<std::string>& files = edited_.effects.sky;
+    std::string joined;
+    for (const std::string& file : files) joined += (joined.empty() ? "" : ";") + file;
+    char text[2048];
+    snprintf(text, sizeof text, "%s", joined.c_str());
+    if (!ImGui::InputText("sky", text, sizeof text, ImGuiInputTextFlags_EnterReturnsTrue)) return;
+    files.clear();
+    const std::string entered = text;
+    for (size_t at = 0; at < entered.size();) {
+        const size_t end = std::min(entered.find(';', at), entered.size());
+        if (end > at) files.push_back(entered.substr(at, end - at));
+        at = end + 1;
+    }
+    if (files.empty()) edited_.effects.water.reset();
 }
 
 // From then on its description is shown.
@@ -351,7 +397,10 @@ InspectorWishes Inspector::Show(const std::vector<std::string>& recent) {
     }
     if (scene && section("Animation", true)) ShowPlayback();
     if (section("View", true)) ShowView();
-    if (scene && section("Nodes", true)) ShowNodes();
+    if (scene && section("Nodes", true)) {
+        ShowNodes();
+        ShowSelected();
+    }
     if (scene && section("Materials", false)) ShowMaterials();
     if (scene && section("Lights", false)) ShowLights();
     if (scene && section("Effects", false)) ShowEffects();

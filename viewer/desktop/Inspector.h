@@ -28,10 +28,12 @@ class Inspector {
     void ShowView();
     void ShowNodes();
     void ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children);
+    void ShowSelected();
     void ShowMaterials();
     void ChangeMaterial(const std::string& name, const QexPODMaterial& before, const QexPODMaterial& after);
     void ShowLights();
     void ShowEffects();
+    void ShowSky();
     void ShowEmitters();
     void SaveEmitter(size_t index, const QexParticleEmitter& emitter);
     void ShowStatistics();
