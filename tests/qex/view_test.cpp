@@ -10,12 +10,16 @@ class QexView : public QexCommandTest {
   protected:
     // Runs in the test's folder, so that nothing of the user's settings is seen.
     CommandResult View(const std::string& words) const {
-        const std::string line = "cd '" + Path("") + "' && XDG_CONFIG_HOME='" + Path("") +
-                                 "' xvfb-run -a -s '-screen 0 640x480x24' '" QEX_COMMAND
-                                 "' view --size 400x300 " +
-                                 words + " >out.txt 2>err.txt";
-        const int status = system(line.c_str());
-        return {WEXITSTATUS(status), ReadText(Path("out.txt")), ReadText(Path("err.txt"))};
+        // The command's status, not that of xvfb-run, which may trip over its own temporary files.
+        WriteText(Path("run"), "XDG_CONFIG_HOME=\"$PWD\" '" QEX_COMMAND "' view --size 400x300 " + words +
+                                   " >out.txt 2>err.txt; echo $? >status");
+        const std::string line =
+            "cd '" + Path("") +
+            "' && rm -f status && xvfb-run -a -s '-screen 0 640x480x24' sh run >xvfb.txt 2>&1";
+        if (system(line.c_str()) < 0) return {-1, "", ""};
+        const std::string status = ReadText(Path("status"));
+        return {status.empty() ? -1 : atoi(status.c_str()), ReadText(Path("out.txt")),
+                ReadText(Path("err.txt"))};
     }
     CommandResult Script(const std::string& files, const std::string& script) const {
         WriteText(Path("script"), script);
