@@ -4,6 +4,8 @@
 #include <algorithm>
 #include <cmath>
 
+#include "Shapes.h"
+
 namespace scenes {
 
 namespace {
@@ -48,16 +50,6 @@ pod::Material White() {
     return material;
 }
 
-// Two triangles for each cell of a grid of vertices, u first.
-void AddGridIndices(uint32_t across, uint32_t up, pod::MeshArrays* arrays) {
-    for (uint32_t y = 0; y + 1 < up; ++y)
-        for (uint32_t x = 0; x + 1 < across; ++x) {
-            const uint32_t i = y * across + x;
-            for (uint32_t index : {i, i + 1, i + across, i + across, i + 1, i + across + 1})
-                arrays->indices.push_back(index);
-        }
-}
-
 // A closed tube along +Y of radius 0.25, four rings to a bone, that tapers towards its end. A vertex follows
 // the bone beside it, node 2 and on, and the next one, the more the nearer it is.
 pod::MeshArrays Tube(uint32_t bones, float length) {
@@ -84,25 +76,17 @@ pod::MeshArrays Tube(uint32_t bones, float length) {
             arrays.boneWeights.push_back({static_cast<uint8_t>(255 - share), share, 0, 0});
         }
     }
-    AddGridIndices(kAround + 1, kRings * bones + 1, &arrays);
+    shapes::AddGridIndices(0, kAround + 1, kRings * bones + 1, &arrays);
     return arrays;
 }
 
 // A flat polygon, counter-clockwise from the side that is seen.
 void AddPolygon(const std::vector<pod::Vec3>& corners, pod::MeshArrays* arrays) {
-    const auto side = [&corners](size_t corner, size_t axis) {
-        return corners[corner][axis] - corners[0][axis];
-    };
-    pod::Vec3 normal;
-    for (size_t i = 0; i < 3; ++i) {
-        const size_t j = (i + 1) % 3, k = (i + 2) % 3;
-        normal[i] = side(1, j) * side(2, k) - side(1, k) * side(2, j);
-    }
-    const float length = std::hypot(normal[0], normal[1], normal[2]);
+    const pod::Vec3 normal = shapes::NormalOf(corners[0], corners[1], corners[2]);
     const auto first = static_cast<uint32_t>(arrays->positions.size());
     for (const pod::Vec3& corner : corners) {
         arrays->positions.push_back(corner);
-        arrays->normals.push_back({normal[0] / length, normal[1] / length, normal[2] / length});
+        arrays->normals.push_back(normal);
         arrays->uvs.push_back({corner[0], corner[1]});
     }
     for (uint32_t i = 2; i < corners.size(); ++i)
@@ -156,7 +140,7 @@ pod::MeshArrays Sheet(uint32_t size) {
             arrays.normals.push_back({0, 0, 1});
             arrays.uvs.push_back({u, v});
         }
-    AddGridIndices(size, size, &arrays);
+    shapes::AddGridIndices(0, size, size, &arrays);
     return arrays;
 }
 
@@ -197,7 +181,7 @@ pod::MeshArrays Sphere(uint32_t segments) {
                 {-std::sin(up) * std::sin(east), std::cos(up), -std::sin(up) * std::cos(east)});
             arrays.uvs.push_back({u, v});
         }
-    AddGridIndices(2 * segments + 1, segments + 1, &arrays);
+    shapes::AddGridIndices(0, 2 * segments + 1, segments + 1, &arrays);
     return arrays;
 }
 

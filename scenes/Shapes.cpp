@@ -10,6 +10,16 @@ namespace {
 
 constexpr float kTurn = 6.2831853f;
 
+uint32_t AddVertex(const pod::Vec3& position, const pod::Vec3& normal, const pod::Vec2& uv,
+                   pod::MeshArrays* mesh) {
+    mesh->positions.push_back(position);
+    mesh->normals.push_back(normal);
+    mesh->uvs.push_back(uv);
+    return static_cast<uint32_t>(mesh->positions.size()) - 1;
+}
+
+}  // namespace
+
 pod::Vec3 NormalOf(const pod::Vec3& a, const pod::Vec3& b, const pod::Vec3& c) {
     pod::Vec3 normal;
     for (size_t i = 0; i < 3; ++i) {
@@ -21,15 +31,14 @@ pod::Vec3 NormalOf(const pod::Vec3& a, const pod::Vec3& b, const pod::Vec3& c) {
     return normal;
 }
 
-uint32_t AddVertex(const pod::Vec3& position, const pod::Vec3& normal, const pod::Vec2& uv,
-                   pod::MeshArrays* mesh) {
-    mesh->positions.push_back(position);
-    mesh->normals.push_back(normal);
-    mesh->uvs.push_back(uv);
-    return static_cast<uint32_t>(mesh->positions.size()) - 1;
+void AddGridIndices(uint32_t first, uint32_t across, uint32_t up, pod::MeshArrays* mesh) {
+    for (uint32_t y = 0; y + 1 < up; ++y)
+        for (uint32_t x = 0; x + 1 < across; ++x) {
+            const uint32_t i = first + y * across + x;
+            for (const uint32_t index : {i, i + 1, i + across, i + across, i + 1, i + across + 1})
+                mesh->indices.push_back(index);
+        }
 }
-
-}  // namespace
 
 void AddTriangle(const std::array<pod::Vec3, 3>& corners, const std::array<pod::Vec2, 3>& uvs,
                  pod::MeshArrays* mesh) {
@@ -126,12 +135,7 @@ void AddLathe(const std::vector<pod::Vec2>& profile, int sides, const UvRect& uv
                       {uv.left + (uv.right - uv.left) * s, uv.bottom + (uv.top - uv.bottom) * t}, mesh);
         }
     }
-    const auto across = static_cast<uint32_t>(sides) + 1;
-    for (uint32_t i = 0; i + 1 < curve.size(); ++i)
-        for (uint32_t j = 0; j + 1 < across; ++j) {
-            const uint32_t a = first + i * across + j, b = a + across;
-            for (const uint32_t k : {a, a + 1, b, b, a + 1, b + 1}) mesh->indices.push_back(k);
-        }
+    AddGridIndices(first, static_cast<uint32_t>(sides) + 1, static_cast<uint32_t>(curve.size()), mesh);
 }
 
 void AddBlob(const pod::Vec3& centre, const pod::Vec3& radii, int sides, const UvRect& uv,
@@ -150,11 +154,7 @@ void AddBlob(const pod::Vec3& centre, const pod::Vec3& radii, int sides, const U
             AddVertex(position, out,
                       {uv.left + (uv.right - uv.left) * s, uv.bottom + (uv.top - uv.bottom) * t}, mesh);
         }
-    for (uint32_t i = 0; i < up; ++i)
-        for (uint32_t j = 0; j < across; ++j) {
-            const uint32_t a = first + i * (across + 1) + j, b = a + across + 1;
-            for (const uint32_t k : {a, a + 1, b, b, a + 1, b + 1}) mesh->indices.push_back(k);
-        }
+    AddGridIndices(first, across + 1, up + 1, mesh);
 }
 
 }  // namespace shapes

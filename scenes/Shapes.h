@@ -13,6 +13,10 @@ struct UvRect {
     float left, bottom, right, top;
 };
 
+// Of length 1, towards the side from which a, b and c are counter-clockwise; zeros where they are in line.
+pod::Vec3 NormalOf(const pod::Vec3& a, const pod::Vec3& b, const pod::Vec3& c);
+// Two triangles for each cell of a grid of vertices that begins at `first`, u first.
+void AddGridIndices(uint32_t first, uint32_t across, uint32_t up, pod::MeshArrays* mesh);
 // A flat quad; its corners are those of the rectangle from the lower left on, counter-clockwise.
 void AddQuad(const std::array<pod::Vec3, 4>& corners, const UvRect& uv, pod::MeshArrays* mesh);
 void AddTriangle(const std::array<pod::Vec3, 3>& corners, const std::array<pod::Vec2, 3>& uvs,

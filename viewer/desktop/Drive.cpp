@@ -102,22 +102,20 @@ bool Resize(Window* window, std::istringstream& words) {
     return true;
 }
 
-bool Drop(Window* window, std::istringstream& words) {
-    std::string file;
-    std::getline(words >> std::ws, file);
-    SDL_Event event = {};
-    event.type = SDL_DROPFILE;
-    event.drop.file = SDL_strdup(file.c_str());
-    window->Take(event);
-    window->Settle();
-    return true;
-}
-
 // The rest of a line.
 std::string Rest(std::istringstream& words) {
     std::string text;
     std::getline(words >> std::ws, text);
     return text;
+}
+
+bool Drop(Window* window, std::istringstream& words) {
+    SDL_Event event = {};
+    event.type = SDL_DROPFILE;
+    event.drop.file = SDL_strdup(Rest(words).c_str());
+    window->Take(event);
+    window->Settle();
+    return true;
 }
 
 bool SayMessages(Window* window, std::istringstream&) {

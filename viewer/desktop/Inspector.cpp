@@ -37,12 +37,6 @@ double MegabytesInUse() {
     return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / (1 << 20);
 }
 
-const char* FormatName(uint32_t format) {
-    static const char* const kNames[] = {"compressed or other", "RGBA 8888", "RGBA 4444", "RGBA 5551",
-                                         "RGB 565"};
-    return format < sizeof kNames / sizeof kNames[0] ? kNames[format] : "other";
-}
-
 int MipLevels(const QexTexture& texture) {
     int levels = 1;
     for (uint32_t side = std::max(static_cast<uint32_t>(texture.width), texture.height); side > 1; side /= 2)
@@ -112,17 +106,15 @@ void Inspector::ShowView() {
                 edited_.effects.shader = name == names[0] ? "" : name;
         ImGui::EndCombo();
     }
-    static const char* const kOverlays[] = {"grid", "wireframe", "boxes", "bones", "normals"};
     for (int i = 0; i < static_cast<int>(Overlay::kCount); ++i) {
         bool on = viewer_->Shows(static_cast<Overlay>(i));
         if (i % 3) ImGui::SameLine(static_cast<float>(i % 3) * 110);
-        if (ImGui::Checkbox(kOverlays[i], &on)) viewer_->Show(static_cast<Overlay>(i), on);
+        if (ImGui::Checkbox(kOverlayNames[i], &on)) viewer_->Show(static_cast<Overlay>(i), on);
     }
 }
 
-void Inspector::ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children) {
-    const QexPODModel& scene = viewer_->View().Model()->scene;
-    const std::string name = NodeWord(scene, index);
+void Inspector::ShowNode(uint32_t index) {
+    const std::string& name = nodeWords_[index];
     ImGui::PushID(static_cast<int>(index));
     bool shown = !IsHidden(edited_, name);
     if (ImGui::Checkbox("##shown", &shown)) {
@@ -130,21 +122,17 @@ void Inspector::ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>
         if (!shown)
             nodes.push_back({name, NodeChange::kHide, {0, 0, 0}});
         else
-            nodes.erase(std::remove_if(nodes.begin(), nodes.end(),
-                                       [&](const NodeChange& c) {
-                                           return c.what == NodeChange::kHide && c.node == name;
-                                       }),
-                        nodes.end());
+            TakeBack(&nodes, NodeChange::kHide, name);
     }
     ImGui::SameLine();
     ImGuiTreeNodeFlags flags =
         ImGuiTreeNodeFlags_DefaultOpen | ImGuiTreeNodeFlags_OpenOnArrow | ImGuiTreeNodeFlags_SpanAvailWidth;
-    if (children[index].empty()) flags |= ImGuiTreeNodeFlags_Leaf;
+    if (children_[index].empty()) flags |= ImGuiTreeNodeFlags_Leaf;
     if (viewer_->Selected() == static_cast<int>(index)) flags |= ImGuiTreeNodeFlags_Selected;
     const bool open = ImGui::TreeNodeEx(name.c_str(), flags);
     if (ImGui::IsItemClicked()) viewer_->Select(static_cast<int>(index));
     if (open) {
-        for (const uint32_t child : children[index]) ShowNode(child, children);
+        for (const uint32_t child : children_[index]) ShowNode(child);
         ImGui::TreePop();
     }
     ImGui::PopID();
@@ -152,12 +140,18 @@ void Inspector::ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>
 
 void Inspector::ShowNodes() {
     const QexPODModel& scene = viewer_->View().Model()->scene;
-    std::vector<std::vector<uint32_t>> children(scene.nodeCount);
+    if (loads_ != viewer_->Loads()) {
+        loads_ = viewer_->Loads();
+        nodeWords_.clear();
+        children_.assign(scene.nodeCount, {});
+        for (uint32_t i = 0; i < scene.nodeCount; ++i) {
+            nodeWords_.push_back(NodeWord(scene, i));
+            const int32_t parent = scene.nodes[i].parentIndex;
+            if (parent >= 0) children_[static_cast<size_t>(parent)].push_back(i);
+        }
+    }
     for (uint32_t i = 0; i < scene.nodeCount; ++i)
-        if (scene.nodes[i].parentIndex >= 0)
-            children[static_cast<size_t>(scene.nodes[i].parentIndex)].push_back(i);
-    for (uint32_t i = 0; i < scene.nodeCount; ++i)
-        if (scene.nodes[i].parentIndex < 0) ShowNode(i, children);
+        if (scene.nodes[i].parentIndex < 0) ShowNode(i);
 }
 
 // Where the selected node is moved, how it is turned, and whether the scene is mirrored in it.
@@ -165,7 +159,7 @@ void Inspector::ShowSelected() {
     const QexPODModel& scene = viewer_->View().Model()->scene;
     if (viewer_->Selected() < 0) return;
     const uint32_t index = static_cast<uint32_t>(viewer_->Selected());
-    const std::string name = NodeWord(scene, index);
+    const std::string& name = nodeWords_[index];
     EffectOptions& e = edited_.effects;
     const struct {
         const char* label;
@@ -215,9 +209,10 @@ void Inspector::ShowMaterials() {
             changed |= ImGui::SliderFloat("opacity", &material.opacity, 0, 1);
             if (changed)
                 ChangeMaterial(MaterialWord(model->scene, i), viewer_->View().MaterialOf(i), material);
-            if (const QexTexture* texture = model->textures[i]) {
+            if (HasTexture(model, i)) {
+                const QexTexture* texture = model->textures[i];
                 ImGui::Text("%s: %d x %u, %s, up to %d levels", texture->name, texture->width,
-                            texture->height, FormatName(texture->format), MipLevels(*texture));
+                            texture->height, FormatName(*texture), MipLevels(*texture));
                 // The first row is the lower edge.
                 ImGui::Image(reinterpret_cast<ImTextureID>(static_cast<uintptr_t>(texture->glName)),
                              {160, 160}, {0, 1}, {1, 0});

@@ -3,6 +3,7 @@
 
 #include <map>
 #include <string>
+#include <vector>
 
 #include "front/Viewer.h"
 
@@ -27,7 +28,7 @@ class Inspector {
     void ShowPlayback();
     void ShowView();
     void ShowNodes();
-    void ShowNode(uint32_t index, const std::vector<std::vector<uint32_t>>& children);
+    void ShowNode(uint32_t index);
     void ShowSelected();
     void ShowMaterials();
     void ChangeMaterial(const std::string& name, const QexPODMaterial& before, const QexPODMaterial& after);
@@ -40,6 +41,10 @@ class Inspector {
 
     Viewer* viewer_;
     SceneOptions edited_;
+    // Of the scene of that load.
+    size_t loads_ = 0;
+    std::vector<std::string> nodeWords_;
+    std::vector<std::vector<uint32_t>> children_;
     // Emitters whose values no file has, and which record they were changed in.
     std::map<std::string, const QexParticleEmitter*> unsaved_;
 };

@@ -16,10 +16,8 @@ namespace {
 
 using json = nlohmann::ordered_json;
 
-constexpr double kMost = 1e9;  // of any number
-const char* const kOverlayNames[] = {"grid", "wireframe", "boxes", "bones", "normals"};
+constexpr double kMost = 1e9;                                                           // of any number
 const char* const kMaterialFields[] = {"diffuse", "specular", "shininess", "opacity"};  // as changes' What
-const char* const kFormatNames[] = {"compressed or other", "RGBA 8888", "RGBA 4444", "RGBA 5551", "RGB 565"};
 
 bool ReadNumber(const json& value, double* number) {
     if (value.is_number()) *number = std::clamp(value.get<double>(), -kMost, kMost);
@@ -166,12 +164,9 @@ bool SetHidden(Viewer* v, const json& value) {
         !std::all_of(value.begin(), value.end(), [](const json& name) { return name.is_string(); }))
         return false;
     return Alter(v, [&](SceneOptions* o) {
-        auto& nodes = o->effects.nodes;
-        nodes.erase(std::remove_if(nodes.begin(), nodes.end(),
-                                   [](const NodeChange& c) { return c.what == NodeChange::kHide; }),
-                    nodes.end());
+        TakeBack(&o->effects.nodes, NodeChange::kHide);
         for (const json& name : value)
-            nodes.push_back({name.get<std::string>(), NodeChange::kHide, {0, 0, 0}});
+            o->effects.nodes.push_back({name.get<std::string>(), NodeChange::kHide, {0, 0, 0}});
         return true;
     });
 }
@@ -346,10 +341,8 @@ std::string DescribeScene(Viewer* viewer) {
         json texture;
         const QexTexture* t = model->textures[i];
         if (HasTexture(model, i))
-            texture = {{"name", t->name},
-                       {"width", t->width},
-                       {"height", t->height},
-                       {"format", kFormatNames[t->format < 5 ? t->format : 0]}};
+            texture = {
+                {"name", t->name}, {"width", t->width}, {"height", t->height}, {"format", FormatName(*t)}};
         materials.push_back({{"name", MaterialWord(scene, i)},
                              {"diffuse", Numbers(m.diffuse, 3)},
                              {"specular", Numbers(m.specular, 3)},

@@ -311,12 +311,7 @@ void HideSelected(V* v) {
 }
 
 void ShowAllNodes(V* v) {
-    Alter(v, [](SceneOptions* o) {
-        auto& nodes = o->effects.nodes;
-        nodes.erase(std::remove_if(nodes.begin(), nodes.end(),
-                                   [](const NodeChange& c) { return c.what == NodeChange::kHide; }),
-                    nodes.end());
-    });
+    Alter(v, [](SceneOptions* o) { TakeBack(&o->effects.nodes, NodeChange::kHide); });
 }
 
 }  // namespace

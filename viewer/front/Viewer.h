@@ -27,6 +27,7 @@ struct ViewerEvent {
 };
 
 enum class Overlay { kGrid, kWireframe, kBoxes, kBones, kNormals, kCount };
+extern const char* const kOverlayNames[static_cast<size_t>(Overlay::kCount)];
 
 // The last frames' times and the scene's size.
 struct ViewerStatistics {

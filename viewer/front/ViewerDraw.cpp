@@ -19,6 +19,8 @@ constexpr uint32_t kMostEdges = 60000;  // of wires and normals that are drawn, 
 
 }  // namespace
 
+const char* const kOverlayNames[] = {"grid", "wireframe", "boxes", "bones", "normals"};
+
 // Triangles as they are in the world, skinned ones in their meshes' own pose.
 void Viewer::AddMesh(uint32_t node, bool wires, bool normals) {
     QexModel* model = view_->Model();

@@ -1,6 +1,7 @@
 // Names of parts, and changes of them.
 #include "scene/Changes.h"
 
+#include <algorithm>
 #include <cstdlib>
 
 const ChangeWord kNodeChanges[4] = {{"hide", 0}, {"move:", 3}, {"rotate:", 3}, {"face:", 3}};
@@ -92,6 +93,13 @@ int32_t FindNode(const QexModel& model, const std::string& word, std::string* pr
 
 int32_t FindMaterial(const QexModel& model, const std::string& word, std::string* problem) {
     return Find(MaterialsOf(model.scene), word, problem);
+}
+
+void TakeBack(std::vector<NodeChange>* changes, NodeChange::What what, const std::string& node) {
+    const auto taken = [&](const NodeChange& c) {
+        return c.what == what && (node.empty() || c.node == node);
+    };
+    changes->erase(std::remove_if(changes->begin(), changes->end(), taken), changes->end());
 }
 
 std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes) {

@@ -46,6 +46,9 @@ int32_t FindMaterial(const QexModel& model, const std::string& word, std::string
 std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes);
 std::string ChangeMaterials(QexModel* model, const std::vector<MaterialChange>& changes);
 
+// Takes changes of nodes back: all of a kind, or those of the node that is named.
+void TakeBack(std::vector<NodeChange>* changes, NodeChange::What what, const std::string& node = "");
+
 // Adds a change that takes the place of an earlier one of the same kind.
 template <class Change>
 void SetChange(std::vector<Change>* changes, const Change& change, std::string Change::*part) {

@@ -40,6 +40,7 @@ void SceneView::Unload() {
     sky_.reset();
     emitters_.reset();
     points_.clear();
+    size_ = 1;
     transparentCount_ = 0;
     if (!model_) return;
     ForgetTextures(model_.get());

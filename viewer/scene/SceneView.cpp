@@ -31,6 +31,7 @@ void SceneView::SetFrame(double frame) {
 void SceneView::FitTo(const std::vector<double>& frames) {
     frames_ = frames;
     points_.clear();
+    size_ = 1;
     if (!model_) return;
     const double shown = frame_;
     // Of long sequences some pictures stand for all.
@@ -44,17 +45,13 @@ void SceneView::FitTo(const std::vector<double>& frames) {
     SetFrame(shown);
     const std::optional<float> mirror =
         options_.effects.mirror ? options_.effects.mirror : options_.effects.water;
-    if (!mirror) return;
-    for (size_t i = 0, seen = points_.size(); i < seen; ++i) {
+    for (size_t i = 0, seen = mirror ? points_.size() : 0; i < seen; ++i) {
         const QexVec3 p = points_[i];
         points_.push_back({p.x, 2 * *mirror - p.y, p.z});
     }
-}
-
-float SceneView::Size() const {
     const Bounds bounds = BoundsOf(points_);
     const float edge = bounds.empty ? 0 : bounds.LongestEdge();
-    return edge > 0 ? edge : 1;
+    if (edge > 0) size_ = edge;
 }
 
 // With the eyes side by side each has half the picture.
@@ -63,13 +60,14 @@ void SceneView::PlaceCamera(float turned) {
     const int width = options_.effects.stereo == 3 ? std::max(whole / 2, 1) : whole;
     const float aspect = static_cast<float>(width) / static_cast<float>(engine_->height / scale_);
     QexCamera_Create(&camera_, 0);
-    OrbitView view = ChooseView(points_, options_.view);
-    view.yaw += turned;
     const uint32_t camera = static_cast<uint32_t>(options_.camera.value_or(0));
     if (options_.look)
         LookAlong(*options_.look, options_.view.up, points_, floor_ ? Size() : 0, aspect, &camera_);
-    else if (UsesAutoCamera() || !model_ || !UseSceneCamera(model_.get(), camera, aspect, &camera_))
+    else if (UsesAutoCamera() || !model_ || !UseSceneCamera(model_.get(), camera, aspect, &camera_)) {
+        OrbitView view = ChooseView(points_, options_.view);
+        view.yaw += turned;
         FramePoints(points_, view, aspect, &camera_);
+    }
 }
 
 void SceneView::Draw(float turned) {

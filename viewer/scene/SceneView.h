@@ -61,7 +61,7 @@ class SceneView {
     const QexModel* Model() const { return model_.get(); }
     const QexCamera& Camera() const { return camera_; }
     const std::vector<QexVec3>& Points() const { return points_; }
-    float Size() const;
+    float Size() const { return size_; }  // the points' longest edge
     Emitters* Particles() { return emitters_.get(); }
     QexRuntimeContext* Engine() { return engine_; }
     bool UsesAutoCamera() const { return autoCamera || options_.autoCamera; }
@@ -101,6 +101,7 @@ class SceneView {
     int scale_ = 1;
     std::vector<double> frames_ = {0};
     std::vector<QexVec3> points_;  // that the automatic camera frames
+    float size_ = 1;
     std::vector<TransparentSPODNodeInfo> transparent_;
     uint32_t transparentCount_ = 0;
 };

@@ -232,6 +232,12 @@ std::vector<std::string> LoadNormalMaps(QexModel* model) {
     return lookup.problems;
 }
 
+const char* FormatName(const QexTexture& texture) {
+    static const char* const kNames[] = {"compressed or other", "RGBA 8888", "RGBA 4444", "RGBA 5551",
+                                         "RGB 565"};
+    return kNames[texture.format < 5 ? texture.format : 0];
+}
+
 bool HasTexture(const QexModel* model, uint32_t material) {
     const std::vector<bool>& coloured = LookupOf(model).coloured;
     return model->textures[material] && material < coloured.size() && !coloured[material];

@@ -43,6 +43,9 @@ std::vector<std::string> CompleteTextures(QexModel* model, const std::vector<boo
 // with them, one line each.
 std::vector<std::string> LoadNormalMaps(QexModel* model);
 
+// How a texture holds its pixels, for people.
+const char* FormatName(const QexTexture& texture);
+
 // Whether a material has a texture, not only one of its colour.
 bool HasTexture(const QexModel* model, uint32_t material);
 

@@ -29,7 +29,7 @@ function send(kind, x, y, button = 0, amount = 0, modifiers = 0, text = '') {
     redraw();
 }
 
-export function set(properties) {
+function set(properties) {
     module.ccall('Page_Set', 'number', ['string'], [JSON.stringify(properties)]);
     redraw();
 }
