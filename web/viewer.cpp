@@ -59,6 +59,11 @@ EMSCRIPTEN_KEEPALIVE void Page_Add(const char* name, const void* bytes, size_t s
     s_Viewer->OpenBytes(name, bytes, size);
 }
 
+// Without showing it: a picture for the sky.
+EMSCRIPTEN_KEEPALIVE const char* Page_Keep(const char* name, const void* bytes, size_t size) {
+    return Return(s_Viewer->KeepBytes(name, bytes, size));
+}
+
 EMSCRIPTEN_KEEPALIVE const char* Page_Choices() {
     return Return(DescribeChoices());
 }

@@ -99,6 +99,23 @@ TEST_F(QexView, FilesThatChangeAreShownAnewFromTheSamePlace) {
     EXPECT_EQ(result.out, first + first);  // the camera
 }
 
+TEST_F(QexView, AnotherAnimationIsChosen) {
+    const std::string animated = "/usr/share/assimp/models/X/Testwuson.X";
+    if (!std::filesystem::exists(animated)) GTEST_SKIP() << animated << " is not installed";
+    const CommandResult result = Script(
+        animated, "scrub 3\nscreenshot first.png\nclip 1\nscrub 3\nline drawn.png\nscreenshot shown.png\n");
+    ASSERT_EQ(result.status, 0) << result.err;
+    const size_t at = result.out.find("qex render");
+    ASSERT_TRUE(at != std::string::npos && Contains(result.out, " --clip=1 && ")) << result.out;
+    std::string line = "cd '" + Path("") + "' && " + result.out;
+    for (size_t i = 0; (i = line.find("qex ", i)) != std::string::npos; i += strlen(QEX_COMMAND) + 2)
+        line.replace(i, 3, "'" QEX_COMMAND "'");
+    ASSERT_EQ(system(line.c_str()), 0) << line;
+    EXPECT_EQ(Differing(LoadPicture("shown.png"), LoadPicture("drawn.png"), 1), 0) << line;
+    EXPECT_GT(Differing(LoadPicture("shown.png"), LoadPicture("first.png"), 8), 0.2);
+    EXPECT_NE(Script(animated, "clip 9\n").status, 0);
+}
+
 TEST_F(QexView, SaysWhatItCannotShow) {
     WriteScene(Path("quad.pod"), QuadScene());
     WriteText(Path("broken.pod"), "no scene");

@@ -38,8 +38,8 @@ TEST(CommandWords, WhatIsPrintedIsReadAsTheSame) {
         {"--sky=1", "--sky=2", "--sky=3", "--sky=4", "--sky=5", "--sky=6"},
         {"--emitter=a.json", "--emitter=b", "--emitter-texture=c.png", "--emitter-time=0.7"},
         {"--node=a=b=hide", "--node=c=move:1,-2,3.3", "--node=d=rotate:0,90,0", "--node=e=face:0,0,1",
-         "--material=a=diffuse:0.1,0,1", "--material=b=c=specular:1,0.2,0", "--material=#1=shininess:12.5",
-         "--material=d=opacity:0.3", "--pick=1,2", "--pick=0.5,3"},
+         "--node=f=shader:depth", "--material=a=diffuse:0.1,0,1", "--material=b=c=specular:1,0.2,0",
+         "--material=#1=shininess:12.5", "--material=d=opacity:0.3", "--pick=1,2", "--pick=0.5,3"},
         {"--texture=skin=/dev/null/../null", "--flip-textures=no"},
         {"--drawing=described", "--stats", "--quiet"},
     };

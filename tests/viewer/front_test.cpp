@@ -148,6 +148,55 @@ TEST_F(Front, ShowsPicksAndKeepsAScene) {
     EXPECT_NEAR(static_cast<double>(Covered()), static_cast<double>(covered), 300.0);
 }
 
+// The quad's parent is turned and twice as large.
+TEST_F(Front, TheHandMovesNodesAndLights) {
+    pod::Scene scene = QuadScene();
+    scene.nodes[0].parent = 3;
+    scene.nodes.push_back(
+        pod::BuildNode("parent", {{}, {{0, 0, 0.70710678f, 0.70710678f}}, {{2, 2, 2}}, {}}));
+    WriteScene(Path("quad.pod"), scene);
+    Load(Path("quad.pod"));
+    Press("1");
+    const auto middle = [this] {
+        const Bytes pixels = viewer_.Picture(200, 100, 1);
+        double x = 0, y = 0, count = 0;
+        for (size_t i = 0; i < pixels.size(); i += 4)
+            if (std::abs(pixels[i] - 0x40) > 3)
+                x += static_cast<double>(i / 4 % 200), y += static_cast<double>(i / 800), ++count;
+        return std::pair(x / count, y / count);
+    };
+    const auto drag = [this](float dx, float dy, unsigned modifiers) {
+        ViewerEvent event = At(ViewerEvent::kPointerDown, 100, 50);
+        event.modifiers = modifiers;
+        viewer_.Handle(event);
+        for (const float part : {0.5f, 1.0f})
+            viewer_.Handle(At(ViewerEvent::kPointerMove, 100 + part * dx, 50 + part * dy));
+        viewer_.Handle(At(ViewerEvent::kPointerUp, 100 + dx, 50 + dy));
+    };
+    ViewerEvent away = At(ViewerEvent::kWheel, 0, 0);
+    away.amount = -6;
+    viewer_.Handle(away);
+    const auto before = middle();
+    Pointer(100, 50, 100, 50);
+    const LookView look = *viewer_.Options().look;
+    drag(20, -10, kAlt);
+    const auto after = middle();
+    EXPECT_NEAR(after.first - before.first, 20, 1);
+    EXPECT_NEAR(after.second - before.second, -10, 1);
+
+    SceneOptions options = viewer_.Options();
+    options.effects.nodes.clear();
+    options.effects.lights = {{QEX_LIGHT_POINT, {look.target.x, look.target.y, look.target.z}, {1, 1, 1, 1}}};
+    viewer_.SetOptions(options);
+    drag(-15, 25, 0);
+    // 40 degrees are 100 pixels.
+    const float pixel = 2 * (look.eye.z - look.target.z) * std::tan(20 * 3.14159265f / 180) / 100;
+    const float* place = viewer_.Options().effects.lights[0].vector;
+    ExpectNear({place[0], place[1], place[2]},
+               {look.target.x - 15 * pixel, look.target.y - 25 * pixel, look.target.z}, pixel / 2);
+    ExpectNear(viewer_.Options().look->eye, look.eye, 1e-4f);
+}
+
 TEST_F(Front, KeysChangeThePictureAndChangeItBack) {
     WriteScene(Path("quad.pod"), QuadScene());
     Load(Path("quad.pod"));
@@ -168,17 +217,21 @@ TEST_F(Front, PropertiesAreReadAndSetAsJson) {
     WriteScene(Path("quad.pod"), QuadScene());
     Load(Path("quad.pod"));
     const std::string node = json::parse(DescribeScene(&viewer_))["nodes"][0]["name"];
-    const json wanted = {{"shader", "gouraud"},
-                         {"lean", false},
-                         {"background", "#102030"},
-                         {"floor", -2.5},
-                         {"shadow", true},
-                         {"up", "-z"},
-                         {"overlays", {{"grid", true}}},
-                         {"hidden", {node}},
-                         {"lights", {{{"place", {1, 2, 3}}, {"colour", {1, 0.5, 0}}}}},
-                         {"selected", 0},
-                         {"material", {{"index", 0}, {"opacity", 0.25}}}};
+    const json wanted = {
+        {"shader", "gouraud"},
+        {"lean", false},
+        {"background", "#102030"},
+        {"floor", -2.5},
+        {"shadow", true},
+        {"up", "-z"},
+        {"overlays", {{"grid", true}}},
+        {"hidden", {node}},
+        {"lights", {{{"place", {1, 2, 3}}, {"colour", {1, 0.5, 0}}}}},
+        {"selected", 0},
+        {"node",
+         {{"name", node}, {"mesh", true}, {"move", {0, 1, 0}}, {"turn", {0, 0, 30}}, {"shader", "depth"}}},
+        {"material", {{"index", 0}, {"opacity", 0.25}}}};
+    viewer_.Select(0);
     EXPECT_TRUE(SetProperties(&viewer_, wanted.dump()));
     const json state = json::parse(DescribeState(&viewer_));
     for (const auto& [name, value] : wanted.items())
@@ -197,6 +250,9 @@ TEST_F(Front, PropertiesAreReadAndSetAsJson) {
                                  R"({"background": "#12345g"})",
                                  R"({"lights": [{"place": [1, 2]}]})",
                                  R"({"hidden": [3]})",
+                                 R"({"node": {"shader": "none"}})",
+                                 R"({"node": {"move": [1, 2]}})",
+                                 R"({"sky": ["one.png", "two.png"]})",
                                  R"({"material": {"index": 1e300, "opacity": 1}})",
                                  R"({"material": {"index": 0, "diffuse": [1, "a", 2]}})",
                                  R"({"depthOfField": {"sigma": null}})"};
@@ -224,6 +280,17 @@ TEST_F(Front, ShowsFilesThatComeAsBytes) {
     EXPECT_EQ(viewer_.Messages().size(), 1u);  // its texture is missing
     Press("1");
     const Bytes before = viewer_.Picture(200, 100, 1);
+    // Six green squares in a cross, and what is no cross.
+    const std::string sky = viewer_.KeepBytes("sky.tga", Tga(8, 6).data(), Tga(8, 6).size());
+    EXPECT_TRUE(SetProperties(&viewer_, json({{"sky", {sky}}}).dump()));
+    const Bytes green = viewer_.Picture(200, 100, 1);
+    EXPECT_GT(green[1], green[0] + 100);
+    const size_t said = viewer_.Said();
+    viewer_.KeepBytes("sky.tga", Tga(7, 6).data(), Tga(7, 6).size());
+    for (const json& files : {json::array(), json({sky}), json::array()})
+        EXPECT_TRUE(SetProperties(&viewer_, json({{"sky", files}}).dump()));
+    EXPECT_EQ(viewer_.Said(), said + 1);
+    EXPECT_EQ(viewer_.Picture(200, 100, 1), before);
     add("words.txt", {'w'});
     EXPECT_EQ(viewer_.FailedLoads(), 1u);
     add("picture.tga", Tga(2, 4));
@@ -235,10 +302,9 @@ TEST_F(Front, ShowsFilesThatComeAsBytes) {
     EXPECT_EQ(viewer_.Name(), "other.tga");
     const Bounds box = BoundsOf(viewer_.View().Points());
     EXPECT_FLOAT_EQ((box.high.y - box.low.y) / (box.high.x - box.low.x), 2);
-
-    // What the command draws is what the viewer shows, but for the samples of edges.
 }
 
+// What the command draws is what the viewer shows, but for the samples of edges.
 TEST_F(Front, CommandLinesSayWhatIsShown) {
     WriteScene(Path("quad.pod"), QuadScene());
     Load(Path("quad.pod"));
@@ -253,6 +319,9 @@ TEST_F(Front, CommandLinesSayWhatIsShown) {
         },
         [](EffectOptions* e) {
             e->nodes = {{"quad", NodeChange::kMove, {0.4f, 0.1f, 0}}};
+        },
+        [](EffectOptions* e) {
+            e->nodes = {{"quad", NodeChange::kShader, {0, 0, 0}, "depth"}};
         },
         [](EffectOptions* e) {
             e->lights = {{QEX_LIGHT_POINT, {-2, 1, 1}, {1, 0.2f, 0, 1}}};

@@ -25,6 +25,12 @@ DROP = """
     for (const url of a.slice(0, -1)) transfer.items.add(new File([await (await fetch(url)).arrayBuffer()], url.split('/').pop()));
     window.dispatchEvent(new DragEvent('drop', {dataTransfer: transfer, cancelable: true}));
 """
+SKY = """
+    const transfer = new DataTransfer(), input = [...document.querySelectorAll('.row')].find(row => row.firstChild.textContent === 'sky').children[1];
+    transfer.items.add(new File([await (await fetch(a[0])).arrayBuffer()], 'sky.tga'));
+    input.files = transfer.files;
+    input.onchange();
+"""
 MESSAGE = "return document.getElementById('message').textContent"
 SAVE = """
     const saved = new Promise(done => { HTMLAnchorElement.prototype.click = function() { done(this.href); }; });
@@ -143,9 +149,22 @@ class ViewerPage(unittest.TestCase):
         browser.act("mouse", [(x, y)])
         self.settle()
         self.assertEqual(len(browser.run(chosen)), 1)
+        self.far()
+        browser.run(CONTROL, "module", "depth")
+        self.assertGreater(self.far(), 0.01)
         browser.run("window.dispatchEvent(new KeyboardEvent('keydown', {key: 'Escape'}))")
         self.settle()
         self.assertEqual(browser.run(chosen), [])
+
+    def test_a_picture_becomes_the_sky(self):
+        with open(os.path.join(self.files, "sky.tga"), "wb") as file:  # six blue squares in a cross
+            file.write(bytes([0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 0, 0, 4, 0, 3, 0, 24, 0]) + bytes([255, 80, 0]) * 12)
+        self.far()
+        self.browser.run(SKY, f"{self.url}/files/sky.tga")
+        self.browser.run("await new Promise(r => setTimeout(r, 300))")
+        self.assertGreater(self.far(), 0.3)
+        self.browser.run(CONTROL, "water")
+        self.assertGreater(self.far(), 0.05)
 
     def test_files_are_dropped_and_broken_ones_named(self):
         browser = self.browser

@@ -28,7 +28,7 @@ void Conversion::Stop() {
     folder_.clear();
 }
 
-bool Conversion::Start(const std::string& input, std::string* problem) {
+bool Conversion::Start(const std::string& input, std::optional<size_t> clip, std::string* problem) {
     Stop();
     input_ = input;
     std::string pattern = (std::filesystem::temp_directory_path() / "qex-view-XXXXXX").string();
@@ -41,13 +41,22 @@ bool Conversion::Start(const std::string& input, std::string* problem) {
     const std::string from = std::filesystem::absolute(input).string(), to = Output(),
                       said = folder_ + "/said";
     const int messages = open(said.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
-    child_ = StartQex({"convert", from, "-o", to, "--quiet"}, messages);
+    std::vector<std::string> words = {"convert", from, "-o", to, "--quiet", "--clips-to", folder_ + "/clips"};
+    if (clip) words.push_back("--clip=" + std::to_string(*clip));
+    child_ = StartQex(words, messages);
     const int error = errno;
     if (messages >= 0) close(messages);
     if (child_ > 0) return true;
     *problem = std::string("no process can be started for it: ") + strerror(error);
     child_ = 0;
     return false;
+}
+
+std::vector<std::string> Conversion::Clips() const {
+    std::vector<std::string> names;
+    std::ifstream list(folder_ + "/clips");
+    for (std::string line; std::getline(list, line);) names.push_back(line);
+    return names;
 }
 
 Conversion::State Conversion::Poll(std::string* problem) {

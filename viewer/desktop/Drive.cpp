@@ -118,6 +118,13 @@ bool Drop(Window* window, std::istringstream& words) {
     return true;
 }
 
+bool Clip(Window* window, std::istringstream& words) {
+    size_t clip = 0;
+    if (!(words >> clip) || !window->ChooseClip(clip)) return false;
+    window->Settle();
+    return true;
+}
+
 bool SayMessages(Window* window, std::istringstream&) {
     for (const std::string& message : window->Front().Messages()) printf("%s\n", message.c_str());
     return true;
@@ -144,6 +151,7 @@ const struct {
     {"wait", Wait},
     {"size", Resize},
     {"open", Drop},
+    {"clip", Clip},
     {"select", SaySelected},
     {"messages", SayMessages},
     {"line", [](Window* w, std::istringstream& s) { return printf("%s\n", w->Line(Rest(s)).c_str()) > 0; }},

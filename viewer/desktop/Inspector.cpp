@@ -28,6 +28,20 @@ bool Optional(const char* label, std::optional<float>* value, float otherwise, f
     return changed;
 }
 
+// A module by its name, or none, which is called `otherwise`.
+bool ChooseShader(const char* label, const char* otherwise, std::string* shader) {
+    if (!ImGui::BeginCombo(label, shader->empty() ? otherwise : shader->c_str())) return false;
+    bool changed = ImGui::Selectable(otherwise, shader->empty());
+    if (changed) shader->clear();
+    for (const std::string& name : ShaderNames())
+        if (ImGui::Selectable(name.c_str(), name == *shader)) {
+            *shader = name;
+            changed = true;
+        }
+    ImGui::EndCombo();
+    return changed;
+}
+
 double MegabytesInUse() {
     unsigned long pages = 0, resident = 0;
     if (FILE* file = fopen("/proc/self/statm", "r")) {
@@ -72,6 +86,21 @@ void Inspector::ShowPlayback() {
     if (ImGui::SliderFloat("speed", &speed, -4, 4, "%.2f")) play.SetSpeed(static_cast<double>(speed));
 }
 
+std::optional<size_t> Inspector::ChooseClip(const std::vector<std::string>& clips, size_t clip) {
+    const auto name = [&](size_t i) {
+        return clips[i].empty() ? "animation " + std::to_string(i) : clips[i];
+    };
+    std::optional<size_t> chosen;
+    if (!ImGui::BeginCombo("clip", name(std::min(clip, clips.size() - 1)).c_str())) return chosen;
+    for (size_t i = 0; i < clips.size(); ++i) {
+        ImGui::PushID(static_cast<int>(i));
+        if (ImGui::Selectable(name(i).c_str(), i == clip)) chosen = i;
+        ImGui::PopID();
+    }
+    ImGui::EndCombo();
+    return chosen;
+}
+
 void Inspector::ShowView() {
     if (ImGui::Button("Frame all")) viewer_->FrameAll();
     const QexModel* model = viewer_->View().Model();
@@ -97,15 +126,7 @@ void Inspector::ShowView() {
     }
     int drawing = edited_.lean ? 0 : 1;
     if (ImGui::Combo("drawing", &drawing, "lean\0described\0")) edited_.lean = drawing == 0;
-    std::vector<std::string> names = ShaderNames();
-    names.insert(names.begin(), "default look");
-    const std::string current = edited_.effects.shader.empty() ? names[0] : edited_.effects.shader;
-    if (ImGui::BeginCombo("shader", current.c_str())) {
-        for (const std::string& name : names)
-            if (ImGui::Selectable(name.c_str(), name == current))
-                edited_.effects.shader = name == names[0] ? "" : name;
-        ImGui::EndCombo();
-    }
+    ChooseShader("shader", "default look", &edited_.effects.shader);
     for (int i = 0; i < static_cast<int>(Overlay::kCount); ++i) {
         bool on = viewer_->Shows(static_cast<Overlay>(i));
         if (i % 3) ImGui::SameLine(static_cast<float>(i % 3) * 110);
@@ -154,7 +175,8 @@ void Inspector::ShowNodes() {
         if (scene.nodes[i].parentIndex < 0) ShowNode(i);
 }
 
-// Where the selected node is moved, how it is turned, and whether the scene is mirrored in it.
+// Where the selected node is moved, how it is turned, which module draws it, and whether the scene is
+// mirrored in it.
 void Inspector::ShowSelected() {
     const QexPODModel& scene = viewer_->View().Model()->scene;
     if (viewer_->Selected() < 0) return;
@@ -167,13 +189,19 @@ void Inspector::ShowSelected() {
         float step;
     } kinds[] = {{"move", NodeChange::kMove, viewer_->View().Size() / 200}, {"turn", NodeChange::kRotate, 1}};
     for (const auto& kind : kinds) {
-        const auto found = std::find_if(e.nodes.begin(), e.nodes.end(), [&](const NodeChange& c) {
-            return c.node == name && c.what == kind.what;
-        });
-        const QexVec3 now = found == e.nodes.end() ? QexVec3{0, 0, 0} : found->value;
+        const NodeChange* change = FindChange(e.nodes, name, kind.what);
+        const QexVec3 now = change ? change->value : QexVec3{0, 0, 0};
         float value[3] = {now.x, now.y, now.z};
         if (ImGui::DragFloat3(kind.label, value, kind.step))
             SetChange(&e.nodes, {name, kind.what, {value[0], value[1], value[2]}});
+    }
+    if (index < scene.meshNodeCount) {
+        const NodeChange* own = FindChange(e.nodes, name, NodeChange::kShader);
+        std::string shader = own ? own->shader : "";
+        if (ChooseShader("module", "that of the scene", &shader)) {
+            TakeBack(&e.nodes, NodeChange::kShader, name);
+            if (!shader.empty()) e.nodes.push_back({name, NodeChange::kShader, {0, 0, 0}, shader});
+        }
     }
     bool mirrors = e.mirrorNode == name;
     if (index < scene.meshNodeCount && !e.depthOfField && e.sky.empty() &&
@@ -235,6 +263,10 @@ void Inspector::ShowLights() {
         const bool gone = ImGui::Button("Remove");
         ImGui::PopID();
         if (gone) lights.erase(lights.begin() + static_cast<std::ptrdiff_t>(i--));
+    }
+    if (lights.empty() && ImGui::Button("Take the scene's")) {
+        viewer_->TakeSceneLights();
+        lights = viewer_->Options().effects.lights;
     }
     if (lights.size() < QEX_MAX_LIGHTS && ImGui::Button("Add a light")) {
         const QexVec3 eye = viewer_->View().Camera().eye;
@@ -363,7 +395,8 @@ void Inspector::ShowStatistics() {
     ImGui::Text("%.1f MB in use", MegabytesInUse());
 }
 
-InspectorWishes Inspector::Show(const std::vector<std::string>& recent) {
+InspectorWishes Inspector::Show(const std::vector<std::string>& recent, const std::vector<std::string>& clips,
+                                size_t clip) {
     InspectorWishes wishes;
     const ImVec2 screen = ImGui::GetIO().DisplaySize;
     const float width = std::min(static_cast<float>(kWidth), screen.x);
@@ -390,7 +423,10 @@ InspectorWishes Inspector::Show(const std::vector<std::string>& recent) {
             ImGui::EndCombo();
         }
     }
-    if (scene && section("Animation", true)) ShowPlayback();
+    if (scene && section("Animation", true)) {
+        if (clips.size() > 1) wishes.clip = ChooseClip(clips, clip);
+        ShowPlayback();
+    }
     if (section("View", true)) ShowView();
     if (scene && section("Nodes", true)) {
         ShowNodes();

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <map>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -10,6 +11,7 @@
 // What the panel asks the window for.
 struct InspectorWishes {
     std::string open;  // a file
+    std::optional<size_t> clip;
     bool screenshot = false, turntable = false, copyLine = false;
 };
 
@@ -19,13 +21,16 @@ class Inspector {
 
     explicit Inspector(Viewer* viewer) : viewer_(viewer) {}
 
-    // Between ImGui::NewFrame and ImGui::Render.
-    InspectorWishes Show(const std::vector<std::string>& recent);
+    // Between ImGui::NewFrame and ImGui::Render. `clips` names the animations that the file has, of which the
+    // scene has one.
+    InspectorWishes Show(const std::vector<std::string>& recent, const std::vector<std::string>& clips,
+                         size_t clip);
     // What is shown and a command line does not say; empty when it says all.
     std::string LeftOut() const;
 
   private:
     void ShowPlayback();
+    std::optional<size_t> ChooseClip(const std::vector<std::string>& clips, size_t clip);
     void ShowView();
     void ShowNodes();
     void ShowNode(uint32_t index);

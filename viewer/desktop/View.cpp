@@ -8,7 +8,7 @@
 int RunView(const ViewOptions& options) {
     Window window(options);
     std::string problem;
-    if (!options.files.empty()) window.Expect(options.files[0]);
+    if (!options.files.empty() && !options.randomEvents) window.Expect(options.files[0]);
     if (!window.Start(&problem)) return Fail("view", problem, 1);
     if (options.batch) return DriveBatch(&window, options.files);
     if (options.randomEvents) return DriveRandomly(&window, options);

@@ -138,7 +138,7 @@ bool Window::IsConverted(const std::string& file) {
 
 void Window::Expect(const std::string& file) {
     std::string problem;
-    if (IsConverted(file) && conversion_.Start(file, &problem)) expected_ = file;
+    if (IsConverted(file) && conversion_.Start(file, {}, &problem)) expected_ = file;
 }
 
 // Emitters are shown with the scene that is there; what is no POD file is converted first.
@@ -152,11 +152,13 @@ void Window::Open(const std::string& file) {
         return WatchFiles();
     }
     keep_ = false;
+    clip_.reset();
+    clips_.clear();
     const bool begun = file == expected_;
     expected_.clear();
     if (begun) return;
     if (!IsConverted(file)) return viewer_->Open(file);
-    if (!conversion_.Start(file, &problem)) viewer_->Say(file + ": " + problem);
+    if (!conversion_.Start(file, {}, &problem)) viewer_->Say(file + ": " + problem);
 }
 
 void Window::Page(int by) {
@@ -179,6 +181,7 @@ void Window::Poll(double seconds) {
     std::string problem;
     const Conversion::State state = conversion_.Poll(&problem);
     if (state == Conversion::State::kFailed) viewer_->Fail(problem);
+    if (state == Conversion::State::kDone) clips_ = conversion_.Clips();
     if (state == Conversion::State::kDone)
         keep_ ? viewer_->Reload(conversion_.Output())
               : viewer_->Open(conversion_.Output(), conversion_.Input());
@@ -194,18 +197,29 @@ void Window::Poll(double seconds) {
 }
 
 void Window::ReloadChanged() {
-    std::string problem;
     const SceneOptions options = viewer_->Options();
     SceneOptions without = options;
     without.effects.emitters = {};
     viewer_->SetOptions(without);
     viewer_->SetOptions(options);
     if (shownPath_.empty()) return;
+    if (viewer_->Name() != viewer_->Path()) return ConvertAgain();
     keep_ = true;
-    if (viewer_->Name() == viewer_->Path())
-        viewer_->Reload(viewer_->Path());
-    else if (!conversion_.Start(viewer_->Name(), &problem))
-        viewer_->Say(viewer_->Name() + ": " + problem);
+    viewer_->Reload(viewer_->Path());
+}
+
+bool Window::ChooseClip(size_t clip) {
+    if (clip >= clips_.size() || viewer_->Name() == viewer_->Path()) return false;
+    clip_ = clip;
+    ConvertAgain();
+    return true;
+}
+
+// The file that is shown, perhaps with another of its animations.
+void Window::ConvertAgain() {
+    std::string problem;
+    keep_ = true;
+    if (!conversion_.Start(viewer_->Name(), clip_, &problem)) viewer_->Say(viewer_->Name() + ": " + problem);
 }
 
 // The surface as it is now.
@@ -279,6 +293,7 @@ void Window::Grant(const InspectorWishes& wishes) {
     if (wishes.turntable) Turntable();
     if (wishes.copyLine) CopyLine();
     if (!wishes.open.empty()) Open(wishes.open);
+    if (wishes.clip) ChooseClip(*wishes.clip);
 }
 
 void Window::Frame(double seconds) {
@@ -288,7 +303,7 @@ void Window::Frame(double seconds) {
     ImGui_ImplSDL2_NewFrame();
     ImGui::NewFrame();
     InspectorWishes wishes;
-    if (settings_.inspector) wishes = inspector_->Show(settings_.recent);
+    if (settings_.inspector) wishes = inspector_->Show(settings_.recent, clips_, clip_.value_or(0));
     ShowMessages(seconds);
     ImGui::Render();
     Grant(wishes);

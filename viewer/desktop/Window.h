@@ -2,6 +2,7 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -30,6 +31,8 @@ class Window {
     void Run();
 
     void Open(const std::string& file);
+    // Another animation of the file that is shown; false when it has no such one.
+    bool ChooseClip(size_t clip);
     void Take(const SDL_Event& event);
     void TakeAll();  // that wait
     void Frame(double seconds);
@@ -54,6 +57,7 @@ class Window {
     void Resized();
     void Poll(double seconds);
     void ReloadChanged();
+    void ConvertAgain();
     void ShowMessages(double seconds);
     void Grant(const InspectorWishes& wishes);
     void CopyLine();
@@ -76,6 +80,9 @@ class Window {
     Conversion conversion_;
     Watch watch_;
     std::string shownPath_, expected_;
+    // Of what is converted: its animations, and the one that was chosen.
+    std::vector<std::string> clips_;
+    std::optional<size_t> clip_;
     std::vector<std::string> files_;
     size_t page_ = 0, said_ = 0, loads_ = 0;
     float sayFor_ = 0;

@@ -25,7 +25,9 @@ std::string Window::Line(const std::string& output) const {
     std::string line;
     if (viewer_->Name() != viewer_->Path()) {
         options.input = WithoutExtension(FileName(viewer_->Name())) + ".pod";
-        line = "qex " + ShellLine({"convert", viewer_->Name(), "-o", options.input}) + " && ";
+        std::vector<std::string> words = {"convert", viewer_->Name(), "-o", options.input};
+        if (clip_) words.push_back("--clip=" + std::to_string(*clip_));
+        line = "qex " + ShellLine(words) + " && ";
     }
     return line + "qex " + ShellLine(RenderWords(options));
 }

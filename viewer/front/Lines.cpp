@@ -52,6 +52,17 @@ void Lines::AddBox(const QexVec3 corners[8], uint32_t colour) {
             if (!(corner & bit)) Add(corners[corner], corners[corner | bit], colour);
 }
 
+void Lines::AddMark(const QexVec3& middle, float radius, uint32_t colour) {
+    // Each axis' two corners are joined with the next axis'.
+    for (int axis = 0; axis < 3; ++axis)
+        for (int signs = 0; signs < 4; ++signs) {
+            float from[3] = {middle.x, middle.y, middle.z}, to[3] = {middle.x, middle.y, middle.z};
+            from[axis] += signs & 1 ? radius : -radius;
+            to[(axis + 1) % 3] += signs & 2 ? radius : -radius;
+            Add({from[0], from[1], from[2]}, {to[0], to[1], to[2]}, colour);
+        }
+}
+
 void Lines::AddGrid(float size, int squares, const QexVec3& up) {
     const bool x = up.x != 0, z = up.z != 0;
     const QexVec3 first = x ? QexVec3{0, 1, 0} : QexVec3{1, 0, 0},

@@ -18,6 +18,8 @@ class Lines {
     void Clear() { points_.clear(); }
     void Add(const QexVec3& from, const QexVec3& to, uint32_t colour);  // RRGGBB
     void AddBox(const QexVec3 corners[8], uint32_t colour);             // as QexBoundingBox's corners
+    // An octahedron with so far from its middle to its corners.
+    void AddMark(const QexVec3& middle, float radius, uint32_t colour);
     // Squares around the origin, across the vertical; the two axes in colour.
     void AddGrid(float size, int squares, const QexVec3& up);
     // Between other drawings; `hidden`: behind what is nearer.

@@ -86,12 +86,16 @@ bool SetBackground(Viewer* v, const json& value) {
     });
 }
 
-bool SetShader(Viewer* v, const json& value) {
+bool IsShader(const json& value) {
     const std::vector<std::string> names = ShaderNames();
-    const std::string name = value.is_string() ? value.get<std::string>() : "?";
-    if (!name.empty() && std::find(names.begin(), names.end(), name) == names.end()) return false;
+    return value.is_string() &&
+           (value == "" || std::find(names.begin(), names.end(), value.get<std::string>()) != names.end());
+}
+
+bool SetShader(Viewer* v, const json& value) {
+    if (!IsShader(value)) return false;
     return Alter(v, [&](SceneOptions* o) {
-        o->effects.shader = name;
+        o->effects.shader = value.get<std::string>();
         return true;
     });
 }
@@ -212,6 +216,59 @@ bool SetMaterial(Viewer* v, const json& value) {
     });
 }
 
+// Of the node that is selected.
+json Node(Viewer* v) {
+    const QexModel* model = v->View().Model();
+    if (!model || v->Selected() < 0) return {};
+    const auto index = static_cast<uint32_t>(v->Selected());
+    const std::string name = NodeWord(model->scene, index);
+    const std::vector<NodeChange>& nodes = v->Options().effects.nodes;
+    const auto place = [&](NodeChange::What what) {
+        const NodeChange* change = FindChange(nodes, name, what);
+        return change ? Numbers(&change->value.x, 3) : json({0, 0, 0});
+    };
+    const NodeChange* shader = FindChange(nodes, name, NodeChange::kShader);
+    return {{"name", name},
+            {"mesh", index < model->scene.meshNodeCount},
+            {"move", place(NodeChange::kMove)},
+            {"turn", place(NodeChange::kRotate)},
+            {"shader", shader ? shader->shader : ""}};
+}
+
+bool SetNode(Viewer* v, const json& value) {
+    const QexModel* model = v->View().Model();
+    if (!model || v->Selected() < 0 || !value.is_object()) return false;
+    const std::string name = NodeWord(model->scene, static_cast<uint32_t>(v->Selected()));
+    return Alter(v, [&](SceneOptions* o) {
+        std::vector<NodeChange>& nodes = o->effects.nodes;
+        for (const auto& [word, what] :
+             {std::pair("move", NodeChange::kMove), {"turn", NodeChange::kRotate}}) {
+            float n[3];
+            if (!value.contains(word)) continue;
+            if (!ReadNumbers(value[word], n, 3)) return false;
+            SetChange(&nodes, {name, what, {n[0], n[1], n[2]}});
+        }
+        if (!value.contains("shader")) return true;
+        if (!IsShader(value["shader"])) return false;
+        TakeBack(&nodes, NodeChange::kShader, name);
+        if (value["shader"] != "")
+            nodes.push_back({name, NodeChange::kShader, {0, 0, 0}, value["shader"].get<std::string>()});
+        return true;
+    });
+}
+
+// Paths of one picture or six, as KeepBytes gives them.
+bool SetSky(Viewer* v, const json& value) {
+    if (!value.is_array() || !(value.empty() || value.size() == 1 || value.size() == 6) ||
+        !std::all_of(value.begin(), value.end(), [](const json& file) { return file.is_string(); }))
+        return false;
+    return Alter(v, [&](SceneOptions* o) {
+        o->effects.sky = value.get<std::vector<std::string>>();
+        if (value.empty()) o->effects.water.reset();
+        return true;
+    });
+}
+
 json EmitterNames(Viewer* v) {
     json names = json::array();
     for (const std::string& file : v->Options().effects.emitters.emitters) names.push_back(FileName(file));
@@ -308,7 +365,12 @@ const struct {
          });
      }},
     {"depthOfField", Blur, SetBlur},
+    {"sky", [](V v) { return json(v->Options().effects.sky); }, SetSky},
+    {"water", [](V v) { return Height(v->Options().effects.water); },
+     [](V v, J j) { return SetHeight(v, j, &EffectOptions::water); }},
     {"lights", Lights, SetLights},
+    {"sceneLights", nullptr, [](V v, J) { return v->TakeSceneLights(), true; }},
+    {"node", Node, SetNode},
     {"hidden", Hidden, SetHidden},
     {"overlays", Overlays, SetOverlays},
     {"up", [](V v) { return json(kUpAxisNames[static_cast<int>(v->Camera().Up())]); }, SetUp},

@@ -199,6 +199,7 @@ void Viewer::Drag(const ViewerEvent& event) {
     touch.y = event.y;
     touch.moved += std::fabs(dx) + std::fabs(dy);
     if (touch.moved < kClick) return;
+    if (touch.held != kNothing) return MoveHeld(touch.held, dx, dy);
     const float height = static_cast<float>(engine_.height);
     if (touch.button == 3 || touch.modifiers & kControl)
         camera_.Dolly(std::pow(2.0f, std::clamp(dy / height * 4, -8.0f, 8.0f)));
@@ -214,7 +215,10 @@ void Viewer::Handle(const ViewerEvent& event) {
         if (!std::isfinite(number)) return;
     switch (event.kind) {
         case ViewerEvent::kPointerDown:
-            touches_.push_back({event.x, event.y, 0, event.button, event.modifiers});
+            touches_.push_back({event.x, event.y, 0, event.button, event.modifiers,
+                                event.button == 1 && touches_.empty()
+                                    ? HeldAt(event.x, event.y, event.modifiers)
+                                    : kNothing});
             break;
         case ViewerEvent::kPointerMove: Drag(event); break;
         case ViewerEvent::kPointerUp:
@@ -359,7 +363,9 @@ std::string Viewer::HelpText() {
     std::string text =
         "drag         orbit\nShift+drag   pan, as the middle button does\nCtrl+drag    nearer, farther, as "
         "the right "
-        "button does\nwheel        nearer, farther\nclick        select\n";
+        "button does\nwheel        nearer, farther\nclick        select\nAlt+drag     move the selected "
+        "node\n"
+        "drag a light's mark to move it\n";
     for (const Key& key : Keys()) {
         char line[80];
         snprintf(line, sizeof line, "%-12s %s\n",

@@ -54,6 +54,9 @@ class Viewer {
     // next Tick opens a scene, shows its textures that came later, or shows a texture that is of no scene by
     // itself; emitters are drawn with what is there.
     void OpenBytes(const std::string& name, const void* bytes, size_t size);
+    // Keeps bytes for what names them, the pictures of a sky for example. Where they lie, or "" where there
+    // is no room for them, which is said.
+    std::string KeepBytes(const std::string& name, const void* bytes, size_t size);
     // The scene again, with camera and playback as they are.
     void Reload(const std::string& path);
     bool IsLoading() const { return view_->IsLoading(); }
@@ -94,6 +97,9 @@ class Viewer {
     const std::string& Path() const { return path_; }
     const std::string& Name() const { return name_; }
 
+    // Takes the scene's own lights over as lights that can be moved; directional ones from far away.
+    void TakeSceneLights();
+
     // What there is to say, the newest last.
     const std::vector<std::string>& Messages() const { return messages_; }
     void Say(const std::string& text);
@@ -121,7 +127,18 @@ class Viewer {
         float x, y, moved;
         int button;
         unsigned modifiers;
+        int held;  // a light's index, kNode or kNothing
     };
+    static constexpr int kNothing = -1, kNode = -2;
+    // A place as it is seen: pixels from the upper left corner, how large one is there in the world, and as
+    // far to the right and down.
+    struct Spot {
+        float x, y, pixel;
+        QexVec3 right, down;
+    };
+    bool See(const QexVec3& place, Spot* spot) const;
+    int HeldAt(float x, float y, unsigned modifiers) const;
+    void MoveHeld(int held, float dx, float dy);
     static std::vector<uint8_t> Read(int width, int height);
     void Resize(int width, int height);
     void Drag(const ViewerEvent& event);

@@ -14,6 +14,7 @@ namespace {
 
 constexpr uint32_t kSelected = 0xFFA030, kBox = 0x60C0FF, kBone = 0xFFFF60, kWire = 0x101418,
                    kNormal = 0x60FF90;
+constexpr float kMark = 9;              // pixels from a light's mark's middle to its corners
 constexpr int kSamples = 4;             // of a pixel of a picture
 constexpr uint32_t kMostEdges = 60000;  // of wires and normals that are drawn, a node
 
@@ -80,6 +81,14 @@ void Viewer::DrawOverlays() {
             QexModel_GetNodeWorldPos(model, i, &to) == 0 &&
             QexModel_GetNodeWorldPos(model, static_cast<uint32_t>(node.parentIndex), &from) == 0)
             over_.Add(from, to, chosen ? kSelected : kBone);
+    }
+    for (const QexLight& light : options_.effects.lights) {
+        const QexVec3 place = {light.vector[0], light.vector[1], light.vector[2]};
+        uint32_t colour = 0;
+        for (const float c : light.colour)
+            colour = colour << 8 | static_cast<uint32_t>(std::clamp(c, 0.2f, 1.0f) * 255);
+        Spot spot;
+        if (See(place, &spot)) over_.AddMark(place, kMark * spot.pixel, colour >> 8);
     }
     inside_.Draw(view_->Camera(), true);
     over_.Draw(view_->Camera(), false);

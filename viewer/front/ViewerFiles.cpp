@@ -16,7 +16,7 @@ const char* const kTextures[] = {"pvr", "ktx", "tga", "png", "jpg", "jpeg", "bmp
 
 }  // namespace
 
-void Viewer::OpenBytes(const std::string& name, const void* bytes, size_t size) {
+std::string Viewer::KeepBytes(const std::string& name, const void* bytes, size_t size) {
     const std::filesystem::path temporary = std::filesystem::temp_directory_path();
     std::error_code error;
     for (int i = 0; folder_.empty() && i < 1000; ++i) {
@@ -28,8 +28,14 @@ void Viewer::OpenBytes(const std::string& name, const void* bytes, size_t size) 
     FILE* file = folder_.empty() ? nullptr : fopen(path.c_str(), "wb");
     const bool whole = file && fwrite(bytes, 1, size, file) == size;
     if (file) fclose(file);
-    const std::string extension = Extension(path);
-    if (!whole) return Fail(name + ": there is no room for it among the temporary files");
+    if (whole) return path;
+    Fail(name + ": there is no room for it among the temporary files");
+    return "";
+}
+
+void Viewer::OpenBytes(const std::string& name, const void* bytes, size_t size) {
+    const std::string path = KeepBytes(name, bytes, size), extension = Extension(path);
+    if (path.empty()) return;
     if (extension == "pod") {
         addedScene_ = path;
     } else if (extension == "emitter" || extension == "json") {

@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <cstdlib>
 
-const ChangeWord kNodeChanges[4] = {{"hide", 0}, {"move:", 3}, {"rotate:", 3}, {"face:", 3}};
+const ChangeWord kNodeChanges[5] = {{"hide", 0}, {"move:", 3}, {"rotate:", 3}, {"face:", 3}, {"shader:", 0}};
 const ChangeWord kMaterialChanges[4] = {
     {"diffuse:", 3}, {"specular:", 3}, {"shininess:", 1}, {"opacity:", 1}};
 
@@ -72,7 +72,7 @@ int32_t Find(const Parts& parts, const std::string& word, std::string* problem) 
 }  // namespace
 
 bool NodeChange::operator==(const NodeChange& o) const {
-    return node == o.node && what == o.what && SameValue(value, o.value);
+    return node == o.node && what == o.what && SameValue(value, o.value) && shader == o.shader;
 }
 
 bool MaterialChange::operator==(const MaterialChange& o) const {
@@ -100,6 +100,13 @@ void TakeBack(std::vector<NodeChange>* changes, NodeChange::What what, const std
         return c.what == what && (node.empty() || c.node == node);
     };
     changes->erase(std::remove_if(changes->begin(), changes->end(), taken), changes->end());
+}
+
+const NodeChange* FindChange(const std::vector<NodeChange>& changes, const std::string& node,
+                             NodeChange::What what) {
+    const auto found = std::find_if(changes.begin(), changes.end(),
+                                    [&](const NodeChange& c) { return c.node == node && c.what == what; });
+    return found == changes.end() ? nullptr : &*found;
 }
 
 std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes) {

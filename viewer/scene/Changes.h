@@ -1,5 +1,6 @@
-// What is changed of a scene's parts without writing its file anew: nodes that are hidden or moved,
-// materials' colours. Parts are called by name, or where they have none of their own by "#" and their index.
+// What is changed of a scene's parts without writing its file anew: nodes that are hidden, moved or drawn by
+// another module, materials' colours. Parts are called by name, or where they have none of their own by "#"
+// and their index.
 #pragma once
 
 #include <string>
@@ -8,11 +9,12 @@
 #include "Qex.h"
 
 struct NodeChange {
-    enum What { kHide, kMove, kRotate, kFace };
+    enum What { kHide, kMove, kRotate, kFace, kShader };
 
     std::string node;
     What what;
-    QexVec3 value;  // a place, or degrees
+    QexVec3 value;            // a place, or degrees
+    std::string shader = {};  // kShader: a name of ShaderNames
 
     bool operator==(const NodeChange& o) const;
 };
@@ -27,12 +29,13 @@ struct MaterialChange {
     bool operator==(const MaterialChange& o) const;
 };
 
-// How changes are written, in the order of their What: a word and how many numbers follow it.
+// How changes are written, in the order of their What: a word and how many numbers follow it; a module's name
+// behind that of kShader.
 struct ChangeWord {
     const char* word;
     size_t numbers;
 };
-extern const ChangeWord kNodeChanges[4], kMaterialChanges[4];
+extern const ChangeWord kNodeChanges[5], kMaterialChanges[4];
 
 // What a part is called.
 std::string NodeWord(const QexPODModel& scene, uint32_t index);
@@ -42,7 +45,8 @@ std::string MaterialWord(const QexPODModel& scene, uint32_t index);
 int32_t FindNode(const QexModel& model, const std::string& word, std::string* problem);
 int32_t FindMaterial(const QexModel& model, const std::string& word, std::string* problem);
 
-// Carries the changes out. Returns a line that says which part there is not, or nothing.
+// Carries the changes out, but for those of modules, see SceneShaders. Returns a line that says which part
+// there is not, or nothing.
 std::string ChangeNodes(QexModel* model, const std::vector<NodeChange>& changes);
 std::string ChangeMaterials(QexModel* model, const std::vector<MaterialChange>& changes);
 
@@ -59,6 +63,9 @@ void SetChange(std::vector<Change>* changes, const Change& change, std::string C
         }
     changes->push_back(change);
 }
+// The change of that kind of a node, or null.
+const NodeChange* FindChange(const std::vector<NodeChange>& changes, const std::string& node,
+                             NodeChange::What what);
 inline void SetChange(std::vector<NodeChange>* changes, const NodeChange& change) {
     SetChange(changes, change, &NodeChange::node);
 }

@@ -103,7 +103,8 @@ void AddEffects(const EffectOptions& effects, Words* words) {
     if (effects.emitters.time != EmitterScene().time)
         words->Add("emitter-time", Number(static_cast<double>(effects.emitters.time)));
     for (const NodeChange& change : effects.nodes)
-        words->Add("node", change.node + "=" + ChangeText(kNodeChanges[change.what], change.value));
+        words->Add("node",
+                   change.node + "=" + ChangeText(kNodeChanges[change.what], change.value) + change.shader);
     for (const MaterialChange& change : effects.materials)
         words->Add("material",
                    change.material + "=" + ChangeText(kMaterialChanges[change.what], change.value));

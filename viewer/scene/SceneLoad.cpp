@@ -1,5 +1,7 @@
 // What a scene is shown with: its model, loaded in parts, the changes that options make, and what is around
 // it.
+#include <algorithm>
+
 #include "common/EngineOutput.h"
 #include "scene/SceneView.h"
 
@@ -87,7 +89,7 @@ void SceneView::Adopt(std::vector<std::string>* warnings) {
     Unload();
     model_ = std::move(loading_);
     const QexPODModel& scene = model_->scene;
-    lit_ = LitMaterials(scene, options_.effects.shader);
+    lit_ = LitMaterials(*model_, options_.effects);
     for (const std::string& line : CompleteTextures(model_.get(), lit_)) warnings->push_back(line);
     warnings->insert(warnings->end(), loadLines_.begin(), loadLines_.end());
     materials_.assign(scene.materials, scene.materials + scene.materialCount);
@@ -113,14 +115,17 @@ std::string SceneView::Apply(std::vector<std::string>* warnings) {
     const EffectOptions& effects = options_.effects;
     EngineOutput quiet;
     Restore();
-    if (effects.shader == "normalmap" && !normalMaps_) {
+    const bool normalMaps =
+        effects.shader == "normalmap" || std::any_of(effects.nodes.begin(), effects.nodes.end(),
+                                                     [](const auto& c) { return c.shader == "normalmap"; });
+    if (normalMaps && !normalMaps_) {
         for (const std::string& line : LoadNormalMaps(model_.get())) warnings->push_back(line);
         normalMaps_ = true;
     }
     std::string problem = ChangeMaterials(model_.get(), effects.materials);
     const QexPODMaterial* materials = model_->scene.materials;
     changed_.assign(materials, materials + model_->scene.materialCount);
-    const std::vector<bool> lit = LitMaterials(model_->scene, effects.shader);
+    const std::vector<bool> lit = LitMaterials(*model_, effects);
     if (lit != lit_ || effects.materials != coloured_) RecolourTextures(model_.get(), lit);
     lit_ = lit;
     coloured_ = effects.materials;
@@ -132,6 +137,7 @@ std::string SceneView::Apply(std::vector<std::string>* warnings) {
         shaders_.UseDefault(model_.get(), effects.shadow, lit_);
     else
         shaders_.Use(model_.get(), effects.shader, lit_);
+    shaders_.Use(model_.get(), effects.nodes);
     FitTo(frames_);
     const std::string fault = Refit(warnings);
     return problem.empty() ? fault : problem;

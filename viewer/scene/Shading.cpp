@@ -72,22 +72,30 @@ std::vector<std::string> ShaderNames() {
     return names;
 }
 
-std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shader) {
-    const ShaderRow* row = FindShader(shader);
+std::vector<bool> LitMaterials(const QexModel& model, const EffectOptions& effects) {
+    const QexPODModel& scene = model.scene;
+    const ShaderRow* row = FindShader(effects.shader);
     std::vector<bool> lit(scene.materialCount, !row || row->lit);
-    if (row) return lit;
-    for (uint32_t i = 0; i < scene.meshNodeCount; ++i) {
+    for (uint32_t i = 0; !row && i < scene.meshNodeCount; ++i) {
         const int32_t material = scene.nodes[i].materialIndex;
         if (material >= 0 && !HasNormals(scene, i)) lit[static_cast<size_t>(material)] = false;
+    }
+    std::string ignored;
+    for (const NodeChange& change : effects.nodes) {
+        const ShaderRow* own = change.what == NodeChange::kShader ? FindShader(change.shader) : nullptr;
+        const int32_t node = own ? FindNode(model, change.node, &ignored) : -1;
+        if (node < 0 || static_cast<uint32_t>(node) >= scene.meshNodeCount) continue;
+        const int32_t material = scene.nodes[node].materialIndex;
+        if (material >= 0 && (!own->lit || HasNormals(scene, static_cast<uint32_t>(node))))
+            lit[static_cast<size_t>(material)] = own->lit;
     }
     return lit;
 }
 
-void SceneShaders::Use(QexModel* model, const std::string& name, const std::vector<bool>& lit) {
-    const ShaderRow* row = FindShader(name);
-    if (!row) return;
+void SceneShaders::Give(QexModel* model, uint32_t meshNode, size_t index) {
     made_.resize(std::size(kShaders));
-    Pair& made = made_[static_cast<size_t>(row - kShaders)];
+    const ShaderRow& row = kShaders[index];
+    Pair& made = made_[index];
     const auto need = [](QexShaderModule** module, Create create, SetParameters set) {
         if (*module || !create) return *module;
         *module = create();
@@ -97,13 +105,27 @@ void SceneShaders::Use(QexModel* model, const std::string& name, const std::vect
         }
         return *module;
     };
-    for (uint32_t i = 0; i < model->scene.meshNodeCount; ++i) {
-        QexPODNode& node = model->scene.nodes[i];
-        if (row->lit && !IsLit(model->scene, i, lit)) continue;
-        QexShaderModule* module = model->scene.meshes[node.objectIndex].skinned == 1
-                                      ? need(&made.skinned, row->createSkinned, row->setSkinnedDepth)
-                                      : need(&made.still, row->create, row->setDepth);
-        if (module) node.shader = module;
+    QexPODNode& node = model->scene.nodes[meshNode];
+    QexShaderModule* module = model->scene.meshes[node.objectIndex].skinned == 1
+                                  ? need(&made.skinned, row.createSkinned, row.setSkinnedDepth)
+                                  : need(&made.still, row.create, row.setDepth);
+    if (module) node.shader = module;
+}
+
+void SceneShaders::Use(QexModel* model, const std::string& name, const std::vector<bool>& lit) {
+    const ShaderRow* row = FindShader(name);
+    for (uint32_t i = 0; row && i < model->scene.meshNodeCount; ++i)
+        if (!row->lit || IsLit(model->scene, i, lit)) Give(model, i, static_cast<size_t>(row - kShaders));
+}
+
+void SceneShaders::Use(QexModel* model, const std::vector<NodeChange>& changes) {
+    std::string ignored;
+    for (const NodeChange& change : changes) {
+        const ShaderRow* row = change.what == NodeChange::kShader ? FindShader(change.shader) : nullptr;
+        const int32_t node = row ? FindNode(*model, change.node, &ignored) : -1;
+        if (node < 0 || static_cast<uint32_t>(node) >= model->scene.meshNodeCount) continue;
+        if (!row->lit || HasNormals(model->scene, static_cast<uint32_t>(node)))
+            Give(model, static_cast<uint32_t>(node), static_cast<size_t>(row - kShaders));
     }
 }
 

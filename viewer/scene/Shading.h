@@ -13,9 +13,10 @@ constexpr float kNearDepth = 0, kFarDepth = 1;
 // The short names of the shader modules.
 std::vector<std::string> ShaderNames();
 
-// By material, whether the modules of that name multiply its colour with that of the texture. In the default
-// look, which has no name, those are lit whose meshes all have normals.
-std::vector<bool> LitMaterials(const QexPODModel& scene, const std::string& shader);
+// By material, whether the modules that draw it multiply its colour with that of the texture. In the default
+// look, which has no name, those are lit whose meshes all have normals. Where nodes of one material have
+// modules of both kinds the last of those that were changed counts.
+std::vector<bool> LitMaterials(const QexModel& model, const EffectOptions& effects);
 
 // The modules that draw a model instead of the engine's choice. Each is made when a model first needs it.
 class SceneShaders {
@@ -31,13 +32,18 @@ class SceneShaders {
     // Lit from the scene's lights or the camera; what files say about ambient light, which is rarely meant,
     // is replaced by a share of the colour.
     void UseDefault(QexModel* model, bool shadow, const std::vector<bool>& lit);
+    // Gives nodes the modules that changes name, but for lit ones where there are no normals.
+    void Use(QexModel* model, const std::vector<NodeChange>& changes);
     void Release();
 
   private:
     struct Pair {
         QexShaderModule *still = nullptr, *skinned = nullptr;
     };
-    std::vector<Pair> made_;  // by row of the table
+    // `row`: of the table of modules.
+    void Give(QexModel* model, uint32_t meshNode, size_t row);
+
+    std::vector<Pair> made_;  // by row
 };
 
 // Gives all nodes of a model, which may be null, other modules for as long as it lives.

@@ -51,8 +51,9 @@ class Controls {
 
 const section = (title, open, ...rows) => make('details', {open}, make('summary', {textContent: title}), ...rows);
 
-// `set` changes properties, `save` writes a file, `memory` tells the program's bytes, `emitters` what emitters there are.
-export function inspector(root, choices, canvas, {set, save, memory, emitters}) {
+// `set` changes properties, `save` writes a file, `keep` takes files into the program and tells their paths there, `memory` tells
+// its bytes, `emitters` what emitters there are.
+export function inspector(root, choices, canvas, {set, save, keep, memory, emitters}) {
     let controls = new Controls(set), scene = null, lightRows = null, calls = 0, lastCalls = 0, times = [], counts = false;
     const graph = make('canvas', {id: 'graph', width: 280, height: 48}), figures = make('div', {id: 'figures', className: 'faint'});
     const statistics = section('Statistics', false, graph, figures), lights = make('div'), particles = make('div');
@@ -123,6 +124,27 @@ export function inspector(root, choices, canvas, {set, save, memory, emitters}) 
             make('div', {className: 'faint', textContent: t ? `${t.name}: ${t.width} x ${t.height}, ${t.format}` : 'no texture'}));
     }
 
+    // One picture or six.
+    function sky() {
+        const input = make('input', {type: 'file', accept: '.png,.jpg,.jpeg,.tga,.bmp', multiple: true});
+        input.onchange = async () => set({sky: await keep(input.files)});
+        return input;
+    }
+
+    // What is selected, while something is.
+    function selected(c) {
+        const part = make('div'), modules = [['', 'that of the scene'], ...choices.shaders.map(name => [name, name])];
+        let node = null;
+        c.updates.push(state => {
+            node = state.node;
+            part.hidden = !node;
+        });
+        const place = name => ['x', 'y', 'z'].map((axis, k) => c.number(`${name} ${axis}`, s => s.node?.[name][k] ?? 0,
+            v => ({node: {[name]: node[name].map((old, at) => (at === k ? v : old))}}), 'any'));
+        part.append(...place('move'), ...place('turn'), c.choice('module', modules, s => s.node?.shader ?? '', shader => ({node: {shader}})));
+        return part;
+    }
+
     function effects(c) {
         const part = (name, value) => s => ({depthOfField: {...s, [name]: value}});
         let blur = null;
@@ -132,6 +154,8 @@ export function inspector(root, choices, canvas, {set, save, memory, emitters}) 
             c.check('floor', s => s.floor !== null, floor => ({floor})),
             c.check('shadow', s => s.shadow, shadow => ({shadow})),
             c.check('mirror', s => s.mirror !== null, mirror => ({mirror})),
+            c.row('sky', sky(), make('button', {textContent: 'None', onclick: () => set({sky: []})})),
+            c.check('water', s => s.water !== null, water => ({water})),
             c.choice('stereo', [['0', 'off'], ['1', 'red, blue'], ['2', 'red, cyan'], ['3', 'side by side']], s => String(s.stereo),
                 mode => ({stereo: Number(mode)})),
             c.check('depth of field', s => s.depthOfField !== null, on => ({depthOfField: on ? {} : null})),
@@ -156,6 +180,7 @@ export function inspector(root, choices, canvas, {set, save, memory, emitters}) 
                 c.colour('colour', s => toHex(s.lights[i]?.colour ?? [1, 1, 1]), v => change(i, 'colour', () => toNumbers(v))),
                 make('button', {textContent: 'Remove', onclick: () => set({lights: current().filter((_, at) => at !== i)})}),
             ]),
+            ...(state.lights.length ? [] : [make('button', {textContent: "Take the scene's", onclick: () => set({sceneLights: true})})]),
             make('button', {textContent: 'Add a light', onclick: () => set({lights: [...current(), {place: [0, 0, 0]}]})}));
         c.updates.forEach(update => update(state));
     }
@@ -214,7 +239,7 @@ export function inspector(root, choices, canvas, {set, save, memory, emitters}) 
             const c = controls;
             root.replaceChildren(section('View', true, ...view(c)));
             if (scene)
-                root.append(section('Nodes', true, make('div', {className: 'nodes'}, ...nodes(c))),
+                root.append(section('Nodes', true, make('div', {className: 'nodes'}, ...nodes(c)), selected(c)),
                     section('Materials', false, ...scene.materials.map((m, i) => material(c, m, i))),
                     section('Lights', false, lights), section('Effects', true, ...effects(c)),
                     section('Emitters', false, particles));

@@ -38,6 +38,14 @@ function say(text) {
     element('message').textContent = text;
 }
 
+function give(name, file) {
+    const place = module._malloc(file.bytes.length || 1);
+    module.HEAPU8.set(file.bytes, place);
+    const result = module.ccall(`Page_${name}`, 'string', ['string', 'number', 'number'], [file.name, place, file.bytes.length]);
+    module._free(place);
+    return result;
+}
+
 // Files of any kind: zips are opened, all others go to the program, which shows what it knows.
 async function add(files) {
     for (const {name, bytes} of files) {
@@ -48,17 +56,14 @@ async function add(files) {
             say(`${name}: ${error.message}`);
             continue;
         }
-        for (const file of inside) {
-            const place = module._malloc(file.bytes.length || 1);
-            module.HEAPU8.set(file.bytes, place);
-            module.ccall('Page_Add', null, ['string', 'number', 'number'], [file.name, place, file.bytes.length]);
-            module._free(place);
-        }
+        for (const file of inside) give('Add', file);
     }
     redraw();
 }
 
 const readAll = files => Promise.all(Array.from(files, async file => ({name: file.name, bytes: new Uint8Array(await file.arrayBuffer())})));
+
+const keep = async files => (await readAll(files)).map(file => give('Keep', file));
 
 // The files of dropped folders, too.
 async function filesOf(items) {
@@ -242,7 +247,7 @@ async function run() {
         return fail('This browser has no WebGL, or it is switched off: the viewer cannot draw.');
     const choices = JSON.parse(ask('Choices'));
     element('keys').textContent = `${choices.help}two fingers  pan, nearer and farther`;
-    panel = inspector(element('inspector'), choices, canvas, {set, save, memory: () => module.HEAPU8.length, emitters: () => JSON.parse(ask('Emitters'))});
+    panel = inspector(element('inspector'), choices, canvas, {set, save, keep, memory: () => module.HEAPU8.length, emitters: () => JSON.parse(ask('Emitters'))});
     takeDrops();
     takePointers();
     takeKeys();

@@ -242,6 +242,13 @@ void ListClips(const aiScene& scene) {
     }
 }
 
+std::string ClipNames(const aiScene& scene) {
+    std::string names;
+    for (unsigned i = 0; i < scene.mNumAnimations; ++i)
+        names += OnOneLine(scene.mAnimations[i]->mName.C_Str()) + "\n";
+    return names;
+}
+
 int FindClip(const aiScene& scene, const std::string& wanted, std::string* error) {
     std::string names;
     for (unsigned i = 0; i < scene.mNumAnimations; ++i) {

@@ -63,6 +63,8 @@ pod::Transform BuildTransform(const aiMatrix4x4& local, const aiNodeAnim* channe
 // One line for each animation on standard output: index, name, seconds and number of channels, with tabs
 // between.
 void ListClips(const aiScene& scene);
+// Their names, a line each.
+std::string ClipNames(const aiScene& scene);
 
 // Index of the animation that `wanted` names, or whose index it is; -1, with the reason in `error`, when
 // there is none.

@@ -170,12 +170,15 @@ int ConvertFile(const ConvertOptions& options) {
         if (!source->mNumAnimations) log.Error("has no animations");
         return kDone;
     }
+    std::string error;
+    const std::string names = ClipNames(*source);
+    if (!options.clipsTo.empty() && !WriteOutput(options.clipsTo, names.data(), names.size(), &error))
+        return BadArgument(options.clipsTo, error);
     SceneSettings settings = SettingsFor(options);
     int status = ChooseParts(options, *source, &settings);
     if (status != kDone) return status;
     TextureSet textures(source, options.input, OutputDirectory(options), options.textureFormat, &log);
     pod::Scene scene;
-    std::string error;
     status = ConvertScene(*source, settings, &textures, &log, &scene, &error);
     if (status != kDone) {
         log.Error(error);
@@ -197,6 +200,7 @@ void SetUpConvert(CLI::App* app, ConvertOptions* options) {
     app->add_option("--fps", options->fps, "frames per second of the sampled animation (30)")
         ->check(WholeNumberFrom(1, 1000));
     app->add_option("--clip", options->clip, "animation to convert, by name or index (the first)");
+    app->add_option("--clips-to", options->clipsTo)->group("");
     app->add_flag("--list-clips", options->listClips,
                   "print index, name, seconds and channels of the animations; convert nothing");
     app->add_option("--max-bones", options->maxBones, "most bones in a batch of a skinned mesh (16)")

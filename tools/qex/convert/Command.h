@@ -21,6 +21,7 @@ struct ConvertOptions {
     TextureOverrides textures;  // in place of the materials' own
     Placement placement;
     int memory = 4096;       // megabytes that the conversion may take
+    std::string clipsTo;     // a file that gets the animations' names, a line each; none when empty
     bool listClips = false;  // print the animations and convert nothing
     bool quiet = false;      // no summary; warnings and errors still show
 };

@@ -39,7 +39,9 @@ const NumberShape kLight = {',',
                             {kAny, kAny, kAny, {NumberRange::kColour, 0, DBL_MAX, 0xFFFFFF}},
                             3,
                             "is no light; expected X,Y,Z or X,Y,Z,RRGGBB, at most 4 of them"};
-const char kNoNodeChange[] = "is no change; expected NAME=hide, NAME=move:X,Y,Z, rotate: (degrees) or face:";
+const char kNoNodeChange[] =
+    "is no change; expected NAME=hide, NAME=move:X,Y,Z, rotate: (degrees), face: or "
+    "shader:MODULE";
 const char kNoMaterialChange[] =
     "is no change; expected NAME=diffuse:R,G,B, specular:R,G,B, shininess:N or opacity:N, all but shininess "
     "0 to 1";
@@ -109,6 +111,19 @@ std::string ParseChange(const std::string& text, const ChangeWord (&words)[kKind
         return "";
     }
     return "'" + text + "' " + fault;
+}
+
+std::string ParseNodeChange(const std::string& text, std::vector<NodeChange>* changes) {
+    static const NumberRange kRanges[] = {kAny, kAny, kAny, kAny, kAny};
+    const std::string word = std::string("=") + kNodeChanges[NodeChange::kShader].word;
+    const size_t at = text.rfind(word);
+    if (at == text.npos) return ParseChange(text, kNodeChanges, kNoNodeChange, kRanges, changes);
+    const std::string shader = text.substr(at + word.size());
+    const std::vector<std::string> names = ShaderNames();
+    if (std::find(names.begin(), names.end(), shader) == names.end())
+        return "'" + shader + "' is no module; expected one of those of --shader";
+    changes->push_back({text.substr(0, at), NodeChange::kShader, {0, 0, 0}, shader});
+    return "";
 }
 
 CLI::Option* AddHeight(CLI::App* app, const char* name, const std::string& help,
@@ -236,12 +251,8 @@ void SetUpRender(CLI::App* app, RenderOptions* options) {
     AddEffects(app, effects);
     AddEmitters(app, &effects->emitters);
     AddParsed(
-        app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate: or face:",
-        [=](const std::string& text) {
-            static const NumberRange kRanges[] = {kAny, kAny, kAny, kAny};
-            return ParseChange(text, kNodeChanges, kNoNodeChange, kRanges, &effects->nodes);
-        },
-        kMostRepeats);
+        app, "--node", "NAME=hide, NAME=move:X,Y,Z, rotate:, face: or shader:MODULE",
+        [=](const std::string& text) { return ParseNodeChange(text, &effects->nodes); }, kMostRepeats);
     AddParsed(
         app, "--material", "NAME=diffuse:R,G,B, specular:R,G,B, shininess:N or opacity:N",
         [=](const std::string& text) {
