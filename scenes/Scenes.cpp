@@ -118,14 +118,23 @@ pod::MeshArrays Hull() {
     return arrays;
 }
 
+// Both sides, as far apart as a sail is thick, so that neither shows through the other.
+void AddSail(const std::vector<pod::Vec3>& corners, pod::MeshArrays* arrays) {
+    constexpr float kThickness = 0.02f;
+    const pod::Vec3 normal = shapes::NormalOf(corners[0], corners[1], corners[2]);
+    std::vector<pod::Vec3> back(corners.rbegin(), corners.rend());
+    for (pod::Vec3& corner : back)
+        for (size_t i = 0; i < 3; ++i) corner[i] -= kThickness * normal[i];
+    AddPolygon(corners, arrays);
+    AddPolygon(back, arrays);
+}
+
 pod::MeshArrays Sails() {
     const pod::Vec3 mast[] = {{0.15f, 0.4f, 0}, {0.15f, 2.2f, 0}}, boom = {-0.95f, 0.55f, 0.2f},
                     bow = {1.3f, 0.5f, 0};
     pod::MeshArrays arrays;
-    AddPolygon({mast[0], mast[1], boom}, &arrays);
-    AddPolygon({boom, mast[1], mast[0]}, &arrays);
-    AddPolygon({mast[0], bow, mast[1]}, &arrays);
-    AddPolygon({mast[1], bow, mast[0]}, &arrays);
+    AddSail({mast[0], mast[1], boom}, &arrays);
+    AddSail({mast[0], bow, mast[1]}, &arrays);
     return arrays;
 }
 

@@ -197,6 +197,31 @@ TEST_F(Front, TheHandMovesNodesAndLights) {
     ExpectNear(viewer_.Options().look->eye, look.eye, 1e-4f);
 }
 
+TEST_F(Front, LightsOfTheSceneAreTakenOver) {
+    for (const int32_t type : {QEX_LIGHT_POINT, QEX_LIGHT_DIRECTIONAL}) {
+        pod::Scene scene = QuadScene();
+        AddLight(&scene, type, {1, 0.4f, 1});
+        // A lamp shines down its own Y axis.
+        scene.nodes[1] =
+            pod::BuildNode("lamp", {{{0.5f, 0.2f, 1}}, {{0.5f, 0, 0, 0.8660254f}}, {}, {}}, -1, 0);
+        WriteScene(Path("quad.pod"), scene);
+        Load(Path("quad.pod"));
+        Press("1");
+        const Bytes own = viewer_.Picture(200, 100, 1);
+        viewer_.TakeSceneLights();
+        ASSERT_EQ(viewer_.Options().effects.lights.size(), 1u) << type;
+        EXPECT_EQ(viewer_.Options().effects.lights[0].type, QEX_LIGHT_POINT);
+        const Bytes taken = viewer_.Picture(200, 100, 1);
+        int most = 0;
+        for (size_t i = 0; i < own.size(); ++i) most = std::max(most, std::abs(own[i] - taken[i]));
+        EXPECT_LE(most, 2) << type;
+        SceneOptions dark = viewer_.Options();
+        dark.effects.lights[0].colour[0] = 0.2f;
+        viewer_.SetOptions(dark);
+        EXPECT_NE(viewer_.Picture(200, 100, 1), taken) << type;
+    }
+}
+
 TEST_F(Front, KeysChangeThePictureAndChangeItBack) {
     WriteScene(Path("quad.pod"), QuadScene());
     Load(Path("quad.pod"));

@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "common/Talk.h"
+#include "front/Properties.h"
 
 namespace {
 
@@ -154,6 +155,7 @@ const struct {
     {"clip", Clip},
     {"select", SaySelected},
     {"messages", SayMessages},
+    {"set", [](Window* w, std::istringstream& s) { return SetProperties(&w->Front(), Rest(s)); }},
     {"line", [](Window* w, std::istringstream& s) { return printf("%s\n", w->Line(Rest(s)).c_str()) > 0; }},
     {"screenshot", [](Window* w, std::istringstream& s) { return w->Screenshot(Rest(s)); }},
     {"window", [](Window* w, std::istringstream& s) { return w->SaveWindow(Rest(s)); }},
