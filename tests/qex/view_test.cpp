@@ -99,6 +99,21 @@ TEST_F(QexView, FilesThatChangeAreShownAnewFromTheSamePlace) {
     EXPECT_EQ(result.out, first + first);  // the camera
 }
 
+TEST_F(QexView, AGltfFileIsDropped) {
+    const std::string file = "/usr/share/assimp/models/glTF2/simple_skin/simple_skin.gltf";
+    if (!std::filesystem::exists(file)) GTEST_SKIP() << file << " is not installed";
+    WriteScene(Path("quad.pod"), QuadScene());
+    const CommandResult result =
+        Script("quad.pod", "screenshot before.png\nopen " + file + "\nscreenshot after.png\nline x.png\n");
+    ASSERT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(
+        result.out.rfind("qex convert " + file + " -o simple_skin.pod && qex render simple_skin.pod ", 0), 0u)
+        << result.out;
+    const Image after = LoadPicture("after.png");
+    EXPECT_GT(Differing(LoadPicture("before.png"), after, 8), 5);
+    EXPECT_GT(Differing({after.width, after.height, Bytes(after.pixels.size(), 0x40), false}, after, 60), 1);
+}
+
 TEST_F(QexView, AnotherAnimationIsChosen) {
     const std::string animated = "/usr/share/assimp/models/X/Testwuson.X";
     if (!std::filesystem::exists(animated)) GTEST_SKIP() << animated << " is not installed";
