@@ -179,7 +179,7 @@ TEST_F(Front, TheHandMovesNodesAndLights) {
     const auto before = middle();
     Pointer(100, 50, 100, 50);
     const LookView look = *viewer_.Options().look;
-    drag(20, -10, kAlt);
+    drag(20, -10, kShift | kControl);
     const auto after = middle();
     EXPECT_NEAR(after.first - before.first, 20, 1);
     EXPECT_NEAR(after.second - before.second, -10, 1);

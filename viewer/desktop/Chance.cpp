@@ -70,7 +70,13 @@ void Chance::Key() {
     const bool letter = Below(3) != 0;
     const auto& key = keys[Below(static_cast<unsigned>(keys.size()))];
     event.key.keysym.sym = letter ? tolower(key.key[0]) : kOthers[Below(std::size(kOthers))];
-    static const SDL_Keymod kHeld[] = {KMOD_NONE, KMOD_NONE, KMOD_NONE, KMOD_SHIFT, KMOD_CTRL, KMOD_ALT};
+    static const SDL_Keymod kHeld[] = {KMOD_NONE,
+                                       KMOD_NONE,
+                                       KMOD_NONE,
+                                       KMOD_SHIFT,
+                                       KMOD_CTRL,
+                                       KMOD_ALT,
+                                       static_cast<SDL_Keymod>(KMOD_CTRL | KMOD_SHIFT)};
     SDL_SetModState(kHeld[Below(std::size(kHeld))]);
     event.key.keysym.mod = static_cast<Uint16>(SDL_GetModState());
     window_->Take(event);

@@ -152,8 +152,6 @@ void Window::Open(const std::string& file) {
         return WatchFiles();
     }
     keep_ = false;
-    clip_.reset();
-    clips_.clear();
     const bool begun = file == expected_;
     expected_.clear();
     if (begun) return;
@@ -171,7 +169,7 @@ void Window::Page(int by) {
 void Window::WatchFiles() {
     std::vector<std::string> files = viewer_->Options().effects.emitters.emitters;
     if (!shownPath_.empty()) files.push_back(viewer_->Name());
-    if (viewer_->View().Model() && viewer_->Name() == viewer_->Path())
+    if (viewer_->View().Model() && !IsConversionShown())
         for (const std::string& file : TextureFilesOf(viewer_->View().Model())) files.push_back(file);
     watch_.Set(files);
 }
@@ -181,10 +179,12 @@ void Window::Poll(double seconds) {
     std::string problem;
     const Conversion::State state = conversion_.Poll(&problem);
     if (state == Conversion::State::kFailed) viewer_->Fail(problem);
-    if (state == Conversion::State::kDone) clips_ = conversion_.Clips();
-    if (state == Conversion::State::kDone)
+    if (state == Conversion::State::kDone) {
+        clips_ = conversion_.Clips();
+        if (!keep_) clip_.reset();
         keep_ ? viewer_->Reload(conversion_.Output())
               : viewer_->Open(conversion_.Output(), conversion_.Input());
+    }
     viewer_->SetWaiting(conversion_.AtWork());
     if (viewer_->Loads() != loads_) {
         loads_ = viewer_->Loads();
@@ -203,13 +203,13 @@ void Window::ReloadChanged() {
     viewer_->SetOptions(without);
     viewer_->SetOptions(options);
     if (shownPath_.empty()) return;
-    if (viewer_->Name() != viewer_->Path()) return ConvertAgain();
+    if (IsConversionShown()) return ConvertAgain();
     keep_ = true;
     viewer_->Reload(viewer_->Path());
 }
 
 bool Window::ChooseClip(size_t clip) {
-    if (clip >= clips_.size() || viewer_->Name() == viewer_->Path()) return false;
+    if (clip >= clips_.size() || !IsConversionShown()) return false;
     clip_ = clip;
     ConvertAgain();
     return true;
@@ -302,8 +302,10 @@ void Window::Frame(double seconds) {
     if (hidden_ || width_ < 1 || height_ < 1) return SDL_Delay(options_.IsDriven() ? 0 : 50);
     ImGui_ImplSDL2_NewFrame();
     ImGui::NewFrame();
+    const std::vector<std::string> none;
     InspectorWishes wishes;
-    if (settings_.inspector) wishes = inspector_->Show(settings_.recent, clips_, clip_.value_or(0));
+    if (settings_.inspector)
+        wishes = inspector_->Show(settings_.recent, IsConversionShown() ? clips_ : none, clip_.value_or(0));
     ShowMessages(seconds);
     ImGui::Render();
     Grant(wishes);

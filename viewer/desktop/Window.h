@@ -58,6 +58,7 @@ class Window {
     void Poll(double seconds);
     void ReloadChanged();
     void ConvertAgain();
+    bool IsConversionShown() const { return viewer_->Name() != viewer_->Path(); }
     void ShowMessages(double seconds);
     void Grant(const InspectorWishes& wishes);
     void CopyLine();

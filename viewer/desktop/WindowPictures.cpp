@@ -23,7 +23,7 @@ std::string Window::Line(const std::string& output) const {
     RenderOptions options = viewer_->AsRenderOptions(PictureWidth(), height_);
     options.output = output;
     std::string line;
-    if (viewer_->Name() != viewer_->Path()) {
+    if (IsConversionShown()) {
         options.input = WithoutExtension(FileName(viewer_->Name())) + ".pod";
         std::vector<std::string> words = {"convert", viewer_->Name(), "-o", options.input};
         if (clip_) words.push_back("--clip=" + std::to_string(*clip_));

@@ -34,9 +34,10 @@ bool Viewer::See(const QexVec3& place, Spot* spot) const {
     return true;
 }
 
-// The nearest light's mark; with Alt the selected node, wherever it is.
+// The nearest light's mark; with Ctrl and Shift, as window managers have Alt, the selected node, wherever it
+// is.
 int Viewer::HeldAt(float x, float y, unsigned modifiers) const {
-    if (modifiers & kAlt) return selected_ >= 0 && view_->Model() ? kNode : kNothing;
+    if (modifiers == (kShift | kControl)) return selected_ >= 0 && view_->Model() ? kNode : kNothing;
     int held = kNothing;
     float nearest = kReach;
     const std::vector<QexLight>& lights = options_.effects.lights;

@@ -361,11 +361,13 @@ const std::vector<Viewer::Key>& Viewer::Keys() {
 
 std::string Viewer::HelpText() {
     std::string text =
-        "drag         orbit\nShift+drag   pan, as the middle button does\nCtrl+drag    nearer, farther, as "
-        "the right "
-        "button does\nwheel        nearer, farther\nclick        select\nAlt+drag     move the selected "
-        "node\n"
-        "drag a light's mark to move it\n";
+        "drag         orbit\n"
+        "Shift+drag   pan, as the middle button does\n"
+        "Ctrl+drag    nearer, farther, as the right button does\n"
+        "Ctrl+Shift+drag moves the selected node,\n"
+        "drag on a light's mark moves that\n"
+        "wheel        nearer, farther\n"
+        "click        select\n";
     for (const Key& key : Keys()) {
         char line[80];
         snprintf(line, sizeof line, "%-12s %s\n",
