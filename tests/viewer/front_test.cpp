@@ -251,7 +251,7 @@ TEST_F(Front, PropertiesAreReadAndSetAsJson) {
         {"up", "-z"},
         {"overlays", {{"grid", true}}},
         {"hidden", {node}},
-        {"lights", {{{"place", {1, 2, 3}}, {"colour", {1, 0.5, 0}}}}},
+        {"lights", {{{"place", {1, 2, 3}}, {"colour", {1, 0, 0}}}}},
         {"selected", 0},
         {"node",
          {{"name", node}, {"mesh", true}, {"move", {0, 1, 0}}, {"turn", {0, 0, 30}}, {"shader", "depth"}}},

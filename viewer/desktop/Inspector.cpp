@@ -198,10 +198,7 @@ void Inspector::ShowSelected() {
     if (index < scene.meshNodeCount) {
         const NodeChange* own = FindChange(e.nodes, name, NodeChange::kShader);
         std::string shader = own ? own->shader : "";
-        if (ChooseShader("module", "that of the scene", &shader)) {
-            TakeBack(&e.nodes, NodeChange::kShader, name);
-            if (!shader.empty()) e.nodes.push_back({name, NodeChange::kShader, {0, 0, 0}, shader});
-        }
+        if (ChooseShader("module", "that of the scene", &shader)) SetShader(&e.nodes, name, shader);
     }
     bool mirrors = e.mirrorNode == name;
     if (index < scene.meshNodeCount && !e.depthOfField && e.sky.empty() &&
@@ -257,9 +254,7 @@ void Inspector::ShowLights() {
     for (size_t i = 0; i < lights.size(); ++i) {
         ImGui::PushID(static_cast<int>(i));
         ImGui::DragFloat3("place", lights[i].vector, size / 100);
-        // A command line has colours of 8 bits.
-        if (ImGui::ColorEdit3("colour", lights[i].colour))
-            for (float& c : lights[i].colour) c = std::round(std::clamp(c, 0.0f, 1.0f) * 255) / 255;
+        ImGui::ColorEdit3("colour", lights[i].colour);
         const bool gone = ImGui::Button("Remove");
         ImGui::PopID();
         if (gone) lights.erase(lights.begin() + static_cast<std::ptrdiff_t>(i--));

@@ -8,10 +8,6 @@ namespace {
 
 constexpr float kReach = 12;  // pixels around a light's mark
 
-QexVec3 Sum(const QexVec3& a, const QexVec3& b, float times) {
-    return {a.x + b.x * times, a.y + b.y * times, a.z + b.z * times};
-}
-
 }  // namespace
 
 bool Viewer::See(const QexVec3& place, Spot* spot) const {
@@ -59,7 +55,7 @@ void Viewer::MoveHeld(int held, float dx, float dy) {
         if (static_cast<size_t>(held) >= options.effects.lights.size()) return;
         float* at = options.effects.lights[static_cast<size_t>(held)].vector;
         if (!See({at[0], at[1], at[2]}, &spot)) return;
-        const QexVec3 moved = Sum(Sum({at[0], at[1], at[2]}, spot.right, dx), spot.down, dy);
+        const QexVec3 moved = Offset(Offset({at[0], at[1], at[2]}, spot.right, dx), spot.down, dy);
         at[0] = moved.x, at[1] = moved.y, at[2] = moved.z;
         return SetOptions(options);
     }
@@ -67,7 +63,7 @@ void Viewer::MoveHeld(int held, float dx, float dy) {
     const uint32_t index = static_cast<uint32_t>(selected_);
     QexVec3 place;
     if (QexModel_GetNodeWorldPos(model, index, &place) != 0 || !See(place, &spot)) return;
-    const QexVec3 across = Sum(Sum({0, 0, 0}, spot.right, dx), spot.down, dy);
+    const QexVec3 across = Offset(Offset({0, 0, 0}, spot.right, dx), spot.down, dy);
     QexVec4 way = {across.x, across.y, across.z, 0};
     // Changes are in the space of the node's parent.
     const int32_t parent = model->scene.nodes[index].parentIndex;
@@ -103,8 +99,7 @@ void Viewer::TakeSceneLights() {
             QexVec3_Scale(&along, &along, -far);
             light = {QEX_LIGHT_POINT, {along.x, along.y, along.z}, {1, 1, 1, 1}};
         }
-        for (int c = 0; c < 3; ++c)
-            light.colour[c] = std::round(std::clamp(set.lights[i].colour[c], 0.0f, 1.0f) * 255) / 255;
+        std::copy_n(set.lights[i].colour, 3, light.colour);
         options.effects.lights.push_back(light);
     }
     if (set.count)

@@ -16,10 +16,6 @@ float Dot(const QexVec3& a, const QexVec3& b) {
     return QexVec3_DotProduct(&a, &b);
 }
 
-QexVec3 Moved(const QexVec3& from, const QexVec3& axis, float by) {
-    return {from.x + axis.x * by, from.y + axis.y * by, from.z + axis.z * by};
-}
-
 // A camera's angle from below to above, in degrees; its own is the one across.
 float Vertical(const QexCamera& camera) {
     return 2 * std::atan(std::tan(camera.fov / 2) / camera.aspect) / kDegree;
@@ -33,9 +29,9 @@ OrbitCamera::Axes OrbitCamera::GetAxes() const {
     Axes axes;
     QexVec3 side;
     QexVec3_CrossProduct(&side, &vertical, &front);
-    axes.right = Moved(Moved(zero, side, std::cos(yaw)), front, -std::sin(yaw));
-    axes.back = Moved(Moved(Moved(zero, side, std::sin(yaw) * std::cos(pitch)), vertical, std::sin(pitch)),
-                      front, std::cos(yaw) * std::cos(pitch));
+    axes.right = Offset(Offset(zero, side, std::cos(yaw)), front, -std::sin(yaw));
+    axes.back = Offset(Offset(Offset(zero, side, std::sin(yaw) * std::cos(pitch)), vertical, std::sin(pitch)),
+                       front, std::cos(yaw) * std::cos(pitch));
     QexVec3_CrossProduct(&axes.up, &axes.back, &axes.right);
     return axes;
 }
@@ -52,7 +48,7 @@ void OrbitCamera::Look(float yaw, float pitch) {
 void OrbitCamera::Pan(float right, float up) {
     const Axes axes = GetAxes();
     const float height = 2 * distance_ * std::tan(fov_ * kDegree / 2);
-    target_ = Moved(Moved(target_, axes.right, right * height), axes.up, up * height);
+    target_ = Offset(Offset(target_, axes.right, right * height), axes.up, up * height);
 }
 
 void OrbitCamera::Dolly(float factor) {
@@ -61,8 +57,8 @@ void OrbitCamera::Dolly(float factor) {
 
 void OrbitCamera::Fly(float forward, float right, float up) {
     const Axes axes = GetAxes();
-    target_ = Moved(Moved(Moved(target_, axes.back, -forward * distance_), axes.right, right * distance_),
-                    axes.up, up * distance_);
+    target_ = Offset(Offset(Offset(target_, axes.back, -forward * distance_), axes.right, right * distance_),
+                     axes.up, up * distance_);
 }
 
 void OrbitCamera::FrameAll(const std::vector<QexVec3>& points, float aspect) {
@@ -76,7 +72,7 @@ void OrbitCamera::FrameAll(const std::vector<QexVec3>& points, float aspect) {
                                      : QexVec3{(box.low.x + box.high.x) / 2, (box.low.y + box.high.y) / 2,
                                                (box.low.z + box.high.z) / 2};
     distance_ = std::max(Dot(camera.eye, back) - Dot(middle, back), kNearest);
-    target_ = Moved(camera.eye, back, -distance_);
+    target_ = Offset(camera.eye, back, -distance_);
     fov_ = Vertical(camera);
 }
 
@@ -90,9 +86,9 @@ void OrbitCamera::Follow(const QexCamera& camera, float distance) {
          std::asin(std::clamp(Dot(back, vertical), -1.0f, 1.0f)) / kDegree);
     fov_ = Vertical(camera);
     distance_ = std::clamp(distance, kNearest, kFarthest);
-    target_ = Moved(camera.eye, GetAxes().back, -distance_);
+    target_ = Offset(camera.eye, GetAxes().back, -distance_);
 }
 
 LookView OrbitCamera::View() const {
-    return {Moved(target_, GetAxes().back, distance_), target_, fov_};
+    return {Offset(target_, GetAxes().back, distance_), target_, fov_};
 }

@@ -16,7 +16,8 @@ namespace {
 
 using json = nlohmann::ordered_json;
 
-constexpr double kMost = 1e9;                                                           // of any number
+constexpr double kMost = 1e9;  // of any number
+
 const char* const kMaterialFields[] = {"diffuse", "specular", "shininess", "opacity"};  // as changes' What
 
 bool ReadNumber(const json& value, double* number) {
@@ -92,7 +93,7 @@ bool IsShader(const json& value) {
            (value == "" || std::find(names.begin(), names.end(), value.get<std::string>()) != names.end());
 }
 
-bool SetShader(Viewer* v, const json& value) {
+bool SetSceneShader(Viewer* v, const json& value) {
     if (!IsShader(value)) return false;
     return Alter(v, [&](SceneOptions* o) {
         o->effects.shader = value.get<std::string>();
@@ -250,9 +251,7 @@ bool SetNode(Viewer* v, const json& value) {
         }
         if (!value.contains("shader")) return true;
         if (!IsShader(value["shader"])) return false;
-        TakeBack(&nodes, NodeChange::kShader, name);
-        if (value["shader"] != "")
-            nodes.push_back({name, NodeChange::kShader, {0, 0, 0}, value["shader"].get<std::string>()});
+        SetShader(&nodes, name, value["shader"].get<std::string>());
         return true;
     });
 }
@@ -345,7 +344,7 @@ const struct {
          return json({v->Play().First(), v->Play().Until()});
      },
      SetRange},
-    {"shader", [](V v) { return json(v->Options().effects.shader); }, SetShader},
+    {"shader", [](V v) { return json(v->Options().effects.shader); }, SetSceneShader},
     {"lean", [](V v) { return json(v->Options().lean); },
      [](V v, J j) { return Alter(v, [&](SceneOptions* o) { return ReadFlag(j, &o->lean); }); }},
     {"shadow", [](V v) { return json(v->Options().effects.shadow); },

@@ -140,8 +140,11 @@ void Viewer::CameraMoved() {
 
 void Viewer::SetOptions(const SceneOptions& options) {
     options_ = options;
+    // A command line has colours of 8 bits.
+    for (QexLight& light : options_.effects.lights)
+        for (float& c : light.colour) c = std::round(std::clamp(c, 0.0f, 1.0f) * 255) / 255;
     std::vector<std::string> warnings;
-    const std::string problem = view_->SetOptions(options, &warnings);
+    const std::string problem = view_->SetOptions(options_, &warnings);
     for (const std::string& line : warnings) Say("warning: " + line);
     if (!problem.empty()) Say(problem);
 }

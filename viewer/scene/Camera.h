@@ -28,6 +28,11 @@ OrbitView ChooseView(const std::vector<QexVec3>& points, OrbitView view);
 // Places the camera so that all points are in the picture, from the direction of the view.
 void FramePoints(const std::vector<QexVec3>& points, const OrbitView& view, float aspect, QexCamera* camera);
 
+// A place so far along an axis.
+inline QexVec3 Offset(const QexVec3& from, const QexVec3& axis, float by) {
+    return {from.x + axis.x * by, from.y + axis.y * by, from.z + axis.z * by};
+}
+
 // The vertical of an axis, and where the camera stands at yaw 0.
 QexVec3 UpOf(UpAxis up);
 QexVec3 FrontOf(UpAxis up);

@@ -102,6 +102,11 @@ void TakeBack(std::vector<NodeChange>* changes, NodeChange::What what, const std
     changes->erase(std::remove_if(changes->begin(), changes->end(), taken), changes->end());
 }
 
+void SetShader(std::vector<NodeChange>* changes, const std::string& node, const std::string& shader) {
+    TakeBack(changes, NodeChange::kShader, node);
+    if (!shader.empty()) changes->push_back({node, NodeChange::kShader, {0, 0, 0}, shader});
+}
+
 const NodeChange* FindChange(const std::vector<NodeChange>& changes, const std::string& node,
                              NodeChange::What what) {
     const auto found = std::find_if(changes.begin(), changes.end(),

@@ -69,6 +69,8 @@ const NodeChange* FindChange(const std::vector<NodeChange>& changes, const std::
 inline void SetChange(std::vector<NodeChange>* changes, const NodeChange& change) {
     SetChange(changes, change, &NodeChange::node);
 }
+// The module of a node, or with none the one that it has without changes.
+void SetShader(std::vector<NodeChange>* changes, const std::string& node, const std::string& shader);
 inline void SetChange(std::vector<MaterialChange>* changes, const MaterialChange& change) {
     SetChange(changes, change, &MaterialChange::material);
 }

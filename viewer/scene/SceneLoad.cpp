@@ -5,19 +5,6 @@
 #include "common/EngineOutput.h"
 #include "scene/SceneView.h"
 
-namespace {
-
-bool SameLights(const std::vector<QexLight>& a, const std::vector<QexLight>& b) {
-    const auto same = [](const QexLight& x, const QexLight& y) {
-        for (int i = 0; i < 3; ++i)
-            if (x.vector[i] != y.vector[i] || x.colour[i] != y.colour[i]) return false;
-        return x.type == y.type;
-    };
-    return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), same);
-}
-
-}  // namespace
-
 SceneView::SceneView(QexRuntimeContext* engine, EmitterLoader loadEmitter)
     : engine_(engine), loadEmitter_(loadEmitter) {}
 
@@ -187,6 +174,6 @@ std::string SceneView::SetOptions(const SceneOptions& options, std::vector<std::
     const bool same = a.shader == b.shader && a.nodes == b.nodes && a.materials == b.materials &&
                       a.shadow == b.shadow && a.mirror == b.mirror && a.floor == b.floor &&
                       a.mirrorNode == b.mirrorNode && a.sky == b.sky && a.water == b.water &&
-                      a.emitters == b.emitters && SameLights(a.lights, b.lights);
+                      a.emitters == b.emitters;
     return same ? "" : Apply(warnings);
 }

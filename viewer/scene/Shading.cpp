@@ -2,6 +2,7 @@
 #include "scene/Shading.h"
 
 #include <iterator>
+#include <utility>
 
 namespace {
 
@@ -57,6 +58,21 @@ bool IsLit(const QexPODModel& scene, uint32_t meshNode, const std::vector<bool>&
     return material < 0 ? HasNormals(scene, meshNode) : lit[static_cast<size_t>(material)];
 }
 
+// The mesh nodes that changes give modules to, but for lit ones where there are no normals.
+std::vector<std::pair<uint32_t, const ShaderRow*>> ChangedShaders(const QexModel& model,
+                                                                  const std::vector<NodeChange>& changes) {
+    std::vector<std::pair<uint32_t, const ShaderRow*>> nodes;
+    std::string ignored;
+    for (const NodeChange& change : changes) {
+        const ShaderRow* row = change.what == NodeChange::kShader ? FindShader(change.shader) : nullptr;
+        const int32_t found = row ? FindNode(model, change.node, &ignored) : -1;
+        const uint32_t node = static_cast<uint32_t>(found);
+        if (found < 0 || node >= model.scene.meshNodeCount) continue;
+        if (!row->lit || HasNormals(model.scene, node)) nodes.emplace_back(node, row);
+    }
+    return nodes;
+}
+
 bool Shines(const QexLightSet& set) {
     for (uint32_t i = 0; i < set.count; ++i)
         for (int c = 0; c < 3; ++c)
@@ -80,14 +96,9 @@ std::vector<bool> LitMaterials(const QexModel& model, const EffectOptions& effec
         const int32_t material = scene.nodes[i].materialIndex;
         if (material >= 0 && !HasNormals(scene, i)) lit[static_cast<size_t>(material)] = false;
     }
-    std::string ignored;
-    for (const NodeChange& change : effects.nodes) {
-        const ShaderRow* own = change.what == NodeChange::kShader ? FindShader(change.shader) : nullptr;
-        const int32_t node = own ? FindNode(model, change.node, &ignored) : -1;
-        if (node < 0 || static_cast<uint32_t>(node) >= scene.meshNodeCount) continue;
+    for (const auto& [node, own] : ChangedShaders(model, effects.nodes)) {
         const int32_t material = scene.nodes[node].materialIndex;
-        if (material >= 0 && (!own->lit || HasNormals(scene, static_cast<uint32_t>(node))))
-            lit[static_cast<size_t>(material)] = own->lit;
+        if (material >= 0) lit[static_cast<size_t>(material)] = own->lit;
     }
     return lit;
 }
@@ -119,14 +130,8 @@ void SceneShaders::Use(QexModel* model, const std::string& name, const std::vect
 }
 
 void SceneShaders::Use(QexModel* model, const std::vector<NodeChange>& changes) {
-    std::string ignored;
-    for (const NodeChange& change : changes) {
-        const ShaderRow* row = change.what == NodeChange::kShader ? FindShader(change.shader) : nullptr;
-        const int32_t node = row ? FindNode(*model, change.node, &ignored) : -1;
-        if (node < 0 || static_cast<uint32_t>(node) >= model->scene.meshNodeCount) continue;
-        if (!row->lit || HasNormals(model->scene, static_cast<uint32_t>(node)))
-            Give(model, static_cast<uint32_t>(node), static_cast<size_t>(row - kShaders));
-    }
+    for (const auto& [node, row] : ChangedShaders(*model, changes))
+        Give(model, node, static_cast<size_t>(row - kShaders));
 }
 
 void SceneShaders::UseDefault(QexModel* model, bool shadow, const std::vector<bool>& lit) {
